@@ -1,0 +1,8 @@
+# One interface target holds every warning flag of the project.
+add_library(nimbo_warnings INTERFACE)
+target_compile_options(nimbo_warnings INTERFACE
+  -Wall -Wextra -Wpedantic -Wshadow -Wnon-virtual-dtor -Wold-style-cast -Woverloaded-virtual -Wcast-align
+  -Wduplicated-cond -Wlogical-op -Wnull-dereference
+  # g++ 12 reports members of moved-from optionals and variants as maybe uninitialized under the sanitizers.
+  -Wno-maybe-uninitialized
+  $<$<BOOL:${NIMBO_WARNINGS_AS_ERRORS}>:-Werror>)

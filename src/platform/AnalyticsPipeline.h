@@ -1,0 +1,39 @@
+#pragma once
+
+#include <cstdint>
+#include <optional>
+#include <string>
+#include <vector>
+
+#include "platform/foundation/Date.h"
+
+namespace nimbo {
+
+/// One incident that the widget showed during a session.
+struct TransitIncidentAnalyticsItem {
+  std::string transitLineMuid;  ///< decimal identifier of the line it was shown for
+  std::string transitIncidentTitle;
+};
+
+/// What one appearance of the widget showed.
+struct TransitWidgetAnalyticsRecord {
+  bool initiallyExpanded = false;
+  bool everExpanded = false;
+  int transitMessageType = 0;  ///< 0 until a build reported; then 1 to 4
+  std::vector<TransitIncidentAnalyticsItem> incidentItems;
+  std::optional<std::int64_t> tappedItemIndex;  ///< absent when no row was opened
+
+  void addTransitIncidentItem(TransitIncidentAnalyticsItem item) { incidentItems.push_back(std::move(item)); }
+};
+
+/// Keeps usage records. Main thread only; a record that cannot be kept is logged and dropped.
+class AnalyticsPipeline {
+ public:
+  virtual ~AnalyticsPipeline() = default;
+  virtual void captureUserAction(int action, int target, const std::optional<std::string>& value) = 0;
+  /// `duration` in seconds.
+  virtual void captureWidgetInteraction(int widgetType, int endState, const TransitWidgetAnalyticsRecord& record,
+                                        bool wasLocked, Date startDate, TimeInterval duration) = 0;
+};
+
+}  // namespace nimbo

@@ -1,0 +1,46 @@
+#include "platform/SerialQueue.h"
+
+#include <exception>
+
+#include "platform/Platform.h"
+
+namespace nimbo {
+
+SerialQueue::~SerialQueue() {
+  {
+    const std::lock_guard guard(_state->lock);
+    _state->stopping = true;
+  }
+  _state->changed.notify_all();
+  if (!_thread.joinable()) return;
+  if (_thread.get_id() == std::this_thread::get_id()) _thread.detach();
+  else _thread.join();
+}
+
+void SerialQueue::dispatchAsync(std::function<void()> work) {
+  const std::lock_guard guard(_state->lock);
+  _state->work.push_back(std::move(work));
+  if (!_thread.joinable()) _thread = std::thread([state = _state, label = _label] { run(state, label); });
+  _state->changed.notify_one();
+}
+
+void SerialQueue::run(const std::shared_ptr<State>& state, const std::string& label) {
+  for (;;) {
+    std::function<void()> work;
+    {
+      std::unique_lock guard(state->lock);
+      state->changed.wait(guard, [&] { return state->stopping || !state->work.empty(); });
+      if (state->stopping) return;
+      work = std::move(state->work.front());
+      state->work.pop_front();
+    }
+    try {
+      work();
+    } catch (const std::exception& exception) {
+      writeLog({kDefaultLogSubsystem, "SerialQueue"}, LogLevel::error, "Work on queue %@ threw: %@",
+               {label, exception.what()});
+    }
+  }
+}
+
+}  // namespace nimbo

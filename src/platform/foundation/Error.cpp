@@ -1,0 +1,40 @@
+#include "platform/foundation/Error.h"
+
+#include "platform/foundation/Hash.h"
+
+namespace nimbo {
+
+Error::Error(std::string domain, std::int64_t code, BoxedDictionary::Entries userInfo)
+    : _domain(std::move(domain)),
+      _code(code),
+      _userInfo(std::make_shared<const BoxedDictionary>(std::move(userInfo))) {}
+
+ErrorRef Error::errorWithDomain_code_userInfo(std::string domain, std::int64_t code,
+                                              BoxedDictionary::Entries userInfo) {
+  return std::make_shared<const Error>(std::move(domain), code, std::move(userInfo));
+}
+
+ErrorRef Error::errorWithDomain_code_reason(std::string domain, std::int64_t code, std::string reason) {
+  return errorWithDomain_code_userInfo(std::move(domain), code,
+                                       {{std::string(kErrorReasonKey), box(std::move(reason))}});
+}
+
+std::string Error::reason() const {
+  for (std::string_view key : {kErrorReasonKey, kErrorDebugDescriptionKey})
+    if (const ObjectRef text = _userInfo->objectForKey(key)) return text->description();
+  return _domain + " " + std::to_string(_code);
+}
+
+bool Error::isEqual(const Object* other) const {
+  if (this == other) return true;
+  const auto* error = dynamic_cast<const Error*>(other);
+  return error && error->_domain == _domain && error->_code == _code && error->_userInfo->isEqual(_userInfo.get());
+}
+
+std::uint64_t Error::hash() const { return hashOfBytes(_domain) ^ static_cast<std::uint64_t>(_code); }
+
+std::string Error::description() const {
+  return "Error Domain=" + _domain + " Code=" + std::to_string(_code) + " UserInfo=" + _userInfo->description();
+}
+
+}  // namespace nimbo

@@ -1,0 +1,67 @@
+#include "platform/ui/Environment.h"
+
+#include <algorithm>
+#include <array>
+#include <stdexcept>
+
+#include "platform/Platform.h"
+
+namespace nimbo {
+
+namespace {
+
+constexpr std::array<std::string_view, 12> kCategoryNames = {
+    "extraSmall",          "small",
+    "medium",              "large",
+    "extraLarge",          "extraExtraLarge",
+    "extraExtraExtraLarge", "accessibilityMedium",
+    "accessibilityLarge",  "accessibilityExtraLarge",
+    "accessibilityExtraExtraLarge", "accessibilityExtraExtraExtraLarge"};
+
+}  // namespace
+
+std::optional<ContentSizeCategory> contentSizeCategoryFromName(std::string_view name) {
+  const auto found = std::find(kCategoryNames.begin(), kCategoryNames.end(), name);
+  if (found == kCategoryNames.end()) return std::nullopt;
+  return static_cast<ContentSizeCategory>(found - kCategoryNames.begin());
+}
+
+std::string_view nameOfContentSizeCategory(ContentSizeCategory category) {
+  return kCategoryNames.at(static_cast<std::size_t>(category));
+}
+
+Environment& Environment::current() {
+  return *Platform::current().singleton<Environment>([] { return std::make_shared<Environment>(); });
+}
+
+void Environment::setContentSizeCategory(ContentSizeCategory category) {
+  if (category == _contentSizeCategory) return;
+  _contentSizeCategory = category;
+  // A copy: observers may come and go while they are called. One that was removed has lost its operation.
+  for (const auto observations = _observations; const auto& observation : observations) {
+    const auto alive = observation->observer.lock();
+    if (alive && observation->operation) observation->operation();
+  }
+}
+
+void Environment::setScreenScale(double scale) {
+  if (!(scale > 0)) throw std::invalid_argument("a screen scale is greater than 0");
+  _screenScale = scale;
+}
+
+void Environment::observeContentSizeCategory(const std::shared_ptr<const void>& observer,
+                                             std::function<void()> operation) {
+  std::erase_if(_observations, [](const auto& observation) { return observation->observer.expired(); });
+  _observations.push_back(
+      std::make_shared<Observation>(Observation{observer, observer.get(), std::move(operation)}));
+}
+
+void Environment::removeObserver(const void* observer) {
+  std::erase_if(_observations, [observer](const auto& observation) {
+    if (observation->identity != observer) return false;
+    observation->operation = nullptr;
+    return true;
+  });
+}
+
+}  // namespace nimbo

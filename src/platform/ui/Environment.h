@@ -1,0 +1,66 @@
+#pragma once
+
+#include <functional>
+#include <memory>
+#include <optional>
+#include <string_view>
+#include <vector>
+
+namespace nimbo {
+
+/// The user's preferred text size. `large` is the size at which lengths are given.
+enum class ContentSizeCategory {
+  extraSmall,
+  small,
+  medium,
+  large,
+  extraLarge,
+  extraExtraLarge,
+  extraExtraExtraLarge,
+  accessibilityMedium,
+  accessibilityLarge,
+  accessibilityExtraLarge,
+  accessibilityExtraExtraLarge,
+  accessibilityExtraExtraExtraLarge,
+};
+
+/// "extraSmall" to "accessibilityExtraExtraExtraLarge"; absent for anything else.
+std::optional<ContentSizeCategory> contentSizeCategoryFromName(std::string_view name);
+std::string_view nameOfContentSizeCategory(ContentSizeCategory category);
+
+enum class Appearance { light, dark };
+
+/// The screen and the user's preferences as views see them. One for each platform in force; main thread only.
+class Environment {
+ public:
+  static Environment& current();
+
+  ContentSizeCategory contentSizeCategory() const { return _contentSizeCategory; }
+  /// Announces the change to the observers, in the order in which they came; nothing happens when it is the same.
+  void setContentSizeCategory(ContentSizeCategory category);
+
+  /// Device pixels for each point of the main screen. 1 until set; greater than 0.
+  double screenScale() const { return _screenScale; }
+  void setScreenScale(double scale);
+
+  Appearance appearance() const { return _appearance; }
+  void setAppearance(Appearance appearance) { _appearance = appearance; }
+
+  /// Calls `operation` after each change of the text size, for as long as `observer` lives and is not removed.
+  void observeContentSizeCategory(const std::shared_ptr<const void>& observer, std::function<void()> operation);
+  /// Ends every observation of the observer.
+  void removeObserver(const void* observer);
+
+ private:
+  struct Observation {
+    std::weak_ptr<const void> observer;
+    const void* identity;
+    std::function<void()> operation;
+  };
+  ContentSizeCategory _contentSizeCategory = ContentSizeCategory::large;
+  double _screenScale = 1;
+  Appearance _appearance = Appearance::light;
+  std::vector<std::shared_ptr<Observation>> _observations;
+};
+
+}  // namespace nimbo
