@@ -21,6 +21,7 @@
 #include "platform/TransitLineService.h"
 #include "platform/UserActivity.h"
 #include "platform/archive/KeyedArchive.h"
+#include "platform/artwork/ArtworkCache.h"
 #include "platform/artwork/NamedImage.h"
 #include "platform/foundation/Log.h"
 #include "platform/ui/TextSystem.h"
