@@ -1,0 +1,61 @@
+#include "support/ArchiveDouble.h"
+
+#include <typeinfo>
+
+namespace nimbo {
+
+namespace {
+
+class TextEncoder final : public KeyedEncoder {
+ public:
+  void encodeObject_forKey(const ObjectRef& object, std::string_view key) override {
+    if (!object) return;
+    if (const auto* coding = dynamic_cast<const SecureCoding*>(object.get())) {
+      text += std::string(key) + ": " + std::string(coding->archivableClass().name) + " {";
+      coding->encodeWithCoder(*this);
+      text += "} ";
+    } else if (typeid(*object) == typeid(BoxedArray)) {
+      text += std::string(key) + ": [";
+      for (const ObjectRef& element : static_cast<const BoxedArray&>(*object).elements())
+        encodeObject_forKey(element, "element");
+      text += "] ";
+    } else if (dynamic_cast<const BoxedString*>(object.get()) || dynamic_cast<const BoxedNumber*>(object.get()) ||
+               dynamic_cast<const BoxedDate*>(object.get()) || dynamic_cast<const Error*>(object.get())) {
+      write(key, object->description());
+    } else {
+      failed = true;
+    }
+  }
+  void encodeBool_forKey(bool value, std::string_view key) override { write(key, value ? "yes" : "no"); }
+  void encodeInt64_forKey(std::int64_t value, std::string_view key) override { write(key, std::to_string(value)); }
+  void encodeUInt64_forKey(std::uint64_t value, std::string_view key) override { write(key, std::to_string(value)); }
+  void encodeDouble_forKey(double value, std::string_view key) override { write(key, std::to_string(value)); }
+  void encodeString_forKey(const std::optional<std::string>& value, std::string_view key) override {
+    if (value) write(key, "\"" + *value + "\"");
+  }
+  void encodeDate_forKey(const std::optional<Date>& value, std::string_view key) override {
+    if (value) write(key, isoTextOfDate(*value));
+  }
+  void encodeBytes_forKey(std::span<const std::uint8_t> value, std::string_view key) override {
+    write(key, std::string(value.begin(), value.end()));
+  }
+
+  std::string text;
+  bool failed = false;
+
+ private:
+  void write(std::string_view key, const std::string& value) { text += std::string(key) + ": " + value + " "; }
+};
+
+}  // namespace
+
+KeyedArchive::Archived ArchiveDouble::archivedDataWithRootObject(const ObjectRef& root, bool) {
+  TextEncoder encoder;
+  encoder.encodeObject_forKey(root, kKeyedArchiveRootObjectKey);
+  if (fails || encoder.failed)
+    return {std::nullopt,
+            Error::errorWithDomain_code_reason(std::string(kKeyedArchiveErrorDomain), 1, "cannot be archived")};
+  return {Bytes(encoder.text.begin(), encoder.text.end()), nullptr};
+}
+
+}  // namespace nimbo

@@ -1,0 +1,18 @@
+#pragma once
+
+#include "platform/archive/KeyedArchive.h"
+
+namespace nimbo {
+
+/// Archives to a readable text that nothing reads back: equal objects give equal bytes, objects that may not stand in
+/// an archive give an error.
+class ArchiveDouble final : public KeyedArchive {
+ public:
+  Archived archivedDataWithRootObject(const ObjectRef& root, bool requiringSecureCoding) override;
+  std::unique_ptr<KeyedUnarchiver> unarchiverForReadingFromData(std::span<const std::uint8_t>) override {
+    return nullptr;
+  }
+  bool fails = false;
+};
+
+}  // namespace nimbo

@@ -1,0 +1,59 @@
+#pragma once
+
+#include "platform/artwork/ArtworkCache.h"
+#include "platform/artwork/NamedImage.h"
+#include "platform/ui/TextSystem.h"
+
+#include <functional>
+#include <map>
+
+namespace nimbo {
+
+/// An image that is only its size.
+class ImageDouble final : public Image {
+ public:
+  ImageDouble(Size size, double scale) : _size(size), _scale(scale) {}
+  Size size() const override { return _size; }
+  double scale() const override { return _scale; }
+  std::string_view className() const override { return "ImageDouble"; }
+
+ private:
+  Size _size;
+  double _scale;
+};
+
+/// Images of the sizes that a test sets, in points, 24 by 24 until set.
+class ImageResourcesDouble final : public ImageResources {
+ public:
+  ImageRef image(std::string_view name, double screenScale, bool) override {
+    const auto found = sizes.find(name);
+    return std::make_shared<const ImageDouble>(found == sizes.end() ? Size{24, 24} : found->second, screenScale);
+  }
+  std::map<std::string, Size, std::less<>> sizes;
+};
+
+/// Shields of 14 to 28 points' height, each size step 2 points; as wide as `width` says. Icons are as wide as high;
+/// an artwork without either gives nothing.
+class ShieldRendererDouble final : public ShieldIconRenderer {
+ public:
+  ImageRef render(const TransitArtwork& artwork, std::int64_t shieldSize, double screenScale, bool) override;
+  void setCachesIconAtlases(bool caches) override { cachesIconAtlases = caches; }
+
+  /// Points for a shield size and a text. Until set: half the height for each byte of the text, at least the height.
+  std::function<double(std::int64_t shieldSize, const std::string& text)> width;
+  std::size_t rendered = 0;
+  bool cachesIconAtlases = true;
+};
+
+/// Text of exact made-up measures: each character is half the point size wide; ascent 0.8, descent 0.2 and capital
+/// height 0.7 of the point size. Lines break at spaces, and inside a word that does not fit a line.
+class TextSystemDouble final : public TextSystem {
+ public:
+  FontMetrics metrics(const FontDescriptor& font) override {
+    return {0.8 * font.pointSize, 0.2 * font.pointSize, 0.7 * font.pointSize};
+  }
+  TextLayoutRef layOut(const std::string& text, const FontDescriptor& font, double maxWidth, std::size_t maxLines,
+                       TextAlignment alignment, bool rightToLeft) override;
+};
+
+}  // namespace nimbo

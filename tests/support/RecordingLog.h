@@ -1,0 +1,61 @@
+#pragma once
+
+#include "platform/Signposts.h"
+#include "platform/foundation/Log.h"
+
+#include <functional>
+#include <mutex>
+#include <optional>
+#include <string>
+#include <vector>
+
+namespace nimbo {
+
+/// Keeps every log line. Any thread.
+class RecordingLog final : public Log {
+ public:
+  struct Line {
+    std::string subsystem;
+    std::string category;
+    LogLevel level;
+    std::string text;      ///< private arguments shown
+    std::string redacted;  ///< private arguments left out
+  };
+
+  bool isEnabled(LogLevel) const override { return true; }
+  void write(const LogFacility& facility, LogLevel level, std::string_view format,
+             std::span<const LogArgument> arguments) override;
+
+  std::vector<Line> lines() const;
+  /// Texts of the lines of a category, of one level where that is given.
+  std::vector<std::string> texts(std::string_view category, std::optional<LogLevel> level = {}) const;
+  /// Whether a line's text contains `part`.
+  bool contains(std::string_view part) const;
+  void clear();
+
+ private:
+  mutable std::mutex _lock;
+  std::vector<Line> _lines;
+};
+
+/// Keeps every point event. Any thread.
+class RecordingSignposts final : public Signposts {
+ public:
+  struct Event {
+    std::string subsystem;
+    std::string category;
+    std::string name;
+    std::string message;
+  };
+
+  explicit RecordingSignposts(std::function<void()> onEvent) : _onEvent(std::move(onEvent)) {}
+  void event(const LogFacility& facility, std::string_view name, std::string_view message) override;
+  std::vector<Event> events() const;
+
+ private:
+  std::function<void()> _onEvent;
+  mutable std::mutex _lock;
+  std::vector<Event> _events;
+};
+
+}  // namespace nimbo

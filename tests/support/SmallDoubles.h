@@ -1,0 +1,84 @@
+#pragma once
+
+#include "platform/AnalyticsPipeline.h"
+#include "platform/Bzip2Compress.h"
+#include "platform/DeviceLockState.h"
+#include "platform/NetworkFailureDiagnosis.h"
+#include "platform/RandomSource.h"
+
+#include <deque>
+#include <vector>
+
+namespace nimbo {
+
+/// Gives the numbers of its script, then 0.
+class ScriptedRandomSource final : public RandomSource {
+ public:
+  std::uint32_t next() override {
+    if (numbers.empty()) return 0;
+    const std::uint32_t number = numbers.front();
+    numbers.pop_front();
+    return number;
+  }
+  std::deque<std::uint32_t> numbers;
+};
+
+class NetworkFailureDiagnosisDouble final : public NetworkFailureDiagnosis {
+ public:
+  NetworkFailure diagnose() const override { return failure; }
+  NetworkFailure failure = NetworkFailure::unknown;
+};
+
+/// Gives its states one after the other; the last one stays.
+class DeviceLockStateDouble final : public DeviceLockState {
+ public:
+  int getDeviceLockState() override {
+    const int state = states.at(0);
+    if (states.size() > 1) states.pop_front();
+    return state;
+  }
+  std::deque<int> states{0};
+};
+
+class RecordingAnalyticsPipeline final : public AnalyticsPipeline {
+ public:
+  struct Action {
+    int action;
+    int target;
+    std::optional<std::string> value;
+    bool operator==(const Action&) const = default;
+  };
+  struct Interaction {
+    int widgetType;
+    int endState;
+    TransitWidgetAnalyticsRecord record;
+    bool wasLocked;
+    Date startDate;
+    TimeInterval duration;
+  };
+
+  void captureUserAction(int action, int target, const std::optional<std::string>& value) override {
+    actions.push_back({action, target, value});
+  }
+  void captureWidgetInteraction(int widgetType, int endState, const TransitWidgetAnalyticsRecord& record,
+                                bool wasLocked, Date startDate, TimeInterval duration) override {
+    interactions.push_back({widgetType, endState, record, wasLocked, startDate, duration});
+  }
+
+  std::vector<Action> actions;
+  std::vector<Interaction> interactions;
+};
+
+/// Gives the bytes behind a 'B', or fails.
+class CompressorDouble final : public Compressor {
+ public:
+  std::optional<Bytes> Bzip2Compress(std::span<const std::uint8_t> bytes) override {
+    if (fails) return std::nullopt;
+    Bytes marked{'B'};
+    marked.insert(marked.end(), bytes.begin(), bytes.end());
+    return marked;
+  }
+  bool fails = false;
+};
+
+}  // namespace nimbo

@@ -1,0 +1,52 @@
+#pragma once
+
+#include "platform/Platform.h"
+#include "platform/VirtualTime.h"
+#include "support/ActivityLauncherDouble.h"
+#include "support/ArchiveDouble.h"
+#include "support/DrawingDoubles.h"
+#include "support/FavoritesDouble.h"
+#include "support/MemoryPressureDouble.h"
+#include "support/MemorySettings.h"
+#include "support/RecordingLog.h"
+#include "support/SmallDoubles.h"
+#include "support/StringTablesDouble.h"
+#include "support/TestRunLoop.h"
+#include "support/TransitLineServiceDouble.h"
+
+namespace nimbo {
+
+/// A platform in memory, in force while it lives: each service is a double that the test reaches by its member. The
+/// thread that makes it is the main thread; the clock starts at 2026-01-05T12:00:00Z and stands still until told.
+class TestPlatform final {
+ public:
+  /// The given archive and compressor, where there are any, replace the doubles; they outlive this.
+  explicit TestPlatform(KeyedArchive* archiveInForce = nullptr, Compressor* compressorInForce = nullptr);
+  ~TestPlatform();
+
+  /// The date at which the clock starts.
+  static Date startDate();
+
+  VirtualTime time{startDate()};
+  TestRunLoop loop{time};
+  RecordingLog log;
+  RecordingSignposts signposts{[this] { loop.wake(); }};
+  ScriptedRandomSource random;
+  StringTablesDouble strings;
+  MemorySettings settings;
+  FavoritesDouble favorites;
+  TransitLineServiceDouble transitLines{loop};
+  NetworkFailureDiagnosisDouble network;
+  MemoryPressureDouble memoryPressure;
+  ActivityLauncherDouble activityLauncher{loop};
+  RecordingAnalyticsPipeline analytics;
+  DeviceLockStateDouble deviceLockState;
+  ArchiveDouble archive;
+  CompressorDouble compressor;
+  ImageResourcesDouble images;
+  TextSystemDouble text;
+  std::shared_ptr<ShieldRendererDouble> shieldRenderer = std::make_shared<ShieldRendererDouble>();
+  Platform platform;
+};
+
+}  // namespace nimbo

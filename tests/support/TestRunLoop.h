@@ -1,0 +1,51 @@
+#pragma once
+
+#include "platform/RunLoop.h"
+#include "platform/VirtualTime.h"
+
+#include <condition_variable>
+#include <deque>
+#include <functional>
+#include <mutex>
+#include <thread>
+
+namespace nimbo {
+
+/// The main run loop of a test: the thread that makes it is the main thread, queued work waits until the test runs
+/// it, and timers follow virtual time.
+class TestRunLoop final : public RunLoop {
+ public:
+  explicit TestRunLoop(VirtualTime& time) : _time(time) {}
+
+  bool isCurrent() const override { return std::this_thread::get_id() == _thread; }
+  void dispatchAsync(std::function<void()> work) override;
+  std::shared_ptr<Timer> scheduleTimer(TimeInterval interval, bool repeats, std::function<void(Timer&)> fire) override {
+    return _time.scheduleTimer(interval, repeats, std::move(fire));
+  }
+
+  /// Runs the queued work, and what that queues, until none is left.
+  void runUntilIdle();
+
+  /// Runs work as it comes, from other threads too, until `done` holds; asked after each piece and after each `wake`.
+  /// Throws std::runtime_error when that takes unreasonably long.
+  void waitAndDrain(const std::function<bool()>& done);
+
+  /// Makes `waitAndDrain` look again. Any thread.
+  void wake() {
+    dispatchAsync([] {});
+  }
+
+  /// Drops the queued work.
+  void clear();
+
+ private:
+  bool runOne();
+
+  VirtualTime& _time;
+  const std::thread::id _thread = std::this_thread::get_id();
+  std::mutex _lock;
+  std::condition_variable _arrived;
+  std::deque<std::function<void()>> _queue;
+};
+
+}  // namespace nimbo
