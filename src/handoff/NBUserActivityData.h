@@ -1,0 +1,62 @@
+#pragma once
+
+#include "handoff/NBOpenable.h"
+#include "platform/HostApplication.h"
+
+#include <memory>
+#include <optional>
+#include <string>
+
+namespace nimbo {
+
+/// Activity that opens the map application at one line. User info: "bs", a bzip2 stream of a `NimboActivity`.
+inline const std::string kNimboTransitWidgetIncidentActivityType =
+    std::string(kHostApplicationIdentifier) + ".Transit.Incident";
+
+/// Activity that opens the map application at a list of incidents.
+inline const std::string kNimboTransitWidgetIncidentSummaryActivityType =
+    std::string(kHostApplicationIdentifier) + ".Transit.IncidentList";
+
+/// User-info key of the list's incidents: a keyed archive of an array of `StoredTransitIncident`.
+inline constexpr std::string_view kNimboTransitWidgetIncidentSummaryActivityUserInfoKey = "incidentListKey";
+
+/// Domain of an activity that the system does not create.
+inline constexpr std::string_view kNBUserActivityErrorDomain = "NBUserActivityErrorDomain";
+
+/// Key, in such an error's user info, of the activity data that failed.
+inline constexpr std::string_view kNBUserActivityErrorMissingActivityKey = "NBUserActivityErrorMissingActivityKey";
+
+/// A hand-off to the map application: an activity type and its details, tagged with the session that widget and
+/// application share.
+class NBUserActivityData final : public NBOpenable {
+ public:
+  /// Prepares the shared session and tags `userInfo` with it.
+  static std::shared_ptr<const NBUserActivityData> initWithActivityType_userInfo(
+      std::optional<std::string> activityType, const std::shared_ptr<const BoxedDictionary>& userInfo);
+
+  const std::optional<std::string>& activityType() const { return _activityType; }
+  /// As tagged, not as given; may be null.
+  const std::shared_ptr<const BoxedDictionary>& userInfo() const { return _userInfo; }
+
+  /// Creates the activity anew and gives it to the launcher, for the application that contains this program. The
+  /// context plays no part.
+  void openInContext_completionHandler(Object* context, Completion completion) const override;
+
+  /// Both fields absent or equal.
+  bool isEqualToUserActivityData(const NBUserActivityData& other) const;
+
+  std::string_view className() const override { return "NBUserActivityData"; }
+  bool isEqual(const Object* other) const override;
+  std::uint64_t hash() const override;
+
+ private:
+  NBUserActivityData(std::optional<std::string> activityType, std::shared_ptr<const BoxedDictionary> userInfo)
+      : _activityType(std::move(activityType)), _userInfo(std::move(userInfo)) {}
+
+  std::optional<std::string> _activityType;
+  std::shared_ptr<const BoxedDictionary> _userInfo;
+};
+
+using NBUserActivityDataRef = std::shared_ptr<const NBUserActivityData>;
+
+}  // namespace nimbo
