@@ -24,8 +24,10 @@ ResultRef Result::initWithError(ErrorRef error) {
 
 std::string Result::_errorMessageForValue_error(bool valueBlockMissing, bool errorBlockMissing) {
   std::string message = "Neither block can be nil but ";
-  if (valueBlockMissing && errorBlockMissing) message += "both are nil.";
-  else message += valueBlockMissing ? "value block is nil." : "error block is nil.";
+  if (valueBlockMissing && errorBlockMissing)
+    message += "both are nil.";
+  else
+    message += valueBlockMissing ? "value block is nil." : "error block is nil.";
   return message;
 }
 
@@ -71,8 +73,10 @@ std::string Result::description() const {
   const std::string content = " " + (_isSuccess ? _value->description() : _error->description()) + ">";
   std::string text;
   for (const char c : Object::description()) {
-    if (c == '>') text += content;
-    else text += c;
+    if (c == '>')
+      text += content;
+    else
+      text += c;
   }
   return text;
 }

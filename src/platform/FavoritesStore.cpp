@@ -3,7 +3,8 @@
 namespace nimbo {
 
 void FavoritesStore::readContents(std::function<void(const std::optional<Favorites>&)> callback) {
-  _queue.dispatchAsync([persister = _persister, callback = std::move(callback)] { callback(persister->readFavorites()); });
+  _queue.dispatchAsync(
+      [persister = _persister, callback = std::move(callback)] { callback(persister->readFavorites()); });
 }
 
 }  // namespace nimbo

@@ -13,8 +13,10 @@ SerialQueue::~SerialQueue() {
   }
   _state->changed.notify_all();
   if (!_thread.joinable()) return;
-  if (_thread.get_id() == std::this_thread::get_id()) _thread.detach();
-  else _thread.join();
+  if (_thread.get_id() == std::this_thread::get_id())
+    _thread.detach();
+  else
+    _thread.join();
 }
 
 void SerialQueue::dispatchAsync(std::function<void()> work) {

@@ -13,7 +13,9 @@ std::optional<T> valueOfType(const SharedSettingsStore& store, std::string_view 
 
 }  // namespace
 
-bool SharedSettingsStore::boolForKey(std::string_view key) const { return valueOfType<bool>(*this, key).value_or(false); }
+bool SharedSettingsStore::boolForKey(std::string_view key) const {
+  return valueOfType<bool>(*this, key).value_or(false);
+}
 
 std::optional<Bytes> SharedSettingsStore::dataForKey(std::string_view key) const {
   return valueOfType<Bytes>(*this, key);

@@ -26,8 +26,10 @@ class VirtualTime::VirtualTimer final : public Timer, public std::enable_shared_
   void fire() {
     const auto keep = shared_from_this();
     const auto callback = _fire;
-    if (_repeats) _date = dateByAdding(_date, _interval);
-    else invalidate();
+    if (_repeats)
+      _date = dateByAdding(_date, _interval);
+    else
+      invalidate();
     callback(*this);
   }
 

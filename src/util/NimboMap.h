@@ -31,8 +31,10 @@ auto NimboMap(const std::vector<T>& array, Transform transform) {
   for (std::size_t index = 0; index < array.size(); ++index) {
     Answer answer = transform(array[index], index);
     if (!answer) continue;
-    if constexpr (std::is_same_v<typename detail::MappedValue<Answer>::type, Answer>) result.push_back(std::move(answer));
-    else result.push_back(*std::move(answer));
+    if constexpr (std::is_same_v<typename detail::MappedValue<Answer>::type, Answer>)
+      result.push_back(std::move(answer));
+    else
+      result.push_back(*std::move(answer));
   }
   return result;
 }

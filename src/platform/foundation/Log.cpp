@@ -55,8 +55,10 @@ std::string formatLogLine(std::string_view format, std::span<const LogArgument> 
     const std::string_view flags = rest.substr(0, end);
     const int precision =
         flags.size() == 2 && flags[0] == '.' && flags[1] >= '0' && flags[1] <= '9' ? flags[1] - '0' : 6;
-    if (next >= arguments.size()) line += "(missing)";
-    else line += isPrivate && redact ? std::string(kRedacted) : textOfArgument(arguments[next], precision);
+    if (next >= arguments.size())
+      line += "(missing)";
+    else
+      line += isPrivate && redact ? std::string(kRedacted) : textOfArgument(arguments[next], precision);
     ++next;
     i += (isPrivate ? kPrivate.size() : 0) + end + 1;
   }

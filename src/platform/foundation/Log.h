@@ -34,17 +34,19 @@ class LogArgument {
   template <class T>
   LogArgument(const std::shared_ptr<T>& object) : _value(ObjectRef(object)) {}
   template <class T>
-    requires std::is_arithmetic_v<T>
-  LogArgument(T value) : _value(convert(value)) {}
+  requires std::is_arithmetic_v<T> LogArgument(T value) : _value(convert(value)) {}
 
   const Value& value() const { return _value; }
 
  private:
   template <class T>
   static Value convert(T value) {
-    if constexpr (std::is_floating_point_v<T>) return double{value};
-    else if constexpr (std::is_unsigned_v<T>) return std::uint64_t{value};
-    else return std::int64_t{value};
+    if constexpr (std::is_floating_point_v<T>)
+      return double{value};
+    else if constexpr (std::is_unsigned_v<T>)
+      return std::uint64_t{value};
+    else
+      return std::int64_t{value};
   }
 
   Value _value;

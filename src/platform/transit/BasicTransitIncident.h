@@ -45,12 +45,8 @@ class BasicTransitIncident final : public TransitIncident {
   const std::optional<std::string>& title() const override { return _fields.title; }
   const std::optional<std::string>& summary() const override { return _fields.summary; }
   const std::optional<std::string>& fullDescription() const override { return _fields.fullDescription; }
-  const std::optional<std::string>& messageForRoutePlanning() const override {
-    return _fields.messageForRoutePlanning;
-  }
-  const std::optional<std::string>& messageForRouteStepping() const override {
-    return _fields.messageForRouteStepping;
-  }
+  const std::optional<std::string>& messageForRoutePlanning() const override { return _fields.messageForRoutePlanning; }
+  const std::optional<std::string>& messageForRouteStepping() const override { return _fields.messageForRouteStepping; }
   const std::optional<std::string>& messageForNonRoutable() const override { return _fields.messageForNonRoutable; }
   std::optional<Date> startDate() const override { return _fields.startDate; }
   std::optional<Date> endDate() const override { return _fields.endDate; }

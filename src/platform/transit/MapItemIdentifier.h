@@ -12,10 +12,10 @@ namespace nimbo {
 
 /// How a line is found in the data that an agency publishes, also after the agency renumbered its routes.
 struct TransitLineLocator {
-  std::string feed;         ///< name of the feed as the user set it up
-  std::string agencyID;     ///< agency_id of the static feed; may be empty in a feed of one agency
-  std::string routeID;      ///< route_id of the static feed
-  std::string shortName;    ///< route_short_name, may be empty
+  std::string feed;       ///< name of the feed as the user set it up
+  std::string agencyID;   ///< agency_id of the static feed; may be empty in a feed of one agency
+  std::string routeID;    ///< route_id of the static feed
+  std::string shortName;  ///< route_short_name, may be empty
   TransitMode mode = TransitMode::unknown;
 
   bool operator==(const TransitLineLocator&) const = default;

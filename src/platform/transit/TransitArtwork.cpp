@@ -67,8 +67,10 @@ std::uint64_t TransitArtwork::hash() const {
 
 std::string TransitArtwork::description() const {
   std::string text;
-  if (_fields.accessibilityText) text = *_fields.accessibilityText;
-  else if (_fields.shieldDataSource) text = _fields.shieldDataSource->shieldText.value_or("");
+  if (_fields.accessibilityText)
+    text = *_fields.accessibilityText;
+  else if (_fields.shieldDataSource)
+    text = _fields.shieldDataSource->shieldText.value_or("");
   return "<TransitArtwork: " + text + ">";
 }
 

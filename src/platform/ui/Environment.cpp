@@ -10,13 +10,18 @@ namespace nimbo {
 
 namespace {
 
-constexpr std::array<std::string_view, 12> kCategoryNames = {
-    "extraSmall",          "small",
-    "medium",              "large",
-    "extraLarge",          "extraExtraLarge",
-    "extraExtraExtraLarge", "accessibilityMedium",
-    "accessibilityLarge",  "accessibilityExtraLarge",
-    "accessibilityExtraExtraLarge", "accessibilityExtraExtraExtraLarge"};
+constexpr std::array<std::string_view, 12> kCategoryNames = {"extraSmall",
+                                                             "small",
+                                                             "medium",
+                                                             "large",
+                                                             "extraLarge",
+                                                             "extraExtraLarge",
+                                                             "extraExtraExtraLarge",
+                                                             "accessibilityMedium",
+                                                             "accessibilityLarge",
+                                                             "accessibilityExtraLarge",
+                                                             "accessibilityExtraExtraLarge",
+                                                             "accessibilityExtraExtraExtraLarge"};
 
 }  // namespace
 
@@ -52,8 +57,7 @@ void Environment::setScreenScale(double scale) {
 void Environment::observeContentSizeCategory(const std::shared_ptr<const void>& observer,
                                              std::function<void()> operation) {
   std::erase_if(_observations, [](const auto& observation) { return observation->observer.expired(); });
-  _observations.push_back(
-      std::make_shared<Observation>(Observation{observer, observer.get(), std::move(operation)}));
+  _observations.push_back(std::make_shared<Observation>(Observation{observer, observer.get(), std::move(operation)}));
 }
 
 void Environment::removeObserver(const void* observer) {

@@ -19,9 +19,7 @@ struct Rect {
   Size size() const { return {width, height}; }
   double maxX() const { return x + width; }
   double maxY() const { return y + height; }
-  bool contains(Point point) const {
-    return point.x >= x && point.x < maxX() && point.y >= y && point.y < maxY();
-  }
+  bool contains(Point point) const { return point.x >= x && point.x < maxX() && point.y >= y && point.y < maxY(); }
   bool operator==(const Rect&) const = default;
 };
 
