@@ -1,0 +1,113 @@
+#include "host/TerminalRows.h"
+
+#include <sys/ioctl.h>
+#include <unistd.h>
+
+#include <algorithm>
+#include <cmath>
+#include <cstdlib>
+#include <vector>
+
+#include "host/TerminalText.h"
+#include "platform/transit/TransitArtwork.h"
+#include "platform/ui/Color.h"
+
+namespace nimbo {
+
+using nlohmann::json;
+
+namespace {
+
+constexpr const char* kBold = "1";
+constexpr const char* kFaint = "2";
+
+std::string styled(const std::string& text, const std::string& attributes, const TerminalStyle& style) {
+  return style.colors && !attributes.empty() && !text.empty() ? "\x1b[" + attributes + "m" + text + "\x1b[0m" : text;
+}
+
+std::string textOf(const json& object, const char* key) {
+  const auto found = object.find(key);
+  return found != object.end() && found->is_string() ? printableText(found->get<std::string>()) : std::string();
+}
+
+std::string colorCode(const Color& color, int plane) {
+  const auto part = [](double value) { return std::to_string(std::lround(value * 255)); };
+  return std::to_string(plane) + ";2;" + part(color.red) + ";" + part(color.green) + ";" + part(color.blue);
+}
+
+/// A shield as " 12 " on its colour, or as [12]; a symbol by the name of its mode.
+std::string shieldText(const json& shield, bool dimmed, const TerminalStyle& style) {
+  if (!shield.is_object()) return {};
+  std::string text = textOf(shield, "text");
+  if (text.empty()) text = textOf(shield, "accessibilityText");
+  if (text.empty()) return {};
+  if (!style.colors) return "[" + text + "]";
+  const auto color = colorFromHexText(textOf(shield, "color"));
+  if (!color || dimmed) return styled("[" + text + "]", dimmed ? kFaint : kBold, style);
+  constexpr Color kBlack{0, 0, 0, 1}, kWhite{1, 1, 1, 1};
+  const Color& ink = contrastRatio(*color, kWhite) >= contrastRatio(*color, kBlack) ? kWhite : kBlack;
+  return styled(" " + text + " ", colorCode(*color, 48) + ";" + colorCode(ink, 38) + ";1", style);
+}
+
+/// The four images of the rows as signs.
+std::string imageText(const std::string& name) {
+  if (name.starts_with("good")) return "✓";
+  if (name.starts_with("advisories")) return "⚠";
+  return "•";
+}
+
+std::string artworkText(const json& row, const TerminalStyle& style) {
+  const json artwork = row.value("artwork", json());
+  if (!artwork.is_object() || row.value("artworkHidden", false)) return {};
+  const bool dimmed = artwork.value("alpha", 1.0) < 1;
+  if (artwork.contains("image")) return styled(imageText(textOf(artwork, "image")), dimmed ? kFaint : kBold, style);
+  return shieldText(artwork.value("shield", json()), dimmed, style);
+}
+
+std::string shieldsText(const json& row, const TerminalStyle& style) {
+  std::string text;
+  for (const json& shield : row.value("artworks", json::array())) {
+    const std::string one = shieldText(shield, false, style);
+    if (!one.empty()) text += (text.empty() ? "" : " ") + one;
+  }
+  return text;
+}
+
+}  // namespace
+
+TerminalStyle TerminalStyle::ofStandardOutput() {
+  TerminalStyle style;
+  const char* noColor = std::getenv("NO_COLOR");
+  const char* terminal = std::getenv("TERM");
+  style.colors = isatty(STDOUT_FILENO) && !(noColor && *noColor) && terminal && std::string_view(terminal) != "dumb";
+  constexpr int kNarrowest = 20;
+  winsize size{};
+  if (ioctl(STDOUT_FILENO, TIOCGWINSZ, &size) == 0 && size.ws_col > 0) style.columns = size.ws_col;
+  else if (const char* columns = std::getenv("COLUMNS"); columns && std::atoi(columns) > 0)
+    style.columns = std::atoi(columns);
+  style.columns = std::max(style.columns, kNarrowest);
+  return style;
+}
+
+std::string rowsAsText(const json& snapshot, const TerminalStyle& style) {
+  constexpr int kIndent = 2;
+  std::string text;
+  for (const json& row : snapshot.value("rows", json::array())) {
+    const std::string artwork = artworkText(row, style);
+    const int room = style.columns - (artwork.empty() ? 0 : terminalWidth(artwork) + 1);
+    bool first = true;
+    for (const std::string& line : foldedText(textOf(row, "primaryText"), room)) {
+      text += styled(line, kBold, style);
+      if (first && !artwork.empty()) text += std::string(static_cast<std::size_t>(room - terminalWidth(line) + 1), ' ') + artwork;
+      text += "\n";
+      first = false;
+    }
+    for (const std::string& line : foldedText(textOf(row, "secondaryText"), style.columns - kIndent))
+      text += std::string(kIndent, ' ') + line + "\n";
+    const std::string shields = shieldsText(row, style);
+    if (!shields.empty()) text += std::string(kIndent, ' ') + shields + "\n";
+  }
+  return text;
+}
+
+}  // namespace nimbo

@@ -1,0 +1,21 @@
+#pragma once
+
+#include <nlohmann/json.hpp>
+#include <string>
+
+namespace nimbo {
+
+/// How a terminal shows the rows.
+struct TerminalStyle {
+  bool colors = false;  ///< shields in their colours, titles bold, dimmed images faint
+  int columns = 80;     ///< the terminal's width; texts are folded within it
+
+  /// What the standard output can show: colours on a terminal unless NO_COLOR is set (https://no-color.org) or TERM is
+  /// "dumb"; its width, else COLUMNS, else 80.
+  static TerminalStyle ofStandardOutput();
+};
+
+/// The rows of a snapshot as lines of text: title and shield on one line, the secondary text below.
+std::string rowsAsText(const nlohmann::json& snapshot, const TerminalStyle& style);
+
+}  // namespace nimbo

@@ -1,0 +1,124 @@
+#include "host/WidgetClient.h"
+
+#include <fcntl.h>
+#include <poll.h>
+#include <signal.h>
+#include <spawn.h>
+#include <sys/syscall.h>
+#include <sys/wait.h>
+#include <unistd.h>
+
+#include <cstdlib>
+#include <cstring>
+
+namespace nimbo {
+
+using nlohmann::json;
+
+namespace {
+
+constexpr const char* kProgramName = "nimbo-transit-widget";
+
+struct Pipe {
+  FileDescriptor reading, writing;
+};
+
+Pipe makePipe() {
+  int ends[2];
+  if (pipe2(ends, O_CLOEXEC) != 0) throw WidgetClientFailure(std::string("no pipe: ") + std::strerror(errno));
+  return {FileDescriptor(ends[0]), FileDescriptor(ends[1])};
+}
+
+std::string describeEnd(int status) {
+  if (WIFSIGNALED(status)) return std::string("was ended by signal ") + strsignal(WTERMSIG(status));
+  return "ended with status " + std::to_string(WEXITSTATUS(status));
+}
+
+}  // namespace
+
+std::filesystem::path WidgetClient::widgetProgram() {
+  if (const char* named = std::getenv("NIMBO_TRANSIT_WIDGET"); named && *named) return named;
+  const auto folder = std::filesystem::read_symlink("/proc/self/exe").parent_path();
+  // Installed programs stand side by side; built ones each in the folder of its target.
+  for (const auto& candidate : {folder / kProgramName, folder / ".." / "process" / kProgramName})
+    if (std::error_code error; std::filesystem::exists(candidate, error)) return candidate;
+  return folder / kProgramName;
+}
+
+WidgetClient::WidgetClient(GLibRunLoop& runLoop, const std::vector<std::string>& arguments) : _runLoop(runLoop) {
+  Pipe toWidget = makePipe(), fromWidget = makePipe();
+  const std::string program = widgetProgram();
+  std::vector<char*> argv{const_cast<char*>(kProgramName)};
+  for (const std::string& argument : arguments) argv.push_back(const_cast<char*>(argument.c_str()));
+  argv.push_back(nullptr);
+
+  posix_spawn_file_actions_t actions;
+  posix_spawn_file_actions_init(&actions);
+  posix_spawn_file_actions_adddup2(&actions, toWidget.reading.get(), STDIN_FILENO);
+  posix_spawn_file_actions_adddup2(&actions, fromWidget.writing.get(), STDOUT_FILENO);
+  const int failure = posix_spawn(&_process, program.c_str(), &actions, nullptr, argv.data(), environ);
+  posix_spawn_file_actions_destroy(&actions);
+  if (failure != 0)
+    throw WidgetClientFailure("cannot start " + program + ": " + std::strerror(failure) +
+                              ". Install it beside nimbo-transit, or name it in NIMBO_TRANSIT_WIDGET.");
+
+  _running = true;
+  _input = std::move(fromWidget.reading);
+  _output = std::move(toWidget.writing);
+  _connection = std::make_unique<JSONRPCConnection>(_runLoop, _input.get(), _output.get());
+  _connection->setClosedHandler([this] { _running = false; });
+  handleOpening("openURL");
+  handleOpening("openUserActivity");
+  for (const char* heard : {"preferredContentSizeDidChange", "largestAvailableDisplayModeDidChange", "log"})
+    _connection->setHandler(heard, [](const json&, const JSONRPCResponder&) {});
+  _connection->start();
+}
+
+void WidgetClient::handleOpening(const char* method) {
+  _connection->setHandler(method, [this, method](const json& params, const JSONRPCResponder& responder) {
+    responder.answer({{"opened", _openHandler && _openHandler(method, params)}});
+  });
+}
+
+WidgetClient::~WidgetClient() {
+  _connection.reset();
+  _output = FileDescriptor();
+  _input = FileDescriptor();
+  if (_process <= 0) return;
+  // The process ends when its input closes; a pidfd tells when, without a signal handler of ours.
+  constexpr int kGraceMilliseconds = 1000;
+  const FileDescriptor process(static_cast<int>(syscall(SYS_pidfd_open, _process, 0)));
+  pollfd ended{process.get(), POLLIN, 0};
+  if (process.get() < 0 || poll(&ended, 1, kGraceMilliseconds) != 1) kill(_process, SIGKILL);
+  waitpid(_process, nullptr, 0);
+}
+
+json WidgetClient::call(std::string_view method, const json& params) {
+  std::optional<json> answer;
+  std::optional<JSONRPCError> failure;
+  _connection->call(method, params, [&](const json& result, const std::optional<JSONRPCError>& error) {
+    answer = result;
+    failure = error;
+  });
+  waitUntil([&] { return answer.has_value(); });
+  if (failure && _running) throw WidgetClientFailure(std::string(method) + ": " + failure->message);
+  if (failure) waitUntil([] { return false; });  // says how the process ended
+  return *answer;
+}
+
+void WidgetClient::waitUntil(const std::function<bool()>& done) {
+  bool tired = false;
+  const auto patience = _runLoop.scheduleTimer(kPatience, false, [&](Timer&) { tired = true; });
+  while (!done() && _running && !tired) _runLoop.runOnce();
+  patience->invalidate();
+  if (done()) return;
+  if (tired)
+    throw WidgetClientFailure("the widget process has not answered for " + std::to_string(static_cast<int>(kPatience)) +
+                              " seconds");
+  int status = 0;
+  waitpid(_process, &status, 0);
+  _process = -1;
+  throw WidgetClientFailure("the widget process " + describeEnd(status) + " before it answered");
+}
+
+}  // namespace nimbo
