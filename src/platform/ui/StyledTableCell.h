@@ -1,6 +1,7 @@
 #pragma once
 
 #include <cstdint>
+#include <memory>
 #include <string>
 
 #include "platform/ui/View.h"
@@ -12,20 +13,34 @@ enum class TableCellStyle { standard };
 /// A table row's view.
 class StyledTableCell : public View {
  public:
+  /// An empty cell. Classes with content of their own have a function of the same name that builds it.
+  static std::shared_ptr<StyledTableCell> initWithStyle_reuseIdentifier(TableCellStyle style,
+                                                                        const std::string& reuseIdentifier);
   StyledTableCell(TableCellStyle style, std::string reuseIdentifier);
-  /// Builds the content; called once, right after the cell was made.
-  virtual void didInit() {}
 
   const std::string& reuseIdentifier() const { return _reuseIdentifier; }
+  /// Holds the cell's content; as large as the cell.
+  const std::shared_ptr<View>& contentView() const { return _contentView; }
+
   /// 0: no separator under the row; 1: the inset separator.
   std::int64_t separatorStyleOverride() const { return _separatorStyleOverride; }
   void setSeparatorStyleOverride(std::int64_t style) { _separatorStyleOverride = style; }
 
+  /// Whether the row is shown as touched.
+  bool isHighlighted() const { return _highlighted; }
+  void setHighlighted(bool highlighted) { _highlighted = highlighted; }
+
+  /// The height that the content wants at a width, in points; that of a standard row for a cell without content.
+  virtual double heightFittingWidth(double width);
+
+  void layoutSubviews() override;
   std::string_view className() const override { return "StyledTableCell"; }
 
  private:
   std::string _reuseIdentifier;
+  std::shared_ptr<View> _contentView;
   std::int64_t _separatorStyleOverride = 0;
+  bool _highlighted = false;
 };
 
 }  // namespace nimbo

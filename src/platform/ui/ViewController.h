@@ -17,6 +17,7 @@ class ViewController : public Object {
  public:
   /// The host may be null (no host); it outlives the controller. The names are kept for the controller's use.
   ViewController(std::string nibName, std::string bundle, WidgetHost* widgetHost);
+  ~ViewController() override;
 
   /// Null when the controller runs outside a host.
   WidgetHost* widgetHost() const { return _widgetHost; }
@@ -26,13 +27,15 @@ class ViewController : public Object {
   bool isViewLoaded() const { return _view != nullptr; }
 
   virtual void viewDidLoad() {}
+  /// Before each layout of the view.
   virtual void viewWillLayoutSubviews() {}
-  virtual void viewWillAppear(bool animated);
-  virtual void viewDidAppear(bool animated);
-  virtual void viewWillDisappear(bool animated);
-  virtual void viewDidDisappear(bool animated);
+  virtual void viewWillAppear(bool /*animated*/) {}
+  virtual void viewDidAppear(bool /*animated*/) {}
+  virtual void viewWillDisappear(bool /*animated*/) {}
+  virtual void viewDidDisappear(bool /*animated*/) {}
   virtual void didReceiveMemoryWarning() {}
-  virtual void viewWillTransitionToSize_withTransitionCoordinator(Size size, TransitionCoordinator* coordinator);
+  virtual void viewWillTransitionToSize_withTransitionCoordinator(Size /*size*/,
+                                                                  TransitionCoordinator* /*coordinator*/) {}
 
   /// Points. Setting another size tells the host.
   Size preferredContentSize() const { return _preferredContentSize; }
