@@ -1,7 +1,5 @@
 #include "desktop/system/AtomicFile.h"
 
-#include "desktop/raii/FileDescriptor.h"
-
 #include <fcntl.h>
 #include <sys/stat.h>
 
@@ -9,6 +7,8 @@
 #include <cstdlib>
 #include <string>
 #include <system_error>
+
+#include "desktop/raii/FileDescriptor.h"
 
 namespace nimbo {
 

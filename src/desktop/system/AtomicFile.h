@@ -1,9 +1,9 @@
 #pragma once
 
-#include "platform/foundation/Error.h"
-
 #include <filesystem>
 #include <string_view>
+
+#include "platform/foundation/Error.h"
 
 namespace nimbo {
 

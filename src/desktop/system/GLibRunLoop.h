@@ -1,0 +1,56 @@
+#pragma once
+
+#include <deque>
+#include <functional>
+#include <memory>
+#include <mutex>
+#include <thread>
+
+#include "desktop/raii/GLibHandles.h"
+#include "desktop/system/KernelTimer.h"
+#include "platform/RunLoop.h"
+#include "platform/VirtualTime.h"
+
+namespace nimbo {
+
+/// The main run loop over GLib's default main context; the thread that makes it is the main thread. One at a time in a
+/// process. What callbacks throw is logged, and the loop goes on. Ends its timers and drops queued work when it goes.
+class GLibRunLoop final : public RunLoop {
+ public:
+  /// With `virtualTime`, which outlives the loop, timers wait for that instead of the machine's clocks.
+  explicit GLibRunLoop(VirtualTime* virtualTime = nullptr);
+  ~GLibRunLoop() override;
+  GLibRunLoop(const GLibRunLoop&) = delete;
+  GLibRunLoop& operator=(const GLibRunLoop&) = delete;
+
+  /// Runs until `quit`. Main thread only. A toolkit that runs the default main context itself needs no call of this.
+  void run();
+  /// Ends the run that is going on. Any thread.
+  void quit();
+  /// Waits for the next thing to do and does what is ready. For a program that waits for one answer. Main thread only.
+  void runOnce();
+
+  bool isCurrent() const override { return std::this_thread::get_id() == _thread; }
+  void dispatchAsync(std::function<void()> work) override;
+  std::shared_ptr<Timer> scheduleTimer(TimeInterval interval, bool repeats, std::function<void(Timer&)> fire) override;
+
+  /// Calls `callback` on the main thread for as long as `fd` has something to read, is at its end or in error, until
+  /// the handle goes. The descriptor stays the caller's and outlives the handle. Main thread only.
+  GSourceHandle watchReadable(int fd, std::function<void()> callback);
+  /// The same for exceptional conditions (POLLPRI), by which kernel files announce events.
+  GSourceHandle watchUrgent(int fd, std::function<void()> callback);
+
+ private:
+  void runQueuedWork();
+
+  const std::thread::id _thread = std::this_thread::get_id();
+  VirtualTime* _virtualTime;
+  GMainContextHandle _context;
+  GMainLoopHandle _loop;
+  std::mutex _lock;
+  std::deque<std::function<void()>> _work;
+  GSourceHandle _workSource;
+  KernelTimer::Set _timers;
+};
+
+}  // namespace nimbo

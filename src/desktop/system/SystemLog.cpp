@@ -1,0 +1,42 @@
+#include "desktop/system/SystemLog.h"
+
+#include <string>
+#include <utility>
+
+#include "desktop/system/JournalSink.h"
+#include "desktop/system/StandardErrorSink.h"
+
+namespace nimbo {
+
+SystemLog::SystemLog(const LogOptions& options, std::unique_ptr<LogSink> sink)
+    : _options(options), _sink(std::move(sink)) {
+  if (_options.unknownLevel.empty()) return;
+  const LogArgument level(_options.unknownLevel);
+  write({kDefaultLogSubsystem, "Log"}, LogLevel::error,
+        "NIMBO_LOG is \"%@\", which is no level; errors only are kept. Use debug, info or error.", {&level, 1});
+}
+
+void SystemLog::write(const LogFacility& facility, LogLevel level, std::string_view format,
+                      std::span<const LogArgument> arguments) {
+  if (!isEnabled(level)) return;
+  try {
+    _sink->send({facility, level, formatLogLine(format, arguments, !_options.showsPrivate), {}});
+  } catch (...) {  // the line is lost; whoever wrote it has more important things to do than to handle that
+  }
+}
+
+void SystemLog::event(const LogFacility& facility, std::string_view name, std::string_view message) {
+  if (!_options.toJournal && !isEnabled(LogLevel::debug)) return;
+  _sink->send({facility, LogLevel::debug, message, name});
+}
+
+std::unique_ptr<SystemLog> makeLog(const LogOptions& options) {
+  std::unique_ptr<LogSink> sink;
+  if (options.toJournal)
+    sink = std::make_unique<JournalSink>();
+  else
+    sink = std::make_unique<StandardErrorSink>();
+  return std::make_unique<SystemLog>(options, std::move(sink));
+}
+
+}  // namespace nimbo
