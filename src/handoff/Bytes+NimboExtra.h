@@ -1,9 +1,9 @@
 #pragma once
 
-#include "platform/foundation/Boxed.h"
-
 #include <optional>
 #include <span>
+
+#include "platform/foundation/Boxed.h"
 
 namespace nimbo {
 

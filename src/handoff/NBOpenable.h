@@ -1,8 +1,8 @@
 #pragma once
 
-#include "platform/foundation/Error.h"
-
 #include <functional>
+
+#include "platform/foundation/Error.h"
 
 namespace nimbo {
 

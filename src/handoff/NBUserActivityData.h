@@ -1,11 +1,11 @@
 #pragma once
 
-#include "handoff/NBOpenable.h"
-#include "platform/HostApplication.h"
-
 #include <memory>
 #include <optional>
 #include <string>
+
+#include "handoff/NBOpenable.h"
+#include "platform/HostApplication.h"
 
 namespace nimbo {
 

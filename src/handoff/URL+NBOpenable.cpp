@@ -22,8 +22,6 @@ bool NBURLOpenable::isEqual(const Object* other) const {
   return openable && openable->_url == _url;
 }
 
-std::uint64_t NBURLOpenable::hash() const {
-  return hashOfBytes(_url.absoluteString());
-}
+std::uint64_t NBURLOpenable::hash() const { return hashOfBytes(_url.absoluteString()); }
 
 }  // namespace nimbo

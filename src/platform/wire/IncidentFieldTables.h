@@ -1,0 +1,59 @@
+#pragma once
+
+#include "platform/wire/FieldTable.h"
+#include "platform/wire/StoredTransitIncident.h"
+
+// Incidents as messages. The numbers are part of the hand-off and of saved states: they never change.
+namespace nimbo {
+
+struct AffectedEntityFields {
+  std::uint64_t muid = 0;
+  std::optional<std::vector<std::uint64_t>> nextStopIDs;
+};
+
+template <>
+struct RecordTable<AffectedEntityFields> {
+  static constexpr std::tuple fields{Field{1, "muid", &AffectedEntityFields::muid},
+                                     Field{2, "nextStopIDs", &AffectedEntityFields::nextStopIDs}};
+};
+
+template <>
+struct WireObject<TransitIncidentAffectedEntity> {
+  static AffectedEntityFields fields(const TransitIncidentAffectedEntity& entity) {
+    return {entity.muid(), entity.nextStopIDs()};
+  }
+  static std::shared_ptr<const TransitIncidentAffectedEntity> make(AffectedEntityFields&& fields);
+};
+
+template <>
+struct RecordTable<BasicTransitIncident::Fields> {
+  using Fields = BasicTransitIncident::Fields;
+  static constexpr std::tuple fields{Field{1, "muid", &Fields::muid},
+                                     Field{2, "title", &Fields::title},
+                                     Field{3, "summary", &Fields::summary},
+                                     Field{4, "fullDescription", &Fields::fullDescription},
+                                     Field{5, "messageForRoutePlanning", &Fields::messageForRoutePlanning},
+                                     Field{6, "messageForRouteStepping", &Fields::messageForRouteStepping},
+                                     Field{7, "messageForNonRoutable", &Fields::messageForNonRoutable},
+                                     Field{8, "startDate", &Fields::startDate},
+                                     Field{9, "endDate", &Fields::endDate},
+                                     Field{10, "creationDate", &Fields::creationDate},
+                                     Field{11, "lastUpdated", &Fields::lastUpdated},
+                                     Field{12, "iconType", &Fields::iconType},
+                                     Field{13, "isBlockingIncident", &Fields::isBlockingIncident},
+                                     Field{14, "affectedEntities", &Fields::affectedEntities},
+                                     Field{15, "linkURL", &Fields::linkURL}};
+};
+
+/// Only for incidents that are `StoredTransitIncident`s.
+template <>
+struct WireObject<TransitIncident> {
+  static const BasicTransitIncident::Fields& fields(const TransitIncident& incident) {
+    return static_cast<const StoredTransitIncident&>(incident).fields();
+  }
+  static TransitIncidentRef make(BasicTransitIncident::Fields&& fields) {
+    return std::make_shared<const StoredTransitIncident>(std::move(fields));
+  }
+};
+
+}  // namespace nimbo

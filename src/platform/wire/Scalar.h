@@ -1,0 +1,44 @@
+#pragma once
+
+#include <cstdint>
+#include <span>
+#include <string>
+#include <string_view>
+
+namespace nimbo {
+
+/// A number or boolean of a record, with its presence. Clearing the presence leaves the value.
+template <class T>
+struct Scalar {
+  T value{};
+  bool isPresent = false;
+
+  void set(T newValue) {
+    value = newValue;
+    isPresent = true;
+  }
+};
+
+/// The name of an enumeration's value, or "(unknown: VALUE)".
+inline std::string nameOfValue(std::span<const std::string_view> names, std::int32_t value) {
+  if (value >= 0 && static_cast<std::size_t>(value) < names.size())
+    return std::string(names[static_cast<std::size_t>(value)]);
+  return "(unknown: " + std::to_string(value) + ")";
+}
+
+/// The value of an enumeration's name; 0 for a text that is none.
+inline std::int32_t valueOfName(std::span<const std::string_view> names, std::string_view name) {
+  for (std::size_t value = 0; value < names.size(); ++value)
+    if (names[value] == name) return static_cast<std::int32_t>(value);
+  return 0;
+}
+
+/// An enumeration field: any 32-bit value is kept; `Names` holds the names of the values from 0 on.
+template <const auto& Names>
+struct NamedScalar : Scalar<std::int32_t> {
+  /// 0 when absent.
+  std::int32_t valueOrZero() const { return isPresent ? value : 0; }
+  std::string name() const { return nameOfValue(Names, value); }
+};
+
+}  // namespace nimbo

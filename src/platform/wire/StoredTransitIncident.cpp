@@ -1,0 +1,66 @@
+#include "platform/wire/StoredTransitIncident.h"
+
+#include "platform/wire/IncidentFieldTables.h"
+#include "platform/wire/RecordArchiving.h"
+#include "platform/wire/RecordImplementation.h"
+
+namespace nimbo {
+
+namespace {
+
+class StoredAffectedEntity final : public TransitIncidentAffectedEntity {
+ public:
+  explicit StoredAffectedEntity(AffectedEntityFields fields) : _fields(std::move(fields)) {}
+  std::uint64_t muid() const override { return _fields.muid; }
+  bool hasNextStopIDs() const override { return _fields.nextStopIDs.has_value(); }
+  std::optional<std::vector<std::uint64_t>> nextStopIDs() const override { return _fields.nextStopIDs; }
+  std::string_view className() const override { return "StoredAffectedEntity"; }
+
+ private:
+  AffectedEntityFields _fields;
+};
+
+}  // namespace
+
+std::shared_ptr<const TransitIncidentAffectedEntity> WireObject<TransitIncidentAffectedEntity>::make(
+    AffectedEntityFields&& fields) {
+  return std::make_shared<const StoredAffectedEntity>(std::move(fields));
+}
+
+template class Record<StoredTransitIncident, BasicTransitIncident::Fields, TransitIncident>;
+
+std::shared_ptr<const StoredTransitIncident> StoredTransitIncident::initWithIncident(
+    const TransitIncidentRef& incident) {
+  if (!incident) return nullptr;
+  if (auto stored = std::dynamic_pointer_cast<const StoredTransitIncident>(incident)) return stored;
+  BasicTransitIncident::Fields fields;
+  fields.muid = incident->muid();
+  fields.title = incident->title();
+  fields.summary = incident->summary();
+  fields.fullDescription = incident->fullDescription();
+  fields.messageForRoutePlanning = incident->messageForRoutePlanning();
+  fields.messageForRouteStepping = incident->messageForRouteStepping();
+  fields.messageForNonRoutable = incident->messageForNonRoutable();
+  fields.startDate = incident->startDate();
+  fields.endDate = incident->endDate();
+  fields.creationDate = incident->creationDate();
+  fields.lastUpdated = incident->lastUpdated();
+  fields.iconType = incident->iconType();
+  fields.isBlockingIncident = incident->isBlockingIncident();
+  fields.affectedEntities = incident->affectedEntities();
+  fields.linkURL = incident->linkURL();
+  return std::make_shared<const StoredTransitIncident>(std::move(fields));
+}
+
+const ArchivableClass& StoredTransitIncident::archivedClass() {
+  static constexpr ArchivableClass archived{"StoredTransitIncident", decodeRecord<StoredTransitIncident>};
+  return archived;
+}
+
+void StoredTransitIncident::encodeWithCoder(KeyedEncoder& coder) const { encodeRecord(*this, coder); }
+
+std::string StoredTransitIncident::description() const {
+  return "<StoredTransitIncident: " + std::to_string(muid()) + " " + title().value_or("(no title)") + ">";
+}
+
+}  // namespace nimbo

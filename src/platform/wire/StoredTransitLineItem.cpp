@@ -1,0 +1,76 @@
+#include "platform/wire/StoredTransitLineItem.h"
+
+#include "platform/wire/IncidentFieldTables.h"
+#include "platform/wire/RecordArchiving.h"
+#include "platform/wire/RecordImplementation.h"
+#include "platform/wire/TransitFieldTables.h"
+
+namespace nimbo {
+
+template <>
+struct RecordTable<StoredTransitLineItemFields> {
+  using Fields = StoredTransitLineItemFields;
+  static constexpr std::tuple fields{Field{1, "identifier", &Fields::identifier},
+                                     Field{2, "name", &Fields::name},
+                                     Field{3, "system", &Fields::system},
+                                     Field{4, "artwork", &Fields::artwork},
+                                     Field{5, "modeArtwork", &Fields::modeArtwork},
+                                     Field{6, "alternateArtwork", &Fields::alternateArtwork},
+                                     Field{7, "lineColorString", &Fields::lineColorString},
+                                     Field{8, "isBus", &Fields::isBus},
+                                     Field{9, "departureTimeDisplayStyle", &Fields::departureTimeDisplayStyle},
+                                     Field{10, "departuresAreVehicleSpecific", &Fields::departuresAreVehicleSpecific},
+                                     Field{11, "showVehicleNumber", &Fields::showVehicleNumber},
+                                     Field{12, "hasEncyclopedicInfo", &Fields::hasEncyclopedicInfo},
+                                     Field{13, "isIncidentsTTLExpired", &Fields::isIncidentsTTLExpired},
+                                     Field{14, "hasIncidentComponent", &Fields::hasIncidentComponent},
+                                     Field{15, "incidents", &Fields::incidents}};
+};
+
+template class Record<StoredTransitLineItem, StoredTransitLineItemFields, TransitLineItem>;
+
+std::shared_ptr<StoredTransitLineItem> StoredTransitLineItem::initWithLineItem(const TransitLineItemRef& lineItem) {
+  if (!lineItem) return nullptr;
+  StoredTransitLineItemFields fields;
+  fields.identifier = lineItem->identifier();
+  fields.name = lineItem->name();
+  fields.system = lineItem->system();
+  fields.artwork = lineItem->artwork();
+  fields.modeArtwork = lineItem->modeArtwork();
+  fields.alternateArtwork = lineItem->alternateArtwork();
+  fields.lineColorString = lineItem->lineColorString();
+  fields.isBus = lineItem->isBus();
+  fields.departureTimeDisplayStyle = lineItem->departureTimeDisplayStyle();
+  fields.departuresAreVehicleSpecific = lineItem->departuresAreVehicleSpecific();
+  fields.showVehicleNumber = lineItem->showVehicleNumber();
+  fields.hasEncyclopedicInfo = lineItem->hasEncyclopedicInfo();
+  fields.isIncidentsTTLExpired = lineItem->isIncidentsTTLExpired();
+  if (!lineItem->hasIncidentComponent()) fields.hasIncidentComponent.set(false);
+  fields.incidents.reserve(lineItem->incidents().size());
+  for (const TransitIncidentRef& incident : lineItem->incidents())
+    if (incident) fields.incidents.push_back(StoredTransitIncident::initWithIncident(incident));
+  return std::make_shared<StoredTransitLineItem>(std::move(fields));
+}
+
+const MapItemIdentifierRef& StoredTransitLineItem::identifier() const {
+  static const auto none = std::make_shared<const MapItemIdentifier>(0);
+  return _fields.identifier ? _fields.identifier : none;
+}
+
+const ObjectRef& StoredTransitLineItem::operatingHours() const {
+  static const ObjectRef absent;
+  return absent;
+}
+
+const ArchivableClass& StoredTransitLineItem::archivedClass() {
+  static constexpr ArchivableClass archived{"StoredTransitLineItem", decodeRecord<StoredTransitLineItem>};
+  return archived;
+}
+
+void StoredTransitLineItem::encodeWithCoder(KeyedEncoder& coder) const { encodeRecord(*this, coder); }
+
+std::string StoredTransitLineItem::description() const {
+  return "<StoredTransitLineItem: " + std::to_string(muid()) + " " + name().value_or("(no name)") + ">";
+}
+
+}  // namespace nimbo

@@ -1,0 +1,119 @@
+#pragma once
+
+#include "platform/transit/MapItemIdentifier.h"
+#include "platform/transit/TransitSystem.h"
+#include "platform/wire/FieldTable.h"
+
+// The transit values as messages. The numbers are part of the hand-off and of saved states: they never change.
+namespace nimbo {
+
+template <>
+struct RecordTable<TransitShield> {
+  static constexpr std::tuple fields{Field{1, "shieldType", &TransitShield::shieldType},
+                                     Field{2, "shieldText", &TransitShield::shieldText},
+                                     Field{3, "shieldColorString", &TransitShield::shieldColorString},
+                                     Field{4, "shieldTextColorString", &TransitShield::shieldTextColorString}};
+};
+
+template <>
+struct RecordTable<TransitIcon> {
+  static constexpr std::tuple fields{Field{1, "iconType", &TransitIcon::iconType},
+                                     Field{2, "cartoID", &TransitIcon::cartoID},
+                                     Field{3, "defaultTransitType", &TransitIcon::defaultTransitType},
+                                     Field{4, "iconAttributeKey", &TransitIcon::iconAttributeKey},
+                                     Field{5, "iconAttributeValue", &TransitIcon::iconAttributeValue}};
+};
+
+template <>
+struct RecordTable<ServerFormatToken> {
+  static constexpr std::tuple fields{Field{1, "name", &ServerFormatToken::name},
+                                     Field{2, "value", &ServerFormatToken::value}};
+};
+
+template <>
+struct RecordTable<ServerFormattedString> {
+  static constexpr std::tuple fields{Field{1, "formatStrings", &ServerFormattedString::formatStrings},
+                                     Field{2, "separators", &ServerFormattedString::separators},
+                                     Field{3, "formatTokens", &ServerFormattedString::formatTokens},
+                                     Field{4, "alternativeString", &ServerFormattedString::alternativeString}};
+};
+
+template <>
+struct RecordTable<TransitArtworkText> {
+  static constexpr std::tuple fields{Field{1, "text", &TransitArtworkText::text}};
+};
+
+template <>
+struct RecordTable<TransitArtwork::Fields> {
+  using Fields = TransitArtwork::Fields;
+  static constexpr std::tuple fields{Field{1, "artworkSourceType", &Fields::artworkSourceType},
+                                     Field{2, "artworkUseType", &Fields::artworkUseType},
+                                     Field{3, "shieldDataSource", &Fields::shieldDataSource},
+                                     Field{4, "iconDataSource", &Fields::iconDataSource},
+                                     Field{5, "iconFallbackShieldDataSource", &Fields::iconFallbackShieldDataSource},
+                                     Field{6, "textDataSource", &Fields::textDataSource},
+                                     Field{7, "hasRoutingIncidentBadge", &Fields::hasRoutingIncidentBadge},
+                                     Field{8, "accessibilityText", &Fields::accessibilityText}};
+};
+
+template <>
+struct WireObject<TransitArtwork> {
+  static const TransitArtwork::Fields& fields(const TransitArtwork& artwork) { return artwork.fields(); }
+  static TransitArtworkRef make(TransitArtwork::Fields&& fields) {
+    return std::make_shared<const TransitArtwork>(std::move(fields));
+  }
+};
+
+struct TransitSystemFields {
+  std::uint64_t muid = 0;
+  std::optional<std::string> name;
+  TransitArtworkRef artwork;
+};
+
+template <>
+struct RecordTable<TransitSystemFields> {
+  static constexpr std::tuple fields{Field{1, "muid", &TransitSystemFields::muid},
+                                     Field{2, "name", &TransitSystemFields::name},
+                                     Field{3, "artwork", &TransitSystemFields::artwork}};
+};
+
+template <>
+struct WireObject<TransitSystem> {
+  static TransitSystemFields fields(const TransitSystem& system) {
+    return {system.muid(), system.name(), system.artwork()};
+  }
+  static TransitSystemRef make(TransitSystemFields&& fields) {
+    return std::make_shared<const TransitSystem>(fields.muid, std::move(fields.name), std::move(fields.artwork));
+  }
+};
+
+template <>
+struct RecordTable<TransitLineLocator> {
+  static constexpr std::tuple fields{
+      Field{1, "feed", &TransitLineLocator::feed}, Field{2, "agencyID", &TransitLineLocator::agencyID},
+      Field{3, "routeID", &TransitLineLocator::routeID}, Field{4, "shortName", &TransitLineLocator::shortName},
+      Field{5, "mode", &TransitLineLocator::mode}};
+};
+
+struct MapItemIdentifierFields {
+  std::uint64_t muid = 0;
+  std::optional<TransitLineLocator> locator;
+};
+
+template <>
+struct RecordTable<MapItemIdentifierFields> {
+  static constexpr std::tuple fields{Field{1, "muid", &MapItemIdentifierFields::muid},
+                                     Field{2, "locator", &MapItemIdentifierFields::locator}};
+};
+
+template <>
+struct WireObject<MapItemIdentifier> {
+  static MapItemIdentifierFields fields(const MapItemIdentifier& identifier) {
+    return {identifier.muid(), identifier.locator()};
+  }
+  static MapItemIdentifierRef make(MapItemIdentifierFields&& fields) {
+    return std::make_shared<const MapItemIdentifier>(fields.muid, std::move(fields.locator));
+  }
+};
+
+}  // namespace nimbo
