@@ -23,6 +23,10 @@ class VirtualTime::VirtualTimer final : public Timer, public std::enable_shared_
 
   Date date() const { return _date; }
 
+  void wallClockWasSet(TimeInterval difference) {
+    if (_repeats) _date = dateByAdding(_date, difference);
+  }
+
   void fire() {
     const auto keep = shared_from_this();
     const auto callback = _fire;
@@ -53,6 +57,11 @@ Date VirtualTime::now() const {
 }
 
 void VirtualTime::setNow(Date date) {
+  for (const auto& timer : _timers) timer->wallClockWasSet(intervalBetween(now(), date));
+  moveTo(date);
+}
+
+void VirtualTime::moveTo(Date date) {
   const std::lock_guard guard(_lock);
   _now = date;
 }
@@ -74,10 +83,11 @@ void VirtualTime::advance(TimeInterval seconds) {
   for (;;) {
     const auto next = std::min_element(_timers.begin(), _timers.end(), earlier);
     if (next == _timers.end() || (*next)->date() > end) break;
-    setNow(std::max(now(), (*next)->date()));
+    // No real timer fires at the very moment that it waits for: what lasts until then is over when it fires.
+    moveTo(std::max(now(), dateByAdding((*next)->date(), 1e-6)));
     (*next)->fire();
   }
-  setNow(end);
+  moveTo(std::max(now(), end));
 }
 
 }  // namespace nimbo

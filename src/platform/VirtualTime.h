@@ -21,10 +21,11 @@ class VirtualTime final : public Clock {
   std::shared_ptr<Timer> scheduleTimer(TimeInterval interval, bool repeats, std::function<void(Timer&)> fire);
 
   /// Moves the clock by `seconds` (not negative), stopping at each timer that falls due: timers fire in the order of
-  /// their dates, equal dates in the order of scheduling, each with the clock at its own date.
+  /// their dates, equal dates in the order of scheduling, each with the clock a microsecond past its own date.
   void advance(TimeInterval seconds);
 
-  /// Sets the wall clock without time passing: nothing fires, and one-shot timers keep the dates they were set for.
+  /// Sets the wall clock without time passing: nothing fires, one-shot timers keep the dates they were set for, and
+  /// repeating ones the time that they still have to wait.
   void setNow(Date date);
 
   /// Timers that are still to fire.
@@ -32,6 +33,8 @@ class VirtualTime final : public Clock {
 
  private:
   class VirtualTimer;
+  void moveTo(Date date);
+
   mutable std::mutex _lock;
   Date _now;
   std::vector<std::shared_ptr<VirtualTimer>> _timers;  // in the order of scheduling
