@@ -139,7 +139,7 @@ json snapshotJSON(NBTransitIncidentsViewController& controller) {
   const Size preferred = controller.preferredContentSize();
 
   json rows = json::array();
-  for (std::int64_t row = 0; row < controller.tableView()->numberOfRowsInSection(0); ++row)
+  for (std::int64_t row = 0; row < controller.tableView()->numberOfRows(); ++row)
     rows.push_back(rowJSON(controller, {0, row}));
 
   json expandedItems = json::array();

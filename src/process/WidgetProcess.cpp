@@ -202,7 +202,7 @@ json WidgetProcess::setTextSize(const Parameters& params) {
 
 IndexPath WidgetProcess::existingRow(const Parameters& params) const {
   const IndexPath indexPath = params.indexPath();
-  if (indexPath.section != 0 || indexPath.row >= _controller->tableView()->numberOfRowsInSection(0))
+  if (indexPath.section != 0 || indexPath.row >= _controller->tableView()->numberOfRows())
     throw JSONRPCFailure(JSONRPCError::kInvalidParams, "there is no row " + std::to_string(indexPath.row) +
                                                            " in section " + std::to_string(indexPath.section));
   return indexPath;
@@ -215,7 +215,10 @@ json WidgetProcess::selectRow(const Parameters& params) {
 json WidgetProcess::highlightRow(const Parameters& params) {
   const IndexPath indexPath = existingRow(params);
   const bool highlighted = params.has("highlighted") ? params.flag("highlighted") : true;
-  return {{"highlighted", _controller->tableView()->setRowHighlighted(indexPath, highlighted)}};
+  TableView& tableView = *_controller->tableView();
+  if (highlighted) tableView.highlightRowAtIndexPath(indexPath);
+  else if (tableView.highlightedRow() == indexPath) tableView.highlightRowAtIndexPath(std::nullopt);
+  return {{"highlighted", tableView.highlightedRow() == indexPath}};
 }
 
 json WidgetProcess::snapshot(const Parameters&) { return snapshotJSON(*_controller); }

@@ -1,0 +1,71 @@
+#include "desktop/DesktopPlatform.h"
+
+#include <cstdlib>
+
+#include "desktop/drawing/CairoShieldRenderer.h"
+
+namespace nimbo {
+
+namespace {
+
+constexpr LogFacility kLog{kDefaultLogSubsystem, "DesktopPlatform"};
+
+std::unique_ptr<SystemLog> makeLogInto(std::unique_ptr<LogSink> sink) {
+  const LogOptions options = LogOptions::fromEnvironment();
+  return sink ? std::make_unique<SystemLog>(options, std::move(sink)) : makeLog(options);
+}
+
+/// Tells of a database that was set aside. May come from any thread.
+void logNotice(const ErrorRef& notice) { writeLog(kLog, LogLevel::error, "%@", {notice->reason()}); }
+
+}  // namespace
+
+std::string DesktopPlatform::localeOfEnvironment() {
+  for (const char* variable : {"LC_ALL", "LC_MESSAGES", "LANG"}) {
+    const char* value = std::getenv(variable);
+    if (!value || !*value) continue;
+    const std::string_view locale(value);
+    const std::string_view name = locale.substr(0, locale.find_first_of(".@"));
+    return name == "C" || name == "POSIX" ? "en" : std::string(name);
+  }
+  return "en";
+}
+
+DesktopPlatform::DesktopPlatform(Options options)
+    : _paths(std::move(options.paths)),
+      _locale(options.locale.empty() ? localeOfEnvironment() : std::move(options.locale)),
+      _clock(options.virtualTime ? static_cast<Clock&>(*options.virtualTime) : _systemClock),
+      _log(makeLogInto(std::move(options.logSink))),
+      _strings(_locale),
+      _database(std::make_shared<StateDatabase>(_paths.state, _clock, &logNotice)),
+      _sharedSettings(_database),
+      _analytics(_database),
+      _transitLines(_paths, _locale),
+      _favoritesEditor(_database, [this] { return _transitLines.firstFavorites(); }),
+      _favorites(_favoritesEditor, _transitLines),
+      _memoryPressure(options.runLoop),
+      _text(_locale),
+      _platform(std::make_unique<Platform>(
+          PlatformServices{.clock = _clock,
+                           .mainRunLoop = options.runLoop,
+                           .log = *_log,
+                           .signposts = *_log,
+                           .random = _random,
+                           .strings = _strings,
+                           .sharedSettings = _sharedSettings,
+                           .favorites = _favorites,
+                           .transitLines = _favorites,
+                           .network = _network,
+                           .memoryPressure = _memoryPressure,
+                           .activityLauncher = options.activityLauncher,
+                           .analytics = _analytics,
+                           .deviceLockState = _deviceLockState,
+                           .archive = _archive,
+                           .compressor = _compressor,
+                           .images = _images,
+                           .text = _text,
+                           .shieldRenderer = std::make_shared<CairoShieldRenderer>(_text)})) {}
+
+DesktopPlatform::~DesktopPlatform() = default;
+
+}  // namespace nimbo

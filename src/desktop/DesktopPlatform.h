@@ -1,0 +1,82 @@
+#pragma once
+
+#include <filesystem>
+#include <memory>
+#include <string>
+
+#include "desktop/archive/Bzip2.h"
+#include "desktop/archive/CBORKeyedArchive.h"
+#include "desktop/drawing/CairoImageResources.h"
+#include "desktop/drawing/PangoTextSystem.h"
+#include "desktop/gtfs/GTFSTransitLineService.h"
+#include "desktop/store/FavoritesEditor.h"
+#include "desktop/store/GuardedFavorites.h"
+#include "desktop/store/SQLiteAnalyticsPipeline.h"
+#include "desktop/store/SQLiteSharedSettings.h"
+#include "desktop/store/StateDatabase.h"
+#include "desktop/strings/ICUStringTables.h"
+#include "desktop/system/GLibRunLoop.h"
+#include "desktop/system/LinuxMemoryPressure.h"
+#include "desktop/system/LinuxNetworkFailureDiagnosis.h"
+#include "desktop/system/Paths.h"
+#include "desktop/system/SoftLinkedDeviceLockState.h"
+#include "desktop/system/SystemClock.h"
+#include "desktop/system/SystemLog.h"
+#include "desktop/system/SystemRandom.h"
+#include "platform/Platform.h"
+#include "platform/VirtualTime.h"
+
+namespace nimbo {
+
+/// The platform on Linux, in force while this lives: one real part behind each interface. The parts open what they
+/// need with their first use. Main thread.
+class DesktopPlatform {
+ public:
+  struct Options {
+    Paths paths;
+    /// BCP 47 tag or POSIX name; empty: the environment's.
+    std::string locale;
+    GLibRunLoop& runLoop;
+    /// The clock in place of the machine's, or null.
+    VirtualTime* virtualTime = nullptr;
+    ActivityLauncher& activityLauncher;
+    /// Where log lines go; null: to the journal or standard error.
+    std::unique_ptr<LogSink> logSink;
+  };
+
+  explicit DesktopPlatform(Options options);
+  ~DesktopPlatform();
+
+  const Paths& paths() const { return _paths; }
+  FavoritesEditor& favoritesEditor() { return _favoritesEditor; }
+  SQLiteAnalyticsPipeline& analytics() { return _analytics; }
+  GTFSTransitLineService& transitLines() { return _transitLines; }
+
+  /// The locale of LC_ALL, LC_MESSAGES or LANG, in this order; "en" when none is set or it is "C" or "POSIX".
+  static std::string localeOfEnvironment();
+
+ private:
+  Paths _paths;
+  std::string _locale;
+  SystemClock _systemClock;
+  Clock& _clock;
+  std::unique_ptr<SystemLog> _log;
+  SystemRandom _random;
+  ICUStringTables _strings;
+  std::shared_ptr<StateDatabase> _database;
+  SQLiteSharedSettings _sharedSettings;
+  SQLiteAnalyticsPipeline _analytics;
+  GTFSTransitLineService _transitLines;
+  FavoritesEditor _favoritesEditor;
+  GuardedFavorites _favorites;
+  LinuxNetworkFailureDiagnosis _network;
+  LinuxMemoryPressure _memoryPressure;
+  SoftLinkedDeviceLockState _deviceLockState;
+  CBORKeyedArchive _archive;
+  Bzip2Compressor _compressor;
+  CairoImageResources _images;
+  PangoTextSystem _text;
+  std::unique_ptr<Platform> _platform;
+};
+
+}  // namespace nimbo

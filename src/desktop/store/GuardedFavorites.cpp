@@ -1,0 +1,52 @@
+#include "desktop/store/GuardedFavorites.h"
+
+#include "platform/Platform.h"
+#include "platform/transit/BasicTransitLineItem.h"
+
+namespace nimbo {
+
+namespace {
+
+/// Number of the line that stands for favourites that cannot be read. Lines' numbers are hashes; 0 is none of them.
+constexpr std::uint64_t kUnreadableMuid = 0;
+
+}  // namespace
+
+class GuardedFavorites::Persister final : public FavoritesPersister {
+ public:
+  explicit Persister(std::shared_ptr<State> state) : _state(std::move(state)) {}
+
+  std::optional<Favorites> readFavorites() override {
+    Favorites favorites;
+    const ErrorRef failure = _state->editor.list(favorites);
+    {
+      const std::lock_guard guard(_state->lock);
+      _state->failure = failure;
+    }
+    if (!failure) return favorites;
+    const auto line = std::make_shared<const BasicTransitLineItem>(
+        BasicTransitLineItem::Fields{.identifier = std::make_shared<const MapItemIdentifier>(kUnreadableMuid)});
+    return Favorites{std::make_shared<const FavoriteTransitLine>(line)};
+  }
+
+ private:
+  std::shared_ptr<State> _state;
+};
+
+GuardedFavorites::GuardedFavorites(FavoritesEditor editor, TransitLineService& service)
+    : _state(std::make_shared<State>(std::move(editor))), _service(service) {}
+
+std::shared_ptr<FavoritesPersister> GuardedFavorites::remotePersister() { return std::make_shared<Persister>(_state); }
+
+void GuardedFavorites::lookup(const std::vector<MapItemIdentifierRef>& identifiers, Handler handler) {
+  const bool unreadable = identifiers.size() == 1 && identifiers.front()->muid() == kUnreadableMuid;
+  if (!unreadable) return _service.lookup(identifiers, std::move(handler));
+  ErrorRef failure;
+  {
+    const std::lock_guard guard(_state->lock);
+    failure = _state->failure;
+  }
+  Platform::current().mainRunLoop().dispatchAsync([failure, handler = std::move(handler)] { handler({}, failure); });
+}
+
+}  // namespace nimbo

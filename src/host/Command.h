@@ -1,0 +1,31 @@
+#pragma once
+
+#include <optional>
+#include <stdexcept>
+#include <string>
+#include <vector>
+
+#include "desktop/system/GLibRunLoop.h"
+#include "desktop/system/Paths.h"
+
+namespace nimbo {
+
+/// What every command of the command line has at hand.
+struct CommandContext {
+  GLibRunLoop& runLoop;
+  Paths paths;
+  /// Arguments that give the widget process the same folders.
+  std::vector<std::string> widgetArguments;
+};
+
+/// Ends a command: the message says what failed, where, and what to do.
+struct CommandFailure : std::runtime_error {
+  using std::runtime_error::runtime_error;
+};
+
+/// Exit statuses of the programs.
+inline constexpr int kExitSuccess = 0;
+inline constexpr int kExitFailure = 1;
+inline constexpr int kExitUsage = 2;
+
+}  // namespace nimbo

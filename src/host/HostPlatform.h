@@ -1,0 +1,28 @@
+#pragma once
+
+#include "desktop/DesktopPlatform.h"
+#include "host/Command.h"
+
+namespace nimbo {
+
+/// The platform of a command that works without a widget process: on feeds, favourites and settings. In force while
+/// it lives. A command line opens no activities.
+class HostPlatform final : private ActivityLauncher {
+ public:
+  explicit HostPlatform(const CommandContext& context)
+      : _platform({.paths = context.paths, .locale = {}, .runLoop = context.runLoop, .activityLauncher = *this}) {}
+
+  DesktopPlatform* operator->() { return &_platform; }
+
+ private:
+  std::shared_ptr<UserActivity> createUserActivity(const std::string&) override { return nullptr; }
+  BundleRecordRef bundleRecordOfCurrentProcess() override { return nullptr; }
+  void openUserActivity(const std::shared_ptr<const UserActivity>&, const ApplicationRecordRef&, bool,
+                        Completion completion) override {
+    if (completion) completion(false, nullptr);
+  }
+
+  DesktopPlatform _platform;
+};
+
+}  // namespace nimbo

@@ -1,0 +1,53 @@
+#include "host/OnScreenWidget.h"
+
+#include "platform/HostApplication.h"
+
+namespace nimbo {
+
+using nlohmann::json;
+
+namespace {
+
+std::vector<std::string> arguments(const CommandContext& context, const WidgetPresentation& presentation) {
+  std::vector<std::string> result = context.widgetArguments;
+  if (presentation.virtualTime) result.insert(result.end(), {"--virtual-time", *presentation.virtualTime});
+  return result;
+}
+
+}  // namespace
+
+OnScreenWidget::OnScreenWidget(const CommandContext& context, const WidgetPresentation& presentation)
+    : _client(context.runLoop, arguments(context, presentation)) {
+  const std::string application(kHostApplicationIdentifier);
+  json params = {{"textSize", presentation.textSize},
+                 {"scale", presentation.scale},
+                 {"appearance", presentation.appearance},
+                 {"displayModes",
+                  {{"compact", {presentation.width, presentation.compactHeight}},
+                   {"expanded", {presentation.width, presentation.expandedHeight}}}},
+                 {"activeDisplayMode", "compact"},
+                 {"bundle",
+                  {{"kind", "extension"},
+                   {"identifier", application + ".TransitWidget"},
+                   {"containing", {{"kind", "application"}, {"identifier", application}}}}}};
+  if (presentation.locale) params["locale"] = *presentation.locale;
+  _client.call("initialize", params);
+  for (const char* step : {"loadView", "viewWillAppear", "viewDidAppear"}) _client.call(step);
+}
+
+std::optional<std::string> OnScreenWidget::update() {
+  const json answer = _client.call("performUpdate");
+  if (answer.value("updateResult", "") != "failed") return std::nullopt;
+  return answer.value("reason", "the update failed");
+}
+
+void OnScreenWidget::expand() {
+  if (_client.call("snapshot").value("largestAvailableDisplayMode", "") == "expanded")
+    _client.call("setActiveDisplayMode", {{"mode", "expanded"}});
+}
+
+void OnScreenWidget::close() {
+  for (const char* step : {"viewWillDisappear", "viewDidDisappear", "shutdown"}) _client.call(step);
+}
+
+}  // namespace nimbo

@@ -1,0 +1,45 @@
+#pragma once
+
+#include <nlohmann/json.hpp>
+#include <optional>
+#include <string>
+
+#include "host/Command.h"
+#include "host/WidgetClient.h"
+
+namespace nimbo {
+
+/// How a host shows the widget. The names are those of docs/protocol.md.
+struct WidgetPresentation {
+  double width = kDefaultWidth;                   ///< points
+  double compactHeight = kDefaultRowHeight;       ///< points
+  double expandedHeight = 4 * kDefaultRowHeight;  ///< points: room for four rows
+  double scale = 1;
+  std::string textSize = "large";
+  std::string appearance = "light";
+  std::optional<std::string> locale;           ///< absent: of the environment
+  std::optional<std::string> virtualTime;      ///< ISO date at which the widget's time stands still
+
+  static constexpr double kDefaultWidth = 359;
+  static constexpr double kDefaultRowHeight = 110;
+};
+
+/// A widget process that is on the screen as long as this lives: it appears on construction, disappears, and so saves
+/// its rows, on `close`. Operations throw WidgetClientFailure.
+class OnScreenWidget {
+ public:
+  OnScreenWidget(const CommandContext& context, const WidgetPresentation& presentation);
+
+  /// Waits for the fetch that runs. Absent when it succeeded, else why it failed.
+  std::optional<std::string> update();
+  /// Switches to the expanded mode where the widget offers it; else the compact row says it all.
+  void expand();
+  nlohmann::json snapshot() { return _client.call("snapshot"); }
+  void render(const std::string& path) { _client.call("render", {{"path", path}}); }
+  void close();
+
+ private:
+  WidgetClient _client;
+};
+
+}  // namespace nimbo

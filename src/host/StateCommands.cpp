@@ -1,0 +1,106 @@
+#include "host/StateCommands.h"
+
+#include <cerrno>
+#include <cstring>
+#include <fstream>
+#include <iostream>
+#include <iterator>
+
+#include "desktop/archive/HandoffDecoder.h"
+#include "desktop/rpc/Base64.h"
+#include "host/HostPlatform.h"
+#include "host/TerminalText.h"
+
+namespace nimbo {
+
+namespace {
+
+std::string textOfSetting(const SharedSettingsStore::Value& value) {
+  if (const bool* flag = std::get_if<bool>(&value)) return *flag ? "true" : "false";
+  if (const std::string* text = std::get_if<std::string>(&value)) return printableText(*text);
+  return base64(std::get<Bytes>(value));
+}
+
+SharedSettingsStore::Value settingOfText(const std::string& text) {
+  if (text == "true" || text == "YES") return true;
+  if (text == "false" || text == "NO") return false;
+  return text;
+}
+
+void require(const ErrorRef& error) {
+  if (error) throw CommandFailure(error->reason());
+}
+
+std::string textOfAction(const AnalyticsUserAction& action) {
+  std::string text = "action " + std::to_string(action.action) + ", target " + std::to_string(action.target);
+  return action.value ? text + ", value " + printableText(*action.value) : text;
+}
+
+std::string textOfInteraction(const AnalyticsWidgetInteraction& interaction) {
+  const TransitWidgetAnalyticsRecord& record = interaction.record;
+  std::string text = std::string("session, ended by ") + (interaction.endState == 1 ? "opening a row" : "disappearing") +
+                     " after " + std::to_string(static_cast<long>(interaction.duration)) + " s";
+  if (interaction.wasLocked) text += ", locked";
+  if (record.everExpanded) text += record.initiallyExpanded ? ", expanded from the start" : ", expanded";
+  if (record.tappedItemIndex) text += ", row " + std::to_string(*record.tappedItemIndex);
+  text += ", message type " + std::to_string(record.transitMessageType);
+  for (const auto& item : record.incidentItems)
+    text += "\n  line " + item.transitLineMuid + ": " + printableText(item.transitIncidentTitle);
+  return text;
+}
+
+}  // namespace
+
+int runSettingsGet(const CommandContext& context, const std::string& key) {
+  HostPlatform platform(context);
+  const auto value = Platform::current().sharedSettings().groupStore()->valueForKey(key);
+  if (!value) throw CommandFailure("the setting " + key + " is not set");
+  std::cout << textOfSetting(*value) << "\n";
+  return kExitSuccess;
+}
+
+int runSettingsSet(const CommandContext& context, const std::string& key, const std::string& value) {
+  HostPlatform platform(context);
+  require(Platform::current().sharedSettings().groupStore()->setValue_forKey(settingOfText(value), key));
+  return kExitSuccess;
+}
+
+int runSettingsUnset(const CommandContext& context, const std::string& key) {
+  HostPlatform platform(context);
+  require(Platform::current().sharedSettings().groupStore()->removeValueForKey(key));
+  return kExitSuccess;
+}
+
+int runAnalytics(const CommandContext& context, bool json) {
+  HostPlatform platform(context);
+  std::vector<AnalyticsEntry> entries;
+  require(platform->analytics().list(entries));
+  for (const AnalyticsEntry& entry : entries) {
+    if (json) {
+      std::cout << jsonOfAnalyticsEntry(entry) << "\n";
+      continue;
+    }
+    std::cout << isoTextOfDate(entry.date) << "  ";
+    if (const auto* action = std::get_if<AnalyticsUserAction>(&entry.content)) std::cout << textOfAction(*action);
+    else std::cout << textOfInteraction(std::get<AnalyticsWidgetInteraction>(entry.content));
+    std::cout << "\n";
+  }
+  return kExitSuccess;
+}
+
+int runDecode(const std::string& file) {
+  std::ifstream opened;
+  if (file != "-") {
+    opened.open(file, std::ios::binary);
+    if (!opened) throw CommandFailure("cannot read " + file + ": " + std::strerror(errno));
+  }
+  std::istream& input = file == "-" ? std::cin : opened;
+  const Bytes bytes{std::istreambuf_iterator<char>(input), std::istreambuf_iterator<char>()};
+  if (input.bad()) throw CommandFailure("cannot read " + file + ": " + std::strerror(errno));
+  const HandoffDecoded decoded = decodeHandoff(bytes);
+  if (decoded.error) throw CommandFailure(file + ": " + decoded.error->reason());
+  std::cout << decoded.json << "\n";
+  return kExitSuccess;
+}
+
+}  // namespace nimbo

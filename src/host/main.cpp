@@ -1,0 +1,174 @@
+// nimbo-transit: the widget in a terminal, and what it needs set up.
+
+#include <CLI/CLI.hpp>
+#include <csignal>
+#include <iostream>
+
+#include "host/FavoriteCommands.h"
+#include "host/FeedCommands.h"
+#include "host/StateCommands.h"
+#include "host/WidgetCommands.h"
+
+namespace nimbo {
+namespace {
+
+/// The command line's words. What the user chose is called once everything is parsed.
+class CommandLine {
+ public:
+  CommandLine();
+  int run(int argc, char** argv);
+
+ private:
+  using Action = std::function<int(const CommandContext&)>;
+  CLI::App* add(CLI::App& parent, const std::string& name, const std::string& description, Action action);
+  void addWidgetCommands();
+  void addFeedCommands();
+  void addFavoriteCommands();
+  void addStateCommands();
+
+  CLI::App _app{"How your transit lines run: shows their incidents, and sets up feeds and favourite lines."};
+  std::optional<std::filesystem::path> _config, _state;
+  Action _chosen;
+
+  StatusOptions _status;
+  RenderOptions _render;
+  FeedOptions _feed;
+  std::optional<std::string> _virtualTime;
+  std::string _file, _text, _key, _value;
+  std::vector<std::string> _lines;
+  std::size_t _position = 1;
+  bool _json = false;
+};
+
+/// An option's text that must be an ISO date.
+std::string checkDate(const std::string& text) {
+  return dateFromISOText(text) ? "" : "\"" + text + "\" is no ISO date such as 2026-01-05T12:00:00Z";
+}
+
+CommandLine::CommandLine() {
+  _app.require_subcommand(1);
+  _app.set_version_flag("--version", NIMBO_VERSION);
+  _app.add_option("--config", _config, "Folder of feeds.json (default: $XDG_CONFIG_HOME/nimbo-transit)");
+  _app.add_option("--state", _state, "Folder of favourites and last rows (default: $XDG_STATE_HOME/nimbo-transit)");
+  _app.fallthrough();
+  addWidgetCommands();
+  addFeedCommands();
+  addFavoriteCommands();
+  addStateCommands();
+}
+
+CLI::App* CommandLine::add(CLI::App& parent, const std::string& name, const std::string& description, Action action) {
+  CLI::App* command = parent.add_subcommand(name, description);
+  command->callback([this, action = std::move(action)] { _chosen = action; });
+  return command;
+}
+
+void CommandLine::addWidgetCommands() {
+  CLI::App* status = add(_app, "status", "Show how the favourite lines run",
+                         [this](const CommandContext& context) { return runStatus(context, _status); });
+  status->add_flag("--expanded", _status.expanded, "One row for each incident instead of one for all");
+  status->add_flag("--json", _status.json, "The widget's snapshot as JSON");
+  status->add_option("--now", _status.now, "ISO date by which incidents are judged")->check(checkDate);
+
+  CLI::App* render = add(_app, "render", "Draw the rows into a PNG file",
+                         [this](const CommandContext& context) { return runRender(context, _render); });
+  render->add_flag("--expanded", _render.expanded, "One row for each incident instead of one for all");
+  render->add_option("--size", _render.size, "Most room in points, as WIDTHxHEIGHT");
+  render->add_option("--scale", _render.scale, "Device pixels for each point")->capture_default_str();
+  render->add_option("--text-size", _render.textSize, "extraSmall to accessibilityExtraExtraExtraLarge")
+      ->capture_default_str();
+  render->add_flag("--dark", _render.dark, "In the dark appearance");
+  render->add_option("--locale", _render.locale, "Language of the texts, such as de or ar-EG");
+  render->add_option("--now", _render.now, "ISO date by which incidents are judged")->check(checkDate);
+  render->add_option("OUT", _render.output, "PNG file to write")->required();
+
+  CLI::App* script = add(_app, "script", "Play a file of host events to a widget process and print what comes back",
+                         [this](const CommandContext& context) { return runScript(context, _file, _virtualTime); });
+  script->add_option("FILE", _file, "JSON-RPC messages, one a line; - for the standard input")->required();
+  script->add_option("--virtual-time", _virtualTime, "ISO date at which the widget's time stands still")
+      ->check(checkDate);
+}
+
+void CommandLine::addFeedCommands() {
+  CLI::App* feed = _app.add_subcommand("feed", "The feeds of the agencies")->require_subcommand(1);
+  CLI::App* addFeed = add(*feed, "add", "Set up a feed",
+                          [this](const CommandContext& context) { return runFeedAdd(context, _feed); });
+  addFeed->add_option("NAME", _feed.name, "Name of your choice")->required();
+  addFeed->add_option("--static", _feed.staticFeed, "GTFS: a folder, a zip file, or an http(s) address")->required();
+  addFeed->add_option("--alerts", _feed.alerts, "GTFS-Realtime Service Alerts: a file or an http(s) address")
+      ->required();
+  CLI::App* remove = add(*feed, "remove", "Forget a feed",
+                         [this](const CommandContext& context) { return runFeedRemove(context, _feed.name); });
+  remove->add_option("NAME", _feed.name, "Name of the feed")->required();
+  add(*feed, "list", "List the feeds", [](const CommandContext& context) { return runFeedList(context); });
+  CLI::App* check = add(*feed, "check", "Read feeds and count what they hold, and what fits nothing",
+                        [this](const CommandContext& context) { return runFeedCheck(context, _feed.name); });
+  check->add_option("NAME", _feed.name, "Name of the feed; all without one");
+
+  CLI::App* lines = add(_app, "lines", "List the lines of all feeds",
+                        [this](const CommandContext& context) { return runLines(context, _text); });
+  lines->add_option("TEXT", _text, "Only lines whose name, agency or identifier contains this");
+}
+
+void CommandLine::addFavoriteCommands() {
+  CLI::App* favorite = _app.add_subcommand("favorite", "Your favourite lines")->require_subcommand(1);
+  CLI::App* addLines = add(*favorite, "add", "Add lines",
+                           [this](const CommandContext& context) { return runFavoriteAdd(context, _lines); });
+  addLines->add_option("FEED:ROUTE_ID", _lines, "Lines as \"lines\" prints them")->required();
+  CLI::App* remove = add(*favorite, "remove", "Remove lines",
+                         [this](const CommandContext& context) { return runFavoriteRemove(context, _lines); });
+  remove->add_option("FEED:ROUTE_ID", _lines, "Lines as \"favorite list\" prints them")->required();
+  CLI::App* move = add(*favorite, "move", "Move a line to another position", [this](const CommandContext& context) {
+    return runFavoriteMove(context, _text, _position);
+  });
+  move->add_option("FEED:ROUTE_ID", _text, "A line as \"favorite list\" prints it")->required();
+  move->add_option("POSITION", _position, "1 is the first")->required();
+  add(*favorite, "list", "List the favourite lines in their order",
+      [](const CommandContext& context) { return runFavoriteList(context); });
+}
+
+void CommandLine::addStateCommands() {
+  CLI::App* settings = _app.add_subcommand("settings", "Settings that widget and hosts share")->require_subcommand(1);
+  CLI::App* get = add(*settings, "get", "Print a setting",
+                      [this](const CommandContext& context) { return runSettingsGet(context, _key); });
+  CLI::App* set = add(*settings, "set", "Store a setting: true, false, or a text",
+                      [this](const CommandContext& context) { return runSettingsSet(context, _key, _value); });
+  CLI::App* unset = add(*settings, "unset", "Remove a setting",
+                        [this](const CommandContext& context) { return runSettingsUnset(context, _key); });
+  for (CLI::App* command : {get, set, unset}) command->add_option("KEY", _key, "Name of the setting")->required();
+  set->add_option("VALUE", _value, "true, false, or a text")->required();
+
+  CLI::App* analytics = add(_app, "analytics", "Show the usage records that are kept, and never sent anywhere",
+                            [this](const CommandContext& context) { return runAnalytics(context, _json); });
+  analytics->add_flag("--json", _json, "One JSON object a line");
+  CLI::App* decode = add(_app, "decode", "Print a hand-off payload or a saved state as JSON",
+                         [this](const CommandContext&) { return runDecode(_file); });
+  decode->add_option("FILE", _file, "File with the bytes; - for the standard input")->required();
+}
+
+int CommandLine::run(int argc, char** argv) {
+  try {
+    _app.parse(argc, argv);
+  } catch (const CLI::ParseError& error) {
+    return _app.exit(error) == 0 ? kExitSuccess : kExitUsage;
+  }
+  std::vector<std::string> arguments;
+  if (_config) arguments.insert(arguments.end(), {"--config", std::filesystem::absolute(*_config)});
+  if (_state) arguments.insert(arguments.end(), {"--state", std::filesystem::absolute(*_state)});
+  GLibRunLoop runLoop;
+  return _chosen({runLoop, Paths::resolve(_config, _state), std::move(arguments)});
+}
+
+}  // namespace
+}  // namespace nimbo
+
+int main(int argc, char** argv) {
+  std::signal(SIGPIPE, SIG_IGN);
+  try {
+    return nimbo::CommandLine().run(argc, argv);
+  } catch (const std::exception& failure) {
+    std::cout << std::flush;
+    std::cerr << "nimbo-transit: " << failure.what() << "\n";
+    return nimbo::kExitFailure;
+  }
+}

@@ -1,0 +1,203 @@
+#include <gmock/gmock.h>
+
+#include <limits>
+
+#include "platform/ui/Environment.h"
+#include "support/TestPlatform.h"
+#include "support/TransitFixtures.h"
+#include "widget/NBTransitIncidentsViewController.h"
+
+namespace nimbo {
+namespace {
+
+using testing::ElementsAre;
+using testing::IsEmpty;
+
+/// A host with sizes, which records what it is told.
+class HostDouble final : public WidgetHost {
+ public:
+  WidgetDisplayMode activeDisplayMode() const override { return mode; }
+  Size maximumSizeForDisplayMode(WidgetDisplayMode which) const override {
+    return which == WidgetDisplayMode::Expanded ? expanded : compact;
+  }
+  void setLargestAvailableDisplayMode(WidgetDisplayMode which) override { largest = which; }
+  WidgetDisplayMode largestAvailableDisplayMode() const override { return largest; }
+  void openURL(const URL& url, std::function<void(bool)> completion) override {
+    opened.push_back(url.absoluteString());
+    completion(opens);
+  }
+  void preferredContentSizeDidChange(Size size) override { preferred.push_back(size); }
+
+  WidgetDisplayMode mode = WidgetDisplayMode::Compact;
+  WidgetDisplayMode largest = WidgetDisplayMode::Expanded;
+  Size compact{359, 110}, expanded{359, 350};
+  bool opens = true;
+  std::vector<std::string> opened;
+  std::vector<Size> preferred;
+};
+
+class Controller : public testing::Test {
+ protected:
+  Controller() {
+    platform.favorites.setFavorites(Favorites{std::make_shared<const FavoriteTransitLine>(lineItem(1, "1"))});
+  }
+  void load(WidgetHost* widgetHost) {
+    controller = NBTransitIncidentsViewController::initWithNibName_bundle("", "", widgetHost);
+    controller->view()->setFrame({0, 0, 300, 110});
+  }
+  void appear() {
+    if (!controller) load(&host);
+    controller->viewWillAppear(false);
+    controller->viewDidAppear(false);
+  }
+  void disappear() {
+    controller->viewWillDisappear(false);
+    controller->viewDidDisappear(false);
+  }
+  /// Lets the fetch that runs reach the line service, and answers it.
+  void answer(const TransitLineItems& items, const ErrorRef& error = nullptr) {
+    platform.loop.waitAndDrain([&] { return platform.transitLines.pending() > 0; });
+    platform.transitLines.answer(items, error);
+    platform.loop.runUntilIdle();
+  }
+  NBTransitIncidentsViewController::UpdateHandler record(const std::string& name) {
+    return [this, name](WidgetUpdateResult result) {
+      answers.push_back(name + (result == WidgetUpdateResult::NewData ? ":new" : ":failed"));
+    };
+  }
+
+  TestPlatform platform;
+  HostDouble host;
+  std::shared_ptr<NBTransitIncidentsViewController> controller;
+  std::vector<std::string> answers;
+};
+
+const ErrorRef kError = Error::errorWithDomain_code_reason("D", 1, "no");
+
+TEST_F(Controller, AnswersAllThatWaitForOneFetch) {
+  appear();
+  controller->widgetPerformUpdateWithCompletionHandler(record("first"));
+  controller->widgetPerformUpdateWithCompletionHandler(record("second"));
+  EXPECT_THAT(answers, IsEmpty());
+  answer({lineItem(1, "1")});
+  EXPECT_THAT(answers, ElementsAre("first:new", "second:new"));
+  EXPECT_EQ(platform.transitLines.lookups().size(), 1u);
+
+  controller->widgetPerformUpdateWithCompletionHandler(record("third"));
+  answer({}, kError);
+  EXPECT_THAT(answers, ElementsAre("first:new", "second:new", "third:failed"));
+  EXPECT_EQ(platform.transitLines.lookups().size(), 2u);
+}
+
+TEST_F(Controller, KeepsAnUpdaterOnlyWhileVisibleWithLineItems) {
+  appear();
+  EXPECT_EQ(controller->updater(), nullptr) << "before the first fetch";
+  answer({lineItem(1, "1")});
+  const auto first = controller->updater();
+  ASSERT_NE(first, nullptr);
+  EXPECT_EQ(first->refreshInterval(), 1800.0);
+
+  platform.time.advance(1800);
+  answer({}, kError);
+  EXPECT_EQ(controller->updater(), nullptr) << "after a failed fetch";
+
+  controller->widgetPerformUpdateWithCompletionHandler(nullptr);
+  answer({lineItem(1, "1")});
+  disappear();
+  EXPECT_EQ(controller->updater(), nullptr);
+  platform.time.advance(7200);
+  platform.loop.runUntilIdle();
+  EXPECT_EQ(platform.transitLines.lookups().size(), 3u) << "nothing is fetched while hidden";
+
+  controller->viewWillAppear(false);
+  EXPECT_NE(controller->updater(), nullptr) << "made again from the last result";
+}
+
+TEST_F(Controller, ChangesRowsByTheClockWithoutFetching) {
+  appear();
+  answer({lineItem(1, "1", {incident(9, dateByAdding(platform.time.now(), 600))})});
+  const auto title = [&] {
+    return dynamic_cast<const NBTransitItem&>(*controller->dataSource()->listItem()->summaryItem()).primaryText();
+  };
+  EXPECT_EQ(title(), "TransitWidget_GoodService_Title");
+  platform.time.advance(600);
+  EXPECT_EQ(title(), "Incident 9");
+  EXPECT_EQ(platform.transitLines.lookups().size(), 1u);
+}
+
+TEST_F(Controller, TurnsTheHostsSizesIntoRowsAndWidth) {
+  constexpr auto kNoLimit = std::numeric_limits<std::uint64_t>::max();
+  const struct {
+    double compact, expanded;
+    std::uint64_t rows;
+  } cases[] = {{110, 350, 3}, {110, 110, 1}, {110, 329.9, 2}, {110, 50, kNoLimit},
+               {0, 350, kNoLimit}, {-5, 350, kNoLimit}, {110, -350, kNoLimit}, {1e-9, 1e300, kNoLimit}};
+  for (const auto& c : cases) {
+    host.compact.height = c.compact;
+    host.expanded.height = c.expanded;
+    load(&host);
+    EXPECT_EQ(controller->dataSource()->maxNumberOfRows(), c.rows) << c.compact << " " << c.expanded;
+    EXPECT_EQ(controller->dataSource()->availableWidth(), 359);
+  }
+  load(nullptr);
+  controller->viewWillAppear(false);
+  EXPECT_EQ(controller->dataSource()->maxNumberOfRows(), kNoLimit);
+  EXPECT_EQ(controller->dataSource()->rowHeight(), 0);
+}
+
+TEST_F(Controller, FollowsModesAndTellsTheHostWhatItNeeds) {
+  appear();
+  EXPECT_EQ(host.largest, WidgetDisplayMode::Compact) << "no rows to expand yet";
+  answer({lineItem(1, "1", {incident(1), incident(2)})});
+  EXPECT_EQ(host.largest, WidgetDisplayMode::Expanded);
+  EXPECT_EQ(host.preferred.back(), (Size{359, 110}));
+
+  host.mode = WidgetDisplayMode::Expanded;
+  // The host's own mode counts, not the one that comes with the call.
+  controller->widgetActiveDisplayModeDidChange_withMaximumSize(WidgetDisplayMode::Compact, {1, 1});
+  EXPECT_TRUE(controller->dataSource()->isExpanded());
+  EXPECT_EQ(host.preferred.back(), (Size{359, 220}));
+
+  host.compact.height = 80;
+  Environment::current().setContentSizeCategory(ContentSizeCategory::extraLarge);
+  EXPECT_EQ(controller->dataSource()->rowHeight(), 80);
+  disappear();
+  host.compact.height = 90;
+  Environment::current().setContentSizeCategory(ContentSizeCategory::large);
+  EXPECT_EQ(controller->dataSource()->rowHeight(), 80) << "hidden: does not listen";
+}
+
+TEST_F(Controller, RecordsOnlyOpensThatSucceed) {
+  appear();
+  answer({lineItem(1, "1")});
+  host.opens = false;
+  controller->tableView()->selectRowAtIndexPath({0, 0});
+  EXPECT_THAT(platform.analytics.actions, IsEmpty());
+  host.opens = true;
+  controller->tableView()->selectRowAtIndexPath({0, 0});
+  ASSERT_EQ(platform.analytics.interactions.size(), 1u);
+  EXPECT_EQ(platform.analytics.interactions[0].endState, 1);
+  disappear();
+  EXPECT_EQ(platform.analytics.interactions.size(), 1u);
+}
+
+TEST_F(Controller, AnswersTheHostAlsoWhenItIsGone) {
+  appear();
+  controller->widgetPerformUpdateWithCompletionHandler(record("late"));
+  const std::weak_ptr<NBTransitIncidentsViewController> weak = controller;
+  controller = nullptr;
+  EXPECT_TRUE(weak.expired()) << "a running fetch does not keep the controller alive";
+  answer({lineItem(1, "1")});
+  EXPECT_THAT(answers, IsEmpty()) << "the first fetch has no handler, and its request went with the controller";
+}
+
+TEST_F(Controller, SignpostsMemoryPressure) {
+  load(&host);
+  platform.memoryPressure.fire(MemoryPressureKind::processCritical);
+  platform.loop.waitAndDrain([&] { return !platform.signposts.events().empty(); });
+  EXPECT_EQ(platform.signposts.events().at(0).name, "ProcessMemoryPressureCritical");
+  EXPECT_EQ(platform.signposts.events().at(0).message, " enableTelemetry=YES ");
+}
+
+}  // namespace
+}  // namespace nimbo
