@@ -1,0 +1,74 @@
+#include "incidents/NBTransitIncidentFetcher.h"
+
+#include "incidents/DebugSettings.h"
+#include "incidents/DebugTransitIncident.h"
+#include "incidents/DebugTransitLineItem.h"
+#include "incidents/FavoritesStore+Nimbo.h"
+#include "incidents/SharedSettingsStore+Nimbo.h"
+#include "incidents/_NBTransitIncidentFetcherRequest.h"
+#include "platform/Platform.h"
+#include "util/NBTransitWidgetLog.h"
+#include "util/NimboMap.h"
+
+namespace nimbo {
+
+namespace {
+
+TransitLineRef transitLineOfFavorite(const FavoriteRef& favorite, std::size_t) {
+  const auto* lineFavorite = dynamic_cast<const FavoriteTransitLine*>(favorite.get());
+  return lineFavorite ? lineFavorite->transitLine() : nullptr;
+}
+
+}  // namespace
+
+std::shared_ptr<NBTransitIncidentFetcherRequest>
+NBTransitIncidentFetcher::fetchFavoriteLinesTransitIncidentsWithCompletionHandler(
+    NBTransitIncidentFetcherHandler handler) {
+  auto request = _NBTransitIncidentFetcherRequest::initWithCompletionHandler(std::move(handler));
+  const auto self = std::static_pointer_cast<NBTransitIncidentFetcher>(shared_from_this());
+  defaultContainer()->readContents([self, request](const std::optional<Favorites>& favorites) {
+    writeLog(NBTransitWidgetLogFacility, LogLevel::debug, "Received %lu favorites from container.",
+             {favorites ? favorites->size() : 0});
+    const auto lines = NimboMap(favorites, transitLineOfFavorite);
+    if (lines && !lines->empty()) return self->_fetchIncidentsForLines_withRequest(*lines, request);
+    writeLog(NBTransitWidgetLogFacility, LogLevel::debug, "0 Favorite lines, returning early.");
+    Platform::current().mainRunLoop().dispatchAsync([request] {
+      request->setResultAndInvokeCompletionHandlers(
+          Result::resultWithValue(BoxedArray::of<TransitLineItem>(TransitLineItems{})));
+    });
+  });
+  return request;
+}
+
+void NBTransitIncidentFetcher::_fetchIncidentsForLines_withRequest(
+    const std::vector<TransitLineRef>& lines, std::shared_ptr<_NBTransitIncidentFetcherRequest> request) {
+  const auto identifiers = NimboMap(lines, [](const TransitLineRef& line, std::size_t) { return line->identifier(); });
+  writeLog(NBTransitWidgetLogFacility, LogLevel::debug, "Issuing favorite lines lookup request for Muids: %{private}@.",
+           {BoxedArray::of<MapItemIdentifier>(identifiers)});
+  const auto self = std::static_pointer_cast<NBTransitIncidentFetcher>(shared_from_this());
+  Platform::current().transitLines().lookup(identifiers, [self, request = std::move(request)](
+                                                             const TransitLineItems& items, const ErrorRef& error) {
+    if (error) {
+      writeLog(NBTransitWidgetLogFacility, LogLevel::debug, "Received error: %{private}@.", {error});
+      return request->setResultAndInvokeCompletionHandlers(Result::resultWithError(error));
+    }
+    const bool fakes = __nimbo_groupUserDefaults()->boolForKey(kNimboTransitWidgetDebugInjectFakeIncidents);
+    const TransitLineItems delivered = fakes ? self->_fakeLineItemsFromItems(items) : items;
+    writeLog(NBTransitWidgetLogFacility, LogLevel::debug, "Received %lu line items.", {delivered.size()});
+    request->setResultAndInvokeCompletionHandlers(Result::resultWithValue(BoxedArray::of<TransitLineItem>(delivered)));
+  });
+}
+
+TransitLineItems NBTransitIncidentFetcher::_fakeLineItemsFromItems(const TransitLineItems& items) const {
+  RandomSource& random = Platform::current().random();
+  const bool randomNumber = __nimbo_groupUserDefaults()->boolForKey(kNimboTransitWidgetDebugRandomNumberIncidents);
+  return NimboMap(items, [&](const TransitLineItemRef& item, std::size_t) -> TransitLineItemRef {
+    if (!item->incidents().empty() || random.next() % 3 == 0) return item;
+    TransitIncidents incidents(randomNumber ? random.next() % 3 : 1);
+    for (TransitIncidentRef& incident : incidents)
+      incident = DebugTransitIncident::__debug_fakeIncidentAffectingLine(*item);
+    return DebugTransitLineItem::initWithLine_incidents(item, std::move(incidents));
+  });
+}
+
+}  // namespace nimbo

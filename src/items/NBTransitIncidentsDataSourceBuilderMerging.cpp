@@ -1,0 +1,109 @@
+// Rows of the incident list builder that speak for several lines.
+
+#include <algorithm>
+#include <functional>
+
+#include "items/NBTransitIncidentsDataSourceBuilder.h"
+#include "platform/Localization.h"
+#include "platform/artwork/NamedImage.h"
+#include "platform/artwork/SizedTransitArtwork.h"
+
+namespace nimbo {
+
+namespace {
+
+std::string filledText(std::string_view key, std::initializer_list<FormatArgument> arguments) {
+  return LocalizedFormat(LocalizedString(key), arguments);
+}
+
+/// The same for rows that are equal.
+std::uint64_t keyOfTexts(const NBTransitItem& item) {
+  constexpr std::hash<std::optional<std::string>> hash;
+  return hash(item.primaryText()) * 31 + hash(item.secondaryText());
+}
+
+/// The symbol of the system that all lines belong to. Lines without one are passed over until the first that has one;
+/// after it they break what is common. Null where there is none.
+TransitArtworkRef commonSystemArtwork(const TransitLineItems& lines) {
+  TransitArtworkRef common;
+  for (const TransitLineItemRef& line : lines) {
+    const TransitArtworkRef artwork = line->system() ? line->system()->artwork() : nullptr;
+    if (!common)
+      common = artwork;
+    else if (!artworksAreEquivalent(artwork.get(), common.get()))
+      return nullptr;
+  }
+  return common;
+}
+
+/// The line's name, else its system's; null where both are missing or empty.
+const std::string* nameOfLine(const TransitLineItem& line) {
+  if (line.name() && !line.name()->empty()) return &*line.name();
+  const TransitSystemRef& system = line.system();
+  return system && system->name() && !system->name()->empty() ? &*system->name() : nullptr;
+}
+
+std::vector<std::string> distinctNames(const TransitLineItems& lines) {
+  std::vector<std::string> names;
+  for (const TransitLineItemRef& line : lines) {
+    const std::string* name = nameOfLine(*line);
+    if (name && std::find(names.begin(), names.end(), *name) == names.end()) names.push_back(*name);
+  }
+  return names;
+}
+
+}  // namespace
+
+void NBTransitIncidentsDataSourceBuilder::_updateItemsAffectingSeveralLines_itemToLinesMap(
+    NBTransitItems& items, ItemToLinesMap& itemToLines) const {
+  NumberList keys;
+  for (const NBTransitItemRef& item : items) keys.append(keyOfTexts(*item));
+  for (const NBTransitItems oldItems = items; const NBTransitItemRef& old : oldItems) {
+    const auto entry = itemToLines.find(old);
+    if (entry == itemToLines.end() || entry->second.size() < 2) continue;
+    NBTransitItemRef merged = itemAffectingLines(*old, entry->second);
+    const std::uint64_t key = keyOfTexts(*old);
+    std::size_t index = keys.firstIndexOf(key);
+    while (!absentOrEqual(items.at(index), old)) index = keys.firstIndexOf(key, index + 1);
+    items[index] = merged;
+    keys.replace(index, keyOfTexts(*merged));
+    auto node = itemToLines.extract(entry);
+    node.key() = std::move(merged);
+    itemToLines.insert(std::move(node));
+  }
+}
+
+NBTransitItemRef NBTransitIncidentsDataSourceBuilder::itemAffectingLines(const NBTransitItem& item,
+                                                                         const TransitLineItems& lines) const {
+  NBConfiguredArtworkRef artwork;
+  if (auto common = commonSystemArtwork(lines))
+    artwork = NBConfiguredArtwork::initWithArtworkSource_alpha(
+        SizedTransitArtwork::initWithArtwork_shieldSize_artworkCache(std::move(common), kRowShieldSize, _artworkCache),
+        kFullArtworkAlpha);
+  else
+    artwork = NBConfiguredArtwork::initWithArtworkSource_alpha(NamedImage::imageNamed("WidgetGenericTransit"),
+                                                               kDimmedArtworkAlpha);
+  return NBTransitItem::initWithPrimaryText_secondaryText_artwork_artworkHidden_openable(
+      item.primaryText(), _prependLineNames_toText(lines, item.secondaryText()), std::move(artwork),
+      item.isArtworkHidden(), item.openable());
+}
+
+std::optional<std::string> NBTransitIncidentsDataSourceBuilder::_prependLineNames_toText(
+    const TransitLineItems& lines, const std::optional<std::string>& text) {
+  std::vector<std::string> names = distinctNames(lines);
+  if (names.empty()) return text;
+  const bool hasText = text && !text->empty();
+  const std::size_t count = names.size();
+  const std::string last = std::move(names.back());
+  names.pop_back();
+  if (!hasText) {
+    if (count == 1) return last;
+    if (count == 2) return filledText("TransitWidget_2_Lines_Concatenated", {names.front(), last});
+    return filledText("TransitWidget_N_Lines_Names_Concatenated", {CommaDelimitedList(names), last});
+  }
+  if (count == 1) return filledText("TransitWidget_Single_Line_Prepended_Incident_Text", {last, *text});
+  if (count == 2) return filledText("TransitWidget_2_Lines_Prepended_Incident_Text", {names.front(), last, *text});
+  return filledText("TransitWidget_N_Lines_Prepended_Incident_Text", {CommaDelimitedList(names), last, *text});
+}
+
+}  // namespace nimbo
