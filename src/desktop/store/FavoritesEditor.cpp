@@ -1,0 +1,173 @@
+#include "desktop/store/FavoritesEditor.h"
+
+#include <algorithm>
+#include <stdexcept>
+
+#include "desktop/store/FavoriteLineContent.h"
+
+namespace nimbo {
+
+namespace {
+
+/// The place of a favourite line in the order.
+struct LineRow {
+  std::int64_t id;
+  std::int64_t position;
+  std::uint64_t muid;
+};
+
+ErrorRef refusal(FavoritesError code, std::string reason) {
+  return Error::errorWithDomain_code_reason(std::string(kFavoritesErrorDomain), static_cast<std::int64_t>(code),
+                                            std::move(reason));
+}
+
+ErrorRef unknownLine(std::uint64_t muid) {
+  return refusal(FavoritesError::unknown, "The line " + std::to_string(muid) + " is no favourite.");
+}
+
+bool wereSet(SQLiteConnection& connection) {
+  SQLiteStatement query = connection.prepare(
+      "SELECT EXISTS (SELECT 1 FROM favorites) OR EXISTS (SELECT 1 FROM settings WHERE key = ? AND value)");
+  query.bind(1, kFavoritesWereSetKey);
+  return query.step() && query.integer(0) != 0;
+}
+
+std::vector<LineRow> lineRows(SQLiteConnection& connection) {
+  std::vector<LineRow> rows;
+  SQLiteStatement query =
+      connection.prepare("SELECT id, position, muid FROM favorites WHERE kind = ? ORDER BY position, id");
+  query.bind(1, kFavoriteKindTransitLine);
+  while (query.step())
+    rows.push_back({query.integer(0), query.integer(1), static_cast<std::uint64_t>(query.integer(2))});
+  return rows;
+}
+
+auto findLine(std::vector<LineRow>& rows, std::uint64_t muid) {
+  return std::find_if(rows.begin(), rows.end(), [muid](const LineRow& row) { return row.muid == muid; });
+}
+
+void append(SQLiteConnection& connection, const TransitLine& line) {
+  SQLiteStatement insert = connection.prepare(
+      "INSERT INTO favorites(position, kind, muid, content)"
+      " VALUES ((SELECT coalesce(max(position), -1) + 1 FROM favorites), ?, ?, ?)");
+  const std::string content = contentOfFavoriteLine(line);
+  insert.bind(1, kFavoriteKindTransitLine);
+  insert.bind(2, static_cast<std::int64_t>(line.muid()));
+  insert.bind(3, content);
+  insert.step();
+}
+
+void markAsSet(SQLiteConnection& connection) {
+  SQLiteStatement insert = connection.prepare("INSERT OR REPLACE INTO settings(key, value) VALUES (?, 1)");
+  insert.bind(1, kFavoritesWereSetKey);
+  insert.step();
+}
+
+Favorites storedFavorites(SQLiteConnection& connection) {
+  Favorites favorites;
+  SQLiteStatement query = connection.prepare("SELECT kind, muid, content FROM favorites ORDER BY position, id");
+  while (query.step()) {
+    std::string kind = query.text(0);
+    if (kind == kFavoriteKindTransitLine)
+      favorites.push_back(std::make_shared<const FavoriteTransitLine>(
+          favoriteLineOfContent(static_cast<std::uint64_t>(query.integer(1)), query.text(2))));
+    else
+      favorites.push_back(std::make_shared<const OtherFavorite>(std::move(kind)));
+  }
+  return favorites;
+}
+
+}  // namespace
+
+FavoritesEditor::FavoritesEditor(std::shared_ptr<StateDatabase> database, FirstFavorites firstFavorites)
+    : _database(std::move(database)), _firstFavorites(std::move(firstFavorites)) {
+  if (!_database) throw std::invalid_argument("favourites need a database");
+  if (!_firstFavorites) _firstFavorites = [] { return std::vector<TransitLineRef>(); };
+}
+
+ErrorRef FavoritesEditor::list(Favorites& favorites) const {
+  std::optional<Favorites> stored;
+  const ErrorRef error = _database->read([&](SQLiteConnection& connection) -> ErrorRef {
+    if (wereSet(connection)) stored = storedFavorites(connection);
+    return nullptr;
+  });
+  if (error) return error;
+  if (!stored) {
+    stored.emplace();
+    for (const TransitLineRef& line : _firstFavorites())
+      stored->push_back(std::make_shared<const FavoriteTransitLine>(line));
+  }
+  favorites = std::move(*stored);
+  return nullptr;
+}
+
+ErrorRef FavoritesEditor::change(const StateDatabase::Work& work) {
+  return _database->write(
+      [&](SQLiteConnection& connection) {
+        if (!wereSet(connection))
+          for (const TransitLineRef& line : _firstFavorites()) append(connection, *line);
+        markAsSet(connection);
+        return work(connection);
+      },
+      StateDatabase::Durability::power);
+}
+
+ErrorRef FavoritesEditor::add(const std::vector<TransitLineRef>& lines) {
+  if (std::find(lines.begin(), lines.end(), nullptr) != lines.end())
+    throw std::invalid_argument("a favourite line is not null");
+  return change([&](SQLiteConnection& connection) -> ErrorRef {
+    std::vector<LineRow> rows = lineRows(connection);
+    for (const TransitLineRef& line : lines) {
+      if (findLine(rows, line->muid()) != rows.end())
+        return refusal(FavoritesError::duplicate,
+                       line->name().value_or("The line " + std::to_string(line->muid())) + " is a favourite already.");
+      append(connection, *line);
+      rows.push_back({0, 0, line->muid()});
+    }
+    return nullptr;
+  });
+}
+
+ErrorRef FavoritesEditor::remove(const std::vector<std::uint64_t>& muids) {
+  return change([&](SQLiteConnection& connection) -> ErrorRef {
+    std::vector<LineRow> rows = lineRows(connection);
+    SQLiteStatement remove = connection.prepare("DELETE FROM favorites WHERE id = ?");
+    for (const std::uint64_t muid : muids) {
+      const auto row = findLine(rows, muid);
+      if (row == rows.end()) return unknownLine(muid);
+      remove.bind(1, row->id);
+      remove.step();
+      remove.reset();
+      rows.erase(row);
+    }
+    return nullptr;
+  });
+}
+
+ErrorRef FavoritesEditor::move(std::uint64_t muid, std::size_t position) {
+  return change([&](SQLiteConnection& connection) -> ErrorRef {
+    const std::vector<LineRow> places = lineRows(connection);
+    std::vector<LineRow> rows = places;
+    const auto row = findLine(rows, muid);
+    if (row == rows.end()) return unknownLine(muid);
+    if (position >= rows.size())
+      return refusal(FavoritesError::position, "There are only " + std::to_string(rows.size()) + " favourite lines.");
+    const auto target = rows.begin() + static_cast<std::ptrdiff_t>(position);
+    if (row < target)
+      std::rotate(row, row + 1, target + 1);
+    else
+      std::rotate(target, row, row + 1);
+    // The lines change places among themselves: favourites of other kinds stay where they are.
+    SQLiteStatement place = connection.prepare("UPDATE favorites SET position = ? WHERE id = ?");
+    for (std::size_t i = 0; i < rows.size(); ++i) {
+      if (rows[i].id == places[i].id) continue;
+      place.bind(1, places[i].position);
+      place.bind(2, rows[i].id);
+      place.step();
+      place.reset();
+    }
+    return nullptr;
+  });
+}
+
+}  // namespace nimbo

@@ -1,0 +1,49 @@
+#pragma once
+
+#include "desktop/store/StateDatabase.h"
+#include "platform/FavoritesStore.h"
+
+namespace nimbo {
+
+/// Domain of the errors of favourites; the codes are FavoritesError.
+inline constexpr std::string_view kFavoritesErrorDomain = "org.nimbo.Favorites";
+
+enum class FavoritesError : std::int64_t { duplicate = 1, unknown = 2, position = 3 };
+
+/// Setting that tells an emptied list of favourites from one that was never begun.
+inline constexpr std::string_view kFavoritesWereSetKey = "Nimbo.Favorites.wereSet";
+
+/// The favourites in the state database, as the host application changes them. Each change is one transaction: hosts
+/// that change at once lose nothing, and a change that is refused changes nothing. Favourites of other kinds keep
+/// their places in the order and their content. Any thread.
+class FavoritesEditor final {
+ public:
+  /// The favourite lines of a user who never set any; none where the program knows of none. Called on the thread that
+  /// reads or changes the favourites, with the database locked: must not use it.
+  using FirstFavorites = std::function<std::vector<TransitLineRef>()>;
+
+  /// Throws std::invalid_argument without a database; `firstFavorites` may be null.
+  FavoritesEditor(std::shared_ptr<StateDatabase> database, FirstFavorites firstFavorites);
+
+  /// Sets `favorites` to all favourites in their order; while none were ever set, to the first ones. A line whose
+  /// content cannot be read is a favourite without a line. Null on success, otherwise `favorites` stays.
+  ErrorRef list(Favorites& favorites) const;
+
+  // The first change begins from the first favourites. Each answers null on success.
+
+  /// Appends lines (none of them null). Refused when one is a favourite already.
+  ErrorRef add(const std::vector<TransitLineRef>& lines);
+  /// Removes lines by their numbers. Refused when one is no favourite.
+  ErrorRef remove(const std::vector<std::uint64_t>& muids);
+  /// Moves a line to a position among the favourite lines, counted from 0. Refused when it is no favourite, or where
+  /// there is no such position.
+  ErrorRef move(std::uint64_t muid, std::size_t position);
+
+ private:
+  ErrorRef change(const StateDatabase::Work& work);
+
+  std::shared_ptr<StateDatabase> _database;
+  FirstFavorites _firstFavorites;
+};
+
+}  // namespace nimbo

@@ -1,0 +1,36 @@
+#pragma once
+
+#include "desktop/store/AnalyticsEntry.h"
+#include "desktop/store/SQLiteSharedSettings.h"
+
+namespace nimbo {
+
+/// Setting that turns the keeping of analytics off while it is YES.
+inline constexpr std::string_view kAnalyticsDisabledKey = "Nimbo.TransitWidget.analytics.disabled";
+
+/// Keeps the newest analytics records in the state database, and nowhere else.
+class SQLiteAnalyticsPipeline final : public AnalyticsPipeline {
+ public:
+  /// Records beyond this number push the oldest out.
+  static constexpr std::int64_t kMaximumEntries = 1000;
+
+  /// Throws std::invalid_argument without a database.
+  explicit SQLiteAnalyticsPipeline(std::shared_ptr<StateDatabase> database);
+
+  void captureUserAction(int action, int target, const std::optional<std::string>& value) override;
+  void captureWidgetInteraction(int widgetType, int endState, const TransitWidgetAnalyticsRecord& record,
+                                bool wasLocked, Date startDate, TimeInterval duration) override;
+
+  /// Sets `entries` to what is kept, the oldest first; a record that cannot be understood is left out. Null on success.
+  ErrorRef list(std::vector<AnalyticsEntry>& entries) const;
+  /// Forgets everything. Null on success.
+  ErrorRef clear();
+
+ private:
+  void keep(const AnalyticsEntry& entry);
+
+  std::shared_ptr<StateDatabase> _database;
+  std::shared_ptr<SharedSettingsStore> _settings;
+};
+
+}  // namespace nimbo

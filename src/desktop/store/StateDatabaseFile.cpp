@@ -1,0 +1,175 @@
+#include "desktop/store/StateDatabaseFile.h"
+
+#include <sqlite3.h>
+
+#include <algorithm>
+
+#include "desktop/raii/SQLiteFailure.h"
+#include "desktop/store/FolderLock.h"
+#include "desktop/store/StateDatabaseSchema.h"
+#include "desktop/system/AtomicFile.h"
+
+namespace nimbo {
+
+namespace fs = std::filesystem;
+
+namespace {
+
+std::string_view adviceFor(int sqliteCode) {
+  switch (sqliteCode) {
+    case SQLITE_FULL:
+      return "Free some space and try again.";
+    case SQLITE_BUSY:
+    case SQLITE_LOCKED:
+      return "Another program is using it: try again in a moment.";
+    case SQLITE_CANTOPEN:
+    case SQLITE_PERM:
+    case SQLITE_READONLY:
+    case SQLITE_AUTH:
+      return "Check that you may read and write the file and its folder.";
+    case SQLITE_TOOBIG:
+      return "A single value may have 100 MiB at most.";
+    case SQLITE_NOMEM:
+      return "Close some programs and try again.";
+    default:
+      return "Check the disk that holds it.";
+  }
+}
+
+fs::path withSuffix(const fs::path& path, std::string_view suffix) { return fs::path(path).concat(suffix); }
+
+bool mayWriteTo(const fs::path& folder) { return ::faccessat(AT_FDCWD, folder.c_str(), W_OK, AT_EACCESS) == 0; }
+
+StateDatabaseFile::Opened failed(ErrorRef error) {
+  StateDatabaseFile::Opened opened;
+  opened.error = std::move(error);
+  return opened;
+}
+
+/// The counts as a clause: "3 favourites and 1 setting".
+std::string textOfCounts(const SalvagedCounts& counts) {
+  const auto count = [](std::size_t n, const std::string& noun) {
+    return std::to_string(n) + " " + noun + (n == 1 ? "" : "s");
+  };
+  return count(counts.favorites, "favourite") + " and " + count(counts.settings, "setting");
+}
+
+}  // namespace
+
+StateDatabaseFile::StateDatabaseFile(fs::path folder, const Clock& clock)
+    : _folder(std::move(folder)), _path(_folder / "state.sqlite"), _clock(clock) {}
+
+ErrorRef StateDatabaseFile::error(StateDatabaseError code, std::string reason) const {
+  return Error::errorWithDomain_code_reason(std::string(kStateDatabaseErrorDomain), static_cast<std::int64_t>(code),
+                                            std::move(reason));
+}
+
+ErrorRef StateDatabaseFile::errorOfFailure(const SQLiteFailure& failure, Purpose purpose) const {
+  const bool reading = purpose == Purpose::reading;
+  return error(reading ? StateDatabaseError::cannotRead : StateDatabaseError::cannotWrite,
+               (reading ? "Cannot read " : "Cannot write ") + _path.native() + ": " + failure.what() + ". " +
+                   std::string(adviceFor(failure.code())));
+}
+
+StateDatabaseFile::Opened StateDatabaseFile::open(Purpose purpose) {
+  if (purpose == Purpose::writing) {
+    if (ErrorRef error = makeFolders(_folder)) return failed(std::move(error));
+  } else {
+    std::error_code failure;
+    if (fs::status(_path, failure).type() == fs::file_type::not_found) return {};
+  }
+  const FolderLock lock(_folder);
+  try {
+    return openLocked(purpose);
+  } catch (const SQLiteFailure& failure) {
+    if (!failure.meansDamage()) return failed(errorOfFailure(failure, purpose));
+  }
+  return replaceLocked();
+}
+
+StateDatabaseFile::Opened StateDatabaseFile::openLocked(Purpose purpose) {
+  if (purpose == Purpose::writing) {
+    // SQLite gives the files that it makes beside this one the same mode. A file that exists is not touched: closing it
+    // would drop the locks that this process may hold on it.
+    const FileDescriptor made(::open(_path.c_str(), O_RDWR | O_CREAT | O_EXCL | O_CLOEXEC, 0600));
+    if (!made && errno != EEXIST) return failed(fileError("make", _path, errno));
+  }
+  Opened opened;
+  opened.connection = connect(opened.isSnapshot);
+  const std::int64_t version = opened.connection->integer("PRAGMA user_version");
+  if (version > kStateSchemaVersion)
+    return failed(error(StateDatabaseError::newerVersion,
+                        _path.native() + " was written by a newer version of this program. Install that version, or "
+                                         "choose another state folder."));
+  if (version == kStateSchemaVersion) return opened;
+  if (version < 0 || opened.connection->integer("SELECT count(*) FROM sqlite_schema") != 0)
+    return failed(error(StateDatabaseError::foreign,
+                        _path.native() + " is a database of another program. Move it away, or choose another state "
+                                         "folder."));
+  createStateSchema(*opened.connection);
+  return opened;
+}
+
+std::unique_ptr<SQLiteConnection> StateDatabaseFile::connect(bool& isSnapshot) const {
+  try {
+    auto connection =
+        std::make_unique<SQLiteConnection>(_path, SQLiteConnection::Access::readWrite, kMaximumStateValueBytes);
+    connection->integer("PRAGMA user_version");  // the first access that needs the files beside this one
+    return connection;
+  } catch (const SQLiteFailure& failure) {
+    // A database in WAL mode cannot be read where no file can be made, unless as one that never changes; that one
+    // leaves the log out, so that a log with something in it must not be there.
+    if (failure.code() != SQLITE_CANTOPEN && failure.code() != SQLITE_READONLY) throw;
+    std::error_code noLog;
+    const std::uintmax_t logBytes = fs::file_size(withSuffix(_path, "-wal"), noLog);
+    if (mayWriteTo(_folder) || (!noLog && logBytes > 0)) throw;
+  }
+  isSnapshot = true;
+  return std::make_unique<SQLiteConnection>(_path, SQLiteConnection::Access::immutable, kMaximumStateValueBytes);
+}
+
+fs::path StateDatabaseFile::nameForDamaged() const {
+  std::string date = isoTextOfDate(std::chrono::floor<std::chrono::seconds>(_clock.now()));
+  date.pop_back();  // the "Z"
+  std::replace(date.begin(), date.end(), ':', '-');
+  const fs::path name = withSuffix(_path, ".broken-" + date);
+  fs::path free = name;
+  for (int i = 2; fs::exists(fs::symlink_status(free)); ++i) free = withSuffix(name, "-" + std::to_string(i));
+  return free;
+}
+
+StateDatabaseFile::Opened StateDatabaseFile::replaceDamaged(std::unique_ptr<SQLiteConnection> damaged) {
+  const FolderLock lock(_folder);
+  const bool wasReplaced = damaged->hasMoved();
+  damaged->keepLogOnClose();
+  damaged.reset();
+  if (!wasReplaced) return replaceLocked();
+  try {
+    return openLocked(Purpose::writing);
+  } catch (const SQLiteFailure& failure) {
+    return failed(errorOfFailure(failure, Purpose::writing));
+  }
+}
+
+StateDatabaseFile::Opened StateDatabaseFile::replaceLocked() {
+  const fs::path aside = nameForDamaged();
+  if (::rename(_path.c_str(), aside.c_str()) != 0) return failed(fileError("set aside the damaged", _path, errno));
+  // The log belongs to the damaged file; its index is made anew wherever it is missing.
+  ::rename(withSuffix(_path, "-wal").c_str(), withSuffix(aside, "-wal").c_str());
+  ::unlink(withSuffix(_path, "-shm").c_str());
+  Opened opened;
+  SalvagedCounts counts;
+  try {
+    opened = openLocked(Purpose::writing);
+    if (opened.connection) counts = salvageState(aside, *opened.connection);
+  } catch (const SQLiteFailure& failure) {
+    opened = failed(errorOfFailure(failure, Purpose::writing));
+  }
+  opened.notice = error(StateDatabaseError::setAside,
+                        _path.native() + " was damaged and is now kept as " + aside.native() +
+                            ". A new one was begun with what could be read of it: " + textOfCounts(counts) +
+                            ". Check your favourites, and the disk.");
+  return opened;
+}
+
+}  // namespace nimbo

@@ -1,0 +1,69 @@
+#pragma once
+
+#include "desktop/raii/SQLiteConnection.h"
+#include "platform/Clock.h"
+#include "platform/foundation/Error.h"
+
+namespace nimbo {
+
+class SQLiteFailure;
+
+/// Domain of the errors of the state database; the codes are StateDatabaseError.
+inline constexpr std::string_view kStateDatabaseErrorDomain = "org.nimbo.StateDatabase";
+
+enum class StateDatabaseError : std::int64_t {
+  cannotRead = 1,
+  cannotWrite = 2,
+  newerVersion = 3,  ///< written by a newer version of the program; left as it is
+  foreign = 4,       ///< a database of another program; left as it is
+  setAside = 5,      ///< was damaged; kept under another name, a new one begun
+};
+
+/// Longest value that is read or written, with what a row adds to it.
+inline constexpr int kMaximumStateValueBytes = 100 * 1024 * 1024 + 64 * 1024;
+
+/// The file of the state database: makes it, opens it, and sets a damaged one aside under a dated name, with whatever
+/// can still be read of it copied into a new one. Everything here happens under a lock on the folder, so that
+/// processes that start at once do it one after the other. One thread at a time.
+class StateDatabaseFile final {
+ public:
+  enum class Purpose { reading, writing };
+
+  struct Opened {
+    std::unique_ptr<SQLiteConnection> connection;  ///< null after an error, or when there is nothing to read yet
+    ErrorRef error;
+    ErrorRef notice;          ///< for the user: a damaged database was set aside
+    bool isSnapshot = false;  ///< the connection does not see later changes
+  };
+
+  /// Touches nothing. `clock` outlives this.
+  StateDatabaseFile(std::filesystem::path folder, const Clock& clock);
+
+  const std::filesystem::path& path() const { return _path; }
+
+  /// Opens the file; for writing it is made where it is missing, readable and writable by its owner only. Where the
+  /// folder lets nothing be written the file is opened for reading, if it can be.
+  Opened open(Purpose purpose);
+
+  /// Sets the file aside that `damaged` has open, unless another process has done so, and opens the new one.
+  Opened replaceDamaged(std::unique_ptr<SQLiteConnection> damaged);
+
+  /// What SQLite could not do as a sentence with the file and an advice.
+  ErrorRef errorOfFailure(const SQLiteFailure& failure, Purpose purpose) const;
+
+ private:
+  // Each of these needs the folder's lock. The first two throw SQLiteFailure.
+  Opened openLocked(Purpose purpose);
+  std::unique_ptr<SQLiteConnection> connect(bool& isSnapshot) const;
+  Opened replaceLocked();
+
+  ErrorRef error(StateDatabaseError code, std::string reason) const;
+  /// A name for a damaged file that nothing has yet: "state.sqlite.broken-2026-01-05T12-00-00".
+  std::filesystem::path nameForDamaged() const;
+
+  std::filesystem::path _folder;
+  std::filesystem::path _path;
+  const Clock& _clock;
+};
+
+}  // namespace nimbo
