@@ -1,0 +1,46 @@
+#pragma once
+
+#include <map>
+#include <nlohmann/json.hpp>
+
+#include "desktop/archive/ArchiveFormat.h"
+#include "platform/archive/KeyedArchive.h"
+
+namespace nimbo {
+
+/// Reads the objects of a parsed archive.
+class CBORKeyedUnarchiver final : public KeyedUnarchiver {
+ public:
+  /// `content` is the archive's outermost map.
+  explicit CBORKeyedUnarchiver(nlohmann::json content) : _content(std::move(content)) {}
+
+  void setClass_forClassName(const ArchivableClass& archivableClass, std::string_view name) override;
+  void setDecodingFailurePolicy(DecodingFailurePolicy policy) override { _policy = policy; }
+  Decoded decodeTopLevelObjectOfClasses_forKey(const AllowedClasses& classes, std::string_view key) override;
+  void finishDecoding() override { _content = nullptr; }
+
+  // For the decoders of the objects.
+
+  /// Null, after `fail`, for a value or class that is not allowed; null also for an object that decodes to nothing.
+  ObjectRef objectOf(const nlohmann::json& value, const AllowedClasses& classes);
+  /// Keeps the first reason, with the path at this moment; throws it under the policy of raising.
+  void fail(const std::string& reason);
+  bool hasFailed() const { return !_failure.empty(); }
+  ArchivePath& path() { return _path; }
+
+ private:
+  bool isAllowed(const AllowedClasses& classes, const ArchivableClass& archivableClass, std::string_view kind);
+  ObjectRef arrayOf(const nlohmann::json& value, const AllowedClasses& classes);
+  ObjectRef classedObjectOf(const nlohmann::json& value, const AllowedClasses& classes);
+  ObjectRef dateOf(const nlohmann::json& value);
+  ObjectRef errorOf(const nlohmann::json& value);
+  BoxedDictionary::Entries entriesOf(const nlohmann::json& object, std::string_view key, const AllowedClasses& classes);
+
+  nlohmann::json _content;
+  std::map<std::string, ArchivableClass, std::less<>> _substitutes;
+  DecodingFailurePolicy _policy = DecodingFailurePolicy::raiseException;
+  ArchivePath _path;
+  std::string _failure;
+};
+
+}  // namespace nimbo
