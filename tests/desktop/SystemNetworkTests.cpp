@@ -1,0 +1,78 @@
+#include <gtest/gtest.h>
+
+#include <map>
+#include <string>
+
+#include "desktop/system/LinuxNetworkFailureDiagnosis.h"
+#include "support/TemporaryFolder.h"
+
+namespace nimbo {
+namespace {
+
+const std::string kRoutes4 = "Iface\tDestination\tGateway \tFlags\tRefCnt\tUse\tMetric\tMask\t\tMTU\tWindow\tIRTT\n";
+const std::string kNearOnly = kRoutes4 + "eth0\t000200C0\t00000000\t0001\t0\t0\t0\t00FFFFFF\t0\t0\t0\n";
+const std::string kDefault4 = kNearOnly + "eth0\t00000000\t010200C0\t0003\t0\t0\t0\t00000000\t0\t0\t0\n";
+const std::string kRejected4 = kNearOnly + "*\t00000000\t00000000\t0201\t0\t0\t0\t00000000\t0\t0\t0\n";
+const std::string kZeros(32, '0');
+const std::string kDefault6 =
+    kZeros + " 00 " + kZeros + " 00 fe800000000000000000000000000001 00000400 00000001 00000000 00000003     eth0\n";
+const std::string kUnreachable6 =
+    kZeros + " 00 " + kZeros + " 00 " + kZeros + " ffffffff 00000001 00000000 00200200       lo\n";
+
+TEST(LinuxNetworkFailureDiagnosis, ReadsRadiosAndRoutes) {
+  using Files = std::map<std::string, std::string>;
+  const Files kNoRoute{{"proc/net/route", kNearOnly}, {"proc/net/ipv6_route", kUnreachable6}};
+  const auto noRouteAnd = [&](Files files) {
+    files.insert(kNoRoute.begin(), kNoRoute.end());
+    return files;
+  };
+  const Files kBlockedRadios{
+      {"sys/class/rfkill/rfkill0/type", "wlan\n"}, {"sys/class/rfkill/rfkill0/soft", "1\n"},
+      {"sys/class/rfkill/rfkill0/hard", "0\n"},    {"sys/class/rfkill/rfkill1/type", "bluetooth\n"},
+      {"sys/class/rfkill/rfkill1/soft", "0\n"},    {"sys/class/rfkill/rfkill1/hard", "1\n"}};
+  Files oneFreeRadio = kBlockedRadios;
+  oneFreeRadio["sys/class/rfkill/rfkill1/hard"] = "0\n";
+  const auto mobile = [](const std::string& state) {
+    return Files{{"sys/class/net/eth0/operstate", "up\n"},
+                 {"sys/class/net/wwan0/uevent", "DEVTYPE=wwan\nINTERFACE=wwan0\n"},
+                 {"sys/class/net/wwan0/operstate", state}};
+  };
+  Files blockedWithRoute = kBlockedRadios;
+  blockedWithRoute["proc/net/route"] = kDefault4;
+
+  const struct {
+    const char* name;
+    Files files;
+    NetworkFailure expected;
+  } kCases[] = {
+      {"nothing to read", {}, NetworkFailure::unknown},
+      {"a route", {{"proc/net/route", kDefault4}}, NetworkFailure::unknown},
+      {"a route of version 6 only",
+       {{"proc/net/route", kRoutes4}, {"proc/net/ipv6_route", kUnreachable6 + kDefault6}},
+       NetworkFailure::unknown},
+      {"no route", kNoRoute, NetworkFailure::noInternet},
+      {"an unreachable default", {{"proc/net/route", kRejected4}}, NetworkFailure::noInternet},
+      {"a table cut off", {{"proc/net/route", "eth0\t00000000"}}, NetworkFailure::noInternet},
+      {"all radios blocked", noRouteAnd(kBlockedRadios), NetworkFailure::airplaneMode},
+      {"all radios blocked, cable in", blockedWithRoute, NetworkFailure::unknown},
+      {"one radio free", noRouteAnd(oneFreeRadio), NetworkFailure::noInternet},
+      {"mobile data down", noRouteAnd(mobile("down\n")), NetworkFailure::cellularDataDisabled},
+      {"mobile data up", noRouteAnd(mobile("unknown\n")), NetworkFailure::noInternet},
+      {"modem without an interface", noRouteAnd({{"sys/class/wwan/wwan0/uevent", ""}}),
+       NetworkFailure::cellularDataDisabled},
+      {"mobile radio blocked",
+       noRouteAnd({{"sys/class/rfkill/rfkill0/type", "wlan\n"},
+                   {"sys/class/rfkill/rfkill0/soft", "0\n"},
+                   {"sys/class/rfkill/rfkill2/type", "wwan\n"},
+                   {"sys/class/rfkill/rfkill2/soft", "1\n"}}),
+       NetworkFailure::cellularDataDisabled},
+  };
+  for (const auto& test : kCases) {
+    const TemporaryFolder root;
+    for (const auto& [path, text] : test.files) root.write(path, text);
+    EXPECT_EQ(LinuxNetworkFailureDiagnosis(root.path()).diagnose(), test.expected) << test.name;
+  }
+}
+
+}  // namespace
+}  // namespace nimbo
