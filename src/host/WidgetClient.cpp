@@ -65,6 +65,8 @@ WidgetClient::WidgetClient(GLibRunLoop& runLoop, const std::vector<std::string>&
   _running = true;
   _input = std::move(fromWidget.reading);
   _output = std::move(toWidget.writing);
+  // A widget that does not read must not stop its host.
+  fcntl(_output.get(), F_SETFL, fcntl(_output.get(), F_GETFL) | O_NONBLOCK);
   _connection = std::make_unique<JSONRPCConnection>(_runLoop, _input.get(), _output.get());
   _connection->setClosedHandler([this] { _running = false; });
   handleOpening("openURL");
@@ -80,6 +82,10 @@ void WidgetClient::handleOpening(const char* method) {
   });
 }
 
+void WidgetClient::kill() {
+  if (_process > 0) ::kill(_process, SIGKILL);
+}
+
 WidgetClient::~WidgetClient() {
   _connection.reset();
   _output = FileDescriptor();
@@ -89,7 +95,7 @@ WidgetClient::~WidgetClient() {
   constexpr int kGraceMilliseconds = 1000;
   const FileDescriptor process(static_cast<int>(syscall(SYS_pidfd_open, _process, 0)));
   pollfd ended{process.get(), POLLIN, 0};
-  if (process.get() < 0 || poll(&ended, 1, kGraceMilliseconds) != 1) kill(_process, SIGKILL);
+  if (process.get() < 0 || poll(&ended, 1, kGraceMilliseconds) != 1) kill();
   waitpid(_process, nullptr, 0);
 }
 

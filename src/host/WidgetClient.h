@@ -39,6 +39,8 @@ class WidgetClient {
   void setOpenHandler(OpenHandler handler) { _openHandler = std::move(handler); }
   JSONRPCConnection& connection() { return *_connection; }
   bool isRunning() const { return _running; }
+  /// Ends a process that is not to be trusted to end by itself.
+  void kill();
 
   /// Asks and waits for the answer, serving the widget's own requests meanwhile. Throws WidgetClientFailure.
   nlohmann::json call(std::string_view method, const nlohmann::json& params = nlohmann::json::object());

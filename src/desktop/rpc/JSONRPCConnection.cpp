@@ -14,6 +14,11 @@ namespace {
 /// A text for the other end: bad UTF-8 inside a message is replaced rather than thrown on.
 std::string lineOf(const json& message) { return message.dump(-1, ' ', false, json::error_handler_t::replace) + "\n"; }
 
+bool waitWritable(int fd, int milliseconds) {
+  pollfd ready{fd, POLLOUT, 0};
+  return ::poll(&ready, 1, milliseconds) != 0;
+}
+
 bool isID(const json& id) { return id.is_string() || id.is_number() || id.is_null(); }
 
 }  // namespace
@@ -48,9 +53,7 @@ void JSONRPCConnection::readAvailable() {
   } else if (_buffer.size() > kMaximumLine) {
     _skippingLine = true;
     _buffer.clear();
-    JSONRPCResponder(nullptr, [this](const json& answer) {
-      send(answer);
-    }).fail({JSONRPCError::kInvalidRequest, "a line is longer than " + std::to_string(kMaximumLine) + " bytes"});
+    refuse(nullptr, JSONRPCError::kInvalidRequest, "a line is longer than " + std::to_string(kMaximumLine) + " bytes");
   }
 }
 
@@ -68,11 +71,8 @@ void JSONRPCConnection::handleLine(std::string_view line) {
     return depth <= kMaximumDepth;
   };
   const json message = json::parse(line, bounded, false);
-  const auto fail = [this](int code, std::string text) {
-    JSONRPCResponder(nullptr, [this](const json& answer) { send(answer); }).fail({code, std::move(text)});
-  };
-  if (message.is_discarded()) return fail(JSONRPCError::kParseError, "the line is not JSON");
-  if (tooDeep) return fail(JSONRPCError::kInvalidRequest, "the message is nested too deeply");
+  if (message.is_discarded()) return refuse(nullptr, JSONRPCError::kParseError, "the line is not JSON");
+  if (tooDeep) return refuse(nullptr, JSONRPCError::kInvalidRequest, "the message is nested too deeply");
   handleMessage(message);
 }
 
@@ -86,9 +86,13 @@ void JSONRPCConnection::handleMessage(const json& message) {
       (!message.contains("params") || message["params"].is_object()))
     return handleRequest(message);
   const bool hasID = message.is_object() && message.contains("id") && isID(message["id"]);
-  JSONRPCResponder(hasID ? message["id"] : json(nullptr), [this](const json& answer) { send(answer); })
-      .fail({JSONRPCError::kInvalidRequest,
-             "a request is one object with \"jsonrpc\": \"2.0\", \"method\", and, if any, \"params\" as an object"});
+  refuse(hasID ? message["id"] : json(nullptr), JSONRPCError::kInvalidRequest,
+         "a request is one object with \"jsonrpc\": \"2.0\", \"method\", and, if any, \"params\" as an object");
+}
+
+void JSONRPCConnection::refuse(const json& id, int code, std::string problem) {
+  if (_malformed) return _malformed(problem);
+  JSONRPCResponder(id, [this](const json& answer) { send(answer); }).fail({code, std::move(problem)});
 }
 
 void JSONRPCConnection::handleAnswer(const json& message) {
@@ -145,16 +149,16 @@ void JSONRPCConnection::call(std::string_view method, const json& params, Comple
 void JSONRPCConnection::send(const json& message) { sendLine(lineOf(message)); }
 
 void JSONRPCConnection::sendLine(std::string_view line) {
+  constexpr int kPatienceMilliseconds = 1000;
   std::string terminated;
   if (!line.ends_with('\n')) line = terminated = std::string(line) + "\n";
   while (_open && !line.empty()) {
     const ssize_t count = ::write(_output, line.data(), line.size());
     if (count >= 0) {
       line.remove_prefix(static_cast<std::size_t>(count));
-    } else if (errno == EAGAIN) {
-      pollfd ready{_output, POLLOUT, 0};
-      ::poll(&ready, 1, -1);
-    } else if (errno != EINTR) {
+    } else if (errno == EINTR || (errno == EAGAIN && waitWritable(_output, kPatienceMilliseconds))) {
+      continue;
+    } else {
       // Closing here would destroy what is being used by the callers above: the reading side notices next.
       _open = false;
       const std::weak_ptr<bool> alive = _alive;

@@ -15,7 +15,8 @@
 namespace nimbo {
 
 /// JSON-RPC 2.0 over two descriptors, one message a line, both ends alike. A line that is no message gets its error
-/// answer and the connection goes on; a line longer than `kMaximumLine` bytes is skipped whole. Main thread only.
+/// answer and the connection goes on; a line longer than `kMaximumLine` bytes is skipped whole. A non-blocking output
+/// that stays full for a second closes the connection. Main thread only.
 class JSONRPCConnection {
  public:
   using RequestHandler = std::function<void(const nlohmann::json& params, const JSONRPCResponder& responder)>;
@@ -34,6 +35,11 @@ class JSONRPCConnection {
   void setHandler(std::string method, RequestHandler handler);
   /// Hears once when the other end closed its side or a descriptor failed.
   void setClosedHandler(std::function<void()> closed) { _closed = std::move(closed); }
+  /// Hears of what is no message, in place of the other end, which then gets no error answer: for a host that ends a
+  /// widget process that speaks nonsense.
+  void setMalformedHandler(std::function<void(const std::string& problem)> malformed) {
+    _malformed = std::move(malformed);
+  }
   /// Sees every line that arrives before it is handled.
   void setLineObserver(std::function<void(std::string_view)> observer) { _lineObserver = std::move(observer); }
 
@@ -53,6 +59,8 @@ class JSONRPCConnection {
   void handleRequest(const nlohmann::json& message);
   void close();
   void send(const nlohmann::json& message);
+  /// Answers what is no message with an error.
+  void refuse(const nlohmann::json& id, int code, std::string problem);
 
   GLibRunLoop& _runLoop;
   int _input;
@@ -65,6 +73,7 @@ class JSONRPCConnection {
   std::map<std::string, RequestHandler, std::less<>> _handlers;
   std::map<std::int64_t, Completion> _pending;
   std::function<void()> _closed;
+  std::function<void(const std::string&)> _malformed;
   std::function<void(std::string_view)> _lineObserver;
   // Callbacks may destroy the connection while it handles a line.
   std::shared_ptr<bool> _alive = std::make_shared<bool>(true);
