@@ -1,0 +1,239 @@
+// Our records against protoc's generated code for the published schema, which knows nothing of ours.
+
+#include <google/protobuf/unknown_field_set.h>
+#include <gtest/gtest.h>
+#include <nimbo-activity.pb.h>
+
+#include <limits>
+#include <random>
+
+#include "handoff/NimboActivity.h"
+
+namespace nimbo {
+namespace {
+
+using google::protobuf::FieldDescriptor;
+using google::protobuf::Message;
+
+enum class Fill { smallest, largest, zero };
+
+template <class T>
+T extreme(Fill fill) {
+  if (fill == Fill::zero) return 0;
+  return fill == Fill::smallest ? std::numeric_limits<T>::lowest() : std::numeric_limits<T>::max();
+}
+
+/// Sets every field, nested ones and two elements of each repeated one included.
+void fillFields(Message& message, Fill fill) {
+  const auto* reflection = message.GetReflection();
+  for (int index = 0; index < message.GetDescriptor()->field_count(); ++index) {
+    const FieldDescriptor* field = message.GetDescriptor()->field(index);
+    for (int count = field->is_repeated() ? 2 : 1; count > 0; --count) {
+      const auto set = [&](auto setter, auto adder, auto value) {
+        if (field->is_repeated())
+          (reflection->*adder)(&message, field, value);
+        else
+          (reflection->*setter)(&message, field, value);
+      };
+      using R = google::protobuf::Reflection;
+      switch (field->cpp_type()) {
+        case FieldDescriptor::CPPTYPE_INT32:
+          set(&R::SetInt32, &R::AddInt32, extreme<std::int32_t>(fill));
+          break;
+        case FieldDescriptor::CPPTYPE_INT64:
+          set(&R::SetInt64, &R::AddInt64, extreme<std::int64_t>(fill));
+          break;
+        case FieldDescriptor::CPPTYPE_UINT32:
+          set(&R::SetUInt32, &R::AddUInt32, extreme<std::uint32_t>(fill));
+          break;
+        case FieldDescriptor::CPPTYPE_UINT64:
+          // The least unsigned value but 0, which `zero` gives.
+          set(&R::SetUInt64, &R::AddUInt64, fill == Fill::smallest ? 1 : extreme<std::uint64_t>(fill));
+          break;
+        case FieldDescriptor::CPPTYPE_DOUBLE:
+          set(&R::SetDouble, &R::AddDouble, extreme<double>(fill));
+          break;
+        case FieldDescriptor::CPPTYPE_BOOL:
+          set(&R::SetBool, &R::AddBool, fill != Fill::zero);
+          break;
+        case FieldDescriptor::CPPTYPE_STRING:
+          reflection->SetString(&message, field,
+                                fill == Fill::zero ? "" : std::string(fill == Fill::largest ? 300 : 1, 'x'));
+          break;
+        default:
+          fillFields(field->is_repeated() ? *reflection->AddMessage(&message, field)
+                                          : *reflection->MutableMessage(&message, field),
+                     fill);
+      }
+    }
+  }
+}
+
+proto::NimboActivity filled(Fill fill) {
+  proto::NimboActivity message;
+  fillFields(message, fill);
+  return message;
+}
+
+std::string asText(const Bytes& bytes) { return {bytes.begin(), bytes.end()}; }
+
+std::span<const std::uint8_t> asBytes(const std::string& text) {
+  return {reinterpret_cast<const std::uint8_t*>(text.data()), text.size()};
+}
+
+bool readInto(NimboActivity& activity, const std::string& text) {
+  ProtobufReader reader(asBytes(text));
+  return activity.readFrom(reader);
+}
+
+/// The present fields by name, as our dictionary representation must have them.
+void expectSameFields(const BoxedDictionary& ours, const Message& theirs) {
+  std::vector<const FieldDescriptor*> fields;
+  theirs.GetReflection()->ListFields(theirs, &fields);
+  EXPECT_EQ(ours.entries().size(), fields.size()) << theirs.GetTypeName();
+  for (const FieldDescriptor* field : fields) {
+    const ObjectRef value = ours.objectForKey(field->name());
+    ASSERT_TRUE(value) << field->full_name();
+    if (const auto* dictionary = dynamic_cast<const BoxedDictionary*>(value.get()))
+      expectSameFields(*dictionary, theirs.GetReflection()->GetMessage(theirs, field));
+    const auto* array = dynamic_cast<const BoxedArray*>(value.get());
+    if (!array) continue;
+    // Repeated fields are arrays, and so are the messages that are lists of elements.
+    const Message& holder = field->is_repeated() ? theirs : theirs.GetReflection()->GetMessage(theirs, field);
+    const FieldDescriptor* elements = field->is_repeated() ? field : holder.GetDescriptor()->FindFieldByName("element");
+    ASSERT_EQ(static_cast<int>(array->elements().size()), holder.GetReflection()->FieldSize(holder, elements));
+    for (int index = 0; index < holder.GetReflection()->FieldSize(holder, elements); ++index)
+      if (const auto* element =
+              dynamic_cast<const BoxedDictionary*>(array->elements()[static_cast<std::size_t>(index)].get()))
+        expectSameFields(*element, holder.GetReflection()->GetRepeatedMessage(holder, elements, index));
+  }
+}
+
+TEST(Wire, EveryFieldIsReadAndWrittenAsTheGeneratedCodeDoes) {
+  for (const Fill fill : {Fill::smallest, Fill::largest}) {
+    const std::string theirs = filled(fill).SerializeAsString();
+    NimboActivity ours;
+    ASSERT_TRUE(readInto(ours, theirs));
+    EXPECT_EQ(asText(ours.data()), theirs);
+    EXPECT_EQ(asText(ours.copyWithZone()->data()), theirs);
+    EXPECT_TRUE(ours.isEqual(ours.copyWithZone().get()));
+  }
+}
+
+TEST(Wire, NamesOfFieldsAreThoseOfTheSchema) {
+  const proto::NimboActivity theirs = filled(Fill::largest);
+  NimboActivity ours;
+  ASSERT_TRUE(readInto(ours, theirs.SerializeAsString()));
+  expectSameFields(*ours.dictionaryRepresentation(), theirs);
+}
+
+TEST(Wire, PresentZerosAndEmptyTextsKeepTheirPresence) {
+  proto::NimboActivity theirs = filled(Fill::zero);
+  theirs.clear_lineitem();  // whose numbers take absence for 0
+  NimboActivity ours;
+  ASSERT_TRUE(readInto(ours, theirs.SerializeAsString()));
+  EXPECT_EQ(asText(ours.data()), theirs.SerializeAsString());
+  EXPECT_TRUE(ours.hasSelectedPlaceIndex());
+  EXPECT_TRUE(ours.directionsPlan()->hasIsPlayingTrace());
+}
+
+TEST(Wire, UnknownFieldsOfEveryKindAreSkippedAndDropped) {
+  proto::NimboActivity theirs = filled(Fill::largest);
+  const std::string known = theirs.SerializeAsString();
+  for (Message* message : {static_cast<Message*>(&theirs), static_cast<Message*>(theirs.mutable_directionsplan()),
+                           static_cast<Message*>(theirs.mutable_lineitem()->mutable_incidents(1)),
+                           static_cast<Message*>(theirs.mutable_lineitem()->mutable_artwork())}) {
+    auto* unknown = message->GetReflection()->MutableUnknownFields(message);
+    unknown->AddVarint(20, UINT64_MAX);
+    unknown->AddFixed32(21, 1);
+    unknown->AddFixed64(536870911, 2);
+    unknown->AddLengthDelimited(22, "unknown");
+    auto* group = unknown->AddGroup(23);
+    group->AddGroup(23)->AddVarint(1, 1);
+    group->AddLengthDelimited(24, "in a group");
+  }
+  NimboActivity ours;
+  ASSERT_TRUE(readInto(ours, theirs.SerializeAsString()));
+  EXPECT_EQ(asText(ours.data()), known);
+}
+
+TEST(Wire, ACutAnywhereIsJudgedAsTheGeneratedCodeJudgesIt) {
+  proto::NimboActivity theirs = filled(Fill::smallest);
+  theirs.GetReflection()->MutableUnknownFields(&theirs)->AddGroup(30)->AddFixed64(1, 1);
+  const std::string whole = theirs.SerializeAsString();
+  for (std::size_t length = 0; length <= whole.size(); ++length) {
+    const std::string cut = whole.substr(0, length);
+    NimboActivity ours;
+    ProtobufReader reader(asBytes(cut));
+    EXPECT_EQ(ours.readFrom(reader), proto::NimboActivity().ParsePartialFromString(cut)) << "at " << length;
+    EXPECT_EQ(reader.failureText().empty(), !reader.hasError());
+  }
+}
+
+TEST(Wire, ChangedBytesEndInAnAnswerAndNeverBeyondTheEnd) {
+  const std::string whole = filled(Fill::largest).SerializeAsString();
+  std::mt19937 random(7);
+  for (int round = 0; round < 3000; ++round) {
+    std::string changed = whole;
+    for (int change = 0; change < 3; ++change) changed[random() % changed.size()] = static_cast<char>(random());
+    NimboActivity ours;
+    ProtobufReader reader(asBytes(changed));
+    const bool read = ours.readFrom(reader);
+    EXPECT_LE(reader.position(), changed.size());
+    if (!read) continue;
+    // What was read can be written, and reads back as itself.
+    NimboActivity again;
+    const std::string rewritten = asText(ours.data());
+    EXPECT_TRUE(readInto(again, rewritten));
+    EXPECT_EQ(asText(again.data()), rewritten);
+  }
+}
+
+TEST(Wire, ReadingFollowsItsRulesAtTheEdges) {
+  const struct {
+    const char* name;
+    std::string bytes;
+    bool read;
+    bool hasMode;
+    std::int32_t mode;
+    const char* failure;
+  } cases[] = {
+      {"no bytes", "", true, false, 0, ""},
+      {"cut in a value", "\x10\xff", false, true, 0, "collectionsMode: the bytes end inside a number, at byte 1"},
+      {"cut before a value", "\x10", false, true, 0, "collectionsMode: the bytes end inside a number, at byte 1"},
+      {"ten bytes without end are 0", "\x10" + std::string(10, '\xff'), true, true, 0, ""},
+      {"a tag without end is an unknown field", std::string(10, '\xff') + std::string("\x01\x10\x02", 3), true, true, 2,
+       ""},
+      {"the low 32 bits count", std::string("\x10\xff\xff\xff\xff\xff\x01", 7), true, true, -1, ""},
+      {"a known field is read as its type", "\x12\x02", true, true, 2, ""},
+      {"an end of group ends the record", "\x10\x03\x0c\x10\x02", true, true, 3, ""},
+      {"an unknown wire type", "\xf6\x01", false, false, 0, "the wire type is unknown, at byte 2"},
+      {"a group that ends as another", std::string("\x83\x01\x8c\x01", 4), false, false, 0,
+       "a group is closed that is not open, at byte 4"},
+      {"a length beyond the end", "\x10\x01\x1a\x05x", false, true, 1,
+       "searchString: the length exceeds the bytes that follow, at byte 3"},
+      {"a length beyond the record around it", "\x3a\x02\x12\x05long!", false, false, 0,
+       "directionsPlan.originString: the length exceeds the bytes that follow, at byte 3"},
+  };
+  for (const auto& test : cases) {
+    NimboActivity activity;
+    ProtobufReader reader(asBytes(test.bytes));
+    EXPECT_EQ(activity.readFrom(reader), test.read) << test.name;
+    EXPECT_EQ(activity.hasCollectionsMode(), test.hasMode) << test.name;
+    EXPECT_EQ(activity.collectionsMode(), test.mode) << test.name;
+    EXPECT_EQ(reader.failureText(), test.failure) << test.name;
+  }
+}
+
+TEST(Wire, GroupsNestAHundredDeepAndNoDeeper) {
+  for (const std::size_t depth : {std::size_t{100}, std::size_t{101}, std::size_t{1000000}}) {
+    std::string bytes;
+    for (std::size_t i = 0; i < depth; ++i) bytes += "\x83\x01";
+    for (std::size_t i = 0; i < depth; ++i) bytes += "\x84\x01";
+    NimboActivity activity;
+    EXPECT_EQ(readInto(activity, bytes), depth == 100) << depth;
+  }
+}
+
+}  // namespace
+}  // namespace nimbo
