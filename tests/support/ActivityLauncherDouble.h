@@ -1,9 +1,9 @@
 #pragma once
 
+#include <vector>
+
 #include "platform/RunLoop.h"
 #include "platform/UserActivity.h"
-
-#include <vector>
 
 namespace nimbo {
 

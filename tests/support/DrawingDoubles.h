@@ -1,11 +1,11 @@
 #pragma once
 
+#include <functional>
+#include <map>
+
 #include "platform/artwork/ArtworkCache.h"
 #include "platform/artwork/NamedImage.h"
 #include "platform/ui/TextSystem.h"
-
-#include <functional>
-#include <map>
 
 namespace nimbo {
 

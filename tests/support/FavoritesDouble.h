@@ -1,8 +1,8 @@
 #pragma once
 
-#include "platform/FavoritesStore.h"
-
 #include <mutex>
+
+#include "platform/FavoritesStore.h"
 
 namespace nimbo {
 

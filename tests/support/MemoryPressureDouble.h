@@ -1,8 +1,8 @@
 #pragma once
 
-#include "platform/MemoryPressure.h"
-
 #include <vector>
+
+#include "platform/MemoryPressure.h"
 
 namespace nimbo {
 

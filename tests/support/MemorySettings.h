@@ -1,9 +1,9 @@
 #pragma once
 
-#include "platform/SharedSettingsStore.h"
-
 #include <map>
 #include <mutex>
+
+#include "platform/SharedSettingsStore.h"
 
 namespace nimbo {
 

@@ -1,13 +1,13 @@
 #pragma once
 
-#include "platform/Signposts.h"
-#include "platform/foundation/Log.h"
-
 #include <functional>
 #include <mutex>
 #include <optional>
 #include <string>
 #include <vector>
+
+#include "platform/Signposts.h"
+#include "platform/foundation/Log.h"
 
 namespace nimbo {
 

@@ -1,13 +1,13 @@
 #pragma once
 
+#include <deque>
+#include <vector>
+
 #include "platform/AnalyticsPipeline.h"
 #include "platform/Bzip2Compress.h"
 #include "platform/DeviceLockState.h"
 #include "platform/NetworkFailureDiagnosis.h"
 #include "platform/RandomSource.h"
-
-#include <deque>
-#include <vector>
 
 namespace nimbo {
 

@@ -1,8 +1,8 @@
 #pragma once
 
-#include "platform/Localization.h"
-
 #include <map>
+
+#include "platform/Localization.h"
 
 namespace nimbo {
 

@@ -1,13 +1,13 @@
 #pragma once
 
-#include "platform/RunLoop.h"
-#include "platform/VirtualTime.h"
-
 #include <condition_variable>
 #include <deque>
 #include <functional>
 #include <mutex>
 #include <thread>
+
+#include "platform/RunLoop.h"
+#include "platform/VirtualTime.h"
 
 namespace nimbo {
 

@@ -1,10 +1,10 @@
 #pragma once
 
-#include "platform/TransitLineService.h"
-#include "support/TestRunLoop.h"
-
 #include <deque>
 #include <mutex>
+
+#include "platform/TransitLineService.h"
+#include "support/TestRunLoop.h"
 
 namespace nimbo {
 

@@ -1,0 +1,33 @@
+#pragma once
+
+#include <vector>
+
+#include "platform/WidgetHost.h"
+
+namespace nimbo {
+
+/// A host that a test sets and reads.
+class WidgetHostDouble final : public WidgetHost {
+ public:
+  WidgetDisplayMode activeDisplayMode() const override { return activeMode; }
+  Size maximumSizeForDisplayMode(WidgetDisplayMode mode) const override {
+    return mode == WidgetDisplayMode::Compact ? compactMaximum : expandedMaximum;
+  }
+  void setLargestAvailableDisplayMode(WidgetDisplayMode mode) override { largestMode = mode; }
+  WidgetDisplayMode largestAvailableDisplayMode() const override { return largestMode; }
+  void openURL(const URL& url, std::function<void(bool opened)> completion) override {
+    openedURLs.push_back(url);
+    completion(opens);
+  }
+  void preferredContentSizeDidChange(Size size) override { preferredSizes.push_back(size); }
+
+  WidgetDisplayMode activeMode = WidgetDisplayMode::Compact;
+  WidgetDisplayMode largestMode = WidgetDisplayMode::Expanded;
+  Size compactMaximum{359, 110};
+  Size expandedMaximum{359, 616};
+  bool opens = true;  ///< what `openURL` reports
+  std::vector<URL> openedURLs;
+  std::vector<Size> preferredSizes;
+};
+
+}  // namespace nimbo

@@ -1,0 +1,77 @@
+#include <gmock/gmock.h>
+
+#include "incidents/DebugSettings.h"
+#include "incidents/DebugTransitIncident.h"
+#include "incidents/NBTransitIncidentFetcher.h"
+#include "incidents/SharedSettingsStore+Nimbo.h"
+#include "support/TestPlatform.h"
+#include "support/TransitFixtures.h"
+
+namespace nimbo {
+namespace {
+
+/// What a fetch delivers for `items` under the settings in force.
+TransitLineItems fetched(TestPlatform& platform, const TransitLineItems& items) {
+  platform.favorites.setFavorites(Favorites{std::make_shared<const FavoriteTransitLine>(items.at(0))});
+  const auto request =
+      std::make_shared<NBTransitIncidentFetcher>()->fetchFavoriteLinesTransitIncidentsWithCompletionHandler(nullptr);
+  platform.loop.waitAndDrain([&] { return platform.transitLines.pending() == 1; });
+  platform.transitLines.answer(items);
+  platform.loop.runUntilIdle();
+  TransitLineItems delivered;
+  request->result()->withValue_orError(
+      [&](const ObjectRef& value) {
+        delivered = static_cast<const BoxedArray&>(*value).elementsOfClass<TransitLineItem>();
+      },
+      [](const ErrorRef&) {});
+  return delivered;
+}
+
+TEST(FakeIncidents, ComeToLinesWithoutIncidentsAsTheNumbersFall) {
+  TestPlatform platform;
+  const TransitLineItems items{lineItem(10, "with", {incident(1)}), lineItem(20, "kept"), lineItem(30, "faked"),
+                               lineItem(40, "faked too")};
+  platform.random.numbers = {3, 1, 5};
+  EXPECT_EQ(fetched(platform, items), items);
+  EXPECT_EQ(platform.random.numbers.size(), 3u) << "random numbers were drawn with the setting off";
+
+  __nimbo_groupUserDefaults()->setValue_forKey(true, kNimboTransitWidgetDebugInjectFakeIncidents);
+  TransitLineItems delivered = fetched(platform, items);
+  ASSERT_EQ(delivered.size(), 4u);
+  EXPECT_EQ(delivered[0], items[0]);
+  EXPECT_EQ(delivered[1], items[1]);
+  for (const std::size_t faked : {2, 3}) {
+    EXPECT_EQ(delivered[faked]->className(), "DebugTransitLineItem");
+    EXPECT_EQ(delivered[faked]->muid(), items[faked]->muid());
+    EXPECT_EQ(delivered[faked]->alternateArtwork(), items[faked]->alternateArtwork());
+    EXPECT_EQ(delivered[faked]->incidents().size(), 1u);
+    EXPECT_TRUE(delivered[faked]->hasIncidentComponent());
+    EXPECT_FALSE(delivered[faked]->isIncidentsTTLExpired());
+  }
+
+  __nimbo_groupUserDefaults()->setValue_forKey(true, kNimboTransitWidgetDebugRandomNumberIncidents);
+  platform.random.numbers = {1, 3, 2, 5, 0};  // none for the first, two for the second, the last is kept
+  delivered = fetched(platform, items);
+  EXPECT_EQ(delivered[1]->className(), "DebugTransitLineItem");
+  EXPECT_EQ(delivered[1]->incidents().size(), 0u);
+  ASSERT_EQ(delivered[2]->incidents().size(), 2u);
+  EXPECT_EQ(delivered[2]->incidents()[0]->muid(), delivered[2]->incidents()[1]->muid());
+  EXPECT_EQ(delivered[3], items[3]);
+}
+
+TEST(FakeIncidents, AreUnderWayOnTheirLine) {
+  const TestPlatform platform;
+  const auto fake = DebugTransitIncident::__debug_fakeIncidentAffectingLine(*lineItem(1000, "Red"));
+  EXPECT_EQ(fake->muid(), 1001u);
+  EXPECT_EQ(fake->summary(), "Red · Possible delays due to strike");
+  EXPECT_EQ(isoTextOfDate(*fake->startDate()), "2026-01-04T12:00:00Z");
+  EXPECT_EQ(isoTextOfDate(*fake->endDate()), "2026-01-06T12:00:00Z");
+  EXPECT_EQ(fake->creationDate(), fake->startDate());
+  EXPECT_EQ(fake->lastUpdated(), TestPlatform::startDate());
+  EXPECT_TRUE(fake->isBlockingIncident());
+  ASSERT_EQ(fake->affectedEntities().size(), 1u);
+  EXPECT_EQ(fake->affectedEntities()[0]->muid(), 1000u);
+}
+
+}  // namespace
+}  // namespace nimbo

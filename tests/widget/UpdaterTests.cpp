@@ -1,0 +1,120 @@
+#include <gmock/gmock.h>
+
+#include "incidents/NBTransitIncidentUpdater.h"
+#include "support/TestPlatform.h"
+#include "support/TransitFixtures.h"
+
+namespace nimbo {
+namespace {
+
+using testing::ElementsAre;
+using Minutes = std::optional<int>;  // from the start of the test's clock
+
+Date at(int minutes) { return dateByAdding(TestPlatform::startDate(), 60.0 * minutes); }
+
+TransitLineItemRef lineWith(const std::vector<std::pair<Minutes, Minutes>>& periods) {
+  TransitIncidents incidents;
+  for (const auto& [start, end] : periods)
+    incidents.push_back(incident(incidents.size(), start ? std::optional(at(*start)) : std::nullopt,
+                                 end ? std::optional(at(*end)) : std::nullopt));
+  return lineItem(1, "A", std::move(incidents));
+}
+
+class Observer final : public NBTransitIncidentUpdaterObserver {
+ public:
+  void transitIncidentUpdater_dateExpired(NBTransitIncidentUpdater& updater, Date date) override {
+    expired.push_back(date);
+    if (invalidates) updater.invalidate();
+  }
+  void transitIncidentUpdaterNeedsRefresh(NBTransitIncidentUpdater&) override { ++refreshes; }
+  std::vector<Date> expired;
+  int refreshes = 0;
+  bool invalidates = false;
+};
+
+class Updater : public testing::Test {
+ protected:
+  std::shared_ptr<NBTransitIncidentUpdater> start(TransitLineItems items) {
+    auto updater = NBTransitIncidentUpdater::initWithTransitLineItems_refreshInterval(std::move(items), 1800);
+    updater->setObserver(observer);
+    return updater;
+  }
+  TestPlatform platform;
+  std::shared_ptr<Observer> observer = std::make_shared<Observer>();
+};
+
+TEST_F(Updater, WaitsForTheDatesThatChangeTheRows) {
+  const struct {
+    std::vector<std::pair<Minutes, Minutes>> periods;
+    std::set<Date> dates;
+  } cases[] = {
+      {{}, {}},
+      {{{std::nullopt, std::nullopt}, {-10, std::nullopt}, {-10, -5}, {-10, 0}}, {}},
+      {{{-10, 30}, {std::nullopt, 30}, {0, 20}}, {at(20), at(30)}},
+      {{{10, 70}, {15, std::nullopt}}, {at(10), at(15), at(70)}},
+      {{{10, 5}, {10, -5}}, {at(-5), at(5), at(10)}},  // the end of what is still to start counts as it stands
+  };
+  for (const auto& [periods, dates] : cases) {
+    const auto updater = start({lineItem(2, "B"), lineWith(periods)});
+    EXPECT_EQ(updater->updateDates(), dates);
+    updater->invalidate();
+  }
+}
+
+TEST_F(Updater, TellsEachDateWhenItIsReached) {
+  const auto updater = start({lineWith({{10, 20}}), lineWith({{-5, 20}})});
+  platform.time.advance(599);
+  EXPECT_TRUE(observer->expired.empty());
+  platform.time.advance(1);
+  EXPECT_THAT(observer->expired, ElementsAre(at(10)));
+  EXPECT_THAT(updater->updateDates(), ElementsAre(at(20)));
+  platform.time.advance(600);
+  EXPECT_THAT(observer->expired, ElementsAre(at(10), at(20)));
+  EXPECT_TRUE(updater->updateDates().empty());
+  EXPECT_EQ(observer->refreshes, 0);
+  updater->invalidate();
+}
+
+TEST_F(Updater, AsksForARefreshEveryInterval) {
+  const auto updater = start({});
+  platform.time.advance(1799);
+  EXPECT_EQ(observer->refreshes, 0);
+  platform.time.advance(2 * 1800);
+  EXPECT_EQ(observer->refreshes, 2);
+  updater->invalidate();
+  platform.time.advance(10 * 1800);
+  EXPECT_EQ(observer->refreshes, 2);
+}
+
+TEST_F(Updater, StopsAtADateThatPassedUnseen) {
+  const auto updater = start({lineWith({{10, 20}, {30, std::nullopt}})});
+  platform.time.setNow(at(25));  // asleep meanwhile
+  platform.time.advance(0);
+  EXPECT_THAT(observer->expired, ElementsAre(at(10)));
+  EXPECT_THAT(updater->updateDates(), ElementsAre(at(20), at(30)));
+  EXPECT_EQ(platform.time.pendingTimers(), 1u);  // the refresh
+  updater->invalidate();
+}
+
+TEST_F(Updater, LivesAndFiresUntilInvalidated) {
+  std::weak_ptr<NBTransitIncidentUpdater> updater = start({lineWith({{10, 20}})});
+  ASSERT_FALSE(updater.expired());
+  observer->invalidates = true;
+  platform.time.advance(3600);
+  EXPECT_THAT(observer->expired, ElementsAre(at(10)));
+  EXPECT_EQ(observer->refreshes, 0);
+  EXPECT_EQ(platform.time.pendingTimers(), 0u);
+  EXPECT_TRUE(updater.expired());
+}
+
+TEST_F(Updater, GoesOnWithoutItsObserver) {
+  const auto updater = start({lineWith({{10, 20}})});
+  observer.reset();
+  platform.time.advance(1800);
+  EXPECT_TRUE(updater->updateDates().empty());
+  EXPECT_EQ(updater->observer(), nullptr);
+  updater->invalidate();
+}
+
+}  // namespace
+}  // namespace nimbo
