@@ -1,0 +1,24 @@
+#include "desktop/drawing/CairoImageResources.h"
+
+#include "desktop/drawing/DrawnImage.h"
+#include "desktop/drawing/ShieldStyle.h"
+#include "desktop/drawing/VectorImageNamed.h"
+
+namespace nimbo {
+
+ImageRef CairoImageResources::image(std::string_view name, double screenScale, bool nightMode) {
+  // The widget has four images; more than this many are other scales and names that do not exist.
+  constexpr std::size_t kMaximumKept = 32;
+  if (_images.size() > kMaximumKept) _images.clear();
+  const auto [entry, isNew] = _images.try_emplace({std::string(name), screenScale, nightMode});
+  if (!isNew) return entry->second;
+  if (const auto drawing = vectorImageNamed(name)) {
+    const Size size = drawing->size();
+    entry->second = drawImage(size, screenScale, [&](cairo_t* context) {
+      drawing->draw(context, {0, 0, size.width, size.height}, labelColor(nightMode));
+    });
+  }
+  return entry->second;
+}
+
+}  // namespace nimbo

@@ -1,0 +1,255 @@
+#include "desktop/drawing/CairoShieldRenderer.h"
+
+#include <cairo.h>
+
+#include <algorithm>
+#include <cmath>
+#include <limits>
+#include <numbers>
+
+#include "desktop/drawing/CairoPainter.h"
+#include "desktop/drawing/DrawnImage.h"
+#include "desktop/drawing/VectorImageNamed.h"
+
+namespace nimbo {
+
+namespace {
+
+constexpr std::string_view kUnknownModeSymbol = "WidgetGenericTransit";
+
+/// The image of a TransitMode; empty for a value that is none.
+std::string_view symbolName(std::int64_t mode) {
+  switch (static_cast<TransitMode>(mode)) {
+    case TransitMode::unknown:
+      return kUnknownModeSymbol;
+    case TransitMode::tram:
+      return "mode-tram";
+    case TransitMode::subway:
+      return "mode-subway";
+    case TransitMode::rail:
+      return "mode-rail";
+    case TransitMode::bus:
+      return "mode-bus";
+    case TransitMode::ferry:
+      return "mode-ferry";
+    case TransitMode::cableTram:
+      return "mode-cable-tram";
+    case TransitMode::aerialLift:
+      return "mode-aerial-lift";
+    case TransitMode::funicular:
+      return "mode-funicular";
+    case TransitMode::trolleybus:
+      return "mode-trolleybus";
+    case TransitMode::monorail:
+      return "mode-monorail";
+  }
+  return {};
+}
+
+std::string trimmed(const std::optional<std::string>& text) {
+  constexpr std::string_view kSpace = " \t\r\n";
+  const std::size_t begin = text ? text->find_first_not_of(kSpace) : std::string::npos;
+  return begin == std::string::npos ? std::string() : text->substr(begin, text->find_last_not_of(kSpace) + 1 - begin);
+}
+
+/// The format strings with their separators, "{name}" standing for the token of that name; without format strings the
+/// alternative string.
+std::string plainText(const ServerFormattedString& string) {
+  if (!string.formatStrings || string.formatStrings->empty()) return trimmed(string.alternativeString);
+  std::string text;
+  for (std::size_t i = 0; i < string.formatStrings->size(); ++i) {
+    if (i > 0 && string.separators && i <= string.separators->size()) text += (*string.separators)[i - 1].value_or("");
+    text += (*string.formatStrings)[i].value_or("");
+  }
+  if (string.formatTokens)
+    for (const ServerFormatToken& token : *string.formatTokens) {
+      const std::string placeholder = "{" + token.name + "}";
+      for (std::size_t at = text.find(placeholder); at != std::string::npos;
+           at = text.find(placeholder, at + token.value.size()))
+        text.replace(at, placeholder.size(), token.value);
+    }
+  return trimmed(text);
+}
+
+void setColor(cairo_t* context, const Color& color) {
+  cairo_set_source_rgba(context, color.red, color.green, color.blue, color.alpha);
+}
+
+void addRoundedBox(cairo_t* context, const Rect& box, double radius) {
+  constexpr double kQuarter = std::numbers::pi / 2;
+  cairo_new_sub_path(context);
+  cairo_arc(context, box.maxX() - radius, box.y + radius, radius, -kQuarter, 0);
+  cairo_arc(context, box.maxX() - radius, box.maxY() - radius, radius, 0, kQuarter);
+  cairo_arc(context, box.x + radius, box.maxY() - radius, radius, kQuarter, 2 * kQuarter);
+  cairo_arc(context, box.x + radius, box.y + radius, radius, 2 * kQuarter, 3 * kQuarter);
+  cairo_close_path(context);
+}
+
+void fillShape(cairo_t* context, Size size, double radius, const ShieldColors& colors) {
+  addRoundedBox(context, {0, 0, size.width, size.height}, radius);
+  setColor(context, colors.fill);
+  cairo_fill(context);
+  if (colors.outline.alpha == 0) return;
+  constexpr double kWidth = 1;
+  addRoundedBox(context, {kWidth / 2, kWidth / 2, size.width - kWidth, size.height - kWidth}, radius - kWidth / 2);
+  setColor(context, colors.outline);
+  cairo_set_line_width(context, kWidth);
+  cairo_stroke(context);
+}
+
+double badgeDiameter(double height) { return 0.42 * height; }
+
+/// How far the badge stands out of the shape.
+double badgeOverhang(double height) { return 0.8 * badgeDiameter(height); }
+
+/// An exclamation mark on a disc in the top right corner, with a gap around it.
+void drawBadge(cairo_t* context, double width, double height) {
+  const double radius = badgeDiameter(height) / 2;
+  const double x = width - radius, y = radius;
+  const auto disc = [&](double r) { cairo_arc(context, x, y, r, 0, 2 * std::numbers::pi); };
+  cairo_set_operator(context, CAIRO_OPERATOR_CLEAR);
+  disc(radius * 1.22);
+  cairo_fill(context);
+  cairo_set_operator(context, CAIRO_OPERATOR_OVER);
+  setColor(context, {0.79, 0.23, 0.03, 1});
+  disc(radius);
+  cairo_fill(context);
+  setColor(context, {1, 1, 1, 1});
+  cairo_set_line_cap(context, CAIRO_LINE_CAP_ROUND);
+  cairo_set_line_width(context, radius * 0.3);
+  cairo_move_to(context, x, y - radius * 0.5);
+  cairo_line_to(context, x, y + radius * 0.08);
+  cairo_stroke(context);
+  cairo_arc(context, x, y + radius * 0.52, radius * 0.18, 0, 2 * std::numbers::pi);
+  cairo_fill(context);
+}
+
+}  // namespace
+
+void CairoShieldRenderer::setCachesIconAtlases(bool caches) {
+  _keepsSymbols = caches;
+  if (!caches) _symbols.clear();
+}
+
+ImageRef CairoShieldRenderer::render(const TransitArtwork& artwork, std::int64_t shieldSize, double screenScale,
+                                     bool nightMode) {
+  const Look look{shieldMetrics(shieldSize), screenScale, nightMode, artwork.hasRoutingIncidentBadge()};
+  switch (static_cast<ArtworkSourceType>(artwork.artworkSourceType())) {
+    case ArtworkSourceType::shield:
+      return artwork.shieldDataSource() ? renderShield(*artwork.shieldDataSource(), look) : nullptr;
+    case ArtworkSourceType::icon: {
+      const auto& icon = artwork.iconDataSource();
+      const std::string_view name = icon && icon->iconType == 1 ? symbolName(icon->defaultTransitType) : "";
+      if (!name.empty()) return renderSymbol(name, look);
+      if (const auto& fallback = artwork.iconFallbackShieldDataSource())
+        if (ImageRef shield = renderShield(*fallback, look)) return shield;
+      return renderSymbol(kUnknownModeSymbol, look);
+    }
+    case ArtworkSourceType::text: {
+      const auto& text = artwork.textDataSource();
+      return text && text->text ? renderText(plainText(*text->text), look) : nullptr;
+    }
+    case ArtworkSourceType::none:
+      break;
+  }
+  return nullptr;
+}
+
+double CairoShieldRenderer::circleTextWidth(const ShieldMetrics& metrics) const {
+  const double inside = 0.44 * metrics.height;
+  const double capitals = _text.metrics({metrics.textSize, true}).capHeight;
+  return 2 * std::sqrt(inside * inside - capitals * capitals / 4);
+}
+
+ImageRef CairoShieldRenderer::renderShield(const TransitShield& shield, const Look& look) {
+  const std::string text = trimmed(shield.shieldText);
+  if (text.empty() && !(shield.shieldColorString && colorFromHexText(*shield.shieldColorString))) return nullptr;
+  const ShieldMetrics& metrics = look.metrics;
+  const ShieldColors colors = shieldColors(shield, look.nightMode);
+  Size size{metrics.height, metrics.height};
+  double radius = metrics.height / 2, padding = metrics.padding, pointSize = 0;
+  TextLayoutRef layout;
+  const auto type = static_cast<ShieldType>(shield.shieldType);
+  // A text that would lose its end in the smallest circle makes a pill of every size, so that smaller is narrower.
+  if (type == ShieldType::circle &&
+      !fit(text, shieldMetrics(0), circleTextWidth(shieldMetrics(0)), pointSize)->isTruncated())
+    layout = fit(text, metrics, circleTextWidth(metrics), pointSize);
+  else if (type != ShieldType::pill && type != ShieldType::circle)
+    radius = metrics.cornerRadius;
+  if (!layout) {
+    if (radius == metrics.height / 2) {
+      padding *= 1.2;
+      size.width *= 1.25;
+    }
+    layout = fit(text, metrics, metrics.maximumWidth - 2 * padding, pointSize);
+    size.width = std::max(size.width, layout->size().width + 2 * padding);
+  }
+  // Whole pixels, so that the right edge is as sharp as the left one.
+  size.width = std::ceil(size.width * look.screenScale - 1e-6) / look.screenScale;
+  return drawFramed(size.width, look, [&](cairo_t* context) {
+    fillShape(context, size, radius, colors);
+    drawCentered(context, *layout, pointSize, size, colors.text);
+  });
+}
+
+ImageRef CairoShieldRenderer::renderSymbol(std::string_view name, const Look& look) {
+  const auto drawing = symbol(name);
+  if (!drawing) return nullptr;
+  const double height = look.metrics.height;
+  const ShieldColors colors = symbolColors(look.nightMode);
+  return drawFramed(height, look, [&](cairo_t* context) {
+    fillShape(context, {height, height}, look.metrics.cornerRadius, colors);
+    const double margin = 0.1 * height;
+    drawing->draw(context, {margin, margin, height - 2 * margin, height - 2 * margin}, colors.text);
+  });
+}
+
+ImageRef CairoShieldRenderer::renderText(const std::string& text, const Look& look) {
+  if (text.empty()) return nullptr;
+  double pointSize = 0;
+  const TextLayoutRef layout = fit(text, look.metrics, look.metrics.maximumWidth, pointSize);
+  const double width = layout->size().width;
+  return drawFramed(width, look, [&](cairo_t* context) {
+    drawCentered(context, *layout, pointSize, {width, look.metrics.height}, labelColor(look.nightMode));
+  });
+}
+
+ImageRef CairoShieldRenderer::drawFramed(double width, const Look& look,
+                                         const std::function<void(cairo_t*)>& draw) const {
+  const double height = look.metrics.height;
+  const double wholeWidth = look.hasBadge ? width + badgeOverhang(height) : width;
+  return drawImage({wholeWidth, height}, look.screenScale, [&](cairo_t* context) {
+    draw(context);
+    if (look.hasBadge) drawBadge(context, wholeWidth, height);
+  });
+}
+
+TextLayoutRef CairoShieldRenderer::fit(const std::string& text, const ShieldMetrics& metrics, double width,
+                                       double& pointSize) const {
+  const auto layOut = [&](double maxWidth) {
+    return _text.layOut(text, {pointSize, true}, maxWidth, 1, TextAlignment::natural, false);
+  };
+  pointSize = metrics.textSize;
+  const TextLayoutRef whole = layOut(std::numeric_limits<double>::infinity());
+  const double wholeWidth = whole->size().width;
+  if (wholeWidth <= width && !whole->isTruncated()) return whole;
+  pointSize = std::clamp(metrics.textSize * width / wholeWidth, metrics.smallestTextSize, metrics.textSize);
+  // Rounding of the size must not cost the last letter of a text that was shrunk to fit.
+  return layOut(width + 0.01);
+}
+
+void CairoShieldRenderer::drawCentered(cairo_t* context, const TextLayout& text, double pointSize, Size box,
+                                       const Color& color) const {
+  const double baseline = (box.height + _text.metrics({pointSize, true}).capHeight) / 2;
+  const double width = text.size().width;
+  CairoPainter(context).drawText(text, {(box.width - width) / 2, baseline - text.firstBaseline()}, width, color);
+}
+
+std::shared_ptr<const VectorImage> CairoShieldRenderer::symbol(std::string_view name) {
+  if (const auto kept = _symbols.find(name); kept != _symbols.end()) return kept->second;
+  auto drawing = vectorImageNamed(name);
+  if (_keepsSymbols) _symbols.emplace(name, drawing);
+  return drawing;
+}
+
+}  // namespace nimbo

@@ -1,0 +1,57 @@
+#include "desktop/drawing/CairoSurface.h"
+
+#include <cairo.h>
+
+#include <algorithm>
+#include <cmath>
+#include <cstdio>
+
+namespace nimbo {
+
+namespace {
+
+/// Cairo's image surfaces hold coordinates of 16 bits.
+constexpr double kMaximumPixelsEachWay = 32767;
+
+ErrorRef badSize(Size size, double scale, const char* problem) {
+  char text[256];
+  std::snprintf(text, sizeof text, "A picture of %g by %g points at scale %g %s", size.width, size.height, scale,
+                problem);
+  return Error::errorWithDomain_code_reason(std::string(kDrawingErrorDomain), kDrawingErrorBadSize, text);
+}
+
+double pixelCount(double points, double scale) {
+  // A hair less, so that 10.1 points at scale 10 are not 102 pixels.
+  return std::max(1.0, std::ceil(points * scale - 1e-6));
+}
+
+}  // namespace
+
+CairoSurface::Made CairoSurface::make(Size size, double scale) {
+  const auto isLength = [](double value) { return std::isfinite(value) && value >= 0; };
+  if (!isLength(size.width) || !isLength(size.height) || !isLength(scale) || scale == 0)
+    return {nullptr, badSize(size, scale, "cannot be drawn: give lengths of at least 0 and a scale above 0.")};
+  const double width = pixelCount(size.width, scale), height = pixelCount(size.height, scale);
+  if (width > kMaximumPixelsEachWay || height > kMaximumPixelsEachWay || width * height > kMaximumPixelCount)
+    return {nullptr, badSize(size, scale, "is too large: choose a smaller size or scale.")};
+  CairoSurfaceHandle handle(
+      cairo_image_surface_create(CAIRO_FORMAT_ARGB32, static_cast<int>(width), static_cast<int>(height)));
+  if (cairo_surface_status(handle.get()) != CAIRO_STATUS_SUCCESS)
+    return {nullptr, badSize(size, scale, "does not fit into memory: choose a smaller size or scale.")};
+  cairo_surface_set_device_scale(handle.get(), scale, scale);
+  return {std::make_shared<const CairoSurface>(std::move(handle), size, scale), nullptr};
+}
+
+int CairoSurface::pixelWidth() const { return cairo_image_surface_get_width(get()); }
+
+int CairoSurface::pixelHeight() const { return cairo_image_surface_get_height(get()); }
+
+int CairoSurface::stride() const { return cairo_image_surface_get_stride(get()); }
+
+std::span<const std::uint8_t> CairoSurface::pixels() const {
+  cairo_surface_flush(get());
+  return {cairo_image_surface_get_data(get()),
+          static_cast<std::size_t>(stride()) * static_cast<std::size_t>(pixelHeight())};
+}
+
+}  // namespace nimbo

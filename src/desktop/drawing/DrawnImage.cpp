@@ -1,0 +1,23 @@
+#include "desktop/drawing/DrawnImage.h"
+
+#include <cairo.h>
+
+#include "desktop/drawing/CairoImage.h"
+#include "platform/foundation/Log.h"
+
+namespace nimbo {
+
+ImageRef drawImage(Size size, double scale, const std::function<void(cairo_t*)>& draw) {
+  CairoSurface::Made made = CairoSurface::make(size, scale);
+  if (!made.surface) {
+    writeLog({kDefaultLogSubsystem, "Images"}, LogLevel::error, "An image is not drawn: %@", {made.error->reason()});
+    return nullptr;
+  }
+  {
+    const CairoContextHandle context(cairo_create(made.surface->get()));
+    draw(context.get());
+  }
+  return std::make_shared<const CairoImage>(std::move(made.surface));
+}
+
+}  // namespace nimbo

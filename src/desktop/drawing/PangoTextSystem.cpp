@@ -1,0 +1,164 @@
+#include "desktop/drawing/PangoTextSystem.h"
+
+#include <pango/pangocairo.h>
+
+#include <algorithm>
+#include <cmath>
+#include <stdexcept>
+#include <string_view>
+
+#include "desktop/drawing/PangoTextLayout.h"
+#include "platform/foundation/Log.h"
+
+namespace nimbo {
+
+namespace {
+
+constexpr LogFacility kTextLogFacility{kDefaultLogSubsystem, "Text"};
+
+/// Pango counts in 1024ths of a point with 32 bits.
+constexpr double kUnlimitedWidth = 1e6;
+
+struct FontDescriptionDeleter {
+  void operator()(PangoFontDescription* description) const { pango_font_description_free(description); }
+};
+struct FontOptionsDeleter {
+  void operator()(cairo_font_options_t* options) const { cairo_font_options_destroy(options); }
+};
+
+void checkSize(const FontDescriptor& font) {
+  if (!(font.pointSize > 0) || !std::isfinite(font.pointSize))
+    throw std::invalid_argument("a font's point size is above 0");
+}
+
+GObjectHandle<PangoLayout> makeLayout(PangoContext* context, const FontDescriptor& font) {
+  checkSize(font);
+  const std::unique_ptr<PangoFontDescription, FontDescriptionDeleter> description(pango_font_description_new());
+  pango_font_description_set_family_static(description.get(), "sans-serif");
+  pango_font_description_set_weight(description.get(), font.bold ? PANGO_WEIGHT_BOLD : PANGO_WEIGHT_NORMAL);
+  pango_font_description_set_absolute_size(description.get(), std::min(font.pointSize, 1000.0) * PANGO_SCALE);
+  GObjectHandle<PangoLayout> layout(pango_layout_new(context));
+  pango_layout_set_font_description(layout.get(), description.get());
+  pango_layout_set_auto_dir(layout.get(), FALSE);
+  return layout;
+}
+
+/// The text in valid UTF-8.
+std::string valid(const std::string& text) {
+  if (g_utf8_validate_len(text.data(), text.size(), nullptr)) return text;
+  const std::unique_ptr<char, decltype(&g_free)> repaired(
+      g_utf8_make_valid(text.data(), static_cast<gssize>(text.size())), &g_free);
+  return repaired.get();
+}
+
+/// Cuts a text that has more than the characters allowed, before a character that no mark belongs to.
+bool cutToMaximum(std::string& text) {
+  // No character is shorter than a byte.
+  if (text.size() <= PangoTextSystem::kMaximumCharacters) return false;
+  const char* const begin = text.c_str();
+  const char* const end = begin + text.size();
+  const char* cut = begin;
+  for (std::size_t count = 0; cut < end && count < PangoTextSystem::kMaximumCharacters; ++count)
+    cut = g_utf8_next_char(cut);
+  if (cut == end) return false;
+  constexpr int kMarksLookedThrough = 16;
+  const char* beforeMarks = cut;
+  for (int i = 0; i < kMarksLookedThrough && beforeMarks > begin; ++i) {
+    if (!g_unichar_ismark(g_utf8_get_char(beforeMarks))) {
+      cut = beforeMarks;
+      break;
+    }
+    beforeMarks = g_utf8_prev_char(beforeMarks);
+  }
+  text.resize(static_cast<std::size_t>(cut - begin));
+  text += "\u2026";
+  return true;
+}
+
+/// Line ends become spaces.
+void joinLines(std::string& text) {
+  std::string joined;
+  joined.reserve(text.size());
+  const std::string_view view = text;
+  for (std::size_t i = 0; i < view.size();) {
+    const std::string_view rest = view.substr(i);
+    std::size_t length = 0;
+    for (std::string_view lineEnd : {"\r\n", "\n", "\r", "\v", "\f", "\u0085", "\u2028", "\u2029"})
+      if (length == 0 && rest.starts_with(lineEnd)) length = lineEnd.size();
+    joined += length > 0 ? ' ' : view[i];
+    i += std::max<std::size_t>(length, 1);
+  }
+  text = std::move(joined);
+}
+
+}  // namespace
+
+PangoContext* PangoTextSystem::context(bool rightToLeft) {
+  GObjectHandle<PangoContext>& context = _contexts[rightToLeft];
+  if (context) return context.get();
+  if (!_fontMap) _fontMap.reset(pango_cairo_font_map_new());
+  context.reset(pango_font_map_create_context(_fontMap.get()));
+  pango_context_set_base_dir(context.get(), rightToLeft ? PANGO_DIRECTION_RTL : PANGO_DIRECTION_LTR);
+  pango_context_set_language(context.get(), pango_language_from_string(_language.c_str()));
+  pango_context_set_round_glyph_positions(context.get(), FALSE);
+  const std::unique_ptr<cairo_font_options_t, FontOptionsDeleter> options(cairo_font_options_create());
+  cairo_font_options_set_antialias(options.get(), CAIRO_ANTIALIAS_GRAY);
+  cairo_font_options_set_hint_style(options.get(), CAIRO_HINT_STYLE_NONE);
+  cairo_font_options_set_hint_metrics(options.get(), CAIRO_HINT_METRICS_OFF);
+  pango_cairo_context_set_font_options(context.get(), options.get());
+  return context.get();
+}
+
+FontMetrics PangoTextSystem::metrics(const FontDescriptor& font) {
+  checkSize(font);
+  std::optional<FontMetrics>& unit = _unitMetrics[font.bold];
+  if (!unit) {
+    // Large enough for the ink to be as exact as the font's own units.
+    constexpr double kSize = 1000;
+    const auto layout = makeLayout(context(false), {kSize, font.bold});
+    pango_layout_set_text(layout.get(), "H", 1);
+    PangoRectangle ink, line;
+    pango_layout_get_extents(layout.get(), &ink, &line);
+    const double baseline = pango_layout_get_baseline(layout.get());
+    if (pango_layout_get_unknown_glyphs_count(layout.get()) > 0) {
+      logMissingCharacters();
+      unit = FontMetrics{0.8, 0.2, 0.7};
+    } else {
+      constexpr double kUnits = kSize * PANGO_SCALE;
+      unit = FontMetrics{baseline / kUnits, (line.height - baseline) / kUnits, (baseline - ink.y) / kUnits};
+    }
+  }
+  return {unit->ascent * font.pointSize, unit->descent * font.pointSize, unit->capHeight * font.pointSize};
+}
+
+TextLayoutRef PangoTextSystem::layOut(const std::string& text, const FontDescriptor& font, double maxWidth,
+                                      std::size_t maxLines, TextAlignment alignment, bool rightToLeft) {
+  std::string shown = valid(text);
+  const bool wasCut = cutToMaximum(shown);
+  if (maxLines > 0) joinLines(shown);
+  auto layout = makeLayout(context(rightToLeft), font);
+  pango_layout_set_text(layout.get(), shown.data(), static_cast<int>(shown.size()));
+  if (!(maxWidth > 0)) {
+    pango_layout_set_width(layout.get(), 0);
+    pango_layout_set_wrap(layout.get(), PANGO_WRAP_WORD);
+  } else if (maxWidth < kUnlimitedWidth) {
+    pango_layout_set_width(layout.get(), static_cast<int>(std::lround(maxWidth * PANGO_SCALE)));
+    pango_layout_set_wrap(layout.get(), PANGO_WRAP_WORD_CHAR);
+  }
+  if (maxLines > 0) {
+    pango_layout_set_ellipsize(layout.get(), PANGO_ELLIPSIZE_END);
+    pango_layout_set_height(layout.get(), -static_cast<int>(std::min<std::size_t>(maxLines, 1'000'000)));
+  }
+  if (pango_layout_get_unknown_glyphs_count(layout.get()) > 0) logMissingCharacters();
+  return std::make_shared<const PangoTextLayout>(std::move(layout), alignment, rightToLeft, wasCut);
+}
+
+void PangoTextSystem::logMissingCharacters() {
+  if (_loggedMissingCharacters) return;
+  _loggedMissingCharacters = true;
+  writeLog(kTextLogFacility, LogLevel::error,
+           "No font has some of the characters to show; boxes stand for them. Install fonts for them, such as the "
+           "packages fonts-noto-core and fonts-noto-cjk.");
+}
+
+}  // namespace nimbo

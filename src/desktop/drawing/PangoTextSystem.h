@@ -1,0 +1,44 @@
+#pragma once
+
+#include <array>
+#include <optional>
+#include <string>
+
+#include "desktop/raii/GObjectHandle.h"
+#include "platform/ui/TextSystem.h"
+
+typedef struct _PangoContext PangoContext;
+typedef struct _PangoFontMap PangoFontMap;
+
+namespace nimbo {
+
+/// Text in the system's sans-serif family, shaped by Pango. Fonts are looked for on the first use, once. Where no font
+/// has a character, a box stands for it; the first time is logged.
+class PangoTextSystem final : public TextSystem {
+ public:
+  /// `language` is the user's, as a BCP 47 tag ("ja"): it chooses between the shapes that languages give a character.
+  explicit PangoTextSystem(std::string language = "en") : _language(std::move(language)) {}
+
+  /// Throws std::invalid_argument for a point size that is not above 0.
+  FontMetrics metrics(const FontDescriptor& font) override;
+  /// Text that is limited in lines is one paragraph: its line ends become spaces. Of a text of more than
+  /// `kMaximumCharacters` the beginning is laid out. Throws as `metrics` does.
+  TextLayoutRef layOut(const std::string& text, const FontDescriptor& font, double maxWidth, std::size_t maxLines,
+                       TextAlignment alignment, bool rightToLeft) override;
+
+  /// More than any row shows; shaping takes a millisecond for about 2000.
+  static constexpr std::size_t kMaximumCharacters = 4000;
+
+ private:
+  PangoContext* context(bool rightToLeft);
+  void logMissingCharacters();
+
+  std::string _language;
+  GObjectHandle<PangoFontMap> _fontMap;
+  // One for each paragraph direction: changing a context lays out anew what was made with it.
+  std::array<GObjectHandle<PangoContext>, 2> _contexts;
+  std::array<std::optional<FontMetrics>, 2> _unitMetrics;  // at a size of 1 point: regular, bold
+  bool _loggedMissingCharacters = false;
+};
+
+}  // namespace nimbo

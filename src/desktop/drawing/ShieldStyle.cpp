@@ -1,0 +1,69 @@
+#include "desktop/drawing/ShieldStyle.h"
+
+#include <algorithm>
+
+namespace nimbo {
+
+namespace {
+
+// Size 7 stands beside a headline, and leaves 8 points above and below in rows down to 46 points. At size 0 the widest
+// shield fits the narrowest column, 73 points.
+constexpr ShieldMetrics kMetrics[] = {
+    // height, text, smallest text, padding, corner radius, maximum width
+    {16, 9.5, 8.0, 4.0, 3.5, 72},     // 0
+    {18, 10.5, 8.5, 4.5, 4.0, 81},    // 1
+    {20, 11.5, 9.0, 5.0, 4.5, 90},    // 2
+    {22, 12.5, 9.5, 5.5, 5.0, 99},    // 3
+    {24, 13.5, 10.0, 6.0, 5.5, 108},  // 4
+    {26, 14.5, 10.5, 6.5, 6.0, 117},  // 5
+    {28, 15.5, 11.0, 7.0, 6.5, 126},  // 6
+    {30, 16.5, 11.5, 7.5, 7.0, 135},  // 7
+};
+
+constexpr Color kBlack{0, 0, 0, 1};
+constexpr Color kWhite{1, 1, 1, 1};
+
+/// What a row's ground looks like, near enough to tell which shields would vanish in it.
+constexpr Color rowBackground(bool nightMode) { return nightMode ? Color{0.11, 0.11, 0.12, 1} : kWhite; }
+
+constexpr Color neutralFill(bool nightMode) {
+  return nightMode ? Color{0.62, 0.65, 0.70, 1} : Color{0.36, 0.40, 0.46, 1};
+}
+
+/// Source: WCAG 2.1, success criterion 1.4.3.
+constexpr double kLegibleContrast = 4.5;
+
+/// Below this contrast a shield's edge is lost in its row.
+constexpr double kVisibleContrast = 1.3;
+
+ShieldColors colorsOnFill(const Color& fill, std::optional<Color> wanted, bool nightMode) {
+  ShieldColors colors{fill, {}, {0, 0, 0, 0}};
+  if (wanted && contrastRatio(*wanted, fill) >= kLegibleContrast)
+    colors.text = *wanted;
+  else
+    colors.text = contrastRatio(kBlack, fill) > contrastRatio(kWhite, fill) ? kBlack : kWhite;
+  if (contrastRatio(fill, rowBackground(nightMode)) < kVisibleContrast)
+    colors.outline = nightMode ? Color{1, 1, 1, 0.45} : Color{0, 0, 0, 0.4};
+  return colors;
+}
+
+std::optional<Color> colorOf(const std::optional<std::string>& text) {
+  return text ? colorFromHexText(*text) : std::nullopt;
+}
+
+}  // namespace
+
+const ShieldMetrics& shieldMetrics(std::int64_t shieldSize) {
+  return kMetrics[std::clamp<std::int64_t>(shieldSize, 0, std::size(kMetrics) - 1)];
+}
+
+ShieldColors shieldColors(const TransitShield& shield, bool nightMode) {
+  const auto fill = colorOf(shield.shieldColorString);
+  return colorsOnFill(fill.value_or(neutralFill(nightMode)), colorOf(shield.shieldTextColorString), nightMode);
+}
+
+ShieldColors symbolColors(bool nightMode) { return colorsOnFill(neutralFill(nightMode), {}, nightMode); }
+
+Color labelColor(bool nightMode) { return nightMode ? Color{0.95, 0.95, 0.96, 1} : Color{0.11, 0.11, 0.12, 1}; }
+
+}  // namespace nimbo
