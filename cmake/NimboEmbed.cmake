@@ -33,6 +33,6 @@ const std::size_t kEmbeddedResourcesCount = ${index};
 
 }  // namespace nimbo
 " @ONLY)
-  set_source_files_properties(${output} PROPERTIES OBJECT_DEPENDS "${files}")
+  set_source_files_properties(${output} TARGET_DIRECTORY ${target} PROPERTIES OBJECT_DEPENDS "${files}")
   target_sources(${target} PRIVATE ${output})
 endfunction()
