@@ -16,8 +16,7 @@ std::vector<std::string> arguments(const CommandContext& context, const WidgetPr
 
 }  // namespace
 
-OnScreenWidget::OnScreenWidget(const CommandContext& context, const WidgetPresentation& presentation)
-    : _client(context.runLoop, arguments(context, presentation)) {
+json initializationOf(const WidgetPresentation& presentation) {
   const std::string application(kHostApplicationIdentifier);
   json params = {{"textSize", presentation.textSize},
                  {"scale", presentation.scale},
@@ -31,7 +30,12 @@ OnScreenWidget::OnScreenWidget(const CommandContext& context, const WidgetPresen
                    {"identifier", application + ".TransitWidget"},
                    {"containing", {{"kind", "application"}, {"identifier", application}}}}}};
   if (presentation.locale) params["locale"] = *presentation.locale;
-  _client.call("initialize", params);
+  return params;
+}
+
+OnScreenWidget::OnScreenWidget(const CommandContext& context, const WidgetPresentation& presentation)
+    : _client(context.runLoop, arguments(context, presentation)) {
+  _client.call("initialize", initializationOf(presentation));
   for (const char* step : {"loadView", "viewWillAppear", "viewDidAppear"}) _client.call(step);
 }
 

@@ -17,12 +17,17 @@ struct WidgetPresentation {
   double scale = 1;
   std::string textSize = "large";
   std::string appearance = "light";
-  std::optional<std::string> locale;           ///< absent: of the environment
-  std::optional<std::string> virtualTime;      ///< ISO date at which the widget's time stands still
+  std::optional<std::string> locale;       ///< absent: of the environment
+  std::optional<std::string> virtualTime;  ///< ISO date at which the widget's time stands still
 
   static constexpr double kDefaultWidth = 359;
   static constexpr double kDefaultRowHeight = 110;
+
+  bool operator==(const WidgetPresentation&) const = default;
 };
+
+/// The parameters of `initialize` that present the widget so, in the compact mode.
+nlohmann::json initializationOf(const WidgetPresentation& presentation);
 
 /// A widget process that is on the screen as long as this lives: it appears on construction, disappears, and so saves
 /// its rows, on `close`. Operations throw WidgetClientFailure.

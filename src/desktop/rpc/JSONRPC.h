@@ -22,6 +22,8 @@ struct JSONRPCError {
   static constexpr int kInvalidState = -32001;
   /// Drawing failed.
   static constexpr int kDrawingFailed = -32002;
+  /// Never sent: no answer comes because the connection is closed.
+  static constexpr int kConnectionClosed = -1;
 };
 
 /// Thrown by a request's handler: becomes the request's error answer, and nothing has changed.

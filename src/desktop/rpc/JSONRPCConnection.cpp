@@ -142,7 +142,7 @@ void JSONRPCConnection::call(std::string_view method, const json& params, Comple
     _pending.emplace(id, std::move(completion));
     send({{"jsonrpc", "2.0"}, {"id", id}, {"method", method}, {"params", params}});
   } else {
-    completion(nullptr, JSONRPCError{JSONRPCError::kInternalError, "the connection is closed"});
+    completion(nullptr, JSONRPCError{JSONRPCError::kConnectionClosed, "the connection is closed"});
   }
 }
 
@@ -177,7 +177,7 @@ void JSONRPCConnection::close() {
   _watch.reset();
   const std::weak_ptr<bool> alive = _alive;
   for (auto pending = std::exchange(_pending, {}); auto& [id, completion] : pending)
-    completion(nullptr, JSONRPCError{JSONRPCError::kInternalError, "the connection was closed"});
+    completion(nullptr, JSONRPCError{JSONRPCError::kConnectionClosed, "the connection was closed"});
   if (!alive.expired() && _closed) std::exchange(_closed, nullptr)();
 }
 

@@ -1,0 +1,33 @@
+#pragma once
+
+#include <memory>
+#include <nlohmann/json.hpp>
+#include <string>
+#include <vector>
+
+#include "host/window/SharedPicture.h"
+#include "platform/ui/Geometry.h"
+
+namespace nimbo {
+
+/// A row of the widget as keyboard and screen reader know it.
+struct WidgetRow {
+  Rect frame;        ///< points, in the widget
+  std::string name;  ///< the line, how it runs, and the text
+  bool opens = false;
+};
+
+/// What the widget shows at one moment.
+struct WidgetContent {
+  std::shared_ptr<const SharedPicture> picture;
+  std::vector<WidgetRow> rows;
+  bool canExpand = false;
+  bool isExpanded = false;
+
+  /// Takes rows and modes from a snapshot of docs/protocol.md. Throws nlohmann::json::exception for anything else.
+  static WidgetContent ofSnapshot(const nlohmann::json& snapshot);
+};
+
+using WidgetContentRef = std::shared_ptr<const WidgetContent>;
+
+}  // namespace nimbo

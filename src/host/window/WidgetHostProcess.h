@@ -1,0 +1,113 @@
+#pragma once
+
+#include <deque>
+#include <memory>
+#include <optional>
+#include <string>
+#include <vector>
+
+#include "host/OnScreenWidget.h"
+#include "host/WidgetClient.h"
+#include "host/window/WidgetContent.h"
+#include "platform/Clock.h"
+
+namespace nimbo {
+
+/// Keeps a widget process for a window: started when the widget is first shown, told when it is hidden, ended when it
+/// stays hidden, started again after a crash. Nothing waits for the process: what it shows comes to the delegate.
+/// Main thread only.
+class WidgetHostProcess {
+ public:
+  /// Hears of the process, in calls of its own. Outlives it.
+  class Delegate {
+   public:
+    virtual ~Delegate() = default;
+    /// The widget shows something else; until the next call that is what to show, whatever becomes of the process.
+    virtual void widgetDidChange(const WidgetContentRef& content) = 0;
+    /// The process is not started again by itself; `reason` says why. `restart` is the way out.
+    virtual void widgetDidFail(const std::string& reason) = 0;
+    /// A fetch of the user's has begun or ended.
+    virtual void widgetIsUpdating(bool updating) = 0;
+    /// Opens what a row opens (a request of docs/protocol.md); answers whether it did.
+    virtual bool widgetOpens(std::string_view method, const nlohmann::json& params) = 0;
+  };
+
+  /// `arguments` are those of the widget program.
+  WidgetHostProcess(GLibRunLoop& runLoop, const Clock& clock, std::vector<std::string> arguments, Delegate& delegate);
+  ~WidgetHostProcess();
+
+  /// How the widget is shown: told to the process that runs, which is started anew only for another locale.
+  void setPresentation(const WidgetPresentation& presentation);
+  /// Whether the user can see the widget.
+  void setVisible(bool visible);
+  /// Whether the user wants a row for each incident; it is so while the widget offers it.
+  void setExpanded(bool expanded);
+
+  /// Fetches now.
+  void update();
+  void highlightRow(std::size_t row, bool highlighted);
+  void selectRow(std::size_t row);
+  /// Starts anew after `widgetDidFail`.
+  void restart();
+
+  bool isRunning() const { return _client != nullptr; }
+
+  /// Seconds for which a hidden widget's process is kept.
+  static constexpr TimeInterval kHiddenPatience = 60;
+  /// Seconds in which the process answers anything but an update.
+  static constexpr TimeInterval kAnswerPatience = 10;
+  /// So many crashes within so many seconds are not the last ones.
+  static constexpr std::size_t kCrashLimit = 3;
+  static constexpr TimeInterval kCrashWindow = 60;
+
+ private:
+  using Completion = std::function<void(const nlohmann::json& result)>;
+
+  void start();
+  void appear();
+  void disappear();
+  void stop();
+  /// Ends the process for a fault of its own and starts another one, or gives up.
+  void fail(const std::string& reason);
+  /// Does `fail` when nothing of the process is on the stack any more.
+  void failSoon(const std::string& reason);
+  void giveUp(const std::string& reason);
+  void setUpConnection();
+  void countLine();
+  /// A request that a sound process answers with a result.
+  void ask(std::string_view method, const nlohmann::json& params = nlohmann::json::object(),
+           Completion completion = nullptr);
+  /// A request about a row, which may be gone by now.
+  void askOfRow(std::string_view method, std::size_t row, nlohmann::json params = nlohmann::json::object());
+  void call(std::string_view method, const nlohmann::json& params, JSONRPCConnection::Completion completion);
+  void askForContent();
+  void show(const std::shared_ptr<SharedPicture>& picture, const nlohmann::json& snapshot);
+  void setExpandedMode(bool expanded);
+  void setUpdating(bool updating);
+
+  GLibRunLoop& _runLoop;
+  const Clock& _clock;
+  std::vector<std::string> _arguments;
+  Delegate& _delegate;
+
+  WidgetPresentation _presentation;
+  bool _visible = false;
+  bool _wantsExpanded = false;
+  bool _gaveUp = false;
+  std::deque<Date> _crashes;
+  std::shared_ptr<Timer> _hiddenTimer;
+
+  // Of the process that runs.
+  std::unique_ptr<WidgetClient> _client;
+  std::uint64_t _generation = 0;  // tells this process from those before it
+  bool _appeared = false;
+  bool _isExpanded = false;  // as last told
+  bool _awaitsContent = false;
+  bool _contentIsStale = false;
+  bool _isUpdating = false;
+  std::vector<std::shared_ptr<Timer>> _patience;
+  Date _heardSince;
+  std::size_t _heardLines = 0;
+};
+
+}  // namespace nimbo
