@@ -1,6 +1,7 @@
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 #include <sys/resource.h>
+#include <sys/socket.h>
 #include <unistd.h>
 
 #include <algorithm>
@@ -176,6 +177,28 @@ TEST_F(GLibRunLoopTest, TellsOfDataAndOfItsEnd) {
   pipe.writer = FileDescriptor();
   loop.run();
   EXPECT_THAT(read, ElementsAre("a", "b", "end"));
+}
+
+TEST_F(GLibRunLoopTest, TellsUrgentConditionsFromPlainData) {
+  std::array<int, 2> ends{};
+  ASSERT_EQ(::socketpair(AF_UNIX, SOCK_STREAM, 0, ends.data()), 0);
+  const FileDescriptor reader(ends[0]), writer(ends[1]);
+  ASSERT_EQ(::send(writer.get(), "a", 1, 0), 1);
+  int calls = 0;
+  GSourceHandle watch = loop.watchUrgent(reader.get(), [&](bool inError) {
+    EXPECT_FALSE(inError);
+    ++calls;
+    watch.reset();
+  });
+  const auto runOnce = [&] {
+    loop.scheduleTimer(0, false, [&](Timer&) { quitWhenIdle(); });
+    loop.run();
+  };
+  runOnce();
+  EXPECT_EQ(calls, 0);
+  if (::send(writer.get(), "b", 1, MSG_OOB) != 1) GTEST_SKIP() << "no urgent data on local sockets of this kernel";
+  runOnce();
+  EXPECT_EQ(calls, 1);
 }
 
 TEST(VirtualRunLoop, MovesItsTimersOnlyWithVirtualTime) {

@@ -52,10 +52,11 @@ std::shared_ptr<Timer> GLibRunLoop::scheduleTimer(TimeInterval interval, bool re
 }
 
 GSourceHandle GLibRunLoop::watchReadable(int fd, std::function<void()> callback) {
-  return attachDescriptorSource(_context.get(), fd, Readiness::readable, std::move(callback));
+  return attachDescriptorSource(_context.get(), fd, Readiness::readable,
+                                [callback = std::move(callback)](bool) { callback(); });
 }
 
-GSourceHandle GLibRunLoop::watchUrgent(int fd, std::function<void()> callback) {
+GSourceHandle GLibRunLoop::watchUrgent(int fd, std::function<void(bool inError)> callback) {
   return attachDescriptorSource(_context.get(), fd, Readiness::urgent, std::move(callback));
 }
 

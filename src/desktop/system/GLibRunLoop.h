@@ -37,8 +37,9 @@ class GLibRunLoop final : public RunLoop {
   /// Calls `callback` on the main thread for as long as `fd` has something to read, is at its end or in error, until
   /// the handle goes. The descriptor stays the caller's and outlives the handle. Main thread only.
   GSourceHandle watchReadable(int fd, std::function<void()> callback);
-  /// The same for exceptional conditions (POLLPRI), by which kernel files announce events.
-  GSourceHandle watchUrgent(int fd, std::function<void()> callback);
+  /// The same for exceptional conditions (POLLPRI), by which kernel files announce events. Each event is told once, by
+  /// the call itself: polling again finds nothing. Told `inError`, the file is gone and nothing else will come of it.
+  GSourceHandle watchUrgent(int fd, std::function<void(bool inError)> callback);
 
  private:
   void runQueuedWork();

@@ -12,10 +12,11 @@ enum class Readiness {
   urgent     ///< exceptional data (POLLPRI), as kernel files announce events
 };
 
-/// Attaches a source to `context` that calls `callback` for as long as `fd` is ready or in error. The descriptor stays
-/// the caller's and outlives the source.
+/// Attaches a source to `context` that calls `callback` for as long as `fd` is ready or in error, and says whether it
+/// is in error. Kernel files tell each event to the first who polls: the callback must not poll again. The descriptor
+/// stays the caller's and outlives the source.
 GSourceHandle attachDescriptorSource(GMainContext* context, int fd, Readiness readiness,
-                                     std::function<void()> callback);
+                                     std::function<void(bool inError)> callback);
 
 /// Attaches a source to `context` that calls `callback` once for each time it was woken; it sleeps at first.
 GSourceHandle attachWakeableSource(GMainContext* context, std::function<void()> callback);

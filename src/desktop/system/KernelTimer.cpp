@@ -77,7 +77,8 @@ void KernelTimer::start(GMainContext* context) {
   _descriptor =
       FileDescriptor(::timerfd_create(_repeats ? CLOCK_BOOTTIME : CLOCK_REALTIME, TFD_NONBLOCK | TFD_CLOEXEC));
   if (_descriptor && armDescriptor()) {
-    _source = attachDescriptorSource(context, _descriptor.get(), Readiness::readable, [this] { descriptorIsReady(); });
+    _source =
+        attachDescriptorSource(context, _descriptor.get(), Readiness::readable, [this](bool) { descriptorIsReady(); });
     return;
   }
   _descriptor = FileDescriptor();

@@ -1,7 +1,6 @@
 #include "desktop/system/LinuxMemoryPressure.h"
 
 #include <fcntl.h>
-#include <poll.h>
 #include <sys/inotify.h>
 
 #include <cstdint>
@@ -93,16 +92,12 @@ class StallSource final : public DescriptorSource {
   }
 
   GSourceHandle watch(GLibRunLoop& loop, int descriptor) override {
-    return loop.watchUrgent(descriptor, [this] { pressureIsUp(); });
-  }
-
-  void pressureIsUp() {
-    pollfd state{descriptor(), POLLPRI, 0};
-    ::poll(&state, 1, 0);
-    if (state.revents & POLLERR)
-      stopWatching();  // the file is gone, and would stay ready for ever
-    else if (state.revents & POLLPRI)
-      occurred();
+    return loop.watchUrgent(descriptor, [this](bool inError) {
+      if (inError)
+        stopWatching();
+      else
+        occurred();
+    });
   }
 
   std::filesystem::path _file;

@@ -30,13 +30,13 @@ void SystemLog::event(const LogFacility& facility, std::string_view name, std::s
   _sink->send({facility, LogLevel::debug, message, name});
 }
 
+std::unique_ptr<LogSink> makeLogSink(const LogOptions& options) {
+  if (options.toJournal) return std::make_unique<JournalSink>();
+  return std::make_unique<StandardErrorSink>();
+}
+
 std::unique_ptr<SystemLog> makeLog(const LogOptions& options) {
-  std::unique_ptr<LogSink> sink;
-  if (options.toJournal)
-    sink = std::make_unique<JournalSink>();
-  else
-    sink = std::make_unique<StandardErrorSink>();
-  return std::make_unique<SystemLog>(options, std::move(sink));
+  return std::make_unique<SystemLog>(options, makeLogSink(options));
 }
 
 }  // namespace nimbo

@@ -25,6 +25,9 @@ class SystemLog final : public Log, public Signposts {
   const std::unique_ptr<LogSink> _sink;
 };
 
+/// The sink that `options` choose: the journal or standard error.
+std::unique_ptr<LogSink> makeLogSink(const LogOptions& options);
+
 /// A log that goes where `options` say. An unknown level is its first line.
 std::unique_ptr<SystemLog> makeLog(const LogOptions& options);
 
