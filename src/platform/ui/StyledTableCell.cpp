@@ -13,14 +13,19 @@ std::shared_ptr<StyledTableCell> StyledTableCell::initWithStyle_reuseIdentifier(
 
 StyledTableCell::StyledTableCell(TableCellStyle, std::string reuseIdentifier)
     : _reuseIdentifier(std::move(reuseIdentifier)), _contentView(std::make_shared<View>()) {
-  addSubview(_contentView);
+  _contentView->setLayoutName("contentView");
+  addFillingSubview(_contentView);
 }
 
-double StyledTableCell::heightFittingWidth(double) { return kStandardRowHeight; }
+FontRef StyledTableCell::preferredTableCellFont(TextStyle style, FontTraits traits) {
+  return Font::preferredFont(style, traits);
+}
 
-void StyledTableCell::layoutSubviews() {
-  View::layoutSubviews();
-  _contentView->setFrame(bounds());
+double StyledTableCell::fittingHeight(double estimate) {
+  if (_contentView->subviews().empty()) return kStandardRowHeight;
+  return systemLayoutSizeFittingSize_withHorizontalFittingPriority_verticalFittingPriority(
+             {frame().width, estimate}, kLayoutPriorityRequired, kLayoutPriorityFittingSize)
+      .height;
 }
 
 }  // namespace nimbo

@@ -4,6 +4,7 @@
 #include <memory>
 #include <string>
 
+#include "platform/ui/Font.h"
 #include "platform/ui/View.h"
 
 namespace nimbo {
@@ -30,11 +31,18 @@ class StyledTableCell : public View {
   bool isHighlighted() const { return _highlighted; }
   void setHighlighted(bool highlighted) { _highlighted = highlighted; }
 
-  /// The height that the content wants at a width, in points; that of a standard row for a cell without content.
-  virtual double heightFittingWidth(double width);
+  /// The font of a text in a row, at the user's present text size.
+  static FontRef preferredTableCellFont(TextStyle style, FontTraits traits);
 
-  void layoutSubviews() override;
+  /// The height that the constraints inside want at the cell's width, in points, as near to `estimate` as they leave
+  /// free; that of a standard row for a cell without content.
+  double fittingHeight(double estimate);
+
   std::string_view className() const override { return "StyledTableCell"; }
+
+ protected:
+  bool isLayoutRoot() const override { return true; }
+  bool clipsToBounds() const override { return true; }
 
  private:
   std::string _reuseIdentifier;

@@ -3,6 +3,11 @@
 #include <algorithm>
 #include <stdexcept>
 
+#include "platform/ui/DrawingContext.h"
+#include "platform/ui/Painter.h"
+#include "platform/ui/RoundToViewScale.h"
+#include "platform/ui/SystemColors.h"
+
 namespace nimbo {
 
 std::shared_ptr<TableView> TableView::initWithFrame_style(const Rect& frame, TableViewStyle) {
@@ -118,6 +123,7 @@ void TableView::loadIfNeeded() {
   _needsReload = false;
   emptyIntoPool();
   const auto dataSource = _dataSource.lock();
+  const auto delegate = _delegate.lock();
   _sections = dataSource ? dataSource->numberOfSectionsInTableView(*this) : 0;
   for (IndexPath path; path.section < _sections; ++path.section) {
     const auto count = dataSource->tableView_numberOfRowsInSection(*this, path.section);
@@ -125,7 +131,8 @@ void TableView::loadIfNeeded() {
       auto cell = dataSource->tableView_cellForRowAtIndexPath(*this, path);
       if (!cell) throw std::invalid_argument("the data source answered no cell for a row");
       addSubview(cell);
-      _rows.push_back({path, std::move(cell)});
+      const double estimate = delegate ? delegate->tableView_estimatedHeightForRowAtIndexPath(*this, path) : 0;
+      _rows.push_back({path, std::move(cell), estimate});
     }
   }
   // Those left in the pool are not shown. They keep their content and are taken up by later rows.
@@ -149,11 +156,24 @@ void TableView::layoutSubviews() {
   const double width = bounds().width;
   double y = 0;
   for (const Row& row : _rows) {
-    const double height = row.cell->heightFittingWidth(width);
-    row.cell->setFrame({0, y, width, height});
-    y += row.cell->frame().height;
+    StyledTableCell& cell = *row.cell;
+    const double before = cell.frame().height;
+    cell.setFrame({0, y, width, before > 0 ? before : row.estimatedHeight});
+    cell.setFrame({0, y, width, cell.fittingHeight(row.estimatedHeight)});
+    y += cell.frame().height;
   }
   if (_footer) _footer->setFrame({0, y, width, _footer->frame().height});
+}
+
+void TableView::drawContent(Painter& painter, const DrawingContext& context) {
+  const double pixel = 1 / context.screenScale;
+  for (const Row& row : _rows) {
+    const Rect& frame = row.cell->frame();
+    if (row.cell->isHighlighted()) painter.fillRect(frame, colorOf(SystemColor::rowHighlight, context.appearance));
+    if (row.cell->separatorStyleOverride() != 0 && _separatorEffect)
+      painter.fillRect({frame.x, roundToViewScale(frame.maxY(), this) - pixel, frame.width, pixel},
+                       _separatorEffect->color(context.appearance));
+  }
 }
 
 }  // namespace nimbo

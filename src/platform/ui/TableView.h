@@ -60,10 +60,15 @@ class TableView : public View {
   void layoutSubviews() override;
   std::string_view className() const override { return "TableView"; }
 
+ protected:
+  void drawContent(Painter& painter, const DrawingContext& context) override;
+  bool clipsToBounds() const override { return true; }
+
  private:
   struct Row {
     IndexPath indexPath;
     std::shared_ptr<StyledTableCell> cell;
+    double estimatedHeight = 0;
   };
   void loadIfNeeded();
   void emptyIntoPool();

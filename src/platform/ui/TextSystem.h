@@ -38,6 +38,9 @@ class TextLayout : public Object {
 
 using TextLayoutRef = std::shared_ptr<const TextLayout>;
 
+/// Points; a width for texts that are not to be broken.
+inline constexpr double kUnboundedTextWidth = 1e6;
+
 /// Where lines begin when they are narrower than their box.
 enum class TextAlignment { natural, center };
 

@@ -1,17 +1,25 @@
 #pragma once
 
 #include <memory>
+#include <optional>
 #include <vector>
 
-#include "platform/foundation/Object.h"
+#include "platform/ui/ContentSize.h"
 #include "platform/ui/Geometry.h"
+#include "platform/ui/layout/LayoutConstraint.h"
+#include "platform/ui/layout/LayoutGuide.h"
 
 namespace nimbo {
 
-/// A rectangle on the screen with other views in it. Held by shared pointer; main thread only.
-class View : public Object {
+class LayoutEngine;
+class Painter;
+struct DrawingContext;
+
+/// A rectangle on the screen with other views in it. Its frame is set by whoever owns it, or found from constraints.
+/// Held by shared pointer; main thread only.
+class View : public LayoutItem {
  public:
-  View() = default;
+  View();
   ~View() override;
 
   /// Points, in the superview's coordinates.
@@ -30,6 +38,7 @@ class View : public Object {
   /// Puts a view on top of the others, out of the superview it had. Throws std::invalid_argument for null, for this
   /// view and for one that this view is in.
   void addSubview(std::shared_ptr<View> view);
+  /// Constraints between what is inside the view and what is outside become inactive.
   void removeFromSuperview();
   /// Null for the root. Valid as long as this view stays in it.
   View* superview() const { return _superview; }
@@ -37,27 +46,99 @@ class View : public Object {
   const std::vector<std::shared_ptr<View>>& subviews() const { return _subviews; }
   /// Whether this view is `ancestor` or inside it.
   bool isDescendantOf(const View& ancestor) const;
+  View* owningView() override { return this; }
 
   bool isHidden() const { return _hidden; }
-  virtual void setHidden(bool hidden);
+  void setHidden(bool hidden);
+
+  /// Device pixels for each point of the screen that the view is on.
+  virtual double screenScale() const;
+  /// Whether leading is on the right: as the nearest view that has it set says, else as the locale's script.
+  bool isRightToLeft() const;
+  void setRightToLeft(std::optional<bool> rightToLeft);
 
   /// Asks for `layoutSubviews` at the next `layoutIfNeeded`.
   void setNeedsLayout();
   /// Lays out this view and all inside it that asked; stops after a fixed number of rounds.
   void layoutIfNeeded();
-  /// Sets the subviews' frames. Overrides call the base.
-  virtual void layoutSubviews() {}
+  /// Sets the frames of subviews that have no constraints of their own. Overrides call the base.
+  virtual void layoutSubviews();
+
+  /// The size that the constraints inside give the view when `size` is wanted as much as the priorities say. For a view
+  /// of which `isLayoutRoot` is true.
+  virtual Size systemLayoutSizeFittingSize_withHorizontalFittingPriority_verticalFittingPriority(
+      Size size, LayoutPriority horizontalFittingPriority, LayoutPriority verticalFittingPriority);
+
+  /// Whether the frame, as it was set, acts as constraints on what is around. True until switched off, which a view
+  /// needs whose frame is to be found from constraints.
+  bool usesAutomaticConstraints() const { return _usesAutomaticConstraints; }
+  void setUsesAutomaticConstraints(bool uses);
+  void addLayoutGuide(const std::shared_ptr<LayoutGuide>& guide);
+  const std::vector<std::shared_ptr<LayoutConstraint>>& constraints() const { return _constraints; }
+  /// The constraints inside, or what they depend on, changed.
+  void setNeedsUpdateConstraints();
+
+  /// The view whose first or last line of text is this one's; null when it is this view.
+  virtual View* viewForFirstBaselineLayout() { return nullptr; }
+  virtual View* viewForLastBaselineLayout() { return nullptr; }
+  /// The view at the end of that chain.
+  View& firstBaselineView();
+  View& lastBaselineView();
+
+  /// Of two views whose contents do not both have room, the one of the lower rank gets it. 0 until set.
+  void setCompressionRank(int rank) { _compressionRank = rank; }
+
+  /// Draws the view and all inside it, its origin where the painter's is. Lay it out before.
+  void draw(Painter& painter);
 
   std::string_view className() const override { return "View"; }
 
+ protected:
+  friend class LayoutEngine;
+  friend class LayoutConstraint;
+
+  /// Whether the constraints inside are solved apart from those around: the view's frame is set by its superview.
+  virtual bool isLayoutRoot() const { return _superview == nullptr; }
+  /// Adds the constraints that the view makes by itself, which it keeps alive until the next call.
+  virtual void appendGeneratedConstraints(std::vector<const LayoutConstraint*>& /*constraints*/) {}
+  /// Has the views solved from constraints even if none is active: some are generated.
+  void requireConstraintLayout();
+
+  /// The view keeps to these sizes as much as content does: a little less than constraints of the same priority.
+  virtual ContentSize contentSize() { return {}; }
+  /// Starts a layout: whatever `contentSize` took over from a size found before is forgotten.
+  virtual void forgetAdaptedSize() {}
+  /// A layout found a size; answers whether `contentSize` is another one because of it.
+  virtual bool adaptToSize(Size /*size*/) { return false; }
+  /// Distances of the baselines from the top and from the bottom; absent in views without text.
+  virtual std::optional<double> firstBaselineFromTop() { return std::nullopt; }
+  virtual std::optional<double> lastBaselineFromBottom() { return std::nullopt; }
+  /// The subview is always as large as this view.
+  void addFillingSubview(std::shared_ptr<View> view);
+
+  virtual void drawContent(Painter& /*painter*/, const DrawingContext& /*context*/) {}
+  virtual DrawingContext contextForSubviews(const DrawingContext& context) const;
+  virtual bool clipsToBounds() const { return false; }
+
  private:
+  View& layoutRoot();
   bool layoutOnce();
+  void holdConstraint(std::shared_ptr<LayoutConstraint> constraint);
+  void dropConstraint(const LayoutConstraint& constraint);
+  void drawTree(Painter& painter, const DrawingContext& context);
 
   Rect _frame;
   Insets _layoutMargins;
   View* _superview = nullptr;
   std::vector<std::shared_ptr<View>> _subviews;
+  std::vector<std::shared_ptr<LayoutGuide>> _guides;
+  std::vector<std::shared_ptr<LayoutConstraint>> _constraints;
+  std::unique_ptr<LayoutEngine> _engine;  // of a layout root with constraints inside
+  std::optional<bool> _rightToLeft;
+  int _compressionRank = 0;
   bool _hidden = false;
+  bool _usesAutomaticConstraints = true;
+  bool _fillsSuperview = false;
   bool _needsLayout = true;
   bool _subtreeNeedsLayout = true;  // this view or one inside it needs layout
 };

@@ -4,18 +4,26 @@
 #include <memory>
 
 #include "platform/foundation/Object.h"
+#include "platform/ui/Color.h"
+#include "platform/ui/Environment.h"
 
 namespace nimbo {
 
-/// How the widget host lets texts and symbols stand out from its background, by style number. Immutable.
+/// How the widget host lets texts and symbols stand out from its background, by style number:
+///
+///     101  primary texts
+///     102  secondary texts and faded shields
+///     103  separators and other faint lines; any other number gives the same
+///
+/// Texts in styles 101 and 102 have a contrast of 4.5 to 1 or more on the widget's background. Immutable.
 class VisualEffect final : public Object {
  public:
   static std::shared_ptr<const VisualEffect> widgetEffectForVibrancyStyle(std::int64_t style);
-  /// The effect of separators and other faint lines.
   static std::shared_ptr<const VisualEffect> widgetTertiaryVibrancyEffect();
   explicit VisualEffect(std::int64_t vibrancyStyle) : _vibrancyStyle(vibrancyStyle) {}
 
   std::int64_t vibrancyStyle() const { return _vibrancyStyle; }
+  Color color(Appearance appearance) const;
   std::string_view className() const override { return "VisualEffect"; }
 
  private:
