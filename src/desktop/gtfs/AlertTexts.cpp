@@ -1,0 +1,111 @@
+#include "desktop/gtfs/AlertTexts.h"
+
+#include "desktop/gtfs/EffectWords.h"
+#include "desktop/gtfs/PlainText.h"
+#include "desktop/gtfs/TranslatedText.h"
+#include "desktop/gtfs/Utf8.h"
+
+namespace nimbo {
+
+namespace {
+
+constexpr std::size_t kLongestRawText = 64 * 1024;  // bytes; no row shows more, and hostile texts end somewhere
+constexpr std::size_t kLongestParagraph = 200;      // characters that a row's second text can sensibly show
+
+std::string textIn(std::string_view alert, AlertField field, const LanguagePreference& preference) {
+  const auto translations = translationsIn(alert, field);
+  return plainText(chooseTranslation(translations, preference).substr(0, kLongestRawText));
+}
+
+/// The text on one line.
+std::string onOneLine(std::string text) {
+  std::string result;
+  for (const char c : text)
+    if (c != '\n')
+      result += c;
+    else if (!result.empty() && result.back() != ' ')
+      result += ' ';
+  return result;
+}
+
+std::string_view firstLine(std::string_view text) { return text.substr(0, text.find('\n')); }
+
+/// What a text says after its title, when it begins with it; else all of it.
+std::string_view afterTitle(std::string_view text, std::string_view title) {
+  constexpr std::string_view kMarks = " .:;,!\n";
+  title = title.substr(0, title.find_last_not_of(kMarks) + 1);
+  std::size_t position = 0;
+  for (const char c : title) {
+    // Lines of the text are parted by blanks in the title.
+    const std::size_t next = c == ' ' ? text.find_first_not_of(" \n", position) : position + 1;
+    const bool isSame = position < text.size() && (text[position] == c || (c == ' ' && text[position] == '\n'));
+    if (!isSame || next == std::string_view::npos) return text;
+    position = next;
+  }
+  const std::string_view rest = text.substr(position);
+  const std::size_t begin = rest.find_first_not_of(kMarks);
+  if (begin == std::string_view::npos) return {};
+  return begin == 0 ? text : rest.substr(begin);  // "Delays" is not repeated in "Delayspotting"
+}
+
+/// Whether a sentence ends with the character before `position`.
+bool endsSentence(std::string_view text, std::size_t position, char32_t last) {
+  if (last == U'\u3002' || last == U'\uFF01' || last == U'\uFF1F') return true;
+  if (last != '.' && last != '!' && last != '?' && last != U'\u061F' && last != U'\u06D4') return false;
+  return position == text.size() || text[position] == ' ';
+}
+
+/// The longest run of whole sentences within the limit, else the first sentence, however long.
+std::string_view leadingSentences(std::string_view paragraph) {
+  std::size_t end = 0, count = 0;
+  for (std::size_t position = 0; position < paragraph.size();) {
+    const char32_t character = takeCharacter(paragraph, position);
+    ++count;
+    if (count > kLongestParagraph && end > 0) break;
+    if (endsSentence(paragraph, position, character)) end = position;
+  }
+  return paragraph.substr(0, end > 0 ? end : paragraph.size());
+}
+
+/// A line that only announces the next one ("What's happening?", "Affected stops:").
+bool isHeading(std::string_view line) {
+  constexpr std::size_t kLongestHeading = 40;
+  return line.size() <= kLongestHeading && (line.ends_with(':') || line.ends_with('?'));
+}
+
+bool isWebAddress(std::string_view text) {
+  const std::string lower = asciiLowerCase(text.substr(0, 8));
+  return (lower.starts_with("http://") || lower.starts_with("https://")) &&
+         text.find_first_of(" \n\"<>") == std::string_view::npos;
+}
+
+}  // namespace
+
+std::string summaryOfText(std::string_view text) {
+  std::string paragraph(firstLine(text));
+  for (std::string_view rest = text; isHeading(paragraph) && rest.find('\n') != std::string_view::npos;) {
+    rest.remove_prefix(rest.find('\n') + 1);
+    if (!firstLine(rest).empty()) paragraph.append(" ").append(firstLine(rest));
+  }
+  return std::string(firstCharacters(paragraph, kLongestParagraph) == paragraph ? paragraph
+                                                                                : leadingSentences(paragraph));
+}
+
+std::optional<AlertTexts> alertTextsIn(std::string_view alert, AlertEffect effect,
+                                       const LanguagePreference& preference) {
+  AlertTexts texts;
+  const std::string description = textIn(alert, AlertField::descriptionText, preference);
+  texts.title = onOneLine(textIn(alert, AlertField::headerText, preference));
+  if (texts.title.empty()) texts.title = firstLine(description);
+  if (texts.title.empty()) texts.title = onOneLine(textIn(alert, AlertField::effectDetail, preference));
+  if (texts.title.empty()) texts.title = effectWords(effect, preference.user);
+  if (texts.title.empty()) return std::nullopt;
+  if (const std::string_view rest = afterTitle(description, texts.title); !rest.empty()) {
+    texts.summary = summaryOfText(rest);
+    texts.description = description;
+  }
+  if (std::string url = textIn(alert, AlertField::url, preference); isWebAddress(url)) texts.linkURL = std::move(url);
+  return texts;
+}
+
+}  // namespace nimbo

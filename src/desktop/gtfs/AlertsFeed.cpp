@@ -1,0 +1,152 @@
+#include "desktop/gtfs/AlertsFeed.h"
+
+#include <unordered_map>
+
+#include "desktop/gtfs/AlertPeriods.h"
+#include "desktop/gtfs/RealtimeFields.h"
+#include "desktop/gtfs/RealtimeReading.h"
+#include "desktop/gtfs/TransitLineServiceError.h"
+#include "desktop/gtfs/TranslatedText.h"
+
+namespace nimbo {
+
+namespace {
+
+ErrorRef badAlerts(const std::string& place, const std::string& what) {
+  return transitLineServiceError(TransitLineServiceError::badAlerts,
+                                 "The alerts feed " + place + " cannot be used: " + what);
+}
+
+/// Why bytes that are no feed are none.
+std::string whatElse(std::string_view bytes) {
+  const std::size_t begin = bytes.find_first_not_of(" \t\r\n\xEF\xBB\xBF");
+  if (bytes.empty()) return "it is empty. Try again later, or check the address.";
+  const char first = begin == std::string_view::npos ? ' ' : bytes[begin];
+  if (first == '<') return "it is a web page or XML. Give the address of the GTFS-Realtime feed in binary form.";
+  if (first == '{' || first == '[') return "it is JSON. Give the address of the GTFS-Realtime feed in binary form.";
+  return "it is cut off or no GTFS-Realtime feed in binary form. Try again later, or check the address.";
+}
+
+/// Whether no text of the two alerts is in the same language.
+bool areInOtherLanguages(std::string_view a, std::string_view b) {
+  for (const AlertField field : {AlertField::headerText, AlertField::descriptionText}) {
+    const auto texts = translationsIn(a, field), others = translationsIn(b, field);
+    for (const Translation& text : texts)
+      for (const Translation& other : others)
+        if (text.language == other.language || text.language.empty() || other.language.empty()) return false;
+  }
+  return true;
+}
+
+}  // namespace
+
+void AlertsFeed::readHeader(std::string_view body) {
+  _hasHeader = true;
+  for (auto header = messageIn<FeedHeaderField>(body); header.next();) {
+    switch (header.tag()) {
+      case FeedHeaderField::gtfsRealtimeVersion:
+        _version = takeView(header);
+        break;
+      case FeedHeaderField::incrementality:
+        _isDifferential = takeNumber(header) == kIncrementalityDifferential;
+        break;
+      case FeedHeaderField::timestamp:
+        _timestamp = dateOfFeedTime(takeNumber(header));
+        break;
+      default:
+        header.skip();
+    }
+  }
+}
+
+void AlertsFeed::readEntity(std::string_view body) {
+  AlertEntity alert;
+  bool isDeleted = false, hasAlert = false, hasOther = false;
+  for (auto entity = messageIn<FeedEntityField>(body); entity.next();) {
+    switch (entity.tag()) {
+      case FeedEntityField::id:
+        alert.id = takeView(entity);
+        break;
+      case FeedEntityField::isDeleted:
+        isDeleted = takeNumber(entity) != 0;
+        break;
+      case FeedEntityField::alert:
+        alert.body = takeView(entity);
+        hasAlert = true;
+        break;
+      default:
+        hasOther = true;
+        entity.skip();
+    }
+  }
+  if (isDeleted)
+    _skipped.add("deleted entity", alert.id);
+  else if (!hasAlert && hasOther)
+    _skipped.add("entity that is no alert", alert.id);
+  else if (!hasAlert)
+    _skipped.add("entity without content", alert.id);
+  else if (alert.id.empty())
+    _skipped.add("entity without id", {});
+  else
+    _alerts.push_back(alert);
+}
+
+void AlertsFeed::joinLanguages() {
+  std::unordered_map<std::string_view, std::size_t> first;  // place of each identifier's first alert
+  std::vector<AlertEntity> alerts;
+  alerts.reserve(_alerts.size());
+  first.reserve(_alerts.size());
+  for (AlertEntity& alert : _alerts) {
+    const auto [place, isNew] = first.try_emplace(alert.id, alerts.size());
+    if (!isNew) {
+      AlertEntity& other = alerts[place->second];
+      try {
+        if (areInOtherLanguages(other.body, alert.body)) {
+          // Messages one after the other are one message with the fields of both.
+          other.body = _joined->emplace_back(std::string(other.body).append(alert.body));
+          continue;
+        }
+      } catch (const protozero::exception&) {  // found again, and counted, when the alert is read
+      }
+      alert.isRepeated = true;
+    }
+    alerts.push_back(alert);
+  }
+  _alerts = std::move(alerts);
+}
+
+Outcome<AlertsFeed> AlertsFeed::read(std::string bytes, const std::string& place) {
+  AlertsFeed feed;
+  feed._bytes = std::make_shared<const std::string>(std::move(bytes));
+  if (feed._bytes->empty()) return badAlerts(place, whatElse({}));
+  try {
+    for (auto message = messageIn<FeedMessageField>(*feed._bytes); message.next();) {
+      switch (message.tag()) {
+        case FeedMessageField::header:
+          feed.readHeader(takeView(message));
+          break;
+        case FeedMessageField::entity: {
+          const std::string_view body = takeView(message);
+          try {
+            feed.readEntity(body);
+          } catch (const protozero::exception&) {
+            feed._skipped.add("entity that is damaged", {});
+          }
+          break;
+        }
+        default:
+          message.skip();
+      }
+    }
+  } catch (const protozero::exception&) {
+    return badAlerts(place, whatElse(*feed._bytes));
+  }
+  if (!feed._hasHeader) return badAlerts(place, whatElse(*feed._bytes));
+  if (feed._isDifferential)
+    return badAlerts(place,
+                     "it tells only what changed (incrementality DIFFERENTIAL). Ask the publisher for a whole feed.");
+  feed.joinLanguages();
+  return feed;
+}
+
+}  // namespace nimbo

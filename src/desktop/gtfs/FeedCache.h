@@ -1,0 +1,30 @@
+#pragma once
+
+#include <filesystem>
+#include <string>
+#include <string_view>
+
+namespace nimbo {
+
+/// Where the cache keeps what was made from a feed. Everything there can be made again.
+class FeedCache {
+ public:
+  explicit FeedCache(std::filesystem::path folder) : _folder(std::move(folder)) {}
+
+  const std::filesystem::path& folder() const { return _folder; }
+  std::filesystem::path staticFeed(std::string_view feed) const { return file("static", feed); }
+  std::filesystem::path trips(std::string_view feed) const { return file("trips", feed); }
+  std::filesystem::path alerts(std::string_view feed) const { return file("alerts", feed); }
+
+  /// Drops what is kept of a feed.
+  void remove(std::string_view feed) const;
+
+ private:
+  std::filesystem::path file(std::string_view kind, std::string_view feed) const;
+  std::filesystem::path _folder;
+};
+
+/// Logs that something could not be kept; the program goes on without it.
+void logCacheFailure(const std::string& reason);
+
+}  // namespace nimbo

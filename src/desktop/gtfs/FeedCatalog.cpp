@@ -1,0 +1,59 @@
+#include "desktop/gtfs/FeedCatalog.h"
+
+#include "desktop/gtfs/LineItems.h"
+#include "desktop/gtfs/TransitLineServiceError.h"
+#include "desktop/gtfs/Utf8.h"
+
+namespace nimbo {
+
+namespace {
+
+bool holds(std::string_view text, const std::string& part) {
+  return asciiLowerCase(text).find(part) != std::string::npos;
+}
+
+}  // namespace
+
+Outcome<FeedCatalog::Lines> FeedCatalog::linesMatching(std::string_view text) const {
+  const auto sources = _library.sources();
+  if (!sources) return sources.error();
+  const std::string part = asciiLowerCase(text);
+  Lines result;
+  for (const FeedSourceRef& source : *sources) {
+    const auto loaded = source->staticFeed({});
+    if (!loaded) {
+      result.errors.push_back(loaded.error());
+      continue;
+    }
+    const StaticFeed& feed = loaded->feed;
+    LineItems items(source->name(), feed);
+    for (std::size_t i = 0; i < feed.lineCount(); ++i) {
+      const StaticLine line = feed.line(i);
+      if (holds(line.shortName, part) || holds(line.longName, part) || holds(line.routeID, part) ||
+          holds(feed.agency(line.agency).name, part))
+        result.lines.push_back(items.item(i, line.muid));
+    }
+  }
+  return result;
+}
+
+Outcome<TransitLineRef> FeedCatalog::lineNamed(std::string_view name) const {
+  const auto unknown = [&](const std::string& why) {
+    return transitLineServiceError(
+        TransitLineServiceError::unknownLine,
+        "No line is named \"" + std::string(name) + "\": " + why + " \"lines\" lists the lines there are.");
+  };
+  const std::size_t colon = name.find(':');
+  if (colon == std::string_view::npos) return unknown("write the feed, a colon and the route, FEED:ROUTE_ID.");
+  const auto source = _library.sourceNamed(name.substr(0, colon));
+  if (!source) return source.error();
+  const auto loaded = (*source)->staticFeed({});
+  if (!loaded) return loaded.error();
+  const StaticFeed& feed = loaded->feed;
+  for (std::size_t i = 0; i < feed.lineCount(); ++i)
+    if (feed.line(i).routeID == name.substr(colon + 1))
+      return TransitLineRef(LineItems((*source)->name(), feed).item(i, feed.line(i).muid));
+  return unknown("its feed has no such route.");
+}
+
+}  // namespace nimbo

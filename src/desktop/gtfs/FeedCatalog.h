@@ -1,0 +1,33 @@
+#pragma once
+
+#include <string_view>
+#include <vector>
+
+#include "desktop/gtfs/FeedLibrary.h"
+#include "platform/transit/TransitLine.h"
+
+namespace nimbo {
+
+/// The lines that there are to choose from. Blocks its thread.
+class FeedCatalog {
+ public:
+  struct Lines {
+    std::vector<TransitLineRef> lines;  ///< by feed, then as their agencies list them
+    std::vector<ErrorRef> errors;       ///< of feeds that could not be read
+  };
+
+  /// The library outlives this.
+  explicit FeedCatalog(const FeedLibrary& library) : _library(library) {}
+
+  /// The lines in whose names, route identifier or agency `text` occurs, whatever the case of its ASCII letters; all
+  /// for an empty text. An error when the configuration cannot be read.
+  Outcome<Lines> linesMatching(std::string_view text) const;
+
+  /// The line that is written "FEED:ROUTE_ID", or an error that says what to do.
+  Outcome<TransitLineRef> lineNamed(std::string_view name) const;
+
+ private:
+  const FeedLibrary& _library;
+};
+
+}  // namespace nimbo

@@ -1,0 +1,19 @@
+#pragma once
+
+#include <cstdint>
+#include <filesystem>
+#include <string>
+
+#include "desktop/gtfs/Outcome.h"
+
+namespace nimbo {
+
+/// The bytes of a regular file, at most `limit` of them; a larger one is an error. Errors name the file, what is wrong
+/// and what to do.
+Outcome<std::string> readFile(const std::filesystem::path& path, std::uint64_t limit);
+
+/// What tells one state of a file from another without reading it: its size and when it was last written. Empty when
+/// there is none.
+std::string fileFingerprint(const std::filesystem::path& path);
+
+}  // namespace nimbo

@@ -1,0 +1,208 @@
+#include "desktop/gtfs/IncidentReader.h"
+
+#include <algorithm>
+#include <map>
+#include <protozero/exception.hpp>
+#include <tuple>
+#include <unordered_map>
+
+#include "desktop/gtfs/AlertIncident.h"
+#include "desktop/gtfs/AlertPeriods.h"
+#include "desktop/gtfs/AlertTexts.h"
+#include "desktop/gtfs/AlertView.h"
+#include "desktop/gtfs/FeedMuid.h"
+
+namespace nimbo {
+
+namespace {
+
+/// An alert, or several of one content.
+struct Incident {
+  std::string key;  // the least of its alerts
+  AlertTexts texts;
+  AlertEffect effect;
+  std::vector<AlertContent> contents;  // as published: the texts of one language may agree where others differ
+  struct OnLine {
+    std::vector<AlertPeriod> periods;
+    bool isWholeLine = false;
+  };
+  std::map<std::size_t, OnLine> lines;  // by place in the query
+};
+
+using ContentKey = std::tuple<std::string, std::string, std::string, std::int32_t, AlertEffect>;
+
+std::string_view reasonFor(SelectorFit fit) {
+  switch (fit) {
+    case SelectorFit::lines:
+      break;
+    case SelectorFit::stopAlone:
+      return "stop alone (which lines serve it is not known)";
+    case SelectorFit::unknownRoute:
+      return "route that the static feed does not have";
+    case SelectorFit::unknownAgency:
+      return "agency that the static feed does not have";
+    case SelectorFit::unknownTrip:
+      return "trip without a route, not in the static feed";
+    case SelectorFit::noLineOfType:
+      return "route type that no line has";
+    case SelectorFit::contradiction:
+      return "route that is not of the agency, type or trip beside it";
+    case SelectorFit::nothingNamed:
+      return "selector that names no line";
+  }
+  return {};
+}
+
+std::string exampleOf(const EntitySelector& selector) {
+  std::string text;
+  const auto add = [&](std::string_view name, std::string_view value) {
+    if (!value.empty()) text.append(text.empty() ? "" : ", ").append(name).append(" ").append(value);
+  };
+  add("agency", selector.agencyID);
+  add("route", selector.routeID);
+  add("route type", selector.routeType ? std::to_string(*selector.routeType) : "");
+  add("trip", selector.tripID);
+  add("trip of route", selector.tripRouteID);
+  return text;
+}
+
+class IncidentBuilder {
+ public:
+  IncidentBuilder(const AlertsFeed& alerts, const StaticFeed& feed, const IncidentQuery& query)
+      : _alerts(alerts), _query(query), _matcher(feed, indicesOf(query), query.trips) {
+    _reading.incidents.resize(query.lines.size());
+  }
+
+  IncidentReading build() {
+    for (const AlertEntity& alert : _alerts.alerts()) {
+      try {
+        take(alert);
+      } catch (const protozero::exception&) {
+        _reading.skipped.add("alert that is damaged", alert.id);
+      }
+    }
+    if (!_incidents.empty()) takeLeastKeys();
+    for (const Incident& incident : _incidents) emit(incident);
+    return std::move(_reading);
+  }
+
+ private:
+  static std::vector<std::uint32_t> indicesOf(const IncidentQuery& query) {
+    std::vector<std::uint32_t> indices;
+    for (const IncidentQuery::Line& line : query.lines) indices.push_back(line.index);
+    return indices;
+  }
+
+  /// The identifier; where alerts share one, with the content, since the number may not depend on positions.
+  static std::string keyOf(const AlertEntity& alert) {
+    std::string key(alert.id);
+    if (alert.isRepeated) key.append(1, '\0').append(std::to_string(hashOfBytes(alert.body)));
+    return key;
+  }
+
+  void take(const AlertEntity& alert) {
+    _lines.clear();
+    const AlertView view = readAlertView(alert.body, [&](const EntitySelector& selector) { takeSelector(selector); });
+    _contents.emplace_back(&alert, view.content);
+    if (_lines.empty()) return;
+    if (view.isMinor() && !_query.minorAlerts) {
+      _reading.skipped.add("alert without effect on the service, or about accessibility", alert.id);
+      return;
+    }
+    const auto texts = alertTextsIn(alert.body, view.content.effect, _query.language);
+    if (!texts) {
+      _reading.skipped.add("alert that says nothing", alert.id);
+      return;
+    }
+    const AlertPeriods periods = alertPeriodsIn(alert.body);
+    _reading.periods += periods.published;
+    if (periods.periods.empty()) {
+      _reading.skipped.add("alert whose periods end before they start", alert.id);
+      return;
+    }
+    Incident& incident = incidentFor(keyOf(alert), *texts, view.content);
+    for (const auto& [place, isWholeLine] : _lines) {
+      Incident::OnLine& onLine = incident.lines[place];
+      onLine.periods.insert(onLine.periods.end(), periods.periods.begin(), periods.periods.end());
+      onLine.isWholeLine = onLine.isWholeLine || isWholeLine;
+    }
+  }
+
+  void takeSelector(const EntitySelector& selector) {
+    ++_reading.selectors;
+    const SelectorFit fit = _matcher.match(selector, [&](std::size_t place, bool isWholeLine) {
+      bool& flag = _lines[place];
+      flag = flag || isWholeLine;
+    });
+    if (_query.countsUnfit && fit != SelectorFit::lines) _reading.unfit.add(reasonFor(fit), exampleOf(selector));
+  }
+
+  Incident& incidentFor(std::string key, const AlertTexts& texts, const AlertContent& content) {
+    const ContentKey contentKey{texts.title, texts.description.value_or(""), texts.linkURL.value_or(""), content.cause,
+                                content.effect};
+    const auto [place, isNew] = _incidentOfContent.try_emplace(contentKey, _incidents.size());
+    if (isNew) _incidents.push_back({std::move(key), texts, content.effect, {}, {}});
+    Incident& incident = _incidents[place->second];
+    if (std::find(incident.contents.begin(), incident.contents.end(), content) == incident.contents.end())
+      incident.contents.push_back(content);
+    return incident;
+  }
+
+  /// Alerts of the same content that concern other lines, or are over, are the same incident: their identifiers count
+  /// for its number too.
+  void takeLeastKeys() {
+    std::unordered_multimap<std::size_t, std::pair<AlertContent, Incident*>> bySize;
+    for (Incident& incident : _incidents)
+      for (const AlertContent& content : incident.contents)
+        bySize.emplace(content.sizeHash(), std::pair{content, &incident});
+    for (const auto& [alert, content] : _contents) {
+      const auto [begin, end] = bySize.equal_range(content.sizeHash());
+      for (auto found = begin; found != end; ++found) {
+        const auto& [wanted, incident] = found->second;
+        if (wanted == content) incident->key = std::min(incident->key, keyOf(*alert));
+      }
+    }
+  }
+
+  void emit(const Incident& incident) {
+    AlertIncident::Fields fields;
+    fields.muid = incidentMuid(_query.feed, incident.key);
+    fields.title = incident.texts.title;
+    fields.summary = incident.texts.summary;
+    fields.fullDescription = incident.texts.description;
+    fields.messageForRoutePlanning = fields.messageForRouteStepping = fields.messageForNonRoutable = fields.title;
+    fields.lastUpdated = _alerts.timestamp();
+    fields.iconType = static_cast<std::int32_t>(incident.effect);
+    fields.linkURL = incident.texts.linkURL;
+    for (const auto& [place, onLine] : incident.lines)
+      fields.affectedEntities.push_back(std::make_shared<const BasicAffectedEntity>(_query.lines[place].muid));
+    const auto shared = std::make_shared<const AlertIncident::Fields>(std::move(fields));
+    // Lines mostly have the incident in the same periods: they share the objects too.
+    std::map<std::tuple<std::optional<Date>, std::optional<Date>, bool>, TransitIncidentRef> made;
+    for (const auto& [place, onLine] : incident.lines) {
+      const bool isBlocking = incident.effect == AlertEffect::noService && onLine.isWholeLine;
+      for (const AlertPeriod& period : periodsThatMatter(joinedPeriods(onLine.periods), _query.now)) {
+        TransitIncidentRef& object = made[{period.start, period.end, isBlocking}];
+        if (!object) object = std::make_shared<const AlertIncident>(shared, period.start, period.end, isBlocking);
+        _reading.incidents[place].push_back(object);
+      }
+    }
+  }
+
+  const AlertsFeed& _alerts;
+  const IncidentQuery& _query;
+  SelectorMatcher _matcher;
+  IncidentReading _reading;
+  std::map<std::size_t, bool> _lines;  // of the alert at hand: place in the query, whether it is about the whole line
+  std::vector<std::pair<const AlertEntity*, AlertContent>> _contents;  // of all alerts
+  std::vector<Incident> _incidents;
+  std::map<ContentKey, std::size_t> _incidentOfContent;
+};
+
+}  // namespace
+
+IncidentReading readIncidents(const AlertsFeed& alerts, const StaticFeed& feed, const IncidentQuery& query) {
+  return IncidentBuilder(alerts, feed, query).build();
+}
+
+}  // namespace nimbo

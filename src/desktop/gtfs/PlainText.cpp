@@ -1,0 +1,141 @@
+#include "desktop/gtfs/PlainText.h"
+
+#include <algorithm>
+
+#include "desktop/gtfs/HtmlEntities.h"
+#include "desktop/gtfs/HtmlTag.h"
+#include "desktop/gtfs/Utf8.h"
+
+namespace nimbo {
+
+namespace {
+
+bool isLineEnd(char32_t c) { return c == '\n' || c == '\r' || c == 0x85 || c == 0x2028 || c == 0x2029; }
+
+bool isJoiner(char32_t c) { return c == 0x200C || c == 0x200D; }
+
+bool isDirectionMark(char32_t c) { return c == 0x200E || c == 0x200F || c == 0x061C; }
+
+bool isRightToLeftLetter(char32_t c) {
+  return (c >= 0x0590 && c <= 0x08FF && c != 0x061C) || (c >= 0xFB1D && c <= 0xFDFF) || (c >= 0xFE70 && c <= 0xFEFE) ||
+         (c >= 0x10800 && c <= 0x10FFF) || (c >= 0x1E800 && c <= 0x1EFFF);
+}
+
+/// Controls and characters that only ever confuse a line of text.
+bool isUnwanted(char32_t c) {
+  return c < 0x20 || (c >= 0x7F && c <= 0x9F) || c == 0xAD || c == 0x180E || c == 0x200B ||
+         (c >= 0x202A && c <= 0x202E) || (c >= 0x2060 && c <= 0x206F) || c == 0xFEFF || (c >= 0xFFF9 && c <= 0xFFFC) ||
+         (c & 0xFFFE) == 0xFFFE;
+}
+
+/// Takes characters and line ends; writes the folded text.
+class FoldingWriter {
+ public:
+  void write(char32_t c) {
+    if (isLineEnd(c)) {
+      lineEnd();
+    } else if (isWhiteSpace(c)) {
+      _spacePending = true;
+      _joinerPending = 0;
+    } else if (isJoiner(c)) {
+      _joinerPending = c;
+    } else if (!isUnwanted(c)) {
+      append(c);
+    }
+  }
+  void lineEnd() { ++_lineEndsPending, _joinerPending = 0; }
+  void block() { _lineEndsPending = std::max(_lineEndsPending, 1), _joinerPending = 0; }
+  void space() { _spacePending = true; }
+
+  std::string finish() {
+    if (_hasRightToLeftLetter || !_hasDirectionMark) return std::move(_text);
+    std::string result;
+    for (std::size_t position = 0; position < _text.size();)
+      if (const char32_t c = takeCharacter(_text, position); !isDirectionMark(c)) appendCharacter(result, c);
+    return result;
+  }
+
+ private:
+  void append(char32_t c) {
+    const bool isMark = isDirectionMark(c);
+    if (isMark && _text.empty()) return;  // a mark alone is no text
+    _hasDirectionMark = _hasDirectionMark || isMark;
+    _hasRightToLeftLetter = _hasRightToLeftLetter || isRightToLeftLetter(c);
+    if (isMark) {
+      if (_lineEndsPending == 0 && !_spacePending) appendCharacter(_text, c);
+      return;
+    }
+    if (!_text.empty() && _lineEndsPending > 0)
+      _text.append(static_cast<std::size_t>(std::min(_lineEndsPending, 2)), '\n');
+    else if (!_text.empty() && _spacePending)
+      _text += ' ';
+    else if (_joinerPending && _previous >= 0x80 && c >= 0x80)
+      appendCharacter(_text, _joinerPending);
+    appendCharacter(_text, c);
+    _previous = c;
+    _lineEndsPending = 0;
+    _spacePending = false;
+    _joinerPending = 0;
+  }
+
+  std::string _text;
+  char32_t _previous = 0;
+  char32_t _joinerPending = 0;
+  int _lineEndsPending = 0;
+  bool _spacePending = false;
+  bool _hasDirectionMark = false;
+  bool _hasRightToLeftLetter = false;
+};
+
+/// Whether line ends in the text are mere spaces because markup makes the lines.
+bool hasLinesOfMarkup(std::string_view text, const HtmlTagFinder& tags) {
+  for (std::size_t i = text.find('<'); i != std::string_view::npos; i = text.find('<', i + 1)) {
+    const auto tag = tags.tagAt(i);
+    if (tag && (tag->effect == HtmlTagEffect::block || tag->effect == HtmlTagEffect::lineBreak)) return true;
+    if (tag) i += tag->length - 1;
+  }
+  return false;
+}
+
+}  // namespace
+
+std::string plainText(std::string_view text) {
+  const HtmlTagFinder tags(text);
+  const bool lineEndsAreSpaces = hasLinesOfMarkup(text, tags);
+  FoldingWriter writer;
+  for (std::size_t position = 0; position < text.size();) {
+    const std::string_view rest = text.substr(position);
+    if (rest.front() == '<') {
+      if (const auto tag = tags.tagAt(position)) {
+        position += tag->length;
+        switch (tag->effect) {
+          case HtmlTagEffect::none:
+            break;
+          case HtmlTagEffect::space:
+            writer.space();
+            break;
+          case HtmlTagEffect::block:
+            writer.block();
+            break;
+          case HtmlTagEffect::lineBreak:
+            writer.lineEnd();
+            break;
+        }
+        continue;
+      }
+    } else if (rest.front() == '&') {
+      if (const auto entity = htmlEntityAt(rest)) {
+        position += entity->length;
+        writer.write(entity->character);
+        continue;
+      }
+    } else if (rest.starts_with("\r\n")) {
+      ++position;
+    }
+    const char32_t character = takeCharacter(text, position);
+    writer.write(lineEndsAreSpaces && isLineEnd(character) ? U' ' : character);
+  }
+  return writer.finish();
+}
+
+}  // namespace nimbo

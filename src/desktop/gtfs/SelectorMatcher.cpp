@@ -1,0 +1,75 @@
+#include "desktop/gtfs/SelectorMatcher.h"
+
+namespace nimbo {
+
+namespace {
+
+bool isWholeLine(const EntitySelector& selector) {
+  return !selector.hasStop && !selector.hasTrip && !selector.hasDirection;
+}
+
+}  // namespace
+
+SelectorMatcher::SelectorMatcher(const StaticFeed& feed, std::span<const std::uint32_t> lines, TripLookup trips)
+    : _trips(std::move(trips)) {
+  for (std::size_t i = 0; i < feed.agencyCount(); ++i) _agencies.emplace(feed.agency(i).id, i);
+  for (const std::uint32_t index : lines) {
+    const StaticLine line = feed.line(index);
+    _placeOfRoute.emplace(line.routeID, _lines.size());
+    _placeOfLine.emplace(index, _lines.size());
+    _agencyOfLine.push_back(feed.agency(line.agency).id);
+    _lines.push_back(line);
+  }
+}
+
+SelectorFit SelectorMatcher::match(const EntitySelector& selector, const Handler& handler) const {
+  std::string_view route = selector.routeID;
+  if (route.empty())
+    route = selector.tripRouteID;
+  else if (!selector.tripRouteID.empty() && selector.tripRouteID != route)
+    return SelectorFit::contradiction;
+  if (!route.empty()) {
+    const auto place = _placeOfRoute.find(route);
+    return place == _placeOfRoute.end() ? SelectorFit::unknownRoute : matchOne(place->second, selector, handler);
+  }
+  if (!selector.tripID.empty()) return matchTrip(selector, handler);
+  if (selector.hasStop) return SelectorFit::stopAlone;
+  if (selector.hasTrip) return SelectorFit::nothingNamed;
+  return matchAll(selector, handler);
+}
+
+SelectorFit SelectorMatcher::matchOne(std::size_t place, const EntitySelector& selector, const Handler& handler) const {
+  const std::string_view agency = _agencyOfLine[place];
+  if (!selector.agencyID.empty() && !agency.empty() && selector.agencyID != agency && isKnownAgency(selector.agencyID))
+    return SelectorFit::contradiction;
+  const RouteType type = _lines[place].type;
+  if (selector.routeType && type != kUnknownRouteType && basicRouteType(*selector.routeType) != basicRouteType(type))
+    return SelectorFit::contradiction;
+  handler(place, isWholeLine(selector));
+  return SelectorFit::lines;
+}
+
+SelectorFit SelectorMatcher::matchTrip(const EntitySelector& selector, const Handler& handler) const {
+  const auto line = _trips ? _trips(selector.tripID) : std::nullopt;
+  if (!line) return SelectorFit::unknownTrip;
+  const auto place = _placeOfLine.find(*line);
+  return place == _placeOfLine.end() ? SelectorFit::unknownRoute : matchOne(place->second, selector, handler);
+}
+
+SelectorFit SelectorMatcher::matchAll(const EntitySelector& selector, const Handler& handler) const {
+  if (selector.agencyID.empty() && !selector.routeType) return SelectorFit::nothingNamed;
+  // The only agency of a feed may go without an identifier: then every one means it.
+  const bool isOnlyAgency = _agencies.size() == 1 && _agencies.begin()->first.empty();
+  const bool anyAgency = selector.agencyID.empty() || isOnlyAgency;
+  if (!anyAgency && !isKnownAgency(selector.agencyID)) return SelectorFit::unknownAgency;
+  bool found = false;
+  for (std::size_t i = 0; i < _lines.size(); ++i) {
+    if (!anyAgency && _agencyOfLine[i] != selector.agencyID) continue;
+    if (selector.routeType && !routeTypeCovers(*selector.routeType, _lines[i].type)) continue;
+    handler(i, isWholeLine(selector));
+    found = true;
+  }
+  return found ? SelectorFit::lines : SelectorFit::noLineOfType;
+}
+
+}  // namespace nimbo

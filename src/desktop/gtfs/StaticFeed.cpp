@@ -1,0 +1,102 @@
+#include "desktop/gtfs/StaticFeed.h"
+
+#include "desktop/gtfs/StaticFeedLayout.h"
+
+namespace nimbo {
+
+namespace {
+
+FlatHeader headerOf(std::string_view bytes) { return flatRecordAt<FlatHeader>(bytes, 0); }
+
+std::size_t agencyPosition(std::size_t index) { return sizeof(FlatHeader) + index * sizeof(FlatAgency); }
+
+std::size_t linePosition(const FlatHeader& header, std::size_t index) {
+  return agencyPosition(header.agencyCount) + index * sizeof(FlatLine);
+}
+
+std::string_view textOf(std::string_view bytes, const FlatHeader& header, FlatText text) {
+  return bytes.substr(linePosition(header, header.lineCount) + text.offset, text.length);
+}
+
+std::optional<std::uint32_t> colorOf(std::uint32_t color) {
+  if (color == kNoColor) return std::nullopt;
+  return color;
+}
+
+/// Whether everything that the header and the records point to is inside the bytes.
+bool isSound(std::string_view bytes) {
+  if (bytes.size() < sizeof(FlatHeader)) return false;
+  const FlatHeader header = headerOf(bytes);
+  if (header.magic != kFlatFeedMagic || header.checksum != flatChecksum(bytes.substr(kFlatChecksumEnd))) return false;
+  const std::size_t textsBegin = linePosition(header, header.lineCount);
+  if (textsBegin > bytes.size()) return false;
+  const std::size_t textsSize = bytes.size() - textsBegin;
+  const auto isInside = [&](FlatText text) {
+    return text.offset <= textsSize && text.length <= textsSize - text.offset;
+  };
+  bool sound = isInside(header.language) && isInside(header.fingerprint);
+  for (std::size_t i = 0; i < header.agencyCount; ++i) {
+    const auto agency = flatRecordAt<FlatAgency>(bytes, agencyPosition(i));
+    sound = sound && isInside(agency.id) && isInside(agency.name);
+  }
+  for (std::size_t i = 0; i < header.lineCount; ++i) {
+    const auto line = flatRecordAt<FlatLine>(bytes, linePosition(header, i));
+    sound = sound && isInside(line.routeID) && isInside(line.shortName) && isInside(line.longName) &&
+            line.agency < header.agencyCount;
+  }
+  return sound;
+}
+
+}  // namespace
+
+std::optional<StaticFeed> StaticFeed::fromBytes(std::string bytes) {
+  if (!isSound(bytes)) return std::nullopt;
+  return StaticFeed(std::move(bytes));
+}
+
+std::size_t StaticFeed::agencyCount() const { return headerOf(*_bytes).agencyCount; }
+std::size_t StaticFeed::lineCount() const { return headerOf(*_bytes).lineCount; }
+
+StaticAgency StaticFeed::agency(std::size_t index) const {
+  const FlatHeader header = headerOf(*_bytes);
+  const auto agency = flatRecordAt<FlatAgency>(*_bytes, agencyPosition(index));
+  return {textOf(*_bytes, header, agency.id), textOf(*_bytes, header, agency.name),
+          static_cast<TransitMode>(agency.sharedMode)};
+}
+
+StaticLine StaticFeed::line(std::size_t index) const {
+  const FlatHeader header = headerOf(*_bytes);
+  const auto line = flatRecordAt<FlatLine>(*_bytes, linePosition(header, index));
+  return {line.muid,
+          textOf(*_bytes, header, line.routeID),
+          textOf(*_bytes, header, line.shortName),
+          textOf(*_bytes, header, line.longName),
+          colorOf(line.color),
+          colorOf(line.textColor),
+          line.type,
+          line.agency};
+}
+
+std::string_view StaticFeed::language() const {
+  const FlatHeader header = headerOf(*_bytes);
+  return textOf(*_bytes, header, header.language);
+}
+
+std::string_view StaticFeed::fingerprint() const {
+  const FlatHeader header = headerOf(*_bytes);
+  return textOf(*_bytes, header, header.fingerprint);
+}
+
+Date StaticFeed::checkedAt() const { return Date(std::chrono::microseconds(headerOf(*_bytes).checkedAt)); }
+
+StaticFeed StaticFeed::checkedAgainAt(Date date) const {
+  std::string bytes = *_bytes;
+  FlatHeader header = headerOf(bytes);
+  header.checkedAt = date.time_since_epoch().count();
+  std::memcpy(bytes.data(), &header, sizeof header);
+  header.checksum = flatChecksum(std::string_view(bytes).substr(kFlatChecksumEnd));
+  std::memcpy(bytes.data(), &header, sizeof header);
+  return StaticFeed(std::move(bytes));
+}
+
+}  // namespace nimbo
