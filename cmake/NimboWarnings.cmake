@@ -5,4 +5,6 @@ target_compile_options(nimbo_warnings INTERFACE
   -Wduplicated-cond -Wlogical-op -Wnull-dereference
   # g++ 12 reports members of moved-from optionals and variants as maybe uninitialized under the sanitizers.
   -Wno-maybe-uninitialized
+  # Designated initializers leave the fields they do not name at their defaults, on purpose.
+  -Wno-missing-field-initializers
   $<$<BOOL:${NIMBO_WARNINGS_AS_ERRORS}>:-Werror>)

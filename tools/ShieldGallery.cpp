@@ -10,6 +10,7 @@
 #include "desktop/drawing/CairoShieldRenderer.h"
 #include "desktop/drawing/PangoTextSystem.h"
 #include "desktop/drawing/Rendering.h"
+#include "platform/ui/SystemColors.h"
 #include "support/TestPlatform.h"
 
 namespace nimbo {
@@ -64,10 +65,15 @@ class Panel {
   static constexpr Size kSize{640, 610};
 
   Panel(Painter& painter, PangoTextSystem& text, double scale, bool nightMode)
-      : _painter(painter), _text(text), _renderer(text), _scale(scale), _nightMode(nightMode) {}
+      : _painter(painter),
+        _text(text),
+        _renderer(text),
+        _scale(scale),
+        _nightMode(nightMode),
+        _appearance(nightMode ? Appearance::dark : Appearance::light) {}
 
   void draw() {
-    _painter.fillRect({0, 0, kSize.width, kSize.height}, _nightMode ? Color{0.11, 0.11, 0.12, 1} : Color{1, 1, 1, 1});
+    _painter.fillRect({0, 0, kSize.width, kSize.height}, colorOf(SystemColor::background, _appearance));
     for (std::int64_t size = 7; size >= 0; --size) drawShields(size, size == 6);
     for (const std::int64_t size : {7, 4, 1}) drawModes(size);
     drawImages();
@@ -100,14 +106,14 @@ class Panel {
     for (const char* name : {"good-v2", "good-alt-v2", "advisories-v2", "WidgetGenericTransit"})
       show(_images.image(name, _scale, _nightMode));
     for (const char* name : {"good-alt-v2", "advisories-v2", "WidgetGenericTransit"})
-      show(_images.image(name, _scale, _nightMode), 0.3, labelColor(_nightMode));
+      show(_images.image(name, _scale, _nightMode), 0.3, colorOf(SystemColor::label, _appearance));
     next();
   }
   void drawWithHeadline() {
     const FontDescriptor headline{17, true};
     const auto layout = _text.layOut("Delays on the N line", headline, 300, 1, TextAlignment::natural, false);
     const double top = _y + 15 - layout->firstBaseline() + _text.metrics(headline).capHeight / 2;
-    _painter.drawText(*layout, {12, top}, 300, labelColor(_nightMode));
+    _painter.drawText(*layout, {12, top}, 300, colorOf(SystemColor::label, _appearance));
     _x = 24 + layout->size().width;
     show(_renderer.render(*artwork(kSamples[2], false), 7, _scale, _nightMode));
     show(_renderer.render(*artwork(kSamples[6], false), 7, _scale, _nightMode));
@@ -120,6 +126,7 @@ class Panel {
   CairoImageResources _images;
   double _scale;
   bool _nightMode;
+  Appearance _appearance;
   double _x = 12, _y = 12, _rowHeight = 0;
 };
 

@@ -1,8 +1,11 @@
 #include "desktop/DesktopPlatform.h"
 
+#include <algorithm>
 #include <cstdlib>
 
 #include "desktop/drawing/CairoShieldRenderer.h"
+#include "desktop/gtfs/FeedConfiguration.h"
+#include "desktop/gtfs/SampleCity.h"
 
 namespace nimbo {
 
@@ -17,6 +20,18 @@ std::unique_ptr<SystemLog> makeLogInto(std::unique_ptr<LogSink> sink) {
 
 /// Tells of a database that was set aside. May come from any thread.
 void logNotice(const ErrorRef& notice) { writeLog(kLog, LogLevel::error, "%@", {notice->reason()}); }
+
+/// The favourites of a rider who set nothing up: the sample city's. One who set a feed up chooses his own.
+std::vector<TransitLineRef> firstFavorites(const std::filesystem::path& configFolder) {
+  const auto feeds = FeedConfiguration(configFolder).feeds();
+  return feeds && feeds->empty() ? SampleCity::favorites() : std::vector<TransitLineRef>();
+}
+
+/// "de_AT" as "de-AT".
+std::string languageTag(std::string locale) {
+  std::replace(locale.begin(), locale.end(), '_', '-');
+  return locale;
+}
 
 }  // namespace
 
@@ -40,11 +55,11 @@ DesktopPlatform::DesktopPlatform(Options options)
       _database(std::make_shared<StateDatabase>(_paths.state, _clock, &logNotice)),
       _sharedSettings(_database),
       _analytics(_database),
-      _transitLines(_paths, _locale),
-      _favoritesEditor(_database, [this] { return _transitLines.firstFavorites(); }),
+      _transitLines(_paths),
+      _favoritesEditor(_database, [folder = _paths.config] { return firstFavorites(folder); }),
       _favorites(_favoritesEditor, _transitLines),
       _memoryPressure(options.runLoop),
-      _text(_locale),
+      _text(languageTag(_locale)),
       _platform(std::make_unique<Platform>(
           PlatformServices{.clock = _clock,
                            .mainRunLoop = options.runLoop,
@@ -64,7 +79,9 @@ DesktopPlatform::DesktopPlatform(Options options)
                            .compressor = _compressor,
                            .images = _images,
                            .text = _text,
-                           .shieldRenderer = std::make_shared<CairoShieldRenderer>(_text)})) {}
+                           .shieldRenderer = std::make_shared<CairoShieldRenderer>(_text)})) {
+  _transitLines.setLanguage(languageTag(_locale));
+}
 
 DesktopPlatform::~DesktopPlatform() = default;
 

@@ -1,3 +1,7 @@
+#include <algorithm>
+#include <functional>
+#include <map>
+
 #include "handoff/Bytes+NimboExtra.h"
 #include "handoff/NBUserActivityData+Payloads.h"
 #include "handoff/NimboActivity.h"
@@ -13,33 +17,66 @@ namespace {
 /// User-info key of the compressed `NimboActivity`.
 constexpr std::string_view kActivityRecordKey = "bs";
 
+/// The payloads of objects that are alive. A line has a row for each of its incidents, and all rows are made anew
+/// whenever an incident starts or ends; compressing takes a hundred times what the rest of a row takes.
+class PayloadCache {
+ public:
+  /// What `make` answered for these very objects, or answers now; null when it answers no bytes.
+  ObjectRef payloadFor(const std::vector<ObjectRef>& objects, const std::function<std::optional<Bytes>()>& make) {
+    Key key(objects.begin(), objects.end());
+    if (const auto known = _payloads.find(key); known != _payloads.end()) return known->second;
+    std::optional<Bytes> bytes = make();
+    if (!bytes) return nullptr;
+    std::erase_if(_payloads, [](const auto& entry) {
+      return std::ranges::any_of(entry.first, [](const auto& object) { return object.expired(); });
+    });
+    return _payloads.emplace(std::move(key), box(*std::move(bytes))).first->second;
+  }
+
+ private:
+  using Key = std::vector<std::weak_ptr<const Object>>;
+  struct IsBefore {
+    bool operator()(const Key& a, const Key& b) const {
+      return std::ranges::lexicographical_compare(a, b, std::owner_less<>());
+    }
+  };
+  std::map<Key, ObjectRef, IsBefore> _payloads;
+};
+
 NBUserActivityDataRef activityData(const std::string& activityType, std::string_view key,
-                                   std::optional<Bytes> payload) {
+                                   const std::vector<ObjectRef>& objects,
+                                   const std::function<std::optional<Bytes>()>& makePayload) {
+  const auto cache = Platform::current().singleton<PayloadCache>([] { return std::make_shared<PayloadCache>(); });
+  ObjectRef payload = cache->payloadFor(objects, makePayload);
   if (!payload) return nullptr;
+  BoxedDictionary::Entries userInfo;
+  userInfo.emplace(key, std::move(payload));
   return NBUserActivityData::initWithActivityType_userInfo(
-      activityType,
-      std::make_shared<const BoxedDictionary>(BoxedDictionary::Entries{{std::string(key), box(*std::move(payload))}}));
+      activityType, std::make_shared<const BoxedDictionary>(std::move(userInfo)));
 }
 
 }  // namespace
 
 NBUserActivityDataRef activityDataForLineItem(const TransitLineItemRef& lineItem) {
-  NimboActivity activity;
-  activity.setLineItem(StoredTransitLineItem::initWithLineItem(lineItem));
-  const auto displayOptions = std::make_shared<MapDisplayOptions>();
-  displayOptions->setMapType(kMapTypeTransit);
-  activity.setDisplayOptions(displayOptions);
-  return activityData(kNimboTransitWidgetIncidentActivityType, kActivityRecordKey,
-                      bzip2CompressedData(activity.data()));
+  return activityData(kNimboTransitWidgetIncidentActivityType, kActivityRecordKey, {lineItem}, [&] {
+    NimboActivity activity;
+    activity.setLineItem(StoredTransitLineItem::initWithLineItem(lineItem));
+    const auto displayOptions = std::make_shared<MapDisplayOptions>();
+    displayOptions->setMapType(kMapTypeTransit);
+    activity.setDisplayOptions(displayOptions);
+    return bzip2CompressedData(activity.data());
+  });
 }
 
 NBUserActivityDataRef activityDataForIncidents(const TransitIncidents& incidents) {
-  const auto stored = NimboMap(incidents, [](const TransitIncidentRef& incident, std::size_t) {
-    return StoredTransitIncident::initWithIncident(incident);
-  });
-  return activityData(kNimboTransitWidgetIncidentSummaryActivityType,
-                      kNimboTransitWidgetIncidentSummaryActivityUserInfoKey,
-                      Platform::current().archive().archivedDataWithRootObject(BoxedArray::of(stored), true).bytes);
+  return activityData(
+      kNimboTransitWidgetIncidentSummaryActivityType, kNimboTransitWidgetIncidentSummaryActivityUserInfoKey,
+      std::vector<ObjectRef>(incidents.begin(), incidents.end()), [&] {
+        const auto stored = NimboMap(incidents, [](const TransitIncidentRef& incident, std::size_t) {
+          return StoredTransitIncident::initWithIncident(incident);
+        });
+        return Platform::current().archive().archivedDataWithRootObject(BoxedArray::of(stored), true).bytes;
+      });
 }
 
 }  // namespace nimbo

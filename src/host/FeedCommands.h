@@ -1,8 +1,10 @@
 #pragma once
 
 #include <string>
+#include <vector>
 
 #include "host/Command.h"
+#include "platform/transit/TransitLine.h"
 
 namespace nimbo {
 
@@ -20,5 +22,8 @@ int runFeedCheck(const CommandContext& context, const std::string& name);
 
 /// Prints the lines of all feeds that contain `text`, one a line, as FEED:ROUTE_ID, names and agency.
 int runLines(const CommandContext& context, const std::string& text);
+
+/// Prints a line each.
+void printLines(const std::vector<TransitLineRef>& lines);
 
 }  // namespace nimbo

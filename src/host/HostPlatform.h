@@ -5,12 +5,13 @@
 
 namespace nimbo {
 
-/// The platform of a command that works without a widget process: on feeds, favourites and settings. In force while
+/// The platform of a host apart from the widget process: for feeds, favourites and settings. In force while
 /// it lives. A command line opens no activities.
 class HostPlatform final : private ActivityLauncher {
  public:
-  explicit HostPlatform(const CommandContext& context)
-      : _platform({.paths = context.paths, .locale = {}, .runLoop = context.runLoop, .activityLauncher = *this}) {}
+  /// `locale` is a BCP 47 tag or POSIX name; empty: the environment's.
+  explicit HostPlatform(const CommandContext& context, std::string locale = {})
+      : _platform({.paths = context.paths, .locale = std::move(locale), .runLoop = context.runLoop, .activityLauncher = *this}) {}
 
   DesktopPlatform* operator->() { return &_platform; }
 

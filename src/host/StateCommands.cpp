@@ -97,9 +97,9 @@ int runDecode(const std::string& file) {
   std::istream& input = file == "-" ? std::cin : opened;
   const Bytes bytes{std::istreambuf_iterator<char>(input), std::istreambuf_iterator<char>()};
   if (input.bad()) throw CommandFailure("cannot read " + file + ": " + std::strerror(errno));
-  const HandoffDecoded decoded = decodeHandoff(bytes);
+  const DecodedHandoff decoded = decodeHandoff(bytes);
   if (decoded.error) throw CommandFailure(file + ": " + decoded.error->reason());
-  std::cout << decoded.json << "\n";
+  std::cout << *decoded.json << "\n";
   return kExitSuccess;
 }
 

@@ -10,6 +10,7 @@
 #include "host/OnScreenWidget.h"
 #include "host/ScriptPlayer.h"
 #include "host/TerminalRows.h"
+#include "platform/ui/Geometry.h"
 
 namespace nimbo {
 

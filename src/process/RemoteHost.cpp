@@ -30,6 +30,7 @@ Size RemoteHost::maximumSizeForDisplayMode(WidgetDisplayMode mode) const {
 }
 
 void RemoteHost::setLargestAvailableDisplayMode(WidgetDisplayMode mode) {
+  if (_contentObserver) _contentObserver();
   if (mode == _largestAvailableDisplayMode) return;
   _largestAvailableDisplayMode = mode;
   _connection.notify("largestAvailableDisplayModeDidChange", {{"mode", nameOfDisplayMode(mode)}});

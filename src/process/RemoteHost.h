@@ -20,6 +20,8 @@ class RemoteHost final : public WidgetHost, public ActivityLauncher {
   void setBundleRecord(BundleRecordRef record) { _bundleRecord = std::move(record); }
   /// Hears each new preferred size, before the host does.
   void setPreferredSizeObserver(std::function<void(Size)> observer) { _preferredSizeObserver = std::move(observer); }
+  /// Hears of each change of the rows: with each the widget says anew what its largest mode is.
+  void setContentObserver(std::function<void()> observer) { _contentObserver = std::move(observer); }
 
   WidgetDisplayMode activeDisplayMode() const override { return _activeDisplayMode; }
   /// 0 by 0 for a mode of which the host said nothing.
@@ -41,6 +43,7 @@ class RemoteHost final : public WidgetHost, public ActivityLauncher {
   std::map<WidgetDisplayMode, Size> _maximumSizes;
   BundleRecordRef _bundleRecord;
   std::function<void(Size)> _preferredSizeObserver;
+  std::function<void()> _contentObserver;
 };
 
 }  // namespace nimbo

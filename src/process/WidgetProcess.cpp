@@ -1,8 +1,12 @@
 #include "process/WidgetProcess.h"
 
 #include <algorithm>
+#include <utility>
 
-#include "desktop/drawing/ViewRendering.h"
+#include "desktop/drawing/Rendering.h"
+#include "platform/ui/SystemColors.h"
+#include "process/HostLogSink.h"
+#include "process/SharedSurface.h"
 #include "process/Snapshot.h"
 
 namespace nimbo {
@@ -12,6 +16,9 @@ using nlohmann::json;
 namespace {
 
 constexpr int kProtocolVersion = 1;
+
+/// Device pixels for each point.
+constexpr double kSmallestScale = 0.25, kLargestScale = 8;
 
 /// The widest span that one `advanceTime` may cross, in seconds: a year.
 constexpr double kLongestAdvance = 366.0 * 86400;
@@ -49,11 +56,14 @@ WidgetProcess::WidgetProcess(Options options, int input, int output)
   addViewMethod("highlightRow", &WidgetProcess::highlightRow);
   addViewMethod("snapshot", &WidgetProcess::snapshot);
   addViewMethod("render", &WidgetProcess::render);
+  addViewMethod("setAppearance", &WidgetProcess::setAppearance);
+  addViewMethod("setScale", &WidgetProcess::setScale);
   if (_virtualTime) addMethod("advanceTime", &WidgetProcess::advanceTime);
   _connection.setHandler("performUpdate",
                          [this](const json&, const JSONRPCResponder& responder) { performUpdate(responder); });
   _connection.setClosedHandler([this] { _runLoop.quit(); });
   _host.setPreferredSizeObserver([this](Size size) { resizeView(size); });
+  _host.setContentObserver([this] { announceFrame(); });
 }
 
 WidgetProcess::~WidgetProcess() = default;
@@ -90,7 +100,6 @@ json WidgetProcess::initialize(const Parameters& params) {
   if (_platform) throw JSONRPCFailure(JSONRPCError::kInvalidState, "initialize was called already");
 
   // Everything is read before anything is made: a bad parameter leaves the process as it was.
-  constexpr double kSmallestScale = 0.25, kLargestScale = 8;
   const auto locale = params.optionalText("locale");
   const auto textSize = params.has("textSize") ? params.textSize("textSize") : ContentSizeCategory::large;
   const auto scale = params.has("scale") ? params.number("scale", kSmallestScale, kLargestScale) : 1.0;
@@ -104,11 +113,16 @@ json WidgetProcess::initialize(const Parameters& params) {
   }
   const BundleRecordRef record = params.has("bundle") ? bundleRecord(params.object("bundle")) : nullptr;
 
+  auto logSink = std::make_unique<HostLogSink>(
+      makeLogSink(LogOptions::fromEnvironment()), _runLoop, [this](const std::string& category, const std::string& text) {
+        _connection.notify("log", {{"level", "error"}, {"category", category}, {"message", text}});
+      });
   _platform = std::make_unique<DesktopPlatform>(DesktopPlatform::Options{.paths = _options.paths,
                                                                          .locale = locale.value_or(""),
                                                                          .runLoop = _runLoop,
                                                                          .virtualTime = _virtualTime.get(),
-                                                                         .activityLauncher = _host});
+                                                                         .activityLauncher = _host,
+                                                                         .logSink = std::move(logSink)});
   Environment& environment = Environment::current();
   environment.setContentSizeCategory(textSize);
   environment.setScreenScale(scale);
@@ -197,6 +211,7 @@ json WidgetProcess::transitionToSize(const Parameters& params) {
 
 json WidgetProcess::setTextSize(const Parameters& params) {
   Environment::current().setContentSizeCategory(params.textSize("category"));
+  announceFrame();
   return json::object();
 }
 
@@ -218,16 +233,48 @@ json WidgetProcess::highlightRow(const Parameters& params) {
   TableView& tableView = *_controller->tableView();
   if (highlighted) tableView.highlightRowAtIndexPath(indexPath);
   else if (tableView.highlightedRow() == indexPath) tableView.highlightRowAtIndexPath(std::nullopt);
+  announceFrame();
   return {{"highlighted", tableView.highlightedRow() == indexPath}};
 }
 
 json WidgetProcess::snapshot(const Parameters&) { return snapshotJSON(*_controller); }
 
 json WidgetProcess::render(const Parameters& params) {
-  const std::string path = params.text("path");
-  if (const ErrorRef error = renderViewToPNG(*_controller->view(), path))
-    throw JSONRPCFailure(JSONRPCError::kDrawingFailed, error->reason());
-  return {{"path", path}};
+  const bool toSurface = params.has("surface");
+  const std::string path = params.text(toSurface ? "surface" : "path");
+  _frameAnnounced = false;
+  View& view = *_controller->view();
+  view.layoutIfNeeded();
+  const Environment& environment = Environment::current();
+  const auto draw = [&view](Painter& painter) { view.draw(painter); };
+  const CairoSurface::Made made =
+      renderToSurface(draw, view.bounds().size(), environment.screenScale(),
+                      colorOf(SystemColor::background, environment.appearance()));
+  ErrorRef error = made.error;
+  if (!error) error = toSurface ? writeSharedSurface(*made.surface, path) : writePNG(*made.surface, path);
+  if (error) throw JSONRPCFailure(JSONRPCError::kDrawingFailed, error->reason());
+  return {{"width", made.surface->pixelWidth()},
+          {"height", made.surface->pixelHeight()},
+          {"stride", made.surface->stride()},
+          {"scale", made.surface->scale()}};
+}
+
+json WidgetProcess::setAppearance(const Parameters& params) {
+  Environment::current().setAppearance(params.appearance("appearance"));
+  announceFrame();
+  return json::object();
+}
+
+json WidgetProcess::setScale(const Parameters& params) {
+  Environment::current().setScreenScale(params.number("scale", kSmallestScale, kLargestScale));
+  _controller->view()->setNeedsLayout();
+  announceFrame();
+  return json::object();
+}
+
+void WidgetProcess::announceFrame() {
+  if (std::exchange(_frameAnnounced, true)) return;
+  _connection.notify("frame", json::object());
 }
 
 json WidgetProcess::advanceTime(const Parameters& params) {

@@ -55,12 +55,16 @@ class WidgetProcess {
   nlohmann::json highlightRow(const Parameters& params);
   nlohmann::json snapshot(const Parameters& params);
   nlohmann::json render(const Parameters& params);
+  nlohmann::json setAppearance(const Parameters& params);
+  nlohmann::json setScale(const Parameters& params);
   nlohmann::json advanceTime(const Parameters& params);
   nlohmann::json shutdown(const Parameters& params);
   void performUpdate(const JSONRPCResponder& responder);
 
   IndexPath existingRow(const Parameters& params) const;
   void resizeView(Size size);
+  /// Tells the host, once until it renders, that what the widget shows has changed.
+  void announceFrame();
 
   Options _options;
   std::unique_ptr<VirtualTime> _virtualTime;
@@ -70,6 +74,7 @@ class WidgetProcess {
   std::unique_ptr<DesktopPlatform> _platform;  // null until initialized
   std::shared_ptr<NBTransitIncidentsViewController> _controller;
   Stage _stage = Stage::created;
+  bool _frameAnnounced = false;
 };
 
 }  // namespace nimbo

@@ -108,7 +108,7 @@ void NBTransitIncidentsViewController::didReceiveMemoryWarning() {
 }
 
 void NBTransitIncidentsViewController::_startListeningToMemoryPressureEvents() {
-  constexpr LogFacility kLog{kHostSuggestionsLogSubsystem, NBTransitWidgetLogFacility.category};
+  static constexpr LogFacility kLog{kHostSuggestionsLogSubsystem, NBTransitWidgetLogFacility.category};
   const auto queue =
       std::make_shared<SerialQueue>(std::string(kHostApplicationIdentifier) + ".TransitWidget.memoryPresure");
   const auto makeSource = [&](MemoryPressureKind kind, std::string_view name) {

@@ -65,45 +65,37 @@ json jsonOf(const ObjectRef& object) {
   return descriptionOf(object);
 }
 
-DecodedHandoff decoded(std::string_view name, json content) {
-  const json named{{std::string(name), std::move(content)}};
-  // Records keep texts as they were sent: what is not UTF-8 is shown as U+FFFD.
-  return {named.dump(2, ' ', false, json::error_handler_t::replace), nullptr};
+HandoffContent failure(std::string reason) {
+  return {nullptr, Error::errorWithDomain_code_reason(std::string(kHandoffErrorDomain), 0, std::move(reason))};
 }
 
-DecodedHandoff failure(std::string reason) {
-  return {std::nullopt, Error::errorWithDomain_code_reason(std::string(kHandoffErrorDomain), 0, std::move(reason))};
-}
-
-DecodedHandoff decodeRecord(std::span<const std::uint8_t> bytes) {
+HandoffContent readRecord(std::span<const std::uint8_t> bytes) {
   if (bytes.size() > kMaximumRecordSize)
     return failure("the activity record has more than " + std::to_string(kMaximumRecordSize) + " bytes");
   ProtobufReader reader(bytes);
-  NimboActivity activity;
-  if (!activity.readFrom(reader)) return failure("the activity record is broken: " + reader.failureText());
+  const auto activity = std::make_shared<NimboActivity>();
+  if (!activity->readFrom(reader)) return failure("the activity record is broken: " + reader.failureText());
   if (reader.position() < reader.length())
     return failure("the activity record is broken: it ends with the end of a group that is not open, before byte " +
                    std::to_string(reader.position()) + " of " + std::to_string(reader.length()));
-  json fields = jsonOfEntries(*activity.dictionaryRepresentation());
-  if (fields.empty())
+  if (activity->dictionaryRepresentation()->entries().empty())
     return failure(
         "the bytes hold no field of an activity record, and are neither a bzip2 stream nor an archive; "
         "pass the value under \"bs\" or \"incidentListKey\" of a hand-off, or a saved state");
-  return decoded(activity.className(), std::move(fields));
+  return {activity, nullptr};
 }
 
-DecodedHandoff decodeArchive(std::span<const std::uint8_t> bytes) {
+HandoffContent readArchive(std::span<const std::uint8_t> bytes) {
   const CBORKeyedArchive::Opened opened = CBORKeyedArchive::openData(bytes);
-  if (!opened.unarchiver) return {std::nullopt, opened.error};
+  if (!opened.unarchiver) return {nullptr, opened.error};
   const ArchivableClass& stateClass = NBTransitIncidentViewControllerState::archivedClass();
   opened.unarchiver->setClass_forClassName(stateClass, kEarlierStateClassName);
   opened.unarchiver->setDecodingFailurePolicy(DecodingFailurePolicy::setErrorAndReturn);
   const auto [root, error] = opened.unarchiver->decodeTopLevelObjectOfClasses_forKey(
       {&kArrayClass, &StoredTransitIncident::archivedClass(), &stateClass}, kKeyedArchiveRootObjectKey);
-  if (error) return {std::nullopt, error};
+  if (error) return {nullptr, error};
   if (!root) return failure("the archive's root holds neither a list of incidents nor a state with a result");
-  const bool isList = dynamic_cast<const BoxedArray*>(root.get()) != nullptr;
-  return decoded(isList ? kNimboTransitWidgetIncidentSummaryActivityUserInfoKey : root->className(), jsonOf(root));
+  return {root, nullptr};
 }
 
 bool isBzip2Stream(std::span<const std::uint8_t> bytes) {
@@ -119,12 +111,22 @@ bool isMap(std::span<const std::uint8_t> bytes) {
 
 }  // namespace
 
-DecodedHandoff decodeHandoff(std::span<const std::uint8_t> bytes) {
+HandoffContent readHandoff(std::span<const std::uint8_t> bytes) {
   if (bytes.empty()) return failure("there are no bytes");
-  if (isMap(bytes)) return decodeArchive(bytes);
-  if (!isBzip2Stream(bytes)) return decodeRecord(bytes);
-  const Bzip2Decompressed content = bzip2DecompressedData(bytes, kMaximumRecordSize);
-  return content.bytes ? decodeRecord(*content.bytes) : DecodedHandoff{std::nullopt, content.error};
+  if (isMap(bytes)) return readArchive(bytes);
+  if (!isBzip2Stream(bytes)) return readRecord(bytes);
+  const Bzip2Decompressed record = bzip2DecompressedData(bytes, kMaximumRecordSize);
+  return record.bytes ? readRecord(*record.bytes) : HandoffContent{nullptr, record.error};
+}
+
+DecodedHandoff decodeHandoff(std::span<const std::uint8_t> bytes) {
+  const auto [content, error] = readHandoff(bytes);
+  if (error) return {std::nullopt, error};
+  const bool isList = dynamic_cast<const BoxedArray*>(content.get()) != nullptr;
+  const std::string name(isList ? kNimboTransitWidgetIncidentSummaryActivityUserInfoKey : content->className());
+  const json named{{name, jsonOf(content)}};
+  // Records keep texts as they were sent: what is not UTF-8 is shown as U+FFFD.
+  return {named.dump(2, ' ', false, json::error_handler_t::replace), nullptr};
 }
 
 }  // namespace nimbo

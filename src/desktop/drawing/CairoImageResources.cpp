@@ -1,8 +1,8 @@
 #include "desktop/drawing/CairoImageResources.h"
 
 #include "desktop/drawing/DrawnImage.h"
-#include "desktop/drawing/ShieldStyle.h"
 #include "desktop/drawing/VectorImageNamed.h"
+#include "platform/ui/SystemColors.h"
 
 namespace nimbo {
 
@@ -15,7 +15,8 @@ ImageRef CairoImageResources::image(std::string_view name, double screenScale, b
   if (const auto drawing = vectorImageNamed(name)) {
     const Size size = drawing->size();
     entry->second = drawImage(size, screenScale, [&](cairo_t* context) {
-      drawing->draw(context, {0, 0, size.width, size.height}, labelColor(nightMode));
+      drawing->draw(context, {0, 0, size.width, size.height},
+                    colorOf(SystemColor::label, nightMode ? Appearance::dark : Appearance::light));
     });
   }
   return entry->second;

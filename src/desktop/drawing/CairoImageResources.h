@@ -9,7 +9,7 @@
 namespace nimbo {
 
 /// The images of resources/images, drawn as CairoImages. What the images leave to the current colour is drawn in
-/// `labelColor`. Drawn images are kept, a missing name is logged once.
+/// the label's. Drawn images are kept, a missing name is logged once.
 class CairoImageResources final : public ImageResources {
  public:
   ImageRef image(std::string_view name, double screenScale, bool nightMode) override;

@@ -10,6 +10,7 @@
 #include "desktop/drawing/CairoPainter.h"
 #include "desktop/drawing/DrawnImage.h"
 #include "desktop/drawing/VectorImageNamed.h"
+#include "platform/ui/SystemColors.h"
 
 namespace nimbo {
 
@@ -210,7 +211,8 @@ ImageRef CairoShieldRenderer::renderText(const std::string& text, const Look& lo
   const TextLayoutRef layout = fit(text, look.metrics, look.metrics.maximumWidth, pointSize);
   const double width = layout->size().width;
   return drawFramed(width, look, [&](cairo_t* context) {
-    drawCentered(context, *layout, pointSize, {width, look.metrics.height}, labelColor(look.nightMode));
+    drawCentered(context, *layout, pointSize, {width, look.metrics.height},
+                 colorOf(SystemColor::label, look.nightMode ? Appearance::dark : Appearance::light));
   });
 }
 

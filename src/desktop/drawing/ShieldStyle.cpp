@@ -2,6 +2,8 @@
 
 #include <algorithm>
 
+#include "platform/ui/SystemColors.h"
+
 namespace nimbo {
 
 namespace {
@@ -23,9 +25,6 @@ constexpr ShieldMetrics kMetrics[] = {
 constexpr Color kBlack{0, 0, 0, 1};
 constexpr Color kWhite{1, 1, 1, 1};
 
-/// What a row's ground looks like, near enough to tell which shields would vanish in it.
-constexpr Color rowBackground(bool nightMode) { return nightMode ? Color{0.11, 0.11, 0.12, 1} : kWhite; }
-
 constexpr Color neutralFill(bool nightMode) {
   return nightMode ? Color{0.62, 0.65, 0.70, 1} : Color{0.36, 0.40, 0.46, 1};
 }
@@ -42,12 +41,13 @@ ShieldColors colorsOnFill(const Color& fill, std::optional<Color> wanted, bool n
     colors.text = *wanted;
   else
     colors.text = contrastRatio(kBlack, fill) > contrastRatio(kWhite, fill) ? kBlack : kWhite;
-  if (contrastRatio(fill, rowBackground(nightMode)) < kVisibleContrast)
+  if (contrastRatio(fill, colorOf(SystemColor::background, nightMode ? Appearance::dark : Appearance::light)) <
+      kVisibleContrast)
     colors.outline = nightMode ? Color{1, 1, 1, 0.45} : Color{0, 0, 0, 0.4};
   return colors;
 }
 
-std::optional<Color> colorOf(const std::optional<std::string>& text) {
+std::optional<Color> parsedColor(const std::optional<std::string>& text) {
   return text ? colorFromHexText(*text) : std::nullopt;
 }
 
@@ -58,8 +58,8 @@ const ShieldMetrics& shieldMetrics(std::int64_t shieldSize) {
 }
 
 ShieldColors shieldColors(const TransitShield& shield, bool nightMode) {
-  const auto fill = colorOf(shield.shieldColorString);
-  return colorsOnFill(fill.value_or(neutralFill(nightMode)), colorOf(shield.shieldTextColorString), nightMode);
+  const auto fill = parsedColor(shield.shieldColorString);
+  return colorsOnFill(fill.value_or(neutralFill(nightMode)), parsedColor(shield.shieldTextColorString), nightMode);
 }
 
 ShieldColors symbolColors(bool nightMode) { return colorsOnFill(neutralFill(nightMode), {}, nightMode); }

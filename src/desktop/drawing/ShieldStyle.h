@@ -34,7 +34,4 @@ ShieldColors shieldColors(const TransitShield& shield, bool nightMode);
 /// Colour of a mode's symbol, on a tile of the neutral fill.
 ShieldColors symbolColors(bool nightMode);
 
-/// Colour of texts and of one-coloured images on a row.
-Color labelColor(bool nightMode);
-
 }  // namespace nimbo

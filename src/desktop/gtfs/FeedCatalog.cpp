@@ -14,27 +14,35 @@ bool holds(std::string_view text, const std::string& part) {
 
 }  // namespace
 
-Outcome<FeedCatalog::Lines> FeedCatalog::linesMatching(std::string_view text) const {
+Outcome<FeedCatalog::Lines> FeedCatalog::lines(const Filter& isWanted, const std::stop_token& stop) const {
   const auto sources = _library.sources();
   if (!sources) return sources.error();
-  const std::string part = asciiLowerCase(text);
   Lines result;
   for (const FeedSourceRef& source : *sources) {
-    const auto loaded = source->staticFeed({});
+    const auto loaded = source->staticFeed(stop);
     if (!loaded) {
       result.errors.push_back(loaded.error());
       continue;
     }
     const StaticFeed& feed = loaded->feed;
     LineItems items(source->name(), feed);
-    for (std::size_t i = 0; i < feed.lineCount(); ++i) {
-      const StaticLine line = feed.line(i);
-      if (holds(line.shortName, part) || holds(line.longName, part) || holds(line.routeID, part) ||
-          holds(feed.agency(line.agency).name, part))
-        result.lines.push_back(items.item(i, line.muid));
-    }
+    for (std::size_t i = 0; i < feed.lineCount(); ++i)
+      if (const StaticLine line = feed.line(i); isWanted(feed, line)) result.lines.push_back(items.item(i, line.muid));
   }
   return result;
+}
+
+Outcome<FeedCatalog::Lines> FeedCatalog::linesMatching(std::string_view text, const std::stop_token& stop) const {
+  const auto isWanted = [part = asciiLowerCase(text)](const StaticFeed& feed, const StaticLine& line) {
+    return holds(line.shortName, part) || holds(line.longName, part) || holds(line.routeID, part) ||
+           holds(feed.agency(line.agency).name, part);
+  };
+  return lines(isWanted, stop);
+}
+
+Outcome<FeedCatalog::Lines> FeedCatalog::linesNumbered(const std::set<std::uint64_t>& muids,
+                                                       const std::stop_token& stop) const {
+  return lines([&](const StaticFeed&, const StaticLine& line) { return muids.contains(line.muid); }, stop);
 }
 
 Outcome<TransitLineRef> FeedCatalog::lineNamed(std::string_view name) const {

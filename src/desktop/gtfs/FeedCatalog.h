@@ -1,5 +1,8 @@
 #pragma once
 
+#include <functional>
+#include <set>
+#include <stop_token>
 #include <string_view>
 #include <vector>
 
@@ -21,12 +24,18 @@ class FeedCatalog {
 
   /// The lines in whose names, route identifier or agency `text` occurs, whatever the case of its ASCII letters; all
   /// for an empty text. An error when the configuration cannot be read.
-  Outcome<Lines> linesMatching(std::string_view text) const;
+  Outcome<Lines> linesMatching(std::string_view text, const std::stop_token& stop = {}) const;
+
+  /// The lines of these numbers; those that no feed knows are left out. An error as above.
+  Outcome<Lines> linesNumbered(const std::set<std::uint64_t>& muids, const std::stop_token& stop = {}) const;
 
   /// The line that is written "FEED:ROUTE_ID", or an error that says what to do.
   Outcome<TransitLineRef> lineNamed(std::string_view name) const;
 
  private:
+  using Filter = std::function<bool(const StaticFeed& feed, const StaticLine& line)>;
+  Outcome<Lines> lines(const Filter& isWanted, const std::stop_token& stop) const;
+
   const FeedLibrary& _library;
 };
 

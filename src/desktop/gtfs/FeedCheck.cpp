@@ -46,15 +46,15 @@ void checkAgainst(const FreshStaticFeed& fresh, const AlertsFeed& alerts, const 
 
 }  // namespace
 
-FeedCheckReport checkFeed(const Feed& feed, const FeedCache& cache) {
+FeedCheckReport checkFeed(const Feed& feed, const FeedCache& cache, const std::stop_token& stop) {
   FeedCheckReport report;
   report.name = feed.name;
-  const auto fresh = StaticFeedStore(cache).readAnew(feed, {});
+  const auto fresh = StaticFeedStore(cache).readAnew(feed, stop);
   report.staticError = fresh.error();
   if (fresh)
     report.staticFeed = {fresh->feed.agencyCount(), fresh->feed.lineCount(), fresh->trips.count(),
                          std::string(fresh->feed.language()), fresh->skipped};
-  const auto alerts = AlertsStore(cache).fetch(feed, {});
+  const auto alerts = AlertsStore(cache).fetch(feed, stop);
   report.alertsError = alerts.error();
   if (!alerts) return report;
   report.alerts.emplace();

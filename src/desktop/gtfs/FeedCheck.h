@@ -1,6 +1,7 @@
 #pragma once
 
 #include <optional>
+#include <stop_token>
 #include <string>
 #include <vector>
 
@@ -43,6 +44,6 @@ struct FeedCheckReport {
 };
 
 /// Reads both halves of a feed from their sources, whatever the cache holds, and checks them. Blocks its thread.
-FeedCheckReport checkFeed(const Feed& feed, const FeedCache& cache);
+FeedCheckReport checkFeed(const Feed& feed, const FeedCache& cache, const std::stop_token& stop = {});
 
 }  // namespace nimbo

@@ -13,7 +13,8 @@ constexpr int kBusyTimeoutMilliseconds = 5000;
 /// A file name as URI. Source: https://www.sqlite.org/uri.html
 std::string uriOfFile(const std::filesystem::path& file, std::string_view query) {
   std::string uri = "file:";
-  for (const char c : std::filesystem::absolute(file).native()) {
+  const std::filesystem::path whole = std::filesystem::absolute(file);
+  for (const char c : whole.native()) {
     if (c == '?')
       uri += "%3f";
     else if (c == '#')

@@ -6,8 +6,6 @@
 
 namespace nimbo {
 
-bool SQLiteFailure::meansDamage() const { return _code == SQLITE_CORRUPT || _code == SQLITE_NOTADB; }
-
 void SQLiteStatement::Finalizer::operator()(sqlite3_stmt* statement) const { sqlite3_finalize(statement); }
 
 void SQLiteStatement::check(int code) const {

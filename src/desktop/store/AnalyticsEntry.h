@@ -28,7 +28,7 @@ struct AnalyticsEntry {
   std::variant<AnalyticsUserAction, AnalyticsWidgetInteraction> content;
 };
 
-/// The entry as a JSON object on one line (see docs/formats.md), the form in which it is kept.
+/// The entry as a JSON object on one line (see docs/state-database.md), the form in which it is kept.
 std::string jsonOfAnalyticsEntry(const AnalyticsEntry& entry);
 /// Absent when the text is no entry.
 std::optional<AnalyticsEntry> analyticsEntryOfJSON(std::string_view text);

@@ -8,7 +8,7 @@
 namespace nimbo {
 
 /// What a favourite keeps of a line, but for its number: where it is found, name, colour, system and shields, as JSON
-/// (see docs/formats.md).
+/// (see docs/state-database.md).
 std::string contentOfFavoriteLine(const TransitLine& line);
 
 /// The line again, a line item without incidents. Null when `content` is not what `contentOfFavoriteLine` makes;

@@ -55,6 +55,9 @@ struct TransitArtworkText {
   std::optional<ServerFormattedString> text;
 };
 
+template <class Class>
+struct WireObject;
+
 /// A line's shield or a system's symbol, described and not drawn. Immutable.
 class TransitArtwork final : public Object {
  public:
@@ -91,6 +94,9 @@ class TransitArtwork final : public Object {
   std::string description() const override;
 
  private:
+  template <class Class>
+  friend struct WireObject;  // fills the fields of an artwork that is being read
+
   Fields _fields;
 };
 

@@ -46,6 +46,7 @@ class View : public LayoutItem {
   const std::vector<std::shared_ptr<View>>& subviews() const { return _subviews; }
   /// Whether this view is `ancestor` or inside it.
   bool isDescendantOf(const View& ancestor) const;
+  View* asView() override { return this; }
   View* owningView() override { return this; }
 
   bool isHidden() const { return _hidden; }

@@ -17,7 +17,8 @@ class CodableRecord {
   /// read; what was read before stays.
   virtual bool readFrom(ProtobufReader& reader) = 0;
 
-  /// Writes the fields that are present, in ascending order of their numbers. Unknown fields are not kept.
+  /// Writes the fields that are present, so that they stand in ascending order of their numbers. Unknown fields are not
+  /// kept.
   virtual void writeTo(ProtobufWriter& writer) const = 0;
 
   /// The present fields by name.

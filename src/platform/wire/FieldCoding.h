@@ -4,7 +4,7 @@
 #include "platform/wire/FieldTable.h"
 #include "platform/wire/WireType.h"
 
-// Writing and reading the fields of a struct with a table.
+// Writing (backwards, as ProtobufWriter does) and reading the fields of a struct with a table.
 namespace nimbo {
 
 template <class T>
@@ -23,6 +23,9 @@ template <class Struct>
 void writeFields(ProtobufWriter& writer, const Struct& record);
 
 template <class T>
+void writeMember(ProtobufWriter& writer, std::uint32_t number, const T& member);
+
+template <class T>
 void writeValue(ProtobufWriter& writer, std::uint32_t number, const T& value) {
   if constexpr (std::is_same_v<T, bool>) {
     writer.writeBool(value, number);
@@ -39,17 +42,17 @@ void writeValue(ProtobufWriter& writer, std::uint32_t number, const T& value) {
   } else if constexpr (SharedRecordField<T>) {
     writer.writeSubmessage(*value, number);
   } else {
-    const std::size_t contentStart = writer.beginMessage(number);
+    const std::size_t begin = writer.beginMessage();
     if constexpr (SharedObjectField<T>) {
       writeFields(writer, WireObjectOf<T>::fields(*value));
     } else if constexpr (VectorField<T>) {
-      for (const auto& element : value) writeValue(writer, 1, element);
+      writeMember(writer, 1, value);
     } else if constexpr (OptionalField<T>) {
       if (value) writeValue(writer, 1, *value);
     } else {
       writeFields(writer, value);
     }
-    writer.endMessage(contentStart);
+    writer.endMessage(begin, number);
   }
 }
 
@@ -61,7 +64,7 @@ void writeMember(ProtobufWriter& writer, std::uint32_t number, const T& member) 
   } else if constexpr (SharedVectorField<T>) {
     writeMember(writer, number, *member);
   } else if constexpr (VectorField<T>) {
-    for (const auto& element : member) writeValue(writer, number, element);
+    for (auto element = member.rbegin(); element != member.rend(); ++element) writeValue(writer, number, *element);
   } else if constexpr (OptionalField<T>) {
     writeValue(writer, number, *member);
   } else {
@@ -71,7 +74,7 @@ void writeMember(ProtobufWriter& writer, std::uint32_t number, const T& member) 
 
 template <class Struct>
 void writeFields(ProtobufWriter& writer, const Struct& record) {
-  forEachField<Struct>([&](const auto& field) { writeMember(writer, field.number, record.*field.member); });
+  forEachFieldBackwards<Struct>([&](const auto& field) { writeMember(writer, field.number, record.*field.member); });
 }
 
 enum class FieldRead { done, failed, unknown };
@@ -124,9 +127,10 @@ bool readValue(ProtobufReader& reader, T& value) {
     value = std::make_shared<typename T::element_type>();
     return readMessage(reader, [&] { return value->readFrom(reader); });
   } else if constexpr (SharedObjectField<T>) {
-    std::remove_cvref_t<decltype(WireObjectOf<T>::fields(*value))> fields;
-    if (!readMessage(reader, [&] { return readFields(reader, fields); })) return false;
-    value = WireObjectOf<T>::make(std::move(fields));
+    return readMessage(reader, [&] {
+      value = WireObjectOf<T>::make([&](auto& fields) { return readFields(reader, fields); });
+      return value != nullptr;
+    });
   } else if constexpr (VectorField<T> || OptionalField<T>) {
     return readMessage(reader, [&] {
       return readTaggedFields(reader, [&](std::uint64_t number) {
@@ -150,15 +154,17 @@ bool readMember(ProtobufReader& reader, T& member) {
     if (!member) member = std::make_shared<typename T::element_type>();
     return readMember(reader, *member);
   } else if constexpr (VectorField<T>) {
-    typename T::value_type element{};
-    if (!readValue(reader, element)) return false;
-    member.push_back(std::move(element));
-    return true;
+    if (readValue(reader, member.emplace_back())) return true;
+    member.pop_back();
+    return false;
   } else if constexpr (OptionalField<T>) {
-    const bool read = readValue(reader, member.emplace());
-    if constexpr (std::is_same_v<T, std::optional<std::string>>)
-      if (!read) member.reset();
-    return read;
+    if constexpr (std::is_same_v<T, std::optional<std::string>>) {
+      member.reset();
+      if (const auto text = reader.readString()) member.emplace(*text);
+      return member.has_value();
+    } else {
+      return readValue(reader, member.emplace());
+    }
   } else {
     return readValue(reader, member);
   }

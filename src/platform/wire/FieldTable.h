@@ -37,7 +37,8 @@ template <class Struct>
 struct RecordTable;
 
 /// How an immutable class stands in a record: a specialisation has `fields(const Class&)`, answering a struct with a
-/// table, and `make(Struct&&)`, answering the shared object.
+/// table, and `make(fill)`, answering the shared object of the fields that `bool fill(Struct&)` sets, or null when that
+/// answers false.
 template <class Class>
 struct WireObject;
 
@@ -45,6 +46,15 @@ struct WireObject;
 template <class Struct, class Visitor>
 void forEachField(Visitor visit) {
   std::apply([&](const auto&... field) { (visit(field), ...); }, RecordTable<Struct>::fields);
+}
+
+/// Calls `visit(field)` for each field, from the last to the first.
+template <class Struct, class Visitor>
+void forEachFieldBackwards(Visitor visit) {
+  constexpr auto& fields = RecordTable<Struct>::fields;
+  constexpr std::size_t count = std::tuple_size_v<std::remove_cvref_t<decltype(fields)>>;
+  [&]<std::size_t... Index>(std::index_sequence<Index...>) { (visit(std::get<count - 1 - Index>(fields)), ...); }
+  (std::make_index_sequence<count>());
 }
 
 /// The first argument of a template type: what an optional, a shared pointer or a vector holds.

@@ -144,9 +144,11 @@ void mergeMember(T& mine, const T& theirs) {
       mine = theirs;
       return;
     }
-    auto fields = WireObjectOf<T>::fields(*mine);
-    mergeFields(fields, WireObjectOf<T>::fields(*theirs));
-    mine = WireObjectOf<T>::make(std::move(fields));
+    mine = WireObjectOf<T>::make([&](auto& fields) {
+      fields = WireObjectOf<T>::fields(*mine);
+      mergeFields(fields, std::remove_cvref_t<decltype(fields)>(WireObjectOf<T>::fields(*theirs)));
+      return true;
+    });
   } else if constexpr (OptionalField<T>) {
     if constexpr (StructValue<ContentOfT<T>>) {
       if (!mine) mine.emplace();

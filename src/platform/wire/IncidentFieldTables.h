@@ -17,12 +17,27 @@ struct RecordTable<AffectedEntityFields> {
                                      Field{2, "nextStopIDs", &AffectedEntityFields::nextStopIDs}};
 };
 
+/// What an incident of a record affects.
+class StoredAffectedEntity final : public TransitIncidentAffectedEntity {
+ public:
+  std::uint64_t muid() const override { return fields.muid; }
+  bool hasNextStopIDs() const override { return fields.nextStopIDs.has_value(); }
+  std::optional<std::vector<std::uint64_t>> nextStopIDs() const override { return fields.nextStopIDs; }
+  std::string_view className() const override { return "StoredAffectedEntity"; }
+
+  AffectedEntityFields fields;
+};
+
 template <>
 struct WireObject<TransitIncidentAffectedEntity> {
   static AffectedEntityFields fields(const TransitIncidentAffectedEntity& entity) {
     return {entity.muid(), entity.nextStopIDs()};
   }
-  static std::shared_ptr<const TransitIncidentAffectedEntity> make(AffectedEntityFields&& fields);
+  template <class Fill>
+  static std::shared_ptr<const TransitIncidentAffectedEntity> make(Fill fill) {
+    const auto entity = std::make_shared<StoredAffectedEntity>();
+    return fill(entity->fields) ? entity : nullptr;
+  }
 };
 
 template <>
@@ -51,8 +66,10 @@ struct WireObject<TransitIncident> {
   static const BasicTransitIncident::Fields& fields(const TransitIncident& incident) {
     return static_cast<const StoredTransitIncident&>(incident).fields();
   }
-  static TransitIncidentRef make(BasicTransitIncident::Fields&& fields) {
-    return std::make_shared<const StoredTransitIncident>(std::move(fields));
+  template <class Fill>
+  static TransitIncidentRef make(Fill fill) {
+    const auto incident = std::make_shared<StoredTransitIncident>();
+    return fill(incident->_fields) ? incident : nullptr;
   }
 };
 

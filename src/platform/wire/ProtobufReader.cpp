@@ -1,5 +1,6 @@
 #include "platform/wire/ProtobufReader.h"
 
+#include <algorithm>
 #include <bit>
 #include <ranges>
 
@@ -19,17 +20,18 @@ bool ProtobufReader::fail(const char* reason, std::size_t offset) {
 }
 
 std::uint64_t ProtobufReader::readLongVarint() {
-  const std::size_t start = _position;
+  const std::size_t available = std::min(_length - _position, kMaximumVarintLength);
+  const std::uint8_t* bytes = _bytes + _position;
   std::uint64_t value = 0;
-  for (unsigned shift = 0; shift < 7 * kMaximumVarintLength; shift += 7) {
-    if (_position >= _length) {
-      fail("the bytes end inside a number", start);
-      return 0;
+  for (std::size_t index = 0; index < available; ++index) {
+    value |= std::uint64_t{bytes[index] & 0x7fu} << (7 * index);
+    if (bytes[index] < 0x80) {
+      _position += index + 1;
+      return value;
     }
-    const std::uint8_t byte = _bytes[_position++];
-    value |= std::uint64_t{byte & 0x7fu} << shift;
-    if (byte < 0x80) return value;
   }
+  if (available < kMaximumVarintLength) fail("the bytes end inside a number", _position);
+  _position += available;
   return 0;
 }
 
@@ -41,32 +43,6 @@ double ProtobufReader::readDouble() {
   std::uint64_t bits = 0;
   for (unsigned shift = 0; shift < 64; shift += 8) bits |= std::uint64_t{_bytes[_position++]} << shift;
   return std::bit_cast<double>(bits);
-}
-
-std::optional<std::string_view> ProtobufReader::readString() {
-  const auto mark = placeMark();
-  if (!mark) return std::nullopt;
-  const std::string_view text(reinterpret_cast<const char*>(_bytes) + _position, _length - _position);
-  recallMark(*mark);
-  return text;
-}
-
-std::optional<ProtobufReader::Mark> ProtobufReader::placeMark() {
-  const std::size_t start = _position;
-  const std::uint64_t length = readVarint();
-  if (hasError()) return std::nullopt;
-  if (length > _length - _position) {
-    fail("the length exceeds the bytes that follow", start);
-    return std::nullopt;
-  }
-  const Mark mark{_position + static_cast<std::size_t>(length), _length};
-  _length = mark.end;
-  return mark;
-}
-
-void ProtobufReader::recallMark(const Mark& mark) {
-  _position = mark.end;
-  _length = mark.outerLength;
 }
 
 bool ProtobufReader::skipBytes(std::size_t count) {

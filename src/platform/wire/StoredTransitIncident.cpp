@@ -6,27 +6,6 @@
 
 namespace nimbo {
 
-namespace {
-
-class StoredAffectedEntity final : public TransitIncidentAffectedEntity {
- public:
-  explicit StoredAffectedEntity(AffectedEntityFields fields) : _fields(std::move(fields)) {}
-  std::uint64_t muid() const override { return _fields.muid; }
-  bool hasNextStopIDs() const override { return _fields.nextStopIDs.has_value(); }
-  std::optional<std::vector<std::uint64_t>> nextStopIDs() const override { return _fields.nextStopIDs; }
-  std::string_view className() const override { return "StoredAffectedEntity"; }
-
- private:
-  AffectedEntityFields _fields;
-};
-
-}  // namespace
-
-std::shared_ptr<const TransitIncidentAffectedEntity> WireObject<TransitIncidentAffectedEntity>::make(
-    AffectedEntityFields&& fields) {
-  return std::make_shared<const StoredAffectedEntity>(std::move(fields));
-}
-
 template class Record<StoredTransitIncident, BasicTransitIncident::Fields, TransitIncident>;
 
 std::shared_ptr<const StoredTransitIncident> StoredTransitIncident::initWithIncident(

@@ -7,6 +7,8 @@
 namespace nimbo {
 
 class StoredTransitIncident;
+template <class Class>
+struct WireObject;
 extern template class Record<StoredTransitIncident, BasicTransitIncident::Fields, TransitIncident>;
 
 /// A snapshot of an incident for archives and hand-offs: answers all that the incident answered.
@@ -41,6 +43,10 @@ class StoredTransitIncident final : public Record<StoredTransitIncident, BasicTr
   std::string_view className() const override { return "StoredTransitIncident"; }
   /// The class name, the number and the title.
   std::string description() const override;
+
+ private:
+  template <class Class>
+  friend struct WireObject;
 };
 
 }  // namespace nimbo

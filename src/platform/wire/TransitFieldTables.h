@@ -59,8 +59,11 @@ struct RecordTable<TransitArtwork::Fields> {
 template <>
 struct WireObject<TransitArtwork> {
   static const TransitArtwork::Fields& fields(const TransitArtwork& artwork) { return artwork.fields(); }
-  static TransitArtworkRef make(TransitArtwork::Fields&& fields) {
-    return std::make_shared<const TransitArtwork>(std::move(fields));
+  /// Filled in place: the fields are too large to be moved for nothing.
+  template <class Fill>
+  static TransitArtworkRef make(Fill fill) {
+    const auto artwork = std::make_shared<TransitArtwork>(TransitArtwork::Fields());
+    return fill(artwork->_fields) ? artwork : nullptr;
   }
 };
 
@@ -82,7 +85,10 @@ struct WireObject<TransitSystem> {
   static TransitSystemFields fields(const TransitSystem& system) {
     return {system.muid(), system.name(), system.artwork()};
   }
-  static TransitSystemRef make(TransitSystemFields&& fields) {
+  template <class Fill>
+  static TransitSystemRef make(Fill fill) {
+    TransitSystemFields fields;
+    if (!fill(fields)) return nullptr;
     return std::make_shared<const TransitSystem>(fields.muid, std::move(fields.name), std::move(fields.artwork));
   }
 };
@@ -111,7 +117,10 @@ struct WireObject<MapItemIdentifier> {
   static MapItemIdentifierFields fields(const MapItemIdentifier& identifier) {
     return {identifier.muid(), identifier.locator()};
   }
-  static MapItemIdentifierRef make(MapItemIdentifierFields&& fields) {
+  template <class Fill>
+  static MapItemIdentifierRef make(Fill fill) {
+    MapItemIdentifierFields fields;
+    if (!fill(fields)) return nullptr;
     return std::make_shared<const MapItemIdentifier>(fields.muid, std::move(fields.locator));
   }
 };

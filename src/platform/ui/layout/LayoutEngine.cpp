@@ -3,7 +3,6 @@
 #include <algorithm>
 #include <cmath>
 
-#include "platform/ui/RoundToViewScale.h"
 #include "platform/ui/View.h"
 #include "platform/ui/layout/LayoutLog.h"
 
@@ -45,7 +44,8 @@ void LayoutEngine::layOut() {
   const Size solved = _solved ? solvedRootSize() : Size{};
   if (_needsUpdate || !_solved || !isSameLength(solved.width, size.width) || !isSameLength(solved.height, size.height))
     solveFor({size, kRootSizePriority, kRootSizePriority});
-  applyFrames();
+  if (_applied != size) applyFrames();
+  _applied = size;
 }
 
 void LayoutEngine::solveFor(const Target& target) {
@@ -61,6 +61,7 @@ void LayoutEngine::solveFor(const Target& target) {
   if (_needsUpdate) _fitting.reset();
   _needsUpdate = false;
   _solved = target;
+  _applied.reset();
   settle();
 }
 
@@ -171,7 +172,7 @@ bool LayoutEngine::addAnchor(Form& form, const LayoutAnchor& anchor, double sign
   if (!held) return false;
   LayoutItem* item = held.get();
   std::optional<double> fromTop, fromBottom;
-  if (auto* view = dynamic_cast<View*>(item)) {
+  if (View* view = item->asView()) {
     if (anchor.attribute() == LayoutAttribute::firstBaseline) {
       View& text = view->firstBaselineView();
       fromTop = text.firstBaselineFromTop();
@@ -220,7 +221,7 @@ bool LayoutEngine::addAnchor(Form& form, const LayoutAnchor& anchor, double sign
 
 /// Makes them on first use, with those of the views around; a view that fills another has that one's.
 LayoutEngine::Variables LayoutEngine::variablesOf(LayoutItem& item) {
-  auto* view = dynamic_cast<View*>(&item);
+  View* view = item.asView();
   if (view && view != &_root && view->_fillsSuperview) return variablesOf(*view->superview());
   if (const auto found = _variables.find(&item); found != _variables.end()) return found->second;
   if (view != &_root) variablesOf(view ? *view->superview() : *item.owningView());
@@ -243,32 +244,36 @@ Size LayoutEngine::solvedRootSize() const {
 }
 
 void LayoutEngine::applyFrames() {
+  const Screen screen{_root.screenScale(), _root.isRightToLeft()};
   for (const auto& [item, variables] : _variables) {
-    if (auto* view = dynamic_cast<View*>(item)) {
-      if (view != &_root && !view->usesAutomaticConstraints()) view->setFrame(frameOf(variables, *view->superview()));
+    if (View* view = item->asView()) {
+      if (view != &_root && !view->usesAutomaticConstraints())
+        view->setFrame(frameOf(variables, *view->superview(), screen));
     } else {
-      static_cast<LayoutGuide*>(item)->_layoutFrame = frameOf(variables, *item->owningView());
+      static_cast<LayoutGuide*>(item)->_layoutFrame = frameOf(variables, *item->owningView(), screen);
     }
   }
 }
 
-/// From the root's leading top corner, with the edges on device pixels; of the root, as large as it really is.
-Rect LayoutEngine::solvedRect(const Variables& variables) const {
-  const auto valueOf = [this](const std::optional<Variable>& v) { return v ? _installer.value(*v) : 0; };
-  const double x = valueOf(variables.x), y = valueOf(variables.y);
-  const double left = roundToViewScale(x, &_root), top = roundToViewScale(y, &_root);
-  return {left, top, roundToViewScale(x + _installer.value(variables.width), &_root) - left,
-          roundToViewScale(y + _installer.value(variables.height), &_root) - top};
+/// From the root's leading top corner, with the edges on device pixels.
+Rect LayoutEngine::solvedRect(const Variables& variables, const Screen& screen) const {
+  const auto rounded = [&](double length) { return std::round(length * screen.scale) / screen.scale; };
+  const double x = variables.x ? _installer.value(*variables.x) : 0;
+  const double y = variables.y ? _installer.value(*variables.y) : 0;
+  const double left = rounded(x), top = rounded(y);
+  return {left, top, rounded(x + _installer.value(variables.width)) - left,
+          rounded(y + _installer.value(variables.height)) - top};
 }
 
-Rect LayoutEngine::frameOf(const Variables& variables, View& around) {
+/// In the coordinates of the view around it; the root is as large as it really is.
+Rect LayoutEngine::frameOf(const Variables& variables, View& around, const Screen& screen) {
   const View* measured = &around;
   while (measured != &_root && measured->_fillsSuperview) measured = measured->superview();
-  const Rect outer = measured == &_root ? _root.bounds() : solvedRect(variablesOf(around));
-  Rect frame = solvedRect(variables);
+  const Rect outer = measured == &_root ? _root.bounds() : solvedRect(variablesOf(around), screen);
+  Rect frame = solvedRect(variables, screen);
   frame.x -= outer.x;
   frame.y -= outer.y;
-  if (_root.isRightToLeft()) frame.x = outer.width - frame.maxX();
+  if (screen.rightToLeft) frame.x = outer.width - frame.maxX();
   return frame;
 }
 

@@ -45,6 +45,10 @@ class LayoutEngine {
     LayoutPriority horizontal, vertical;
     bool operator==(const Target&) const = default;
   };
+  struct Screen {
+    double scale;
+    bool rightToLeft;
+  };
   /// What a view's content asks for.
   struct ContentConstraints {
     LayoutConstraintRef minimumWidth, maximumWidth, minimumHeight, maximumHeight, firstLine;
@@ -62,8 +66,8 @@ class LayoutEngine {
   Variables variablesOf(LayoutItem& item);
   Size solvedRootSize() const;
   void applyFrames();
-  Rect solvedRect(const Variables& variables) const;
-  Rect frameOf(const Variables& variables, View& around);
+  Rect solvedRect(const Variables& variables, const Screen& screen) const;
+  Rect frameOf(const Variables& variables, View& around, const Screen& screen);
 
   View& _root;
   ConstraintInstaller _installer;
@@ -75,6 +79,7 @@ class LayoutEngine {
   LayoutConstraintRef _rootWidth, _rootHeight;
   std::optional<Target> _solved;
   std::optional<std::pair<Target, Size>> _fitting;  // the last answer of `fittingSize`
+  std::optional<Size> _applied;                     // the root's size for which the frames are set
   bool _needsUpdate = true;
 };
 

@@ -23,6 +23,8 @@ class LayoutItem : public Object {
   LayoutAnchor firstBaselineAnchor() { return anchor(LayoutAttribute::firstBaseline); }
   LayoutAnchor lastBaselineAnchor() { return anchor(LayoutAttribute::lastBaseline); }
 
+  /// The item, if it is a view.
+  virtual View* asView() { return nullptr; }
   /// The view itself, or the view that a guide belongs to; null for a guide whose view is gone.
   virtual View* owningView() = 0;
 

@@ -1,0 +1,75 @@
+#include "host/FavoriteCommands.h"
+
+#include <iostream>
+
+#include "desktop/gtfs/FeedCatalog.h"
+#include "desktop/gtfs/FeedLibrary.h"
+#include "host/FeedCommands.h"
+#include "host/HostPlatform.h"
+
+namespace nimbo {
+
+namespace {
+
+void require(const ErrorRef& error) {
+  if (error) throw CommandFailure(error->reason());
+}
+
+std::vector<TransitLineRef> favoriteLines(HostPlatform& platform) {
+  Favorites favorites;
+  require(platform->favoritesEditor().list(favorites));
+  std::vector<TransitLineRef> lines;
+  for (const FavoriteRef& favorite : favorites)
+    if (const auto* line = dynamic_cast<const FavoriteTransitLine*>(favorite.get()); line && line->transitLine())
+      lines.push_back(line->transitLine());
+  return lines;
+}
+
+/// The number of the favourite that is written so, whether its feed still knows it or not.
+std::uint64_t muidOfFavorite(HostPlatform& platform, const std::string& name) {
+  for (const TransitLineRef& line : favoriteLines(platform)) {
+    const auto& locator = line->identifier()->locator();
+    if (locator && locator->feed + ":" + locator->routeID == name) return line->muid();
+  }
+  throw CommandFailure("\"" + name + "\" is not among the favourites. \"favorite list\" shows them.");
+}
+
+}  // namespace
+
+int runFavoriteAdd(const CommandContext& context, const std::vector<std::string>& names) {
+  HostPlatform platform(context);
+  const FeedLibrary library(context.paths);
+  std::vector<TransitLineRef> lines;
+  for (const std::string& name : names) {
+    auto line = FeedCatalog(library).lineNamed(name);
+    if (!line) throw CommandFailure(line.error()->reason());
+    lines.push_back(*line);
+  }
+  require(platform->favoritesEditor().add(lines));
+  return kExitSuccess;
+}
+
+int runFavoriteRemove(const CommandContext& context, const std::vector<std::string>& names) {
+  HostPlatform platform(context);
+  std::vector<std::uint64_t> muids;
+  for (const std::string& name : names) muids.push_back(muidOfFavorite(platform, name));
+  require(platform->favoritesEditor().remove(muids));
+  return kExitSuccess;
+}
+
+int runFavoriteMove(const CommandContext& context, const std::string& name, std::size_t position) {
+  HostPlatform platform(context);
+  if (position == 0) throw CommandFailure("positions count from 1");
+  require(platform->favoritesEditor().move(muidOfFavorite(platform, name), position - 1));
+  return kExitSuccess;
+}
+
+int runFavoriteList(const CommandContext& context) {
+  HostPlatform platform(context);
+  const auto lines = favoriteLines(platform);
+  printLines(lines);
+  if (lines.empty()) std::cout << "No favourite lines. Add some with \"favorite add FEED:ROUTE_ID\".\n";
+  return kExitSuccess;
+}
+
+}  // namespace nimbo

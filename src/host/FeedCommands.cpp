@@ -1,0 +1,143 @@
+#include "host/FeedCommands.h"
+
+#include <algorithm>
+#include <iostream>
+#include <vector>
+
+#include "desktop/gtfs/FeedCatalog.h"
+#include "desktop/gtfs/FeedCheck.h"
+#include "desktop/gtfs/FeedLibrary.h"
+#include "host/HostPlatform.h"
+#include "host/TerminalText.h"
+
+namespace nimbo {
+
+namespace {
+
+template <class T>
+T require(Outcome<T> outcome) {
+  if (!outcome) throw CommandFailure(outcome.error()->reason());
+  return std::move(*outcome);
+}
+
+void require(const ErrorRef& error) {
+  if (error) throw CommandFailure(error->reason());
+}
+
+void printCount(const char* what, std::size_t count) {
+  std::cout << "  " << what << ": " << count << "\n";
+}
+
+void printReport(const char* what, const SkipReport& report) {
+  for (const SkipReport::Entry& entry : report.entries()) {
+    std::cout << "  " << what << ": " << entry.count << " " << printableText(entry.reason);
+    if (!entry.example.empty()) std::cout << " (first: " << printableText(entry.example) << ")";
+    std::cout << "\n";
+  }
+}
+
+/// Prints what a check found. Answers whether both halves can be used.
+bool printCheck(const FeedCheckReport& report) {
+  std::cout << printableText(report.name) << "\n";
+  if (const auto& feed = report.staticFeed) {
+    printCount("agencies", feed->agencies);
+    printCount("lines", feed->lines);
+    if (feed->trips > 0) printCount("trips", feed->trips);
+    if (!feed->language.empty()) std::cout << "  language: " << printableText(feed->language) << "\n";
+    printReport("skipped in the static feed", feed->skipped);
+  }
+  if (const auto& alerts = report.alerts) {
+    if (alerts->timestamp) std::cout << "  alerts as of: " << isoTextOfDate(*alerts->timestamp) << "\n";
+    printCount("alerts", alerts->alerts);
+    if (report.staticFeed) {
+      printCount("periods", alerts->periods);
+      printCount("selectors", alerts->selectors);
+      printCount("incidents in force or to come", alerts->incidents);
+      printCount("lines affected now", alerts->affectedLines);
+    }
+    printReport("skipped in the alerts", alerts->skipped);
+    printReport("fits nothing", alerts->unfit);
+    if (alerts->staleness) std::cout << "  too old: " << alerts->staleness->reason() << "\n";
+  }
+  for (const ErrorRef& error : {report.staticError, report.alertsError})
+    if (error) std::cout << "  error: " << error->reason() << "\n";
+  return !report.staticError && !report.alertsError && !(report.alerts && report.alerts->staleness);
+}
+
+/// The parts of a line as columns: how it is written, its shield's text, its name, its agency.
+std::vector<std::string> columnsOfLine(const TransitLine& line) {
+  const auto& locator = line.identifier()->locator();
+  const auto& artwork = line.artwork();
+  const std::string shortName = locator ? locator->shortName : "";
+  const std::string fullName = artwork && artwork->accessibilityText() ? *artwork->accessibilityText() : line.name().value_or("");
+  return {printableText(locator ? locator->feed + ":" + locator->routeID : std::to_string(line.muid())),
+          printableText(shortName), printableText(fullName),
+          printableText(line.system() ? line.system()->name().value_or("") : "")};
+}
+
+}  // namespace
+
+void printLines(const std::vector<TransitLineRef>& lines) {
+  std::vector<std::vector<std::string>> table;
+  std::vector<int> widths(4);
+  for (const TransitLineRef& line : lines) {
+    table.push_back(columnsOfLine(*line));
+    for (std::size_t i = 0; i < widths.size(); ++i) widths[i] = std::max(widths[i], terminalWidth(table.back()[i]));
+  }
+  for (const auto& row : table) {
+    std::string text;
+    for (std::size_t i = 0; i < row.size(); ++i)
+      if (widths[i] > 0) text += row[i] + std::string(static_cast<std::size_t>(widths[i] - terminalWidth(row[i]) + 2), ' ');
+    std::cout << text.substr(0, text.find_last_not_of(' ') + 1) << "\n";
+  }
+}
+
+int runFeedAdd(const CommandContext& context, const FeedOptions& options) {
+  const HostPlatform platform(context);
+  Feed feed{.name = options.name,
+            .staticFeed = require(FeedAddress::parse(options.staticFeed)),
+            .alerts = require(FeedAddress::parse(options.alerts))};
+  require(FeedConfiguration(context.paths.config).add(feed));
+  return kExitSuccess;
+}
+
+int runFeedRemove(const CommandContext& context, const std::string& name) {
+  const HostPlatform platform(context);
+  require(FeedConfiguration(context.paths.config).remove(name));
+  return kExitSuccess;
+}
+
+int runFeedList(const CommandContext& context) {
+  const HostPlatform platform(context);
+  const auto feeds = require(FeedConfiguration(context.paths.config).feeds());
+  for (const Feed& feed : feeds)
+    std::cout << printableText(feed.name) << "\n  static: " << printableText(feed.staticFeed.publicText())
+              << "\n  alerts: " << printableText(feed.alerts.publicText()) << "\n";
+  if (feeds.empty()) std::cout << "No feed is set up; the sample city serves. Set one up with \"feed add\".\n";
+  return kExitSuccess;
+}
+
+int runFeedCheck(const CommandContext& context, const std::string& name) {
+  const HostPlatform platform(context);
+  const FeedConfiguration configuration(context.paths.config);
+  const FeedCache cache(context.paths.cache);
+  const auto feeds = name.empty() ? require(configuration.feeds()) : std::vector<Feed>{require(configuration.feedNamed(name))};
+  if (feeds.empty()) throw CommandFailure("no feed is set up to be checked. Set one up with \"feed add\".");
+  std::size_t bad = 0;
+  for (const Feed& feed : feeds) bad += printCheck(checkFeed(feed, cache)) ? 0 : 1;
+  if (bad > 0) throw CommandFailure(std::to_string(bad) + " of " + std::to_string(feeds.size()) + " feeds cannot be used");
+  return kExitSuccess;
+}
+
+int runLines(const CommandContext& context, const std::string& text) {
+  const HostPlatform platform(context);
+  const FeedLibrary library(context.paths);
+  const auto found = require(FeedCatalog(library).linesMatching(text));
+  printLines(found.lines);
+  for (const ErrorRef& error : found.errors) std::cerr << "nimbo-transit: " << error->reason() << "\n";
+  if (!found.errors.empty()) return kExitFailure;
+  if (found.lines.empty()) throw CommandFailure("no line contains \"" + text + "\"");
+  return kExitSuccess;
+}
+
+}  // namespace nimbo

@@ -1,0 +1,27 @@
+#pragma once
+
+#include <optional>
+#include <string>
+
+#include "platform/foundation/Date.h"
+
+namespace nimbo {
+
+/// Dates in the words of a locale and the machine's time zone: "today at 14:00", "yesterday at 9:30", "5 January 2026
+/// at 14:00". Main thread only.
+class DateText {
+ public:
+  /// A BCP 47 tag or POSIX name; empty: the environment's.
+  explicit DateText(const std::string& locale);
+  ~DateText();
+
+  std::string textOf(Date date) const;
+  /// From when until when something lasts, as one phrase; empty when neither is known.
+  std::string textOfPeriod(std::optional<Date> start, std::optional<Date> end, Date now) const;
+
+ private:
+  struct Format;
+  std::unique_ptr<Format> _format;
+};
+
+}  // namespace nimbo

@@ -1,0 +1,116 @@
+#include "host/window/DesktopPreferences.h"
+
+#include <gtkmm/settings.h>
+#include <gtkmm/stylecontext.h>
+
+#include <algorithm>
+#include <array>
+#include <charconv>
+#include <cmath>
+
+#include "host/window/WindowStyle.h"
+#include "platform/Platform.h"
+
+namespace nimbo {
+
+namespace {
+
+constexpr const char* kSystem = "system";
+constexpr std::string_view kAppearanceKey = "Nimbo.Window.appearance";
+constexpr std::string_view kLanguageKey = "Nimbo.Window.language";
+constexpr std::string_view kTextSizeKey = "Nimbo.Window.textSizeSteps";
+
+/// How large a text of each category is beside one of `large`.
+constexpr std::array kTextScales{0.82, 0.88, 0.94, 1.0, 1.12, 1.24, 1.35, 1.65, 1.94, 2.35, 2.76, 3.12};
+
+std::size_t categoryOfScale(double scale) {
+  const auto distance = [scale](double other) { return std::abs(std::log(other / scale)); };
+  const auto nearest = std::min_element(kTextScales.begin(), kTextScales.end(),
+                                        [&](double a, double b) { return distance(a) < distance(b); });
+  return static_cast<std::size_t>(nearest - kTextScales.begin());
+}
+
+std::string storedText(std::string_view key, const char* otherwise) {
+  return Platform::current().sharedSettings().groupStore()->stringForKey(key).value_or(otherwise);
+}
+
+/// The choice serves now even where it cannot be kept, which the store logs.
+void keep(const std::string& text, std::string_view key) {
+  const auto store = Platform::current().sharedSettings().groupStore();
+  const ErrorRef ignored = text == kSystem ? store->removeValueForKey(key) : store->setValue_forKey(text, key);
+}
+
+}  // namespace
+
+DesktopPreferences::DesktopPreferences()
+    : _appearanceChoice(storedText(kAppearanceKey, kSystem)), _languageChoice(storedText(kLanguageKey, kSystem)) {
+  const std::string steps = storedText(kTextSizeKey, "0");
+  std::from_chars(steps.data(), steps.data() + steps.size(), _textSizeSteps);
+  const auto settings = Gtk::Settings::get_default();
+  _desktopIsDark = settings->property_gtk_application_prefer_dark_theme();
+  const auto changed = [this] { apply(); };
+  _connections = {settings->property_gtk_theme_name().signal_changed().connect(changed),
+                  settings->property_gtk_xft_dpi().signal_changed().connect(changed),
+                  _portal.signalChanged().connect(changed)};
+  _style = Gtk::CssProvider::create();
+  Gtk::StyleContext::add_provider_for_display(Gdk::Display::get_default(), _style,
+                                              GTK_STYLE_PROVIDER_PRIORITY_APPLICATION);
+  apply();
+}
+
+DesktopPreferences::~DesktopPreferences() {
+  for (sigc::connection& connection : _connections) connection.disconnect();
+  Gtk::StyleContext::remove_provider_for_display(Gdk::Display::get_default(), _style);
+}
+
+void DesktopPreferences::chooseAppearance(const std::string& choice) {
+  _appearanceChoice = choice;
+  keep(choice, kAppearanceKey);
+  apply();
+}
+
+void DesktopPreferences::chooseLanguage(const std::string& choice) {
+  if (choice == _languageChoice) return;
+  _languageChoice = choice;
+  keep(choice, kLanguageKey);
+  _localeChanged.emit();
+}
+
+void DesktopPreferences::stepTextSize(int step) {
+  const int base = static_cast<int>(categoryOfScale(desktopTextScale()));
+  const int wanted = step == 0 ? base : static_cast<int>(textSize()) + step;
+  _textSizeSteps = std::clamp(wanted, 0, static_cast<int>(kTextScales.size()) - 1) - base;
+  keep(_textSizeSteps == 0 ? kSystem : std::to_string(_textSizeSteps), kTextSizeKey);
+  apply();
+}
+
+Appearance DesktopPreferences::appearance() const {
+  if (_appearanceChoice != kSystem) return _appearanceChoice == "dark" ? Appearance::dark : Appearance::light;
+  const Glib::ustring theme = Gtk::Settings::get_default()->property_gtk_theme_name();
+  const bool themeIsDark = theme.lowercase().find("dark") != Glib::ustring::npos;
+  return _portal.prefersDark().value_or(_desktopIsDark || themeIsDark) ? Appearance::dark : Appearance::light;
+}
+
+double DesktopPreferences::desktopTextScale() const {
+  // Desktops say how much larger texts are by the resolution of fonts. Source: GtkSettings:gtk-xft-dpi.
+  constexpr double kUnitsPerDot = 1024, kUsualResolution = 96;
+  const int resolution = Gtk::Settings::get_default()->property_gtk_xft_dpi();
+  return resolution > 0 ? resolution / kUnitsPerDot / kUsualResolution : 1;
+}
+
+ContentSizeCategory DesktopPreferences::textSize() const {
+  const int category = static_cast<int>(categoryOfScale(desktopTextScale())) + _textSizeSteps;
+  return static_cast<ContentSizeCategory>(std::clamp(category, 0, static_cast<int>(kTextScales.size()) - 1));
+}
+
+double DesktopPreferences::textScale() const { return kTextScales[static_cast<std::size_t>(textSize())]; }
+
+std::string DesktopPreferences::locale() const { return _languageChoice == kSystem ? "" : _languageChoice; }
+
+void DesktopPreferences::apply() {
+  Gtk::Settings::get_default()->property_gtk_application_prefer_dark_theme() = appearance() == Appearance::dark;
+  _style->load_from_data(windowStyle(textScale() / desktopTextScale()));
+  _lookChanged.emit();
+}
+
+}  // namespace nimbo

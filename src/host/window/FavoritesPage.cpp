@@ -1,0 +1,137 @@
+#include "host/window/FavoritesPage.h"
+
+#include <algorithm>
+
+#include "desktop/store/FavoritesEditor.h"
+#include "host/window/Accessible.h"
+#include "platform/Localization.h"
+
+namespace nimbo {
+
+namespace {
+
+/// More lines than anybody reads: the search narrows them.
+constexpr std::size_t kLineLimit = 100;
+
+void clear(Gtk::ListBox& list) {
+  while (Gtk::ListBoxRow* row = list.get_row_at_index(0)) list.remove(*row);
+}
+
+}  // namespace
+
+FavoritesPage::FavoritesPage(const PageContext& context)
+    : Page(LocalizedString("Window_Favorites_Title")), _context(context) {
+  const std::string prompt = LocalizedString("Window_Favorites_Search");
+  _query.property_placeholder_text() = prompt;
+  setAccessibleLabel(_query, prompt);
+  _query.signal_search_changed().connect([this] { search(); });
+  _query.signal_stop_search().connect([this] { _query.set_text(""); });
+  content().append(_query);
+  addSection(_favoritesTitle, "Window_Favorites_Yours", _favoritesList);
+  _noFavorites.set_text(LocalizedString("TransitWidget_NoFavoriteTransitLines_SecondaryText"));
+  _noFavorites.set_wrap();
+  _noFavorites.set_xalign(0);
+  content().append(_noFavorites);
+  addSection(_linesTitle, "Window_Favorites_Lines", _linesList);
+  _notice.set_wrap();
+  _notice.set_xalign(0);
+  _notice.add_css_class("caption");
+  content().append(_searching);
+  content().append(_notice);
+  readFavorites();
+  showFavorites();
+  search();
+}
+
+void FavoritesPage::addSection(Gtk::Label& title, const char* key, Gtk::ListBox& list) {
+  title.set_text(LocalizedString(key));
+  title.add_css_class("heading");
+  title.set_xalign(0);
+  list.add_css_class("card");
+  list.set_selection_mode(Gtk::SelectionMode::NONE);
+  content().append(title);
+  content().append(list);
+}
+
+bool FavoritesPage::isFavorite(const TransitLine& line) const {
+  return std::any_of(_favorites.begin(), _favorites.end(),
+                     [&](const TransitLineRef& favorite) { return favorite->muid() == line.muid(); });
+}
+
+void FavoritesPage::readFavorites() {
+  Favorites all;
+  if (const ErrorRef failure = _context.platform->favoritesEditor().list(all))
+    return _context.navigator.tell(failure->reason());
+  _favorites.clear();
+  for (const FavoriteRef& favorite : all)
+    if (const auto* line = dynamic_cast<const FavoriteTransitLine*>(favorite.get()); line && line->transitLine())
+      _favorites.push_back(line->transitLine());
+}
+
+void FavoritesPage::showFavorites() {
+  clear(_favoritesList);
+  for (std::size_t i = 0; i < _favorites.size(); ++i) {
+    const TransitLineRef& line = _favorites[i];
+    auto* row = Gtk::make_managed<LineRow>(_context, line, true, [this, line] { toggle(line); });
+    row->addMoving(i > 0, i + 1 < _favorites.size(), [this, line, i](int step) {
+      move(line, static_cast<std::size_t>(static_cast<std::ptrdiff_t>(i) + step));
+    });
+    _favoritesList.append(*row);
+  }
+  const bool isSearching = !_query.get_text().empty();
+  _favoritesTitle.set_visible(!isSearching);
+  _favoritesList.set_visible(!isSearching && !_favorites.empty());
+  _noFavorites.set_visible(!isSearching && _favorites.empty());
+}
+
+void FavoritesPage::search() {
+  showFavorites();
+  _searching.start();
+  _search = _context.workers.start(
+      [this, &library = _context.library, text = _query.get_text().raw()](const std::stop_token& stop) {
+        auto found = FeedCatalog(library).linesMatching(text, stop);
+        return [this, found = std::move(found)] {
+          _found = found ? *found : FeedCatalog::Lines{{}, {found.error()}};
+          showFound();
+        };
+      });
+}
+
+void FavoritesPage::showFound() {
+  _searching.stop();
+  clear(_linesList);
+  for (std::size_t i = 0; i < std::min(_found.lines.size(), kLineLimit); ++i) {
+    const TransitLineRef& line = _found.lines[i];
+    _linesList.append(
+        *Gtk::make_managed<LineRow>(_context, line, isFavorite(*line), [this, line] { toggle(line); }));
+  }
+  _linesList.set_visible(!_found.lines.empty());
+  std::string notice;
+  const auto addNotice = [&notice](const std::string& text) { notice += (notice.empty() ? "" : "\n") + text; };
+  if (_found.lines.size() > kLineLimit)
+    addNotice(LocalizedFormat(LocalizedString("Window_Favorites_More"),
+                              {std::uint64_t{_found.lines.size() - kLineLimit}}));
+  if (_found.lines.empty() && _found.errors.empty()) addNotice(LocalizedString("Window_Favorites_NothingFound"));
+  for (const ErrorRef& error : _found.errors) addNotice(error->reason());
+  _notice.set_text(notice);
+  _notice.set_visible(!notice.empty());
+}
+
+void FavoritesPage::toggle(TransitLineRef line) {
+  FavoritesEditor& editor = _context.platform->favoritesEditor();
+  finish(isFavorite(*line) ? editor.remove({line->muid()}) : editor.add({line}));
+}
+
+void FavoritesPage::move(TransitLineRef line, std::size_t position) {
+  finish(_context.platform->favoritesEditor().move(line->muid(), position));
+  if (Gtk::ListBoxRow* row = _favoritesList.get_row_at_index(static_cast<int>(position))) row->grab_focus();
+}
+
+void FavoritesPage::finish(const ErrorRef& failure) {
+  readFavorites();
+  showFavorites();
+  showFound();
+  if (failure) _context.navigator.tell(failure->reason());
+}
+
+}  // namespace nimbo

@@ -1,0 +1,44 @@
+#pragma once
+
+#include <gtkmm/label.h>
+#include <gtkmm/listbox.h>
+#include <gtkmm/searchentry.h>
+#include <gtkmm/spinner.h>
+
+#include <optional>
+#include <vector>
+
+#include "desktop/gtfs/FeedCatalog.h"
+#include "host/window/LineRow.h"
+#include "host/window/Page.h"
+
+namespace nimbo {
+
+/// The favourite lines in their order, and all lines of all feeds to choose from.
+class FavoritesPage final : public Page {
+ public:
+  explicit FavoritesPage(const PageContext& context);
+
+ private:
+  void addSection(Gtk::Label& title, const char* key, Gtk::ListBox& list);
+  void readFavorites();
+  void showFavorites();
+  void search();
+  void showFound();
+  void toggle(TransitLineRef line);
+  void move(TransitLineRef line, std::size_t position);
+  /// Shows the state after a change, or why there was none.
+  void finish(const ErrorRef& failure);
+  bool isFavorite(const TransitLine& line) const;
+
+  const PageContext& _context;
+  std::vector<TransitLineRef> _favorites;
+  FeedCatalog::Lines _found;
+  Gtk::SearchEntry _query;
+  Gtk::Label _favoritesTitle, _noFavorites, _linesTitle, _notice;
+  Gtk::ListBox _favoritesList, _linesList;
+  Gtk::Spinner _searching;
+  std::shared_ptr<Workers::Job> _search;
+};
+
+}  // namespace nimbo

@@ -1,0 +1,36 @@
+#pragma once
+
+#include <gtkmm/box.h>
+#include <gtkmm/spinner.h>
+
+#include "desktop/gtfs/FeedCheck.h"
+#include "host/window/PageContext.h"
+
+namespace nimbo {
+
+/// Reads a feed and shows how far that is, then what the feed holds or why it cannot be used. What runs is dropped with
+/// the view.
+class FeedCheckView final : public Gtk::Box {
+ public:
+  explicit FeedCheckView(const PageContext& context);
+
+  /// Hears what was found; null when the user did not want to wait.
+  using Done = std::function<void(const FeedCheckReport* report)>;
+
+  /// Reads the feed anew.
+  void check(const Feed& feed, Done done);
+  void show(const FeedCheckReport& report);
+  /// Drops what runs and what is shown.
+  void cancel();
+
+ private:
+  void addText(const std::string& text, const char* style);
+  void addSkipped(const SkipReport& report);
+  void clear();
+
+  const PageContext& _context;
+  Gtk::Box* _details = nullptr;
+  std::shared_ptr<Workers::Job> _job;
+};
+
+}  // namespace nimbo

@@ -1,0 +1,38 @@
+#pragma once
+
+#include <gtkmm/box.h>
+#include <gtkmm/label.h>
+
+#include <map>
+#include <optional>
+
+#include "host/window/PageContext.h"
+
+namespace nimbo {
+
+/// Lines by their numbers.
+using LinesByNumber = std::map<std::uint64_t, TransitLineRef>;
+
+/// One incident in full: what its publisher says, when, what it affects.
+class IncidentCard final : public Gtk::Box {
+ public:
+  /// `periods` are the incident's, one at least, each with the same texts. `line` is the line on whose page it stands,
+  /// which is not named again.
+  IncidentCard(const PageContext& context, const TransitIncidents& periods, std::optional<std::uint64_t> line);
+
+  /// The lines that it affects, but for the one that is known. Until it is told their names it counts them.
+  void showAffectedLines(const LinesByNumber& lines);
+
+ private:
+  Gtk::Label& addText(const std::string& text, const char* style);
+  void addTexts(const TransitIncident& incident);
+  void addDates(const TransitIncidents& periods);
+  void addLink(const std::string& url);
+
+  const PageContext& _context;
+  std::vector<std::uint64_t> _affected;
+  Gtk::Box _affectedShields{Gtk::Orientation::HORIZONTAL, 6};
+  Gtk::Label _affectedText;
+};
+
+}  // namespace nimbo

@@ -1,0 +1,35 @@
+#include "host/window/LinePage.h"
+
+#include <gtkmm/label.h>
+
+#include "host/window/IncidentCards.h"
+#include "host/window/LineTexts.h"
+#include "host/window/ShieldImage.h"
+#include "platform/Localization.h"
+
+namespace nimbo {
+
+LinePage::LinePage(const PageContext& context, const TransitLineItemRef& line) : Page(nameOfLine(*line)) {
+  constexpr std::int64_t kShieldSize = 7;
+  auto* header = Gtk::make_managed<Gtk::Box>(Gtk::Orientation::HORIZONTAL, 12);
+  header->append(*Gtk::make_managed<ShieldImage>(context.preferences, artworkOfLine(*line), kShieldSize));
+  auto* texts = Gtk::make_managed<Gtk::Box>(Gtk::Orientation::VERTICAL, 2);
+  for (const auto& [text, style] : {std::pair(nameOfLine(*line), "title"), std::pair(systemNameOfLine(*line), "caption")}) {
+    auto* label = Gtk::make_managed<Gtk::Label>(text);
+    label->add_css_class(style);
+    label->set_xalign(0);
+    label->set_wrap();
+    label->set_visible(!text.empty());
+    texts->append(*label);
+  }
+  header->append(*texts);
+  content().append(*header);
+  if (line->incidents().empty()) {
+    auto* good = Gtk::make_managed<Gtk::Label>(LocalizedString("TransitWidget_GoodService_Title"));
+    good->set_xalign(0);
+    content().append(*good);
+  }
+  content().append(*Gtk::make_managed<IncidentCards>(context, line->incidents(), line->muid()));
+}
+
+}  // namespace nimbo

@@ -1,0 +1,16 @@
+#include "host/window/LineTexts.h"
+
+namespace nimbo {
+
+std::string nameOfLine(const TransitLine& line) {
+  const TransitArtworkRef& artwork = line.artwork();
+  if (artwork && artwork->accessibilityText() && !artwork->accessibilityText()->empty())
+    return *artwork->accessibilityText();
+  return line.name() && !line.name()->empty() ? *line.name() : std::to_string(line.muid());
+}
+
+std::string systemNameOfLine(const TransitLine& line) {
+  return line.system() ? line.system()->name().value_or("") : std::string();
+}
+
+}  // namespace nimbo

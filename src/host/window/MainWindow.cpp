@@ -1,0 +1,135 @@
+#include "host/window/MainWindow.h"
+
+#include <giomm/menu.h>
+#include <giomm/simpleaction.h>
+#include <gtkmm/eventcontrollerkey.h>
+#include <gtkmm/gestureclick.h>
+
+#include "host/window/Accessible.h"
+#include "host/window/FavoritesPage.h"
+#include "host/window/FeedsPage.h"
+#include "host/window/IncidentListPage.h"
+#include "host/window/LinePage.h"
+#include "host/window/MainMenu.h"
+#include "platform/Localization.h"
+
+namespace nimbo {
+
+MainWindow::MainWindow(const CommandContext& command, HostPlatform& platform, DesktopPreferences& preferences)
+    : _library(command.paths),
+      _workers(command.runLoop),
+      _context{command, platform, _library, preferences, _workers, *this},
+      _widgetPage(new WidgetPage(_context)),
+      _pages(std::unique_ptr<Page>(_widgetPage)) {
+  constexpr int kWidth = 420, kHeight = 680;
+  set_default_size(kWidth, kHeight);
+  set_icon_name("org.nimbo.Transit");
+  buildHeader();
+  buildMessageBar();
+  _body.append(_messageBar);
+  _body.append(_pages);
+  set_child(_body);
+  addActions();
+  _pages.signalFrontChanged().connect([this] { showFront(); });
+  showFront();
+}
+
+void MainWindow::buildHeader() {
+  _back.set_icon_name("go-previous-symbolic");
+  _back.set_tooltip_text(LocalizedString("Window_Back"));
+  _back.set_action_name("win.back");
+  _update.set_icon_name("view-refresh-symbolic");
+  _update.set_tooltip_text(LocalizedString("Window_Update"));
+  _update.set_action_name("win.update");
+  _menu.set_icon_name("open-menu-symbolic");
+  _menu.set_tooltip_text(LocalizedString("Window_Menu"));
+  _menu.set_menu_model(makeMainMenu());
+  _menu.set_primary();
+  // The focus stays on the page, where it comes back to when the page does.
+  for (Gtk::Button* button : {&_back, &_update}) {
+    button->set_focus_on_click(false);
+    setAccessibleLabel(*button, button->get_tooltip_text());
+  }
+  setAccessibleLabel(_menu, _menu.get_tooltip_text());
+  _header.pack_start(_back);
+  _header.pack_end(_menu);
+  _header.pack_end(_update);
+  set_titlebar(_header);
+}
+
+void MainWindow::buildMessageBar() {
+  _message.set_wrap();
+  _message.set_xalign(0);
+  _message.set_hexpand();
+  _messageBar.add_child(_message);
+  _messageBar.set_message_type(Gtk::MessageType::WARNING);
+  _messageBar.set_show_close_button();
+  _messageBar.set_revealed(false);
+  _messageBar.signal_response().connect([this](int) { _messageBar.set_revealed(false); });
+}
+
+void MainWindow::addActions() {
+  add_action("back", [this] { _pages.pop(); });
+  add_action("update", [this] { _widgetPage->update(); });
+  DesktopPreferences& preferences = _context.preferences;
+  add_action("text-larger", [&preferences] { preferences.stepTextSize(1); });
+  add_action("text-smaller", [&preferences] { preferences.stepTextSize(-1); });
+  add_action("text-normal", [&preferences] { preferences.stepTextSize(0); });
+  const auto addChoice = [this](const char* name, const std::string& chosen, std::function<void(std::string)> choose) {
+    const auto action = add_action_radio_string(name, chosen);
+    action->signal_activate().connect([action, choose = std::move(choose)](const Glib::VariantBase& value) {
+      action->set_state(value);
+      choose(Glib::VariantBase::cast_dynamic<Glib::Variant<Glib::ustring>>(value).get());
+    });
+  };
+  addChoice("appearance", preferences.appearanceChoice(),
+            [&preferences](const std::string& choice) { preferences.chooseAppearance(choice); });
+  addChoice("language", preferences.languageChoice(),
+            [&preferences](const std::string& choice) { preferences.chooseLanguage(choice); });
+
+  const auto keys = Gtk::EventControllerKey::create();
+  keys->signal_key_pressed().connect(
+      [this](guint key, guint, Gdk::ModifierType) {
+        if (key != GDK_KEY_Escape || _pages.depth() < 2) return false;
+        _pages.pop();
+        return true;
+      },
+      false);
+  add_controller(keys);
+  constexpr guint kBackButton = 8;
+  const auto clicks = Gtk::GestureClick::create();
+  clicks->set_button(kBackButton);
+  clicks->signal_pressed().connect([this](int, double, double) { _pages.pop(); });
+  add_controller(clicks);
+}
+
+void MainWindow::showFront() {
+  set_title(_pages.front().title());
+  const bool isFirst = _pages.depth() == 1;
+  _back.set_visible(!isFirst);
+  _update.set_visible(isFirst);
+  _messageBar.set_revealed(false);
+}
+
+void MainWindow::push(std::unique_ptr<Page> page) { _pages.push(std::move(page)); }
+
+void MainWindow::open(const OpenRequest& request) {
+  struct Opener {
+    MainWindow& window;
+    void operator()(const ShowWidget&) { window._pages.popToFirst(); }
+    void operator()(const ShowFavorites&) { window.push(std::make_unique<FavoritesPage>(window._context)); }
+    void operator()(const ShowFeeds&) { window.push(std::make_unique<FeedsPage>(window._context)); }
+    void operator()(const ShowLine& show) { window.push(std::make_unique<LinePage>(window._context, show.line)); }
+    void operator()(const ShowIncidents& show) {
+      window.push(std::make_unique<IncidentListPage>(window._context, show.incidents));
+    }
+  };
+  std::visit(Opener{*this}, request);
+}
+
+void MainWindow::tell(const std::string& message) {
+  _message.set_text(message);
+  _messageBar.set_revealed(true);
+}
+
+}  // namespace nimbo

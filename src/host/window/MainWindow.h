@@ -1,0 +1,46 @@
+#pragma once
+
+#include <gtkmm/applicationwindow.h>
+#include <gtkmm/button.h>
+#include <gtkmm/headerbar.h>
+#include <gtkmm/infobar.h>
+#include <gtkmm/label.h>
+#include <gtkmm/menubutton.h>
+
+#include "host/window/PageContext.h"
+#include "host/window/PageStack.h"
+#include "host/window/WidgetPage.h"
+
+namespace nimbo {
+
+/// The application's window: the widget screen, and in front of it the page that was opened last.
+class MainWindow final : public Gtk::ApplicationWindow, public Navigator {
+ public:
+  /// What is given outlives the window.
+  MainWindow(const CommandContext& command, HostPlatform& platform, DesktopPreferences& preferences);
+
+  void open(const OpenRequest& request) override;
+  void tell(const std::string& message) override;
+
+ private:
+  void buildHeader();
+  void buildMessageBar();
+  void addActions();
+  void showFront();
+  void push(std::unique_ptr<Page> page);
+
+  FeedLibrary _library;
+  Workers _workers;
+  PageContext _context;
+  Gtk::HeaderBar _header;
+  Gtk::Button _back;
+  Gtk::Button _update;
+  Gtk::MenuButton _menu;
+  Gtk::Box _body{Gtk::Orientation::VERTICAL};
+  Gtk::InfoBar _messageBar;
+  Gtk::Label _message;
+  WidgetPage* _widgetPage;  // the first page of the stack
+  PageStack _pages;
+};
+
+}  // namespace nimbo

@@ -1,0 +1,42 @@
+#pragma once
+
+#include <map>
+#include <memory>
+#include <string>
+#include <string_view>
+#include <variant>
+
+#include "desktop/gtfs/Outcome.h"
+#include "platform/foundation/Boxed.h"
+#include "platform/transit/TransitLineItem.h"
+
+namespace nimbo {
+
+/// The widget screen.
+struct ShowWidget {};
+/// The favourites, with the lines there are to choose from.
+struct ShowFavorites {};
+/// The feeds.
+struct ShowFeeds {};
+/// A line with its incidents, as handed over.
+struct ShowLine {
+  TransitLineItemRef line;
+};
+/// A list of incidents, as handed over.
+struct ShowIncidents {
+  TransitIncidents incidents;
+};
+
+/// A place in the application that somebody asks for: a row of the widget, another program, or a user.
+using OpenRequest = std::variant<ShowWidget, ShowFavorites, ShowFeeds, ShowLine, ShowIncidents>;
+
+/// What a URL of the application's scheme asks for: "nimbo://?favorites=2&t=r" and "nimbo://?t=r" for the favourites,
+/// "nimbo://" for the widget screen, or a hand-off as "nimbo://activity?type=TYPE&KEY=BASE64", percent-encoded. Errors
+/// tell the user what is wrong with it.
+Outcome<OpenRequest> openRequestOfURL(std::string_view url);
+
+/// What a hand-off activity asks for, from its payload alone.
+Outcome<OpenRequest> openRequestOfActivity(std::string_view activityType,
+                                           const std::map<std::string, Bytes, std::less<>>& userInfo);
+
+}  // namespace nimbo

@@ -1,0 +1,213 @@
+#include "host/window/WidgetPage.h"
+
+#include <gdkmm/toplevel.h>
+#include <gtkmm/image.h>
+#include <gtkmm/native.h>
+
+#include <algorithm>
+
+#include "desktop/rpc/Base64.h"
+#include "host/window/Accessible.h"
+#include "platform/Localization.h"
+#include "platform/Platform.h"
+
+namespace nimbo {
+
+using nlohmann::json;
+
+namespace {
+
+/// Setting: whether the user last had a row for each incident.
+constexpr std::string_view kExpandedKey = "Nimbo.Window.expanded";
+
+Gtk::Widget* makePlace(const char* icon, const std::string& name) {
+  auto* row = Gtk::make_managed<Gtk::ListBoxRow>();
+  auto* box = Gtk::make_managed<Gtk::Box>(Gtk::Orientation::HORIZONTAL, 12);
+  box->add_css_class("item");
+  auto* image = Gtk::make_managed<Gtk::Image>();
+  image->set_from_icon_name(icon);
+  auto* label = Gtk::make_managed<Gtk::Label>(name);
+  label->set_hexpand();
+  label->set_xalign(0);
+  auto* arrow = Gtk::make_managed<Gtk::Image>();
+  arrow->set_from_icon_name("go-next-symbolic");
+  for (Gtk::Widget* child : {static_cast<Gtk::Widget*>(image), static_cast<Gtk::Widget*>(label),
+                             static_cast<Gtk::Widget*>(arrow)})
+    box->append(*child);
+  row->set_child(*box);
+  setAccessibleLabel(*row, name);
+  return row;
+}
+
+}  // namespace
+
+WidgetPage::WidgetPage(const PageContext& context)
+    : Page(LocalizedString("Window_Title")),
+      _context(context),
+      _process(context.command.runLoop, Platform::current().clock(), context.command.widgetArguments, *this),
+      _wantsExpanded(Platform::current().sharedSettings().groupStore()->boolForKey(kExpandedKey)) {
+  buildCard();
+  buildPlaces();
+  _process.setPresentation(presentation());
+  _process.setExpanded(_wantsExpanded);
+  _connections.push_back(_context.preferences.signalLookChanged().connect(
+      [this] { _process.setPresentation(presentation()); }));
+  property_scale_factor().signal_changed().connect([this] { _process.setPresentation(presentation()); });
+  watchVisibility();
+}
+
+WidgetPage::~WidgetPage() {
+  for (sigc::connection& connection : _connections) connection.disconnect();
+}
+
+void WidgetPage::buildCard() {
+  auto* header = Gtk::make_managed<Gtk::Box>(Gtk::Orientation::HORIZONTAL, 8);
+  header->add_css_class("card-header");
+  auto* name = Gtk::make_managed<Gtk::Label>(LocalizedString("Window_Widget_Title"));
+  name->add_css_class("heading");
+  name->set_hexpand();
+  name->set_xalign(0);
+  _expand.add_css_class("flat");
+  _expand.signal_clicked().connect([this] { toggleExpanded(); });
+  for (Gtk::Widget* child : {static_cast<Gtk::Widget*>(name), static_cast<Gtk::Widget*>(&_updating),
+                             static_cast<Gtk::Widget*>(&_expand)})
+    header->append(*child);
+
+  _view.signalSelected().connect([this](std::size_t row) { _process.selectRow(row); });
+  _view.signalPressed().connect([this](std::size_t row, bool pressed) { _process.highlightRow(row, pressed); });
+
+  _waiting.set_size_request(-1, static_cast<int>(WidgetPresentation::kDefaultRowHeight));
+  _waiting.start();
+
+  _failure.add_css_class("notice");
+  _failureReason.set_wrap();
+  _failureReason.set_xalign(0);
+  auto* tryAgain = Gtk::make_managed<Gtk::Button>(LocalizedString("Window_TryAgain"));
+  tryAgain->set_halign(Gtk::Align::START);
+  tryAgain->signal_clicked().connect([this] {
+    _failure.hide();
+    _waiting.set_visible(!_content);
+    _process.restart();
+  });
+  _failure.append(_failureReason);
+  _failure.append(*tryAgain);
+  _failure.hide();
+
+  _card.add_css_class("card");
+  _card.set_halign(Gtk::Align::CENTER);
+  _card.set_overflow(Gtk::Overflow::HIDDEN);
+  for (Gtk::Widget* child : {static_cast<Gtk::Widget*>(header), static_cast<Gtk::Widget*>(&_failure),
+                             static_cast<Gtk::Widget*>(&_waiting), static_cast<Gtk::Widget*>(&_view)})
+    _card.append(*child);
+  content().append(_card);
+  showExpandButton();
+}
+
+void WidgetPage::buildPlaces() {
+  _sampleNotice.add_css_class("card");
+  _sampleNotice.add_css_class("notice");
+  auto* text = Gtk::make_managed<Gtk::Label>(LocalizedString("Window_Sample_Text"));
+  text->set_wrap();
+  text->set_xalign(0);
+  auto* button = Gtk::make_managed<Gtk::Button>(LocalizedString("Window_Sample_Button"));
+  button->add_css_class("suggested-action");
+  button->set_halign(Gtk::Align::START);
+  button->signal_clicked().connect([this] { _context.navigator.open(ShowFeeds()); });
+  _sampleNotice.append(*text);
+  _sampleNotice.append(*button);
+  content().append(_sampleNotice);
+
+  _places.add_css_class("card");
+  _places.set_selection_mode(Gtk::SelectionMode::NONE);
+  _places.append(*makePlace("starred-symbolic", LocalizedString("Window_Favorites_Title")));
+  _places.append(*makePlace("network-transmit-receive-symbolic", LocalizedString("Window_Feeds_Title")));
+  _places.signal_row_activated().connect([this](Gtk::ListBoxRow* row) {
+    if (row->get_index() == 0) _context.navigator.open(ShowFavorites());
+    else _context.navigator.open(ShowFeeds());
+  });
+  content().append(_places);
+}
+
+void WidgetPage::watchVisibility() {
+  signal_map().connect([this] {
+    const auto feeds = _context.library.configuration().feeds();
+    _sampleNotice.set_visible(feeds && feeds->empty());
+    updateVisibility();
+  });
+  signal_unmap().connect([this] { updateVisibility(); });
+  signal_realize().connect([this] {
+    const auto toplevel = std::dynamic_pointer_cast<Gdk::Toplevel>(get_native()->get_surface());
+    if (toplevel)
+      _connections.push_back(toplevel->property_state().signal_changed().connect([this] { updateVisibility(); }));
+  });
+}
+
+void WidgetPage::updateVisibility() {
+  const Gtk::Native* native = get_native();
+  const auto toplevel = native ? std::dynamic_pointer_cast<const Gdk::Toplevel>(native->get_surface()) : nullptr;
+  const bool minimized =
+      toplevel && (toplevel->get_state() & Gdk::Toplevel::State::MINIMIZED) != Gdk::Toplevel::State();
+  _process.setVisible(get_mapped() && !minimized);
+}
+
+WidgetPresentation WidgetPage::presentation() const {
+  const DesktopPreferences& preferences = _context.preferences;
+  WidgetPresentation presentation;
+  presentation.scale = get_scale_factor();
+  presentation.textSize = nameOfContentSizeCategory(preferences.textSize());
+  presentation.appearance = preferences.appearance() == Appearance::dark ? "dark" : "light";
+  if (!preferences.locale().empty()) presentation.locale = preferences.locale();
+  return presentation;
+}
+
+void WidgetPage::toggleExpanded() {
+  _wantsExpanded = !_wantsExpanded;
+  const ErrorRef failure =
+      Platform::current().sharedSettings().groupStore()->setValue_forKey(_wantsExpanded, kExpandedKey);
+  if (failure) _context.navigator.tell(failure->reason());
+  _process.setExpanded(_wantsExpanded);
+  showExpandButton();
+}
+
+void WidgetPage::showExpandButton() {
+  _expand.set_label(LocalizedString(_wantsExpanded ? "Window_ShowLess" : "Window_ShowMore"));
+  _expand.set_visible(_content && _content->canExpand);
+}
+
+void WidgetPage::widgetDidChange(const WidgetContentRef& content) {
+  _content = content;
+  _view.setContent(content);
+  _waiting.hide();
+  _failure.hide();
+  showExpandButton();
+}
+
+void WidgetPage::widgetDidFail(const std::string& reason) {
+  _failureReason.set_text(LocalizedFormat(LocalizedString("Window_Widget_Failed"), {reason}));
+  _failure.show();
+  _waiting.hide();
+}
+
+void WidgetPage::widgetIsUpdating(bool updating) { _updating.set_spinning(updating); }
+
+bool WidgetPage::widgetOpens(std::string_view method, const json& params) {
+  const auto request = [&]() -> Outcome<OpenRequest> {
+    if (method == "openURL") return openRequestOfURL(params.at("url").get<std::string>());
+    std::map<std::string, Bytes, std::less<>> userInfo;
+    for (const auto& [key, text] : params.at("userInfo").items())
+      if (auto bytes = bytesFromBase64(text.get<std::string>())) userInfo.emplace(key, std::move(*bytes));
+    return openRequestOfActivity(params.at("activityType").get<std::string>(), userInfo);
+  }();
+  if (!request) {
+    _context.navigator.tell(request.error()->reason());
+    return false;
+  }
+  // The widget hears that it opened before it hears that it disappears.
+  _context.command.runLoop.dispatchAsync(
+      [&navigator = _context.navigator, request = *request, alive = std::weak_ptr<bool>(_alive)] {
+        if (!alive.expired()) navigator.open(request);
+      });
+  return true;
+}
+
+}  // namespace nimbo

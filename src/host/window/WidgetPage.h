@@ -1,0 +1,56 @@
+#pragma once
+
+#include <gtkmm/button.h>
+#include <gtkmm/label.h>
+#include <gtkmm/listbox.h>
+#include <gtkmm/spinner.h>
+
+#include "host/window/Page.h"
+#include "host/window/PageContext.h"
+#include "host/window/WidgetHostProcess.h"
+#include "host/window/WidgetView.h"
+
+namespace nimbo {
+
+/// The widget screen: the widget as its process draws it, and the ways to what it is made from.
+class WidgetPage final : public Page, private WidgetHostProcess::Delegate {
+ public:
+  explicit WidgetPage(const PageContext& context);
+  ~WidgetPage() override;
+
+  /// Fetches now.
+  void update() { _process.update(); }
+
+ private:
+  void buildCard();
+  void buildPlaces();
+  void watchVisibility();
+  void updateVisibility();
+  void toggleExpanded();
+  void showExpandButton();
+  WidgetPresentation presentation() const;
+
+  void widgetDidChange(const WidgetContentRef& content) override;
+  void widgetDidFail(const std::string& reason) override;
+  void widgetIsUpdating(bool updating) override;
+  bool widgetOpens(std::string_view method, const nlohmann::json& params) override;
+
+  const PageContext& _context;
+  WidgetHostProcess _process;
+  WidgetContentRef _content;
+  bool _wantsExpanded;
+
+  Gtk::Box _card{Gtk::Orientation::VERTICAL};
+  Gtk::Spinner _updating;
+  Gtk::Button _expand;
+  WidgetView _view;
+  Gtk::Spinner _waiting;
+  Gtk::Box _failure{Gtk::Orientation::VERTICAL, 8};
+  Gtk::Label _failureReason;
+  Gtk::Box _sampleNotice{Gtk::Orientation::VERTICAL, 8};
+  Gtk::ListBox _places;
+  std::vector<sigc::connection> _connections;
+  std::shared_ptr<bool> _alive = std::make_shared<bool>(true);
+};
+
+}  // namespace nimbo

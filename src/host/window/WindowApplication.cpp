@@ -1,0 +1,85 @@
+#include "host/window/WindowApplication.h"
+
+#include "platform/Localization.h"
+
+namespace nimbo {
+
+Glib::RefPtr<WindowApplication> WindowApplication::create(const CommandContext& context) {
+  return Glib::make_refptr_for_instance(new WindowApplication(context));
+}
+
+WindowApplication::WindowApplication(const CommandContext& context)
+    : Gtk::Application(kIdentifier, context.widgetArguments.empty()
+                                        ? Gio::Application::Flags::HANDLES_OPEN
+                                        : Gio::Application::Flags::HANDLES_OPEN | Gio::Application::Flags::NON_UNIQUE),
+      _context(context) {}
+
+void WindowApplication::on_startup() {
+  Gtk::Application::on_startup();
+  // The choice of a language stands in the settings that the platform reads.
+  _platform = std::make_unique<HostPlatform>(_context);
+  _preferences = std::make_unique<DesktopPreferences>();
+  if (!_preferences->locale().empty()) changeLocale();
+  _preferences->signalLocaleChanged().connect([this] {
+    // Not from within the menu of the window that goes.
+    _context.runLoop.dispatchAsync([this] { changeLocale(); });
+  });
+  add_action("quit", [this] { quit(); });
+  set_accel_for_action("app.quit", "<Primary>q");
+  set_accel_for_action("win.update", "F5");
+  set_accel_for_action("win.back", "<Alt>Left");
+  set_accels_for_action("win.text-larger", {"<Primary>plus", "<Primary>equal", "<Primary>KP_Add"});
+  set_accels_for_action("win.text-smaller", {"<Primary>minus", "<Primary>KP_Subtract"});
+  set_accels_for_action("win.text-normal", {"<Primary>0", "<Primary>KP_0"});
+}
+
+void WindowApplication::makeWindow() {
+  Gtk::Widget::set_default_direction(Platform::current().strings().isRightToLeft() ? Gtk::TextDirection::RTL
+                                                                                   : Gtk::TextDirection::LTR);
+  _window = std::make_unique<MainWindow>(_context, *_platform, *_preferences);
+  add_window(*_window);
+}
+
+void WindowApplication::changeLocale() {
+  const bool hadWindow = _window != nullptr;
+  hold();
+  int width = 0, height = 0;
+  if (hadWindow) _window->get_default_size(width, height);
+  _window.reset();
+  // One platform at a time is in force.
+  _platform.reset();
+  _platform = std::make_unique<HostPlatform>(_context, _preferences->locale());
+  if (hadWindow) {
+    makeWindow();
+    _window->set_default_size(width, height);
+    _window->present();
+  }
+  release();
+}
+
+void WindowApplication::on_activate() {
+  if (!_window) makeWindow();
+  _window->present();
+}
+
+void WindowApplication::on_open(const type_vec_files& files, const Glib::ustring&) {
+  on_activate();
+  for (const auto& file : files) {
+    const auto request = openRequestOfURL(file->get_uri().raw());
+    if (!request) {
+      _window->tell(request.error()->reason());
+      continue;
+    }
+    _window->open(ShowWidget());
+    _window->open(*request);
+  }
+}
+
+void WindowApplication::on_shutdown() {
+  _window.reset();
+  _preferences.reset();
+  _platform.reset();
+  Gtk::Application::on_shutdown();
+}
+
+}  // namespace nimbo

@@ -1,0 +1,42 @@
+#pragma once
+
+#include <gtkmm/application.h>
+
+#include <memory>
+#include <optional>
+
+#include "host/Command.h"
+#include "host/HostPlatform.h"
+#include "host/window/DesktopPreferences.h"
+#include "host/window/MainWindow.h"
+
+namespace nimbo {
+
+/// The application as the desktop sees it: one for each user where there is a session bus; opens URLs of its scheme.
+class WindowApplication final : public Gtk::Application {
+ public:
+  /// With folders of its own it is an application of its own. The context outlives it.
+  static Glib::RefPtr<WindowApplication> create(const CommandContext& context);
+
+  /// Identifier of the application on the bus, in its .desktop file and for its icon.
+  static constexpr const char* kIdentifier = "org.nimbo.Transit";
+
+ protected:
+  explicit WindowApplication(const CommandContext& context);
+  void on_startup() override;
+  void on_activate() override;
+  void on_open(const type_vec_files& files, const Glib::ustring& hint) override;
+  void on_shutdown() override;
+
+ private:
+  void makeWindow();
+  /// The texts are another language's: everything that shows them is made anew.
+  void changeLocale();
+
+  const CommandContext& _context;
+  std::unique_ptr<HostPlatform> _platform;
+  std::unique_ptr<DesktopPreferences> _preferences;
+  std::unique_ptr<MainWindow> _window;
+};
+
+}  // namespace nimbo

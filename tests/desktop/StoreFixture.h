@@ -1,0 +1,51 @@
+#pragma once
+
+#include <gmock/gmock.h>
+
+#include <cstdlib>
+#include <fstream>
+#include <iterator>
+
+#include "desktop/store/StateDatabase.h"
+#include "support/TestPlatform.h"
+
+namespace nimbo {
+
+/// A state folder of the test's own, which does not exist yet, and databases over it.
+class StoreTest : public testing::Test {
+ protected:
+  StoreTest() {
+    std::string name = testing::TempDir() + "nimbo-store-XXXXXX";
+    _parent = ::mkdtemp(name.data());
+  }
+  ~StoreTest() override { std::filesystem::remove_all(_parent); }
+
+  /// Another process's view, as far as the database can tell.
+  std::shared_ptr<StateDatabase> makeDatabase() {
+    return std::make_shared<StateDatabase>(folder(), platform.time,
+                                           [this](const ErrorRef& notice) { notices.push_back(notice->reason()); });
+  }
+  /// A connection that knows no rules.
+  SQLiteConnection connect() { return {file(), SQLiteConnection::Access::readWrite, 2 * kMaximumStateValueBytes}; }
+
+  std::filesystem::path folder() const { return _parent / "state"; }
+  std::filesystem::path file() const { return folder() / "state.sqlite"; }
+
+  static std::string contentOf(const std::filesystem::path& path) {
+    std::ifstream stream(path, std::ios::binary);
+    return {std::istreambuf_iterator<char>(stream), {}};
+  }
+  static void overwrite(const std::filesystem::path& path, std::streamoff offset, const std::string& bytes) {
+    std::fstream stream(path, std::ios::binary | std::ios::in | std::ios::out);
+    stream.seekp(offset);
+    stream << bytes;
+  }
+
+  TestPlatform platform;
+  std::vector<std::string> notices;
+
+ private:
+  std::filesystem::path _parent;
+};
+
+}  // namespace nimbo

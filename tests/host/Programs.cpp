@@ -1,0 +1,99 @@
+#include "host/Programs.h"
+
+#include <fcntl.h>
+#include <spawn.h>
+#include <sys/wait.h>
+#include <unistd.h>
+
+#include <sstream>
+#include <stdexcept>
+
+namespace nimbo {
+
+using nlohmann::json;
+
+Programs::Programs() {
+  folder.write("feed/agency.txt",
+               "agency_id,agency_name,agency_url,agency_timezone\n"
+               "M,Metro,https://example.org,UTC\nB,Buses,https://example.org,UTC\n");
+  folder.write("feed/routes.txt",
+               "route_id,agency_id,route_short_name,route_long_name,route_type,route_color,route_text_color\n"
+               "m1,M,1,Harbour Line,1,005599,FFFFFF\nm2,M,2,Castle Line,1,CC0000,FFFFFF\n"
+               "b10,B,10,Market,3,,\nb11,B,11,Airport,3,,\nb12,B,12,Beach,3,,\n");
+  publish({});
+}
+
+void Programs::publish(const std::vector<AlertsBuilder::Alert>& alerts) const {
+  publishBytes(AlertsBuilder::feed(now(), alerts));
+}
+
+void Programs::setUpCity(const std::vector<std::string>& favorites,
+                         const std::vector<AlertsBuilder::Alert>& alerts) const {
+  publish(alerts);
+  run({"feed", "add", "city", "--static", folder.path() / "feed", "--alerts", alertsFile()});
+  std::vector<std::string> add = {"favorite", "add"};
+  for (const std::string& route : favorites) add.push_back("city:" + route);
+  if (!favorites.empty()) run(add);
+}
+
+ProgramRun Programs::run(std::vector<std::string> arguments, const std::string& input) const {
+  folder.write("stdin", input);
+  const std::string files[] = {folder.path() / "stdin", folder.path() / "stdout", folder.path() / "stderr"};
+  posix_spawn_file_actions_t actions;
+  posix_spawn_file_actions_init(&actions);
+  posix_spawn_file_actions_addopen(&actions, 0, files[0].c_str(), O_RDONLY, 0);
+  for (const int fd : {1, 2})
+    posix_spawn_file_actions_addopen(&actions, fd, files[fd].c_str(), O_WRONLY | O_CREAT | O_TRUNC, 0600);
+  arguments.insert(arguments.begin(), {NIMBO_TRANSIT, "--config", folder.path() / "config", "--state",
+                                       folder.path() / "state"});
+  std::vector<char*> argv;
+  for (std::string& argument : arguments) argv.push_back(argument.data());
+  argv.push_back(nullptr);
+  pid_t process = 0;
+  const int failure = posix_spawn(&process, NIMBO_TRANSIT, &actions, nullptr, argv.data(), environ);
+  posix_spawn_file_actions_destroy(&actions);
+  if (failure != 0) throw std::runtime_error("cannot start " NIMBO_TRANSIT);
+  int status = 0;
+  waitpid(process, &status, 0);
+  return {WIFEXITED(status) ? WEXITSTATUS(status) : 128 + WTERMSIG(status), folder.read("stdout"),
+          folder.read("stderr")};
+}
+
+std::vector<json> Programs::play(const std::vector<json>& events) const {
+  std::string script;
+  for (const json& event : events) script += (event.is_string() ? event.get<std::string>() : event.dump()) + "\n";
+  const ProgramRun result = run({"script", "--virtual-time", isoTextOfDate(now()), "-"}, script);
+  if (result.status != 0) throw std::runtime_error("script failed: " + result.errors + result.output);
+  std::vector<json> lines;
+  std::istringstream output(result.output);
+  for (std::string line; std::getline(output, line);) lines.push_back(json::parse(line));
+  return lines;
+}
+
+json request(const std::string& method, json params) {
+  static int identifier = 0;
+  return {{"jsonrpc", "2.0"}, {"id", ++identifier}, {"method", method}, {"params", std::move(params)}};
+}
+
+std::vector<json> appearing(double compactHeight, double expandedHeight) {
+  return {request("initialize", {{"locale", "en"},
+                                 {"displayModes", {{"compact", {359, compactHeight}}, {"expanded", {359, expandedHeight}}}},
+                                 {"bundle", {{"kind", "application"}, {"identifier", "org.example.Host"}}}}),
+          request("loadView"), request("viewWillAppear"), request("viewDidAppear")};
+}
+
+std::vector<json> snapshots(const std::vector<json>& lines) {
+  std::vector<json> found;
+  for (const json& line : lines)
+    if (line.contains("result") && line["result"].is_object() && line["result"].contains("rows"))
+      found.push_back(line["result"]);
+  return found;
+}
+
+std::vector<std::string> titles(const json& snapshot) {
+  std::vector<std::string> texts;
+  for (const json& row : snapshot.at("rows")) texts.push_back(row.value("primaryText", "(none)"));
+  return texts;
+}
+
+}  // namespace nimbo

@@ -1,0 +1,184 @@
+// The widget process from outside, through its protocol: what a host sees of the whole road from a feed to the rows.
+
+#include <gmock/gmock.h>
+
+#include "host/Programs.h"
+
+namespace nimbo {
+namespace {
+
+using nlohmann::json;
+using testing::ElementsAre;
+using testing::SizeIs;
+
+std::vector<json> operator+(std::vector<json> a, const std::vector<json>& b) {
+  a.insert(a.end(), b.begin(), b.end());
+  return a;
+}
+
+const std::vector<json> kUpdateAndLook = {request("performUpdate"), request("snapshot")};
+const json kExpand = request("setActiveDisplayMode", {{"mode", "expanded"}});
+
+TEST(WidgetProcess, ShowsTheRowsThatTheFeedCallsFor) {
+  const AlertsBuilder::Alert one{"a1", {"m1"}, "Signal failure", "Delays of ten minutes."};
+  const AlertsBuilder::Alert two{"a2", {"b10"}, "Road works", "Stops moved."};
+  const AlertsBuilder::Alert three{"a3", {"b11"}, "Strike", "No service."};
+  const AlertsBuilder::Alert shared{"a4", {"m1", "m2"}, "Lift out of order at Castle", "Use the stairs."};
+  const AlertsBuilder::Alert mixed{"a5", {"m1", "b10"}, "Marathon", "Diversions."};
+  const struct {
+    std::string name;
+    std::vector<std::string> favorites;
+    std::vector<AlertsBuilder::Alert> alerts;
+    double expandedHeight;  // 110 a row; 0: no limit
+    std::vector<std::string> compact, expanded;
+  } cases[] = {
+      {"no favourites", {}, {}, 440, {"No Favorite Lines"}, {}},
+      {"all clear", {"m1", "b10"}, {}, 440, {"Good Service"}, {}},
+      {"one incident on the only line", {"m1"}, {one}, 440, {"Signal failure"}, {}},
+      {"one incident, one clear line", {"m1", "m2"}, {one}, 440, {"Signal failure"}, {"Signal failure", "Good Service"}},
+      {"an incident that two lines share", {"m1", "m2"}, {shared}, 440, {"Lift out of order at Castle"}, {}},
+      {"room for all", {"m1", "b10", "b11", "b12"}, {one, two, three}, 440, {"3 Advisories"},
+       {"Signal failure", "Road works", "Strike", "Good Service"}},
+      {"no limit", {"m1", "b10", "b11", "b12"}, {one, two, three}, 0, {"3 Advisories"},
+       {"Signal failure", "Road works", "Strike", "Good Service"}},
+      {"room for three", {"m1", "b10", "b11", "b12"}, {one, two, three}, 330, {"3 Advisories"},
+       {"Signal failure", "2 More Advisories", "Good Service"}},
+      {"room for one", {"m1", "b10", "b11", "b12"}, {one, two, three}, 110, {"3 Advisories"}, {"3 More Advisories"}},
+      {"lines of two agencies", {"m1", "b10"}, {mixed}, 440, {"Marathon"}, {}},
+  };
+  for (const auto& c : cases) {
+    SCOPED_TRACE(c.name);
+    Programs programs;
+    programs.setUpCity(c.favorites, c.alerts);
+    const auto lines = programs.play(appearing(110, c.expandedHeight) + kUpdateAndLook +
+                                     std::vector<json>{kExpand, request("snapshot")});
+    const auto seen = snapshots(lines);
+    ASSERT_THAT(seen, SizeIs(2));
+    EXPECT_EQ(titles(seen[0]), c.compact);
+    EXPECT_EQ(seen[0]["result"], "success");
+    EXPECT_EQ(seen[0]["largestAvailableDisplayMode"], c.expanded.empty() ? "compact" : "expanded");
+    EXPECT_EQ(titles(seen[1]), c.expanded.empty() ? c.compact : c.expanded);
+    const double height = 110.0 * static_cast<double>(seen[1]["rows"].size());
+    if (!c.expanded.empty()) EXPECT_EQ(seen[1]["preferredContentSize"], (json{359, height}));
+  }
+}
+
+TEST(WidgetProcess, MergesASharedIncidentUnderTheLinesNames) {
+  Programs programs;
+  programs.setUpCity({"m1", "m2", "b10"}, {{"a", {"m1", "m2"}, "Closed", "No trains."}, {"b", {"m2", "b10"}, "Fair", "Crowds."}});
+  const auto seen = snapshots(programs.play(appearing() + std::vector<json>{request("performUpdate"), kExpand, request("snapshot")}));
+  ASSERT_THAT(seen, SizeIs(1));
+  const json& rows = seen[0]["rows"];
+  ASSERT_THAT(rows, SizeIs(2));
+  EXPECT_EQ(rows[0]["secondaryText"], "1 and 2: No trains.");
+  EXPECT_EQ(rows[0]["artwork"]["alpha"], 1.0);
+  EXPECT_EQ(rows[0]["artwork"]["shield"]["icon"]["defaultTransitType"], 2) << "the symbol of the metro's mode";
+  EXPECT_EQ(rows[1]["secondaryText"], "2 and 10: Crowds.");
+  EXPECT_EQ(rows[1]["artwork"]["image"], "WidgetGenericTransit");
+  EXPECT_THAT(seen[0]["listItem"]["summaryItem"]["artworks"], SizeIs(3));
+}
+
+TEST(WidgetProcess, ChangesItsRowsOnTheSecondAndFetchesEveryHalfHour) {
+  Programs programs;
+  const std::int64_t now = Programs::unixNow();
+  programs.setUpCity({"m1"}, {{"a", {"m1"}, "Works", "Slow.", now + 60, now + 120}});
+  const auto wait = [](double seconds) { return request("advanceTime", {{"seconds", seconds}}); };
+  const json look = request("snapshot");
+  const auto seen = snapshots(programs.play(
+      appearing() + kUpdateAndLook + std::vector<json>{wait(59.5), look, wait(0.5), look, wait(59.5), look, wait(0.5), look}));
+  std::vector<std::string> firstRows;
+  for (const json& snapshot : seen) firstRows.push_back(titles(snapshot).at(0));
+  EXPECT_THAT(firstRows, ElementsAre("Good Service", "Good Service", "Works", "Works", "Good Service"));
+  EXPECT_EQ(seen[0]["updateDates"], (json{"2026-01-05T12:01:00Z", "2026-01-05T12:02:00Z"}));
+
+  // A publisher that withdraws the alert is heard after half an hour.
+  Programs other;
+  other.setUpCity({"m1"}, {{"a", {"m1"}, "Works", "Slow."}});
+  const auto before = appearing() + kUpdateAndLook;
+  other.play(before);
+  other.publishBytes(AlertsBuilder::feed(dateByAdding(Programs::now(), 1500), {}));
+  const auto after = snapshots(other.play(before + std::vector<json>{wait(1800), request("performUpdate"), look}));
+  EXPECT_EQ(titles(after.back()).at(0), "Good Service");
+}
+
+TEST(WidgetProcess, ShowsItsLastRowsBeforeAnyFetch) {
+  Programs programs;
+  const std::int64_t now = Programs::unixNow();
+  programs.setUpCity({"m1", "m2"}, {{"a", {"m1"}, "Works", "Slow.", 0, now + 600}, {"b", {"m2"}, "Storm", "Wind.", now - 9, now + 30}});
+  programs.play(appearing() + kUpdateAndLook + std::vector<json>{kExpand, request("viewWillDisappear"), request("viewDidDisappear")});
+  programs.publishBytes("no feed any more");
+
+  const std::vector<json> start = {appearing()[0], request("loadView"), request("snapshot")};
+  const json restored = snapshots(programs.play(start)).at(0);
+  EXPECT_EQ(restored["result"], nullptr);
+  EXPECT_EQ(titles(restored), (std::vector<std::string>{"Works", "Storm"})) << "expanded as it was left";
+
+  // Dates that went by meanwhile are judged at once.
+  const auto later = std::vector<json>{start[0], request("advanceTime", {{"seconds", 31}}), request("loadView"), request("snapshot")};
+  EXPECT_EQ(titles(snapshots(programs.play(later)).at(0)), (std::vector<std::string>{"Works", "Good Service"}));
+}
+
+TEST(WidgetProcess, AnswersTwoUpdatesWithOneLookupAndOpensWhatIsTapped) {
+  Programs programs;
+  programs.setUpCity({"m1"}, {{"a", {"m1"}, "Works", "Slow."}});
+  const json first = request("performUpdate"), second = request("performUpdate");
+  const auto lines = programs.play(appearing() + std::vector<json>{first, second, request("selectRow", {{"section", 0}, {"row", 0}}), request("snapshot")});
+  std::vector<int> updates;
+  json opened;
+  for (const json& line : lines) {
+    if (line.contains("result") && line["result"].contains("updateResult")) {
+      EXPECT_EQ(line["result"]["updateResult"], "newData");
+      updates.push_back(line["id"]);
+    }
+    if (line.value("method", "") == "openUserActivity") opened = line["params"];
+  }
+  EXPECT_THAT(updates, ElementsAre(first["id"], second["id"]));
+  ASSERT_TRUE(opened.is_object());
+  EXPECT_EQ(opened["activityType"], "org.nimbo.Map.Transit.Incident");
+  EXPECT_EQ(opened["application"], "org.example.Host");
+  EXPECT_TRUE(opened["userInfo"].contains("bs"));
+}
+
+TEST(WidgetProcess, OutlivesEveryMessage) {
+  Programs programs;
+  programs.setUpCity({"m1"}, {});
+  const struct {
+    json line;
+    int code;
+  } cases[] = {
+      {"{\"jsonrpc\": \"2.0\", ", -32700},
+      {"[]", -32600},
+      {"[{\"jsonrpc\":\"2.0\",\"id\":1,\"method\":\"snapshot\"}]", -32600},
+      {"{\"jsonrpc\":\"1.0\",\"id\":1,\"method\":\"snapshot\"}", -32600},
+      {"{\"jsonrpc\":\"2.0\",\"id\":1,\"method\":\"snapshot\",\"params\":[1]}", -32600},
+      {std::string(5000, '[') + std::string(5000, ']'), -32600},
+      {std::string("\"\xff\xfe\""), -32700},
+      {request("dance"), -32601},
+      {request("initialize"), -32001},
+      {request("loadView"), -32001},
+      {request("viewDidDisappear"), -32001},
+      {request("setActiveDisplayMode", {{"mode", "huge"}}), -32602},
+      {request("setActiveDisplayMode", {{"mode", "expanded"}, {"maximumSize", {1, "2"}}}), -32602},
+      {request("transitionToSize", {{"size", {-1, 5}}}), -32602},
+      {request("setTextSize", {{"category", "tiny"}}), -32602},
+      {request("selectRow", {{"section", 0}, {"row", 1}}), -32602},
+      {request("selectRow", {{"section", 1}, {"row", 0}}), -32602},
+      {request("selectRow", {{"section", 0}}), -32602},
+      {request("advanceTime", {{"seconds", -1}}), -32602},
+      {request("render", {{"path", "/nonexistent/folder/x.png"}}), -32002},
+  };
+  std::vector<json> events = appearing() + kUpdateAndLook;
+  for (const auto& c : cases) events.push_back(c.line);
+  const auto lines = programs.play(events + std::vector<json>{request("snapshot"), request("shutdown")});
+  std::vector<int> codes;
+  for (const json& line : lines)
+    if (line.contains("error")) codes.push_back(line["error"]["code"]);
+  ASSERT_THAT(codes, SizeIs(std::size(cases)));
+  for (std::size_t i = 0; i < codes.size(); ++i) EXPECT_EQ(codes[i], cases[i].code) << cases[i].line;
+  const auto seen = snapshots(lines);
+  ASSERT_THAT(seen, SizeIs(2));
+  EXPECT_EQ(seen[0], seen[1]) << "bad messages change nothing";
+}
+
+}  // namespace
+}  // namespace nimbo
