@@ -48,17 +48,17 @@ NBTransitIncidentsDataSourceBuilder::Scan NBTransitIncidentsDataSourceBuilder::s
       if (!filter.shouldDisplayIncident(*incident)) continue;
       const std::size_t displayed = scan.displayedMuids.firstIndexOf(incident->muid());
       if (displayed < scan.items.size()) {
-        scan.itemToLines[scan.items[displayed]].push_back(line);
+        scan.itemToLines[displayed].push_back(line);
         lineHasRow = true;
         continue;
       }
-      const NBTransitItemRef item = _itemForIncidentAtIndex_inLine(index, line);
+      NBTransitItemRef item = _itemForIncidentAtIndex_inLine(index, line);
       if (!item) continue;
       scan.displayedIncidents.push_back(incident);
       scan.displayedMuids.append(incident->muid());
-      scan.items.push_back(item);
+      scan.items.push_back(std::move(item));
       scan.incidentsToLine.emplace(incident, line);
-      scan.itemToLines[item].push_back(line);
+      scan.itemToLines.push_back({line});
       lineHasRow = true;
     }
     if (!lineHasRow) scan.clearLines.push_back(line);

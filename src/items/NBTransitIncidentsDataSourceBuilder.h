@@ -4,7 +4,7 @@
 #include <memory>
 #include <optional>
 #include <string>
-#include <unordered_map>
+#include <vector>
 
 #include "analytics/NBTransitIncidentsAnalyticsDelegate.h"
 #include "handoff/NBUserActivityData.h"
@@ -51,8 +51,8 @@ class NBTransitIncidentsDataSourceBuilder final : public NBTransitItemDataSource
   std::string_view className() const override { return "NBTransitIncidentsDataSourceBuilder"; }
 
  private:
-  /// The lines on which a row's incident was found, by the identity of the row; the first one made the row.
-  using ItemToLinesMap = std::unordered_map<NBTransitItemRef, TransitLineItems>;
+  /// The lines on which the incident of row k was found, at k; the first one made the row.
+  using ItemToLinesMap = std::vector<TransitLineItems>;
 
   /// What a scan of the lines finds. Row k shows displayed incident k, whose number is displayed muid k.
   struct Scan {

@@ -6,10 +6,10 @@
 #include "handoff/NBUserActivityData+Payloads.h"
 #include "handoff/URL+NBOpenable.h"
 #include "items/NBTransitIncidentsDataSourceBuilder.h"
+#include "items/NamedArtwork.h"
 #include "platform/Localization.h"
 #include "platform/MapURLBuilder.h"
 #include "platform/UserSession.h"
-#include "platform/artwork/NamedImage.h"
 #include "platform/artwork/SizedTransitArtwork.h"
 #include "platform/transit/IncidentStringProvider.h"
 
@@ -24,10 +24,6 @@ constexpr int kFavoritesTypeTransitLines = 2;
 
 std::string textWithCount(std::string_view key, std::size_t count) {
   return LocalizedFormat(LocalizedString(key), {std::uint64_t{count}});
-}
-
-NBConfiguredArtworkRef namedArtwork(const char* name, double alpha) {
-  return NBConfiguredArtwork::initWithArtworkSource_alpha(NamedImage::imageNamed(name), alpha);
 }
 
 /// The shield that rows show for a line; null where it has none.
@@ -70,7 +66,8 @@ NBUserActivityDataRef NBTransitIncidentsDataSourceBuilder::_userActivityDataForL
 NBTransitItemRef NBTransitIncidentsDataSourceBuilder::_allClearItem() const {
   return NBTransitItem::initWithPrimaryText_secondaryText_artwork_artworkHidden_openable(
       LocalizedString("TransitWidget_GoodService_Title"), _allClearSecondaryText(),
-      namedArtwork("good-v2", kFullArtworkAlpha), false, std::make_shared<const NBURLOpenable>(_urlForFavorites()));
+      artworkOfImageNamed("good-v2", kFullArtworkAlpha), false,
+      std::make_shared<const NBURLOpenable>(_urlForFavorites()));
 }
 
 std::string NBTransitIncidentsDataSourceBuilder::_allClearSecondaryText() const {
@@ -80,7 +77,7 @@ std::string NBTransitIncidentsDataSourceBuilder::_allClearSecondaryText() const 
 NBTransitItemRef NBTransitIncidentsDataSourceBuilder::_clearServiceItemForLines(const TransitLineItems& lines) const {
   return NBTransitItem::initWithPrimaryText_secondaryText_artwork_artworkHidden_openable(
       LocalizedString("TransitWidget_GoodService_Title"), _clearServiceSecondaryTextForLines(lines),
-      namedArtwork("good-alt-v2", kDimmedArtworkAlpha), false,
+      artworkOfImageNamed("good-alt-v2", kDimmedArtworkAlpha), false,
       std::make_shared<const NBURLOpenable>(_urlForFavorites()));
 }
 
@@ -106,7 +103,7 @@ NBTransitItemRef NBTransitIncidentsDataSourceBuilder::_incidentsOverflowItemForI
   return NBTransitItem::initWithPrimaryText_secondaryText_artwork_artworkHidden_openable(
       _advisoriesOverflowTitleForIncidentCount(incidents.size()),
       _advisoriesOverflowSecondaryTextForLineItemsCount(lines.size()),
-      namedArtwork("advisories-v2", kDimmedArtworkAlpha), false, _activityDataForIncidents(incidents));
+      artworkOfImageNamed("advisories-v2", kDimmedArtworkAlpha), false, _activityDataForIncidents(incidents));
 }
 
 std::string NBTransitIncidentsDataSourceBuilder::_advisoriesOverflowTitleForIncidentCount(std::size_t count) const {
@@ -122,10 +119,8 @@ NBTransitSummaryItemRef NBTransitIncidentsDataSourceBuilder::_summaryItemForInci
     const TransitIncidents& incidents, const NBTransitItems& items, const ItemToLinesMap& itemToLines) const {
   TransitArtworks shields;
   const TransitLineItem* previousLine = nullptr;  // many rows in a row are often of one line
-  for (const NBTransitItemRef& item : items) {
-    const auto entry = itemToLines.find(item);
-    if (entry == itemToLines.end()) continue;
-    for (const TransitLineItemRef& line : entry->second) {
+  for (std::size_t row = 0; row < items.size(); ++row) {
+    for (const TransitLineItemRef& line : itemToLines[row]) {
       if (std::exchange(previousLine, line.get()) == line.get()) continue;
       TransitArtworkRef shield = shieldOfLine(*line);
       if (!shield) continue;

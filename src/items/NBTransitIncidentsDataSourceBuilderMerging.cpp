@@ -2,10 +2,11 @@
 
 #include <algorithm>
 #include <functional>
+#include <utility>
 
 #include "items/NBTransitIncidentsDataSourceBuilder.h"
+#include "items/NamedArtwork.h"
 #include "platform/Localization.h"
-#include "platform/artwork/NamedImage.h"
 #include "platform/artwork/SizedTransitArtwork.h"
 
 namespace nimbo {
@@ -56,33 +57,30 @@ std::vector<std::string> distinctNames(const TransitLineItems& lines) {
 
 void NBTransitIncidentsDataSourceBuilder::_updateItemsAffectingSeveralLines_itemToLinesMap(
     NBTransitItems& items, ItemToLinesMap& itemToLines) const {
+  const auto isOfSeveral = [](const TransitLineItems& lines) { return lines.size() > 1; };
+  if (std::none_of(itemToLines.begin(), itemToLines.end(), isOfSeveral)) return;
   NumberList keys;
   for (const NBTransitItemRef& item : items) keys.append(keyOfTexts(*item));
-  for (const NBTransitItems oldItems = items; const NBTransitItemRef& old : oldItems) {
-    const auto entry = itemToLines.find(old);
-    if (entry == itemToLines.end() || entry->second.size() < 2) continue;
-    NBTransitItemRef merged = itemAffectingLines(*old, entry->second);
+  for (std::size_t row = 0; row < items.size(); ++row) {
+    if (!isOfSeveral(itemToLines[row])) continue;
+    const NBTransitItemRef old = items[row];
     const std::uint64_t key = keyOfTexts(*old);
-    std::size_t index = keys.firstIndexOf(key);
-    while (!absentOrEqual(items.at(index), old)) index = keys.firstIndexOf(key, index + 1);
-    items[index] = merged;
-    keys.replace(index, keyOfTexts(*merged));
-    auto node = itemToLines.extract(entry);
-    node.key() = std::move(merged);
-    itemToLines.insert(std::move(node));
+    std::size_t place = keys.firstIndexOf(key);
+    while (!items[place]->isEqual(old.get())) place = keys.firstIndexOf(key, place + 1);
+    items[place] = itemAffectingLines(*old, itemToLines[row]);
+    keys.replace(place, keyOfTexts(*items[place]));
+    itemToLines[place] = std::exchange(itemToLines[row], {});
   }
 }
 
 NBTransitItemRef NBTransitIncidentsDataSourceBuilder::itemAffectingLines(const NBTransitItem& item,
                                                                          const TransitLineItems& lines) const {
-  NBConfiguredArtworkRef artwork;
-  if (auto common = commonSystemArtwork(lines))
-    artwork = NBConfiguredArtwork::initWithArtworkSource_alpha(
-        SizedTransitArtwork::initWithArtwork_shieldSize_artworkCache(std::move(common), kRowShieldSize, _artworkCache),
-        kFullArtworkAlpha);
-  else
-    artwork = NBConfiguredArtwork::initWithArtworkSource_alpha(NamedImage::imageNamed("WidgetGenericTransit"),
-                                                               kDimmedArtworkAlpha);
+  auto common = commonSystemArtwork(lines);
+  auto artwork = common ? NBConfiguredArtwork::initWithArtworkSource_alpha(
+                              SizedTransitArtwork::initWithArtwork_shieldSize_artworkCache(
+                                  std::move(common), kRowShieldSize, _artworkCache),
+                              kFullArtworkAlpha)
+                        : artworkOfImageNamed("WidgetGenericTransit", kDimmedArtworkAlpha);
   return NBTransitItem::initWithPrimaryText_secondaryText_artwork_artworkHidden_openable(
       item.primaryText(), _prependLineNames_toText(lines, item.secondaryText()), std::move(artwork),
       item.isArtworkHidden(), item.openable());
