@@ -64,6 +64,4 @@ ShieldColors shieldColors(const TransitShield& shield, bool nightMode) {
 
 ShieldColors symbolColors(bool nightMode) { return colorsOnFill(neutralFill(nightMode), {}, nightMode); }
 
-Color labelColor(bool nightMode) { return nightMode ? Color{0.95, 0.95, 0.96, 1} : Color{0.11, 0.11, 0.12, 1}; }
-
 }  // namespace nimbo
