@@ -17,6 +17,9 @@ namespace {
 
 constexpr int kProtocolVersion = 1;
 
+/// Room at both sides of the rows, in points.
+constexpr Insets kLayoutMargins{0, 16, 0, 16};
+
 /// Device pixels for each point.
 constexpr double kSmallestScale = 0.25, kLargestScale = 8;
 
@@ -140,12 +143,15 @@ json WidgetProcess::initialize(const Parameters& params) {
 json WidgetProcess::loadView(const Parameters&) {
   if (!_controller) throw JSONRPCFailure(JSONRPCError::kInvalidState, "loadView needs \"initialize\" first");
   requireStage({Stage::created}, "loadView");
-  _controller->view();
-  if (_controller->widgetHost()) resizeView(_host.maximumSizeForDisplayMode(_host.activeDisplayMode()));
-  // A widget that starts in the expanded mode hears of it as of any other change.
-  if (_host.activeDisplayMode() == WidgetDisplayMode::Expanded)
-    _controller->widgetActiveDisplayModeDidChange_withMaximumSize(
-        WidgetDisplayMode::Expanded, _host.maximumSizeForDisplayMode(WidgetDisplayMode::Expanded));
+  _controller->view()->setLayoutMargins(kLayoutMargins);
+  if (_controller->widgetHost()) {
+    // The rows of the last time may have been left in the other mode.
+    const WidgetDisplayMode mode = _host.activeDisplayMode();
+    const Size maximumSize = _host.maximumSizeForDisplayMode(mode);
+    _controller->widgetActiveDisplayModeDidChange_withMaximumSize(mode, maximumSize);
+    const NBTransitIncidentDataSource& rows = *_controller->dataSource();
+    resizeView(rows.preferredContentSizeForExpanded_maxSize(rows.isExpanded(), maximumSize));
+  }
   _stage = Stage::hidden;
   return json::object();
 }

