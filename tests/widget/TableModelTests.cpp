@@ -121,7 +121,9 @@ TEST_F(TableModel, ChangesItsRowsWhenAnIncidentEnds) {
 }
 
 TEST_F(TableModel, ShrinksShieldsIntoTheColumnOfTheWidth) {
-  platform.shieldRenderer->width = [](std::int64_t size, const std::string&) { return 40.0 + 20.0 * static_cast<double>(size); };
+  platform.shieldRenderer->width = [](std::int64_t size, const std::string&) {
+    return 40.0 + 20.0 * static_cast<double>(size);
+  };
   make(success({lineItem(1, "1", {incident(10)}), lineItem(2, "2")}), 0, 359);
   const auto shieldSize = [&] {
     const auto& item = dynamic_cast<const NBTransitItem&>(*model->shieldAjustedSummaryItem());
