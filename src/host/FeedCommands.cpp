@@ -24,9 +24,7 @@ void require(const ErrorRef& error) {
   if (error) throw CommandFailure(error->reason());
 }
 
-void printCount(const char* what, std::size_t count) {
-  std::cout << "  " << what << ": " << count << "\n";
-}
+void printCount(const char* what, std::size_t count) { std::cout << "  " << what << ": " << count << "\n"; }
 
 void printReport(const char* what, const SkipReport& report) {
   for (const SkipReport::Entry& entry : report.entries()) {
@@ -69,7 +67,8 @@ std::vector<std::string> columnsOfLine(const TransitLine& line) {
   const auto& locator = line.identifier()->locator();
   const auto& artwork = line.artwork();
   const std::string shortName = locator ? locator->shortName : "";
-  const std::string fullName = artwork && artwork->accessibilityText() ? *artwork->accessibilityText() : line.name().value_or("");
+  const std::string fullName =
+      artwork && artwork->accessibilityText() ? *artwork->accessibilityText() : line.name().value_or("");
   return {printableText(locator ? locator->feed + ":" + locator->routeID : std::to_string(line.muid())),
           printableText(shortName), printableText(fullName),
           printableText(line.system() ? line.system()->name().value_or("") : "")};
@@ -87,7 +86,8 @@ void printLines(const std::vector<TransitLineRef>& lines) {
   for (const auto& row : table) {
     std::string text;
     for (std::size_t i = 0; i < row.size(); ++i)
-      if (widths[i] > 0) text += row[i] + std::string(static_cast<std::size_t>(widths[i] - terminalWidth(row[i]) + 2), ' ');
+      if (widths[i] > 0)
+        text += row[i] + std::string(static_cast<std::size_t>(widths[i] - terminalWidth(row[i]) + 2), ' ');
     std::cout << text.substr(0, text.find_last_not_of(' ') + 1) << "\n";
   }
 }
@@ -121,11 +121,13 @@ int runFeedCheck(const CommandContext& context, const std::string& name) {
   const HostPlatform platform(context);
   const FeedConfiguration configuration(context.paths.config);
   const FeedCache cache(context.paths.cache);
-  const auto feeds = name.empty() ? require(configuration.feeds()) : std::vector<Feed>{require(configuration.feedNamed(name))};
+  const auto feeds =
+      name.empty() ? require(configuration.feeds()) : std::vector<Feed>{require(configuration.feedNamed(name))};
   if (feeds.empty()) throw CommandFailure("no feed is set up to be checked. Set one up with \"feed add\".");
   std::size_t bad = 0;
   for (const Feed& feed : feeds) bad += printCheck(checkFeed(feed, cache)) ? 0 : 1;
-  if (bad > 0) throw CommandFailure(std::to_string(bad) + " of " + std::to_string(feeds.size()) + " feeds cannot be used");
+  if (bad > 0)
+    throw CommandFailure(std::to_string(bad) + " of " + std::to_string(feeds.size()) + " feeds cannot be used");
   return kExitSuccess;
 }
 

@@ -11,7 +11,10 @@ class HostPlatform final : private ActivityLauncher {
  public:
   /// `locale` is a BCP 47 tag or POSIX name; empty: the environment's.
   explicit HostPlatform(const CommandContext& context, std::string locale = {})
-      : _platform({.paths = context.paths, .locale = std::move(locale), .runLoop = context.runLoop, .activityLauncher = *this}) {}
+      : _platform({.paths = context.paths,
+                   .locale = std::move(locale),
+                   .runLoop = context.runLoop,
+                   .activityLauncher = *this}) {}
 
   DesktopPlatform* operator->() { return &_platform; }
 

@@ -38,8 +38,9 @@ std::string textOfAction(const AnalyticsUserAction& action) {
 
 std::string textOfInteraction(const AnalyticsWidgetInteraction& interaction) {
   const TransitWidgetAnalyticsRecord& record = interaction.record;
-  std::string text = std::string("session, ended by ") + (interaction.endState == 1 ? "opening a row" : "disappearing") +
-                     " after " + std::to_string(static_cast<long>(interaction.duration)) + " s";
+  std::string text = std::string("session, ended by ") +
+                     (interaction.endState == 1 ? "opening a row" : "disappearing") + " after " +
+                     std::to_string(static_cast<long>(interaction.duration)) + " s";
   if (interaction.wasLocked) text += ", locked";
   if (record.everExpanded) text += record.initiallyExpanded ? ", expanded from the start" : ", expanded";
   if (record.tappedItemIndex) text += ", row " + std::to_string(*record.tappedItemIndex);
@@ -81,8 +82,10 @@ int runAnalytics(const CommandContext& context, bool json) {
       continue;
     }
     std::cout << isoTextOfDate(entry.date) << "  ";
-    if (const auto* action = std::get_if<AnalyticsUserAction>(&entry.content)) std::cout << textOfAction(*action);
-    else std::cout << textOfInteraction(std::get<AnalyticsWidgetInteraction>(entry.content));
+    if (const auto* action = std::get_if<AnalyticsUserAction>(&entry.content))
+      std::cout << textOfAction(*action);
+    else
+      std::cout << textOfInteraction(std::get<AnalyticsWidgetInteraction>(entry.content));
     std::cout << "\n";
   }
   return kExitSuccess;

@@ -82,7 +82,8 @@ TerminalStyle TerminalStyle::ofStandardOutput() {
   style.colors = isatty(STDOUT_FILENO) && !(noColor && *noColor) && terminal && std::string_view(terminal) != "dumb";
   constexpr int kNarrowest = 20;
   winsize size{};
-  if (ioctl(STDOUT_FILENO, TIOCGWINSZ, &size) == 0 && size.ws_col > 0) style.columns = size.ws_col;
+  if (ioctl(STDOUT_FILENO, TIOCGWINSZ, &size) == 0 && size.ws_col > 0)
+    style.columns = size.ws_col;
   else if (const char* columns = std::getenv("COLUMNS"); columns && std::atoi(columns) > 0)
     style.columns = std::atoi(columns);
   style.columns = std::max(style.columns, kNarrowest);
@@ -98,7 +99,8 @@ std::string rowsAsText(const json& snapshot, const TerminalStyle& style) {
     bool first = true;
     for (const std::string& line : foldedText(textOf(row, "primaryText"), room)) {
       text += styled(line, kBold, style);
-      if (first && !artwork.empty()) text += std::string(static_cast<std::size_t>(room - terminalWidth(line) + 1), ' ') + artwork;
+      if (first && !artwork.empty())
+        text += std::string(static_cast<std::size_t>(room - terminalWidth(line) + 1), ' ') + artwork;
       text += "\n";
       first = false;
     }

@@ -28,12 +28,14 @@ void forEachCharacter(std::string_view text, Visit visit) {
 }  // namespace
 
 std::string printableText(std::string_view text) {
-  const std::unique_ptr<char, decltype(&g_free)> valid(
-      g_utf8_make_valid(text.data(), static_cast<gssize>(text.size())), &g_free);
+  const std::unique_ptr<char, decltype(&g_free)> valid(g_utf8_make_valid(text.data(), static_cast<gssize>(text.size())),
+                                                       &g_free);
   std::string result;
   forEachCharacter(valid.get(), [&](gunichar c, std::string_view bytes) {
-    if (c == '\n' || !g_unichar_iscntrl(c)) result += bytes;
-    else result += ' ';
+    if (c == '\n' || !g_unichar_iscntrl(c))
+      result += bytes;
+    else
+      result += ' ';
   });
   return result;
 }
@@ -42,9 +44,12 @@ int terminalWidth(std::string_view text) {
   int width = 0;
   bool escape = false;
   forEachCharacter(text, [&](gunichar c, std::string_view) {
-    if (escape) escape = c != 'm';
-    else if (c == 0x1b) escape = true;
-    else width += widthOfCharacter(c);
+    if (escape)
+      escape = c != 'm';
+    else if (c == 0x1b)
+      escape = true;
+    else
+      width += widthOfCharacter(c);
   });
   return width;
 }

@@ -34,8 +34,10 @@ int runStatus(const CommandContext& context, const StatusOptions& options) {
   const std::optional<std::string> failure = widget.update();
   if (options.expanded) widget.expand();
   const nlohmann::json snapshot = widget.snapshot();
-  if (options.json) std::cout << snapshot.dump(2) << "\n";
-  else std::cout << rowsAsText(snapshot, TerminalStyle::ofStandardOutput());
+  if (options.json)
+    std::cout << snapshot.dump(2) << "\n";
+  else
+    std::cout << rowsAsText(snapshot, TerminalStyle::ofStandardOutput());
   widget.close();
   if (failure) throw CommandFailure(*failure);
   return kExitSuccess;

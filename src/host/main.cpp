@@ -91,8 +91,8 @@ void CommandLine::addWidgetCommands() {
 
 void CommandLine::addFeedCommands() {
   CLI::App* feed = _app.add_subcommand("feed", "The feeds of the agencies")->require_subcommand(1);
-  CLI::App* addFeed = add(*feed, "add", "Set up a feed",
-                          [this](const CommandContext& context) { return runFeedAdd(context, _feed); });
+  CLI::App* addFeed =
+      add(*feed, "add", "Set up a feed", [this](const CommandContext& context) { return runFeedAdd(context, _feed); });
   addFeed->add_option("NAME", _feed.name, "Name of your choice")->required();
   addFeed->add_option("--static", _feed.staticFeed, "GTFS: a folder, a zip file, or an http(s) address")->required();
   addFeed->add_option("--alerts", _feed.alerts, "GTFS-Realtime Service Alerts: a file or an http(s) address")
@@ -118,9 +118,8 @@ void CommandLine::addFavoriteCommands() {
   CLI::App* remove = add(*favorite, "remove", "Remove lines",
                          [this](const CommandContext& context) { return runFavoriteRemove(context, _lines); });
   remove->add_option("FEED:ROUTE_ID", _lines, "Lines as \"favorite list\" prints them")->required();
-  CLI::App* move = add(*favorite, "move", "Move a line to another position", [this](const CommandContext& context) {
-    return runFavoriteMove(context, _text, _position);
-  });
+  CLI::App* move = add(*favorite, "move", "Move a line to another position",
+                       [this](const CommandContext& context) { return runFavoriteMove(context, _text, _position); });
   move->add_option("FEED:ROUTE_ID", _text, "A line as \"favorite list\" prints it")->required();
   move->add_option("POSITION", _position, "1 is the first")->required();
   add(*favorite, "list", "List the favourite lines in their order",

@@ -117,7 +117,8 @@ json WidgetProcess::initialize(const Parameters& params) {
   const BundleRecordRef record = params.has("bundle") ? bundleRecord(params.object("bundle")) : nullptr;
 
   auto logSink = std::make_unique<HostLogSink>(
-      makeLogSink(LogOptions::fromEnvironment()), _runLoop, [this](const std::string& category, const std::string& text) {
+      makeLogSink(LogOptions::fromEnvironment()), _runLoop,
+      [this](const std::string& category, const std::string& text) {
         _connection.notify("log", {{"level", "error"}, {"category", category}, {"message", text}});
       });
   _platform = std::make_unique<DesktopPlatform>(DesktopPlatform::Options{.paths = _options.paths,
@@ -237,8 +238,10 @@ json WidgetProcess::highlightRow(const Parameters& params) {
   const IndexPath indexPath = existingRow(params);
   const bool highlighted = params.has("highlighted") ? params.flag("highlighted") : true;
   TableView& tableView = *_controller->tableView();
-  if (highlighted) tableView.highlightRowAtIndexPath(indexPath);
-  else if (tableView.highlightedRow() == indexPath) tableView.highlightRowAtIndexPath(std::nullopt);
+  if (highlighted)
+    tableView.highlightRowAtIndexPath(indexPath);
+  else if (tableView.highlightedRow() == indexPath)
+    tableView.highlightRowAtIndexPath(std::nullopt);
   announceFrame();
   return {{"highlighted", tableView.highlightedRow() == indexPath}};
 }
@@ -253,9 +256,8 @@ json WidgetProcess::render(const Parameters& params) {
   view.layoutIfNeeded();
   const Environment& environment = Environment::current();
   const auto draw = [&view](Painter& painter) { view.draw(painter); };
-  const CairoSurface::Made made =
-      renderToSurface(draw, view.bounds().size(), environment.screenScale(),
-                      colorOf(SystemColor::background, environment.appearance()));
+  const CairoSurface::Made made = renderToSurface(draw, view.bounds().size(), environment.screenScale(),
+                                                  colorOf(SystemColor::background, environment.appearance()));
   ErrorRef error = made.error;
   if (!error) error = toSurface ? writeSharedSurface(*made.surface, path) : writePNG(*made.surface, path);
   if (error) throw JSONRPCFailure(JSONRPCError::kDrawingFailed, error->reason());

@@ -34,7 +34,8 @@ TEST(CommandLine, SetsUpFeedsAndFavorites) {
   EXPECT_THAT(programs.run({"feed", "list"}).output, HasSubstr("city"));
   const ProgramRun check = programs.run({"feed", "check"});
   EXPECT_EQ(check.status, 0) << check.errors;
-  EXPECT_THAT(check.output, HasSubstr("gone")) << "a selector that fits no line is how a false good service comes about";
+  EXPECT_THAT(check.output, HasSubstr("gone"))
+      << "a selector that fits no line is how a false good service comes about";
 
   const auto order = [&] { return programs.run({"favorite", "list"}).output; };
   EXPECT_LT(order().find("city:m2"), order().find("city:b10"));
@@ -80,8 +81,11 @@ TEST(CommandLine, RefusesWhatItCannotDoAndSaysWhy) {
 TEST(CommandLine, ShowsTheErrorRowForAFeedThatFails) {
   const Programs programs;
   programs.setUpCity({"m1", "b10"}, {});
-  for (const std::string_view bytes : {std::string_view("<html><body>502 Bad Gateway</body></html>"), std::string_view(""),
-                                       std::string_view("\x0a\x0d\x0a\x03" "2.0", 7)}) {
+  for (const std::string_view bytes :
+       {std::string_view("<html><body>502 Bad Gateway</body></html>"), std::string_view(""),
+        std::string_view("\x0a\x0d\x0a\x03"
+                         "2.0",
+                         7)}) {
     programs.publishBytes(bytes);
     const ProgramRun result = programs.run({"status", kNow});
     EXPECT_EQ(result.status, 1);

@@ -44,8 +44,8 @@ ProgramRun Programs::run(std::vector<std::string> arguments, const std::string& 
   posix_spawn_file_actions_addopen(&actions, 0, files[0].c_str(), O_RDONLY, 0);
   for (const int fd : {1, 2})
     posix_spawn_file_actions_addopen(&actions, fd, files[fd].c_str(), O_WRONLY | O_CREAT | O_TRUNC, 0600);
-  arguments.insert(arguments.begin(), {NIMBO_TRANSIT, "--config", folder.path() / "config", "--state",
-                                       folder.path() / "state"});
+  arguments.insert(arguments.begin(),
+                   {NIMBO_TRANSIT, "--config", folder.path() / "config", "--state", folder.path() / "state"});
   std::vector<char*> argv;
   for (std::string& argument : arguments) argv.push_back(argument.data());
   argv.push_back(nullptr);
@@ -76,10 +76,11 @@ json request(const std::string& method, json params) {
 }
 
 std::vector<json> appearing(double compactHeight, double expandedHeight) {
-  return {request("initialize", {{"locale", "en"},
-                                 {"displayModes", {{"compact", {359, compactHeight}}, {"expanded", {359, expandedHeight}}}},
-                                 {"bundle", {{"kind", "application"}, {"identifier", "org.example.Host"}}}}),
-          request("loadView"), request("viewWillAppear"), request("viewDidAppear")};
+  return {
+      request("initialize", {{"locale", "en"},
+                             {"displayModes", {{"compact", {359, compactHeight}}, {"expanded", {359, expandedHeight}}}},
+                             {"bundle", {{"kind", "application"}, {"identifier", "org.example.Host"}}}}),
+      request("loadView"), request("viewWillAppear"), request("viewDidAppear")};
 }
 
 std::vector<json> snapshots(const std::vector<json>& lines) {

@@ -4,9 +4,9 @@
 #include <string>
 #include <vector>
 
+#include "host/AlertsBuilder.h"
 #include "platform/foundation/Date.h"
 #include "support/TemporaryFolder.h"
-#include "host/AlertsBuilder.h"
 
 namespace nimbo {
 

@@ -35,13 +35,30 @@ TEST(WidgetProcess, ShowsTheRowsThatTheFeedCallsFor) {
       {"no favourites", {}, {}, 440, {"No Favorite Lines"}, {}},
       {"all clear", {"m1", "b10"}, {}, 440, {"Good Service"}, {}},
       {"one incident on the only line", {"m1"}, {one}, 440, {"Signal failure"}, {}},
-      {"one incident, one clear line", {"m1", "m2"}, {one}, 440, {"Signal failure"}, {"Signal failure", "Good Service"}},
+      {"one incident, one clear line",
+       {"m1", "m2"},
+       {one},
+       440,
+       {"Signal failure"},
+       {"Signal failure", "Good Service"}},
       {"an incident that two lines share", {"m1", "m2"}, {shared}, 440, {"Lift out of order at Castle"}, {}},
-      {"room for all", {"m1", "b10", "b11", "b12"}, {one, two, three}, 440, {"3 Advisories"},
+      {"room for all",
+       {"m1", "b10", "b11", "b12"},
+       {one, two, three},
+       440,
+       {"3 Advisories"},
        {"Signal failure", "Road works", "Strike", "Good Service"}},
-      {"no limit", {"m1", "b10", "b11", "b12"}, {one, two, three}, 0, {"3 Advisories"},
+      {"no limit",
+       {"m1", "b10", "b11", "b12"},
+       {one, two, three},
+       0,
+       {"3 Advisories"},
        {"Signal failure", "Road works", "Strike", "Good Service"}},
-      {"room for three", {"m1", "b10", "b11", "b12"}, {one, two, three}, 330, {"3 Advisories"},
+      {"room for three",
+       {"m1", "b10", "b11", "b12"},
+       {one, two, three},
+       330,
+       {"3 Advisories"},
        {"Signal failure", "2 More Advisories", "Good Service"}},
       {"room for one", {"m1", "b10", "b11", "b12"}, {one, two, three}, 110, {"3 Advisories"}, {"3 More Advisories"}},
       {"lines of two agencies", {"m1", "b10"}, {mixed}, 440, {"Marathon"}, {}},
@@ -67,8 +84,10 @@ TEST(WidgetProcess, ShowsTheRowsThatTheFeedCallsFor) {
 
 TEST(WidgetProcess, MergesASharedIncidentUnderTheLinesNames) {
   Programs programs;
-  programs.setUpCity({"m1", "m2", "b10"}, {{"a", {"m1", "m2"}, "Closed", "No trains."}, {"b", {"m2", "b10"}, "Fair", "Crowds."}});
-  const auto seen = snapshots(programs.play(appearing() + std::vector<json>{request("performUpdate"), kExpand, request("snapshot")}));
+  programs.setUpCity({"m1", "m2", "b10"},
+                     {{"a", {"m1", "m2"}, "Closed", "No trains."}, {"b", {"m2", "b10"}, "Fair", "Crowds."}});
+  const auto seen =
+      snapshots(programs.play(appearing() + std::vector<json>{request("performUpdate"), kExpand, request("snapshot")}));
   ASSERT_THAT(seen, SizeIs(1));
   const json& rows = seen[0]["rows"];
   ASSERT_THAT(rows, SizeIs(2));
@@ -86,8 +105,9 @@ TEST(WidgetProcess, ChangesItsRowsOnTheSecondAndFetchesEveryHalfHour) {
   programs.setUpCity({"m1"}, {{"a", {"m1"}, "Works", "Slow.", now + 60, now + 120}});
   const auto wait = [](double seconds) { return request("advanceTime", {{"seconds", seconds}}); };
   const json look = request("snapshot");
-  const auto seen = snapshots(programs.play(
-      appearing() + kUpdateAndLook + std::vector<json>{wait(59.5), look, wait(0.5), look, wait(59.5), look, wait(0.5), look}));
+  const auto seen =
+      snapshots(programs.play(appearing() + kUpdateAndLook +
+                              std::vector<json>{wait(59.5), look, wait(0.5), look, wait(59.5), look, wait(0.5), look}));
   std::vector<std::string> firstRows;
   for (const json& snapshot : seen) firstRows.push_back(titles(snapshot).at(0));
   EXPECT_THAT(firstRows, ElementsAre("Good Service", "Good Service", "Works", "Works", "Good Service"));
@@ -106,8 +126,10 @@ TEST(WidgetProcess, ChangesItsRowsOnTheSecondAndFetchesEveryHalfHour) {
 TEST(WidgetProcess, ShowsItsLastRowsBeforeAnyFetch) {
   Programs programs;
   const std::int64_t now = Programs::unixNow();
-  programs.setUpCity({"m1", "m2"}, {{"a", {"m1"}, "Works", "Slow.", 0, now + 600}, {"b", {"m2"}, "Storm", "Wind.", now - 9, now + 30}});
-  programs.play(appearing() + kUpdateAndLook + std::vector<json>{kExpand, request("viewWillDisappear"), request("viewDidDisappear")});
+  programs.setUpCity({"m1", "m2"}, {{"a", {"m1"}, "Works", "Slow.", 0, now + 600},
+                                    {"b", {"m2"}, "Storm", "Wind.", now - 9, now + 30}});
+  programs.play(appearing() + kUpdateAndLook +
+                std::vector<json>{kExpand, request("viewWillDisappear"), request("viewDidDisappear")});
   programs.publishBytes("no feed any more");
 
   json initialize = appearing()[0];
@@ -118,7 +140,8 @@ TEST(WidgetProcess, ShowsItsLastRowsBeforeAnyFetch) {
   EXPECT_EQ(titles(restored), (std::vector<std::string>{"Works", "Storm"}));
 
   // Dates that went by meanwhile are judged at once.
-  const auto later = std::vector<json>{start[0], request("advanceTime", {{"seconds", 31}}), request("loadView"), request("snapshot")};
+  const auto later =
+      std::vector<json>{start[0], request("advanceTime", {{"seconds", 31}}), request("loadView"), request("snapshot")};
   EXPECT_EQ(titles(snapshots(programs.play(later)).at(0)), (std::vector<std::string>{"Works", "Good Service"}));
 }
 
@@ -126,7 +149,9 @@ TEST(WidgetProcess, AnswersTwoUpdatesWithOneLookupAndOpensWhatIsTapped) {
   Programs programs;
   programs.setUpCity({"m1"}, {{"a", {"m1"}, "Works", "Slow."}});
   const json first = request("performUpdate"), second = request("performUpdate");
-  const auto lines = programs.play(appearing() + std::vector<json>{first, second, request("selectRow", {{"section", 0}, {"row", 0}}), request("snapshot")});
+  const auto lines =
+      programs.play(appearing() + std::vector<json>{first, second, request("selectRow", {{"section", 0}, {"row", 0}}),
+                                                    request("snapshot")});
   std::vector<int> updates;
   json opened;
   for (const json& line : lines) {

@@ -46,7 +46,7 @@ std::string_view reasonFor(SelectorFit fit) {
     case SelectorFit::noLineOfType:
       return "route type that no line has";
     case SelectorFit::contradiction:
-      return "route that is not of the agency, type or trip beside it";
+      return "route that is not of the agency or trip beside it";
     case SelectorFit::nothingNamed:
       return "selector that names no line";
   }

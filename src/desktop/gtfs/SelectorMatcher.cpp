@@ -42,9 +42,8 @@ SelectorFit SelectorMatcher::matchOne(std::size_t place, const EntitySelector& s
   const std::string_view agency = _agencyOfLine[place];
   if (!selector.agencyID.empty() && !agency.empty() && selector.agencyID != agency && isKnownAgency(selector.agencyID))
     return SelectorFit::contradiction;
-  const RouteType type = _lines[place].type;
-  if (selector.routeType && type != kUnknownRouteType && basicRouteType(*selector.routeType) != basicRouteType(type))
-    return SelectorFit::contradiction;
+  // A route type beside a route is not looked at: publishers write 0, the format's default, beside lines of any type
+  // (Denver, 2026), and dropping such an alert would make a false good service.
   handler(place, isWholeLine(selector));
   return SelectorFit::lines;
 }

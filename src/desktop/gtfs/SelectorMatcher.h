@@ -21,12 +21,13 @@ enum class SelectorFit {
   unknownAgency,
   unknownTrip,
   noLineOfType,
-  contradiction,  ///< a route that is not of the agency or type beside it
+  contradiction,  ///< a route that is not of the agency or trip beside it
   nothingNamed,
 };
 
 /// Finds the lines that selectors of alerts concern. The fields of a selector hold together: a route of an agency is
-/// that route. An agency that the static feed does not know takes nothing away from a route that it does know.
+/// that route. An agency that the static feed does not know, or any route type, takes nothing away from a route that it
+/// does know.
 /// Source: https://gtfs.org/documentation/realtime/reference/#message-entityselector
 class SelectorMatcher {
  public:
