@@ -34,14 +34,14 @@ inline TransitIncidentRef incident(std::uint64_t muid, std::optional<Date> start
   return std::make_shared<const BasicTransitIncident>(std::move(fields));
 }
 
-/// A line whose shields show its name.
+/// A line, with shields that show its name.
 inline TransitLineItemRef lineItem(std::uint64_t muid, const std::string& name, TransitIncidents incidents = {},
-                                   TransitSystemRef system = nullptr) {
+                                   TransitSystemRef system = nullptr, bool hasShield = true) {
   BasicTransitLineItem::Fields fields;
   fields.identifier = std::make_shared<const MapItemIdentifier>(muid);
   fields.name = name;
   fields.system = std::move(system);
-  fields.artwork = shieldArtwork(name);
+  if (hasShield) fields.artwork = shieldArtwork(name);
   fields.alternateArtwork = fields.artwork;
   fields.incidents = std::move(incidents);
   return std::make_shared<const BasicTransitLineItem>(std::move(fields));

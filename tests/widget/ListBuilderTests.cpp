@@ -1,5 +1,6 @@
 #include <gmock/gmock.h>
 
+#include <cctype>
 #include <sstream>
 
 #include "analytics/NBTransitIncidentsAnalyticsDelegate.h"
@@ -19,8 +20,9 @@ using testing::ElementsAre;
 using Rows = std::vector<std::string>;
 
 /// Lines from a text such as "A:1,2 B: C/rail:2": a line for each word, with its system after a slash and its
-/// incidents by number after the colon. The same number is the same incident, of another object on each line; 0 has no
-/// texts, 9 is still to start.
+/// incidents by number after the colon; a small letter is a line without a shield. The same number is the same
+/// incident, of another object on each line; numbers with the same last digit have the same texts: 0 none, 8 only a
+/// description, 9 is still to start.
 class Network {
  public:
   explicit Network(const std::string& text) {
@@ -32,7 +34,8 @@ class Network {
       std::istringstream numbers(word.substr(colon + 1));
       for (std::string number; std::getline(numbers, number, ',');) incidents.push_back(numbered(std::stoul(number)));
       const std::string system = slash < colon ? word.substr(slash + 1, colon - slash - 1) : "";
-      lines.push_back(lineItem(100 + lines.size(), name, std::move(incidents), systemNamed(system)));
+      const bool hasShield = std::isupper(static_cast<unsigned char>(name.front())) != 0;
+      lines.push_back(lineItem(100 + lines.size(), name, std::move(incidents), systemNamed(system), hasShield));
     }
   }
 
@@ -51,7 +54,7 @@ class Network {
     if (const auto* item = dynamic_cast<const NBTransitItem*>(summary.get())) return textOf(*item);
     const auto& item = dynamic_cast<const NBTransitSummaryItem&>(*summary);
     std::string text = item.primaryText() + " | ";
-    for (const auto& shield : item.artworks()) text += *shield->shieldDataSource()->shieldText;
+    for (const auto& shield : item.artworks()) text += textOf(*shield);
     return text + " | " + textOf(item.userActivityData());
   }
 
@@ -59,9 +62,12 @@ class Network {
 
  private:
   static TransitIncidentRef numbered(std::uint64_t number) {
-    if (number == 0) return std::make_shared<const BasicTransitIncident>(BasicTransitIncident::Fields{});
     if (number == 9) return incident(9, dateByAdding(TestPlatform::startDate(), 1));
-    return incident(number);
+    auto fields = dynamic_cast<const BasicTransitIncident&>(*incident(number % 10)).fields();
+    fields.muid = number;
+    if (number == 0 || number == 8) fields.title = fields.summary = std::nullopt;
+    if (number == 8) fields.fullDescription = "Description";
+    return std::make_shared<const BasicTransitIncident>(std::move(fields));
   }
   static TransitSystemRef systemNamed(const std::string& name) {
     if (name.empty()) return nullptr;
@@ -75,9 +81,11 @@ class Network {
       return named->name() + alpha;
     const auto& sized = dynamic_cast<const SizedTransitArtwork&>(*artwork->artworkSource());
     EXPECT_EQ(sized.shieldSize(), 7);
-    if (!sized.artwork()) return "no shield" + alpha;
-    if (sized.artwork()->shieldDataSource()) return *sized.artwork()->shieldDataSource()->shieldText + alpha;
-    return "mode " + std::to_string(sized.artwork()->iconDataSource()->defaultTransitType) + alpha;
+    return (sized.artwork() ? textOf(*sized.artwork()) : "no shield") + alpha;
+  }
+  static std::string textOf(const TransitArtwork& artwork) {
+    if (artwork.shieldDataSource()) return *artwork.shieldDataSource()->shieldText;
+    return "mode " + std::to_string(artwork.iconDataSource()->defaultTransitType);
   }
   std::string textOf(const NBOpenableRef& openable) const {
     if (!openable) return "-";
@@ -149,8 +157,13 @@ TEST_F(ListBuilder, ChoosesTheCompactRowAndTheExpandedRows) {
       {"A:9 B:0 C:", allClear(3), {}},
       {"A:1", row(1, "A"), {}},
       {"A: B:1 C:9", row(1, "B"), {row(1, "B"), clearRow(2)}},
+      {"A:1 B:0", row(1, "A"), {row(1, "A"), clearRow(1)}},
+      {"A:8", " | Description | A | line A", {}},
+      {"a/rail:1", "Incident 1 | Summary 1 | mode 3 | line a", {}},
+      {"a:1", "Incident 1 | Summary 1 | no shield | line a", {}},
       {"A:1,2 B:", summary(2, "A"), {row(1, "A"), row(2, "A"), clearRow(1)}},
-      {"A:1,0 B:2,9", summary(2, "AB"), {row(1, "A"), row(2, "B")}},
+      {"A:1,0 B:2,9 A:0", summary(2, "AB"), {row(1, "A"), row(2, "B"), clearRow(1)}},
+      {"A:1 A:2", summary(2, "A"), {row(1, "A"), row(2, "A")}},
   };
   for (const auto& [network, compact, expanded] : cases) expectRows(network, 0, compact, expanded);
 }
@@ -194,6 +207,9 @@ TEST_F(ListBuilder, ShowsAnIncidentOfSeveralLinesOnceWithTheirNames) {
   };
   for (const auto& [network, expected] : cases) expectRows(network, 0, expected, {});
   expectRows("A:1 B:1,2", 0, summary(2, "AB"), {merged(generic, two), row(2, "B")});
+  // Of two rows that look alike, the first one's place is taken.
+  expectRows("A:1,11 B:11 c:2", 0, summary(3, "AB"),
+             {merged(generic, two), row(1, "A"), "Incident 2 | Summary 2 | no shield | line c"});
 }
 
 TEST_F(ListBuilder, JoinsNamesAloneWhereAnIncidentHasNoText) {
