@@ -111,6 +111,9 @@ std::optional<double> StyledLabel::lastBaselineFromBottom() {
 void StyledLabel::drawContent(Painter& painter, const DrawingContext& context) {
   if (!_text || _text->empty()) return;
   const TextLayoutRef layout = layoutForWidth(frame().width, linesShown());
+  // A line that is cut through cannot be read: at the largest text sizes a row may have no room for its second text.
+  constexpr double kLeastShareOfALine = 0.8;
+  if (frame().height < kLeastShareOfALine * layout->size().height) return;
   const Color color = context.vibrantColor.value_or(colorOf(_textColor, context.appearance));
   painter.drawText(*layout, {0, 0}, frame().width, color);
 }
