@@ -8,6 +8,7 @@
 #include <span>
 #include <stdexcept>
 #include <string>
+#include <tuple>
 #include <vector>
 
 #include "desktop/raii/FileDescriptor.h"
@@ -99,25 +100,18 @@ TEST(SystemLog, KnowsTheJournalsStream) {
 }
 
 TEST(SystemLog, TakesItsOptionsFromTheEnvironment) {
-  const struct {
-    const char* level;
-    const char* isPrivate;
-    LogOptions expected;
-  } kCases[] = {{"debug", "1", {LogLevel::debug, true, false, ""}},
-                {"info", "0", {LogLevel::info, false, false, ""}},
-                {"error", "yes", {LogLevel::error, false, false, ""}},
-                {"", "", {LogLevel::error, false, false, ""}},
-                {"DEBUG", "", {LogLevel::error, false, false, "DEBUG"}}};
-  for (const auto& test : kCases) {
-    ::setenv("NIMBO_LOG", test.level, 1);
-    ::setenv("NIMBO_LOG_PRIVATE", test.isPrivate, 1);
+  const auto optionsOf = [](const char* level, const char* showsPrivate) {
+    ::setenv("NIMBO_LOG", level, 1);
+    ::setenv("NIMBO_LOG_PRIVATE", showsPrivate, 1);
     const LogOptions options = LogOptions::fromEnvironment();
-    EXPECT_EQ(options.level, test.expected.level) << test.level;
-    EXPECT_EQ(options.showsPrivate, test.expected.showsPrivate) << test.isPrivate;
-    EXPECT_EQ(options.unknownLevel, test.expected.unknownLevel) << test.level;
-  }
-  ::unsetenv("NIMBO_LOG");
-  ::unsetenv("NIMBO_LOG_PRIVATE");
+    ::unsetenv("NIMBO_LOG");
+    ::unsetenv("NIMBO_LOG_PRIVATE");
+    return std::tuple(options.level, options.showsPrivate, options.unknownLevel);
+  };
+  EXPECT_EQ(optionsOf("debug", "1"), std::tuple(LogLevel::debug, true, ""));
+  EXPECT_EQ(optionsOf("info", "0"), std::tuple(LogLevel::info, false, ""));
+  EXPECT_EQ(optionsOf("", "yes"), std::tuple(LogLevel::error, false, ""));
+  EXPECT_EQ(optionsOf("DEBUG", ""), std::tuple(LogLevel::error, false, "DEBUG"));
 }
 
 }  // namespace

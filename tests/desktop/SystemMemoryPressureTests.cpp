@@ -15,7 +15,7 @@
 namespace nimbo {
 namespace {
 
-struct Pressure : testing::Test {
+struct LinuxMemoryPressureTest : testing::Test {
   TestPlatform platform;
   TemporaryFolder root;
   GLibRunLoop loop;
@@ -35,44 +35,33 @@ struct Pressure : testing::Test {
     loop.run();
   }
 };
-using LinuxMemoryPressureTest = Pressure;
-
 TEST_F(LinuxMemoryPressureTest, FollowsTheCountersOfTheCgroup) {
   root.write("proc/self/cgroup", "4:memory:/other\n0::/user.slice/app.scope\n");
-  const std::string events = "sys/fs/cgroup/user.slice/app.scope/memory.events";
-  root.write(events, "low 0\nhigh 7\nmax 3\noom 0\noom_kill 0\n");
+  const auto heardAfter = [&](const char* events) {
+    root.write("sys/fs/cgroup/user.slice/app.scope/memory.events", events);
+    settle();
+    return heard;
+  };
+  heardAfter("low 0\nhigh 7\nmax 3\noom 0\noom_kill 0\n");
   LinuxMemoryPressure pressure(loop, LinuxMemoryPressure::Files::ofThisProcess(root.path()));
   const auto warning = listen(pressure, MemoryPressureKind::processWarning, 'w');
   const auto critical = listen(pressure, MemoryPressureKind::processCritical, 'c');
-  warning->activate();
-  settle();
-  EXPECT_EQ(heard, "") << "what happened before";
-
-  root.write(events, "low 0\nhigh 8\nmax 3\noom 0\noom_kill 0\n");
-  settle();
-  EXPECT_EQ(heard, "w");
-  root.write(events, "low 5\nhigh 8\nmax 3\noom 1\noom_kill 1\n");
-  settle();
-  EXPECT_EQ(heard, "wc");
-
+  EXPECT_EQ(heardAfter("low 5\nhigh 7\nmax 3\noom 0\noom_kill 0\n"), "") << "what happened before";
+  EXPECT_EQ(heardAfter("low 5\nhigh 8\nmax 3\noom 0\noom_kill 0\n"), "w");
+  EXPECT_EQ(heardAfter("low 5\nhigh 8\nmax 3\noom 1\noom_kill 1\n"), "wc");
   warning->cancel();
-  root.write(events, "low 5\nhigh 9\nmax 9\noom 1\noom_kill 1\n");
-  settle();
-  EXPECT_EQ(heard, "wcc");
   warning->activate();
-  root.write(events, "low 5\nhigh 99\nmax 9\noom 1\noom_kill 1\n");
-  settle();
-  EXPECT_EQ(heard, "wcc") << "cancelled for good";
+  EXPECT_EQ(heardAfter("low 5\nhigh 9\nmax 9\noom 1\noom_kill 1\n"), "wcc") << "cancelled for good";
 }
 
 TEST_F(LinuxMemoryPressureTest, StartsNoHandlerAfterCancelling) {
   root.write("events", "high 0\n");
   LinuxMemoryPressure pressure(loop, {{}, root.path() / "events"});
-  auto source = listen(pressure, MemoryPressureKind::processWarning, 'w');
+  const auto source = listen(pressure, MemoryPressureKind::processWarning, 'w');
   std::promise<void> proceed;
   queue->dispatchAsync([&] { proceed.get_future().wait(); });
   root.write("events", "high 1\n");
-  loop.scheduleTimer(0, false, [&](Timer&) { loop.dispatchAsync([&] { loop.quit(); }); });
+  loop.scheduleTimer(0, false, [&](Timer&) { loop.quit(); });
   loop.run();
   source->cancel();  // while its handler waits in the queue
   proceed.set_value();

@@ -26,20 +26,18 @@ TEST(LinuxNetworkFailureDiagnosis, ReadsRadiosAndRoutes) {
     files.insert(kNoRoute.begin(), kNoRoute.end());
     return files;
   };
-  const Files kBlockedRadios{
-      {"sys/class/rfkill/rfkill0/type", "wlan\n"}, {"sys/class/rfkill/rfkill0/soft", "1\n"},
-      {"sys/class/rfkill/rfkill0/hard", "0\n"},    {"sys/class/rfkill/rfkill1/type", "bluetooth\n"},
-      {"sys/class/rfkill/rfkill1/soft", "0\n"},    {"sys/class/rfkill/rfkill1/hard", "1\n"}};
-  Files oneFreeRadio = kBlockedRadios;
-  oneFreeRadio["sys/class/rfkill/rfkill1/hard"] = "0\n";
-  const auto mobile = [](const std::string& state) {
+  const auto radios = [](const char* firstSoft, const char* secondType, const char* secondHard) {
+    const std::string first = "sys/class/rfkill/rfkill0/", second = "sys/class/rfkill/rfkill1/";
+    return Files{{first + "type", "wlan\n"},    {first + "soft", firstSoft}, {first + "hard", "0\n"},
+                 {second + "type", secondType}, {second + "soft", "0\n"},    {second + "hard", secondHard}};
+  };
+  const auto mobile = [](const char* state) {
     return Files{{"sys/class/net/eth0/operstate", "up\n"},
                  {"sys/class/net/wwan0/uevent", "DEVTYPE=wwan\nINTERFACE=wwan0\n"},
                  {"sys/class/net/wwan0/operstate", state}};
   };
-  Files blockedWithRoute = kBlockedRadios;
+  Files blockedWithRoute = radios("1\n", "bluetooth\n", "1\n");
   blockedWithRoute["proc/net/route"] = kDefault4;
-
   const struct {
     const char* name;
     Files files;
@@ -53,19 +51,14 @@ TEST(LinuxNetworkFailureDiagnosis, ReadsRadiosAndRoutes) {
       {"no route", kNoRoute, NetworkFailure::noInternet},
       {"an unreachable default", {{"proc/net/route", kRejected4}}, NetworkFailure::noInternet},
       {"a table cut off", {{"proc/net/route", "eth0\t00000000"}}, NetworkFailure::noInternet},
-      {"all radios blocked", noRouteAnd(kBlockedRadios), NetworkFailure::airplaneMode},
+      {"all radios blocked", noRouteAnd(radios("1\n", "bluetooth\n", "1\n")), NetworkFailure::airplaneMode},
       {"all radios blocked, cable in", blockedWithRoute, NetworkFailure::unknown},
-      {"one radio free", noRouteAnd(oneFreeRadio), NetworkFailure::noInternet},
+      {"one radio free", noRouteAnd(radios("1\n", "bluetooth\n", "0\n")), NetworkFailure::noInternet},
       {"mobile data down", noRouteAnd(mobile("down\n")), NetworkFailure::cellularDataDisabled},
       {"mobile data up", noRouteAnd(mobile("unknown\n")), NetworkFailure::noInternet},
       {"modem without an interface", noRouteAnd({{"sys/class/wwan/wwan0/uevent", ""}}),
        NetworkFailure::cellularDataDisabled},
-      {"mobile radio blocked",
-       noRouteAnd({{"sys/class/rfkill/rfkill0/type", "wlan\n"},
-                   {"sys/class/rfkill/rfkill0/soft", "0\n"},
-                   {"sys/class/rfkill/rfkill2/type", "wwan\n"},
-                   {"sys/class/rfkill/rfkill2/soft", "1\n"}}),
-       NetworkFailure::cellularDataDisabled},
+      {"mobile radio blocked", noRouteAnd(radios("0\n", "wwan\n", "1\n")), NetworkFailure::cellularDataDisabled},
   };
   for (const auto& test : kCases) {
     const TemporaryFolder root;
