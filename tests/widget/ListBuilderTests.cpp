@@ -159,6 +159,7 @@ TEST_F(ListBuilder, ChoosesTheCompactRowAndTheExpandedRows) {
       {"A: B:1 C:9", row(1, "B"), {row(1, "B"), clearRow(2)}},
       {"A:1 B:0", row(1, "A"), {row(1, "A"), clearRow(1)}},
       {"A:8", " | Description | A | line A", {}},
+      {"A/rail:1", row(1, "A"), {}},
       {"a/rail:1", "Incident 1 | Summary 1 | mode 3 | line a", {}},
       {"a:1", "Incident 1 | Summary 1 | no shield | line a", {}},
       {"A:1,2 B:", summary(2, "A"), {row(1, "A"), row(2, "A"), clearRow(1)}},
