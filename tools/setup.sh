@@ -13,13 +13,14 @@ packages=(
 )
 case $purpose in
   run) ;;
-  test | lint) packages+=(libgtest-dev libgmock-dev protobuf-compiler libprotobuf-dev python3 python3-kiwisolver zip) ;;
+  test | lint) packages+=(libgtest-dev libgmock-dev protobuf-compiler libprotobuf-dev python3 python3-kiwisolver zlib1g-dev) ;;
   *) echo "usage: tools/setup.sh run|test|lint" >&2; exit 2 ;;
 esac
 [ "$purpose" != lint ] || packages+=(clang-format clang-tidy git)
 
 missing=()
-installed=$(dpkg-query -W -f '${db:Status-Abbrev} ${Package}\n' "${packages[@]}" 2>/dev/null | sed -n 's/^ii  *//p')
+# Fails, and says so, for each package that it has never heard of: those are missing.
+installed=$(dpkg-query -W -f '${db:Status-Abbrev} ${Package}\n' "${packages[@]}" 2>/dev/null | sed -n 's/^ii  *//p' || true)
 for package in "${packages[@]}"; do
   grep -qx -- "$package" <<<"$installed" || missing+=("$package")
 done
