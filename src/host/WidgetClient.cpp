@@ -40,7 +40,8 @@ std::filesystem::path WidgetClient::widgetProgram() {
   if (const char* named = std::getenv("NIMBO_TRANSIT_WIDGET"); named && *named) return named;
   const auto folder = std::filesystem::read_symlink("/proc/self/exe").parent_path();
   // Installed programs stand side by side; built ones each in the folder of its target.
-  for (const auto& candidate : {folder / kProgramName, folder / ".." / "process" / kProgramName})
+  for (const auto& candidate : {folder / kProgramName, folder / ".." / "process" / kProgramName,
+                                folder / ".." / ".." / "process" / kProgramName})
     if (std::error_code error; std::filesystem::exists(candidate, error)) return candidate;
   return folder / kProgramName;
 }

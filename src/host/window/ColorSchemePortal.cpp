@@ -40,9 +40,10 @@ void ColorSchemePortal::settingChanged(const Glib::ustring&, const Glib::ustring
                                        const Glib::VariantContainerBase& parameters) {
   if (signal != "SettingChanged" || !parameters.is_of_type(Glib::VariantType("(ssv)"))) return;
   Glib::Variant<Glib::ustring> area, key;
-  parameters.get_child(area, 0);
-  parameters.get_child(key, 1);
-  if (area.get() == kNamespace && key.get() == kKey) take(parameters.get_child(2));
+  Glib::VariantContainerBase change(parameters);
+  change.get_child(area, 0);
+  change.get_child(key, 1);
+  if (area.get() == kNamespace && key.get() == kKey) take(change.get_child(2));
 }
 
 void ColorSchemePortal::take(const Glib::VariantBase& value) {

@@ -1,32 +1,23 @@
 #include "host/window/DateText.h"
 
-#include <unicode/datefmt.h>
-
 #include "desktop/DesktopPlatform.h"
 #include "platform/Localization.h"
 
 namespace nimbo {
 
-struct DateText::Format {
-  std::unique_ptr<icu::DateFormat> format;
-};
-
-DateText::DateText(const std::string& locale) : _format(std::make_unique<Format>()) {
+DateText::DateText(const std::string& locale) {
   const std::string name = locale.empty() ? DesktopPlatform::localeOfEnvironment() : locale;
-  _format->format.reset(icu::DateFormat::createDateTimeInstance(icu::DateFormat::kLongRelative,
-                                                                icu::DateFormat::kShort,
-                                                                icu::Locale::createCanonical(name.c_str())));
+  _format.reset(icu::DateFormat::createDateTimeInstance(icu::DateFormat::kLongRelative, icu::DateFormat::kShort,
+                                                        icu::Locale::createCanonical(name.c_str())));
   UErrorCode ignored = U_ZERO_ERROR;
-  if (_format->format) _format->format->setContext(UDISPCTX_CAPITALIZATION_FOR_MIDDLE_OF_SENTENCE, ignored);
+  if (_format) _format->setContext(UDISPCTX_CAPITALIZATION_FOR_MIDDLE_OF_SENTENCE, ignored);
 }
 
-DateText::~DateText() = default;
-
 std::string DateText::textOf(Date date) const {
-  if (!_format->format) return isoTextOfDate(date);
+  if (!_format) return isoTextOfDate(date);
   icu::UnicodeString text;
   std::string result;
-  return _format->format->format(static_cast<UDate>(date.time_since_epoch().count()) / 1000, text).toUTF8String(result);
+  return _format->format(static_cast<UDate>(date.time_since_epoch().count()) / 1000, text).toUTF8String(result);
 }
 
 std::string DateText::textOfPeriod(std::optional<Date> start, std::optional<Date> end, Date now) const {

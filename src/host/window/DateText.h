@@ -1,5 +1,8 @@
 #pragma once
 
+#include <unicode/datefmt.h>
+
+#include <memory>
 #include <optional>
 #include <string>
 
@@ -13,15 +16,13 @@ class DateText {
  public:
   /// A BCP 47 tag or POSIX name; empty: the environment's.
   explicit DateText(const std::string& locale);
-  ~DateText();
 
   std::string textOf(Date date) const;
   /// From when until when something lasts, as one phrase; empty when neither is known.
   std::string textOfPeriod(std::optional<Date> start, std::optional<Date> end, Date now) const;
 
  private:
-  struct Format;
-  std::unique_ptr<Format> _format;
+  std::unique_ptr<icu::DateFormat> _format;  // null where the locale has none
 };
 
 }  // namespace nimbo

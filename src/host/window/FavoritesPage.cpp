@@ -102,15 +102,14 @@ void FavoritesPage::showFound() {
   clear(_linesList);
   for (std::size_t i = 0; i < std::min(_found.lines.size(), kLineLimit); ++i) {
     const TransitLineRef& line = _found.lines[i];
-    _linesList.append(
-        *Gtk::make_managed<LineRow>(_context, line, isFavorite(*line), [this, line] { toggle(line); }));
+    _linesList.append(*Gtk::make_managed<LineRow>(_context, line, isFavorite(*line), [this, line] { toggle(line); }));
   }
   _linesList.set_visible(!_found.lines.empty());
   std::string notice;
   const auto addNotice = [&notice](const std::string& text) { notice += (notice.empty() ? "" : "\n") + text; };
   if (_found.lines.size() > kLineLimit)
-    addNotice(LocalizedFormat(LocalizedString("Window_Favorites_More"),
-                              {std::uint64_t{_found.lines.size() - kLineLimit}}));
+    addNotice(
+        LocalizedFormat(LocalizedString("Window_Favorites_More"), {std::uint64_t{_found.lines.size() - kLineLimit}}));
   if (_found.lines.empty() && _found.errors.empty()) addNotice(LocalizedString("Window_Favorites_NothingFound"));
   for (const ErrorRef& error : _found.errors) addNotice(error->reason());
   _notice.set_text(notice);

@@ -72,8 +72,8 @@ void FeedCheckView::show(const FeedCheckReport& report) {
   clear();
   set_visible();
   if (const auto& feed = report.staticFeed)
-    addText(CommaDelimitedList({countText("Window_Feed_Lines", feed->lines),
-                                countText("Window_Feed_Agencies", feed->agencies)}),
+    addText(CommaDelimitedList(
+                {countText("Window_Feed_Lines", feed->lines), countText("Window_Feed_Agencies", feed->agencies)}),
             "body");
   if (const auto& alerts = report.alerts) {
     addText(CommaDelimitedList({countText("Window_Feed_Incidents", alerts->incidents),

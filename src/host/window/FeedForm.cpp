@@ -1,6 +1,6 @@
 #include "host/window/FeedForm.h"
 
-#include <gtkmm/window.h>
+#include <gtkmm/dialog.h>
 
 #include "host/window/Accessible.h"
 #include "platform/Localization.h"
@@ -126,8 +126,10 @@ void FeedForm::check() {
     setBusy(false);
     if (!report) return;
     const bool isStale = report->alerts && report->alerts->staleness;
-    if (!report->staticError && !report->alertsError && !isStale) keep(entered, report);
-    else _addAnyway.show();
+    if (!report->staticError && !report->alertsError && !isStale)
+      keep(entered, report);
+    else
+      _addAnyway.show();
   });
 }
 

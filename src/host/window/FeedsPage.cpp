@@ -6,7 +6,9 @@
 namespace nimbo {
 
 FeedsPage::FeedsPage(const PageContext& context)
-    : Page(LocalizedString("Window_Feeds_Title")), _context(context), _form(context, [this](const FeedCheckReport* report) {
+    : Page(LocalizedString("Window_Feeds_Title")),
+      _context(context),
+      _form(context, [this](const FeedCheckReport* report) {
         showFeeds();
         auto* added = dynamic_cast<FeedRow*>(_list.get_last_child());
         if (added && report) added->show(*report);

@@ -98,7 +98,8 @@ void IncidentCard::addDates(const TransitIncidents& periods) {
 void IncidentCard::addLink(const std::string& url) {
   const std::string host = hostOfLink(url);
   if (host.empty()) return;
-  auto* link = Gtk::make_managed<Gtk::LinkButton>(url, LocalizedFormat(LocalizedString("Window_Incident_Link"), {host}));
+  auto* link =
+      Gtk::make_managed<Gtk::LinkButton>(url, LocalizedFormat(LocalizedString("Window_Incident_Link"), {host}));
   link->set_halign(Gtk::Align::START);
   append(*link);
 }

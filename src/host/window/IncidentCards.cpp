@@ -20,8 +20,10 @@ std::vector<TransitIncidents> groupedByNumber(const TransitIncidents& incidents)
     const auto group = std::find_if(groups.begin(), groups.end(), [&](const TransitIncidents& periods) {
       return periods.front()->muid() == incident->muid();
     });
-    if (group != groups.end()) group->push_back(incident);
-    else groups.push_back({incident});
+    if (group != groups.end())
+      group->push_back(incident);
+    else
+      groups.push_back({incident});
   }
   const Date now = Platform::current().clock().now();
   std::stable_partition(groups.begin(), groups.end(), [now](const TransitIncidents& periods) {

@@ -1,5 +1,6 @@
 #pragma once
 
+#include <gtkmm/box.h>
 #include <gtkmm/button.h>
 #include <gtkmm/listboxrow.h>
 

@@ -9,8 +9,8 @@ namespace nimbo {
 namespace {
 
 /// The languages that have string tables, each in its own words.
-constexpr std::pair<const char*, const char*> kLanguages[] = {
-    {"ar", "العربية"}, {"de", "Deutsch"}, {"en", "English"}, {"es", "Español"}, {"fr", "Français"}, {"ja", "日本語"}};
+constexpr std::pair<const char*, const char*> kLanguages[] = {{"ar", "العربية"}, {"de", "Deutsch"},  {"en", "English"},
+                                                              {"es", "Español"}, {"fr", "Français"}, {"ja", "日本語"}};
 
 }  // namespace
 

@@ -85,7 +85,8 @@ Outcome<OpenRequest> openRequestOfActivity(std::string_view activityType,
   if (payload == userInfo.end()) return badPayload("\"" + std::string(key) + "\"");
   const auto [content, error] = readHandoff(payload->second);
   if (error) return badPayload(error->reason());
-  if (const auto* activity = dynamic_cast<const NimboActivity*>(content.get()); isLine && activity && activity->hasLineItem())
+  if (const auto* activity = dynamic_cast<const NimboActivity*>(content.get());
+      isLine && activity && activity->hasLineItem())
     return OpenRequest(ShowLine{activity->lineItem()});
   if (const auto* incidents = dynamic_cast<const BoxedArray*>(content.get()); !isLine && incidents) {
     TransitIncidents list;

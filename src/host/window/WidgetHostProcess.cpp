@@ -62,7 +62,6 @@ void WidgetHostProcess::setPresentation(const WidgetPresentation& presentation) 
   if (old.scale != presentation.scale) ask("setScale", {{"scale", presentation.scale}});
   if (old.appearance != presentation.appearance) ask("setAppearance", {{"appearance", presentation.appearance}});
   if (old.textSize != presentation.textSize) ask("setTextSize", {{"category", presentation.textSize}});
-  askForContent();
 }
 
 void WidgetHostProcess::setExpanded(bool expanded) {

@@ -31,8 +31,8 @@ Gtk::Widget* makePlace(const char* icon, const std::string& name) {
   label->set_xalign(0);
   auto* arrow = Gtk::make_managed<Gtk::Image>();
   arrow->set_from_icon_name("go-next-symbolic");
-  for (Gtk::Widget* child : {static_cast<Gtk::Widget*>(image), static_cast<Gtk::Widget*>(label),
-                             static_cast<Gtk::Widget*>(arrow)})
+  for (Gtk::Widget* child :
+       {static_cast<Gtk::Widget*>(image), static_cast<Gtk::Widget*>(label), static_cast<Gtk::Widget*>(arrow)})
     box->append(*child);
   row->set_child(*box);
   setAccessibleLabel(*row, name);
@@ -50,8 +50,8 @@ WidgetPage::WidgetPage(const PageContext& context)
   buildPlaces();
   _process.setPresentation(presentation());
   _process.setExpanded(_wantsExpanded);
-  _connections.push_back(_context.preferences.signalLookChanged().connect(
-      [this] { _process.setPresentation(presentation()); }));
+  _connections.push_back(
+      _context.preferences.signalLookChanged().connect([this] { _process.setPresentation(presentation()); }));
   property_scale_factor().signal_changed().connect([this] { _process.setPresentation(presentation()); });
   watchVisibility();
 }
@@ -69,8 +69,8 @@ void WidgetPage::buildCard() {
   name->set_xalign(0);
   _expand.add_css_class("flat");
   _expand.signal_clicked().connect([this] { toggleExpanded(); });
-  for (Gtk::Widget* child : {static_cast<Gtk::Widget*>(name), static_cast<Gtk::Widget*>(&_updating),
-                             static_cast<Gtk::Widget*>(&_expand)})
+  for (Gtk::Widget* child :
+       {static_cast<Gtk::Widget*>(name), static_cast<Gtk::Widget*>(&_updating), static_cast<Gtk::Widget*>(&_expand)})
     header->append(*child);
 
   _view.signalSelected().connect([this](std::size_t row) { _process.selectRow(row); });
@@ -122,8 +122,10 @@ void WidgetPage::buildPlaces() {
   _places.append(*makePlace("starred-symbolic", LocalizedString("Window_Favorites_Title")));
   _places.append(*makePlace("network-transmit-receive-symbolic", LocalizedString("Window_Feeds_Title")));
   _places.signal_row_activated().connect([this](Gtk::ListBoxRow* row) {
-    if (row->get_index() == 0) _context.navigator.open(ShowFavorites());
-    else _context.navigator.open(ShowFeeds());
+    if (row->get_index() == 0)
+      _context.navigator.open(ShowFavorites());
+    else
+      _context.navigator.open(ShowFeeds());
   });
   content().append(_places);
 }

@@ -110,16 +110,17 @@ void WidgetView::size_allocate_vfunc(int, int, int) {
     // A widget must be measured before it is placed.
     _rows[i]->measure(Gtk::Orientation::HORIZONTAL, -1, minimum, natural, ignored, ignored);
     const auto at = [](double length) { return static_cast<int>(std::lround(length)); };
-    _rows[i]->size_allocate({at(frame.x), at(frame.y), std::max(at(frame.width), minimum), std::max(at(frame.height), 1)},
-                            -1);
+    _rows[i]->size_allocate(
+        {at(frame.x), at(frame.y), std::max(at(frame.width), minimum), std::max(at(frame.height), 1)}, -1);
   }
 }
 
 void WidgetView::snapshot_vfunc(const Glib::RefPtr<Gtk::Snapshot>& snapshot) {
   if (_picture) {
     const SharedPicture::Layout& layout = _content->picture->layout();
-    snapshot->append_texture(_picture, Gdk::Graphene::Rect(0, 0, static_cast<float>(layout.width / layout.scale),
-                                                           static_cast<float>(layout.height / layout.scale)));
+    const graphene_rect_t bounds = GRAPHENE_RECT_INIT(0, 0, static_cast<float>(layout.width / layout.scale),
+                                                      static_cast<float>(layout.height / layout.scale));
+    snapshot->append_texture(_picture, &bounds);
   }
   for (const auto& row : _rows) snapshot_child(*row, snapshot);
 }

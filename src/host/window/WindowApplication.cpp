@@ -65,7 +65,7 @@ void WindowApplication::on_activate() {
 void WindowApplication::on_open(const type_vec_files& files, const Glib::ustring&) {
   on_activate();
   for (const auto& file : files) {
-    const auto request = openRequestOfURL(file->get_uri().raw());
+    const auto request = openRequestOfURL(file->get_uri());
     if (!request) {
       _window->tell(request.error()->reason());
       continue;

@@ -16,7 +16,7 @@ constexpr const char* kStyle = R"css(
 .card-header { padding: 8px 8px 8px 14px; border-bottom: 1px solid alpha(@borders, 0.5); }
 .widget-row { margin: 0; padding: 0; min-width: 0; min-height: 0; border: none; border-radius: 0; background: none; box-shadow: none; }
 .widget-row:focus-visible { outline: 2px solid @theme_selected_bg_color; outline-offset: -4px; border-radius: 12px; }
-.title { font-size: 140%; font-weight: bold; }
+.line-title { font-size: 140%; font-weight: bold; }
 .heading { font-weight: bold; }
 .caption { font-size: 88%; opacity: 0.75; }
 .item { padding: 10px 12px; }

@@ -33,9 +33,10 @@ int main(int argc, char** argv) {
   std::signal(SIGPIPE, SIG_IGN);
   drawWithoutDriver();
   if (!gtk_init_check()) {
-    std::fprintf(stderr,
-                 "nimbo-transit-desktop: there is no display to open a window on. Set DISPLAY or WAYLAND_DISPLAY, or use "
-                 "nimbo-transit in the terminal.\n");
+    std::fprintf(
+        stderr,
+        "nimbo-transit-desktop: there is no display to open a window on. Set DISPLAY or WAYLAND_DISPLAY, or use "
+        "nimbo-transit in the terminal.\n");
     return nimbo::kExitFailure;
   }
   std::vector<std::string> folders;
