@@ -1,8 +1,7 @@
 #include "desktop/archive/ArchiveParser.h"
 
-#include <glib.h>
-
 #include "desktop/archive/ArchiveFormat.h"
+#include "desktop/archive/ArchiveText.h"
 #include "platform/archive/KeyedArchive.h"
 
 namespace nimbo {
@@ -50,9 +49,7 @@ class ArchiveBuilder final : public json::json_sax_t {
     return false;
   }
 
-  bool isText(const std::string& text) {
-    return g_utf8_validate_len(text.data(), text.size(), nullptr) || fail("a text is not UTF-8");
-  }
+  bool isText(const std::string& text) { return isUTF8(text) || fail("a text is not UTF-8"); }
 
   /// Where the next value goes: the outermost value, the map entry of the last key, or the end of an array.
   json& nextSlot() {

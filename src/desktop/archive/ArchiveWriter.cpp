@@ -1,11 +1,10 @@
 // Objects to the values of an archive, and these to bytes.
 
-#include <glib.h>
-
 #include <nlohmann/json.hpp>
 #include <stdexcept>
 
 #include "desktop/archive/ArchiveFormat.h"
+#include "desktop/archive/ArchiveText.h"
 #include "desktop/archive/CBORKeyedArchive.h"
 
 namespace nimbo {
@@ -78,9 +77,7 @@ json ArchiveWriter::fail(const std::string& reason) {
   return nullptr;
 }
 
-json ArchiveWriter::textOf(const std::string& text) {
-  return g_utf8_validate_len(text.data(), text.size(), nullptr) ? json(text) : fail("a text is not UTF-8");
-}
+json ArchiveWriter::textOf(const std::string& text) { return isUTF8(text) ? json(text) : fail("a text is not UTF-8"); }
 
 json ArchiveWriter::dateOf(Date date) {
   return {{kArchiveClassKey, kDateClass.name}, {kDateMicrosecondsKey, date.time_since_epoch().count()}};

@@ -1,0 +1,315 @@
+// Keyed archives and saved states, their bytes read and written by a plain CBOR library too.
+
+#include <gtest/gtest.h>
+
+#include <cmath>
+#include <limits>
+#include <nlohmann/json.hpp>
+
+#include "desktop/archive/Bzip2.h"
+#include "desktop/archive/CBORKeyedArchive.h"
+#include "handoff/NBUserActivityData.h"
+#include "platform/wire/StoredTransitIncident.h"
+#include "platform/wire/StoredTransitLineItem.h"
+#include "support/TestPlatform.h"
+#include "support/TransitFixtures.h"
+#include "widget/NBTransitIncidentViewControllerState.h"
+
+namespace nimbo {
+namespace {
+
+using nlohmann::json;
+using State = NBTransitIncidentViewControllerState;
+
+const AllowedClasses kPlainClasses{&kStringClass, &kNumberClass,     &kDataClass, &kDateClass,
+                                   &kArrayClass,  &kDictionaryClass, &kErrorClass};
+
+ObjectRef dictionary(BoxedDictionary::Entries entries) {
+  return std::make_shared<const BoxedDictionary>(std::move(entries));
+}
+
+ObjectRef array(std::vector<ObjectRef> elements) { return std::make_shared<const BoxedArray>(std::move(elements)); }
+
+class Archive : public testing::Test {
+ protected:
+  Bytes archived(const ObjectRef& root) {
+    const auto result = archive.archivedDataWithRootObject(root, true);
+    EXPECT_FALSE(result.error) << result.error->reason();
+    return result.bytes.value_or(Bytes());
+  }
+
+  KeyedUnarchiver::Decoded decoded(const Bytes& bytes, const AllowedClasses& classes) {
+    const auto unarchiver = archive.unarchiverForReadingFromData(bytes);
+    if (!unarchiver) return {};
+    unarchiver->setDecodingFailurePolicy(DecodingFailurePolicy::setErrorAndReturn);
+    return unarchiver->decodeTopLevelObjectOfClasses_forKey(classes, kKeyedArchiveRootObjectKey);
+  }
+
+  CBORKeyedArchive archive;
+  Bzip2Compressor compressor;
+  TestPlatform platform{&archive, &compressor};
+};
+
+Bytes archiveOf(const json& root) { return json::to_cbor({{"$archive", 1}, {"root", root}}); }
+
+TEST_F(Archive, PlainValuesComeBackEqualAndGiveTheSameBytesAgain) {
+  const ObjectRef inner = Error::errorWithDomain_code_reason("Inner", 3, "why");
+  const ObjectRef root =
+      dictionary({{"", box("")},
+                  {"$class", box("a key like the archive's own")},
+                  {"text", box(std::string("\0 \xf0\x9f\x9a\x87", 6))},
+                  {"numbers", array({box(true), box(INT64_MIN), box(UINT64_MAX), box(-0.1), box(5e-324), box(1.5)})},
+                  {"bytes", box(Bytes{0, 255, 10})},
+                  {"dates", array({box(Date::min()), box(Date::max()), box(Date{})})},
+                  {"empty", array({array({}), dictionary({})})},
+                  {"error", Error::errorWithDomain_code_userInfo("Outer", INT64_MIN, {{"underlying", inner}})}});
+  const Bytes bytes = archived(root);
+  const auto [object, error] = decoded(bytes, kPlainClasses);
+  ASSERT_FALSE(error) << error->reason();
+  EXPECT_TRUE(root->isEqual(object.get())) << object->description();
+  EXPECT_EQ(archived(object), bytes);
+
+  const auto infinite = decoded(archived(array({box(std::nan("")), box(HUGE_VAL)})), kPlainClasses).object;
+  EXPECT_EQ(infinite->description(), "(nan, inf)");
+}
+
+TEST_F(Archive, AnyReaderOfCBORFindsVersionClassNamesAndKeys) {
+  const auto state = State::initWithLineItemsResult_expanded(
+      Result::resultWithValue(BoxedArray::of<TransitLineItem>({lineItem(1, "A")})), true);
+  const json content = json::from_cbor(archived(state));
+  EXPECT_EQ(content["$archive"], 1);
+  const json& root = content["root"];
+  EXPECT_EQ(root["$class"], "NBTransitIncidentViewControllerState");
+  EXPECT_EQ(root["expanded"], true);
+  EXPECT_EQ(root["lineItemResultSuccess"][0]["$class"], "StoredTransitLineItem");
+  EXPECT_EQ(Bytes(root["lineItemResultSuccess"][0]["record"].get_binary()),
+            StoredTransitLineItem::initWithLineItem(lineItem(1, "A"))->data());
+}
+
+TEST_F(Archive, WhatMayNotStandInAnArchiveFailsWithItsPlace) {
+  ObjectRef deep = box("bottom");
+  for (int i = 0; i < 1000; ++i) deep = array({deep});
+  const auto activity = NBUserActivityData::initWithActivityType_userInfo("type", nullptr);
+  const struct {
+    ObjectRef root;
+    const char* reason;
+  } cases[] = {
+      {array({box("a"), activity}), "root[1]: an object of the class NBUserActivityData cannot be archived"},
+      {Error::errorWithDomain_code_userInfo("D", 0, {{"x", NamedImage::imageNamed("i")}}),
+       "root.userInfo.x: an object of the class NamedImage cannot be archived"},
+      {State::initWithLineItemsResult_expanded(
+           Result::resultWithError(Error::errorWithDomain_code_userInfo("D", 0, {{"x", activity}})), true),
+       "root.lineItemResultError.userInfo.x: an object of the class NBUserActivityData cannot be archived"},
+      {box("\xff"), "root: a text is not UTF-8"},
+      {dictionary({{"\xff", box(1)}}), "a text is not UTF-8"},
+      {deep, "nested too deep"},
+      {box(Bytes(std::size_t{17} << 20)), "more than 16777216"},
+      {nullptr, "root: an object of the class (null) cannot be archived"},
+  };
+  for (const auto& test : cases) {
+    const auto [bytes, error] = archive.archivedDataWithRootObject(test.root, true);
+    EXPECT_FALSE(bytes);
+    ASSERT_TRUE(error) << test.reason;
+    EXPECT_NE(error->reason().find(test.reason), std::string::npos) << error->reason();
+  }
+}
+
+TEST_F(Archive, StatesComeBackWithTheirResult) {
+  const ErrorRef error = Error::errorWithDomain_code_userInfo("Feed", 7, {{"Reason", box("offline")}});
+  for (const bool expanded : {false, true})
+    for (const ResultRef& result : {Result::resultWithValue(array({})), Result::resultWithError(error)}) {
+      ErrorRef failure;
+      const auto state =
+          State::unarchiveFromData_error(archived(State::initWithLineItemsResult_expanded(result, expanded)), &failure);
+      ASSERT_TRUE(state);
+      EXPECT_FALSE(failure);
+      EXPECT_TRUE(state->lineItemsResult()->isEqual(result.get()));
+      EXPECT_EQ(state->expanded(), expanded);
+    }
+  json content = json::from_cbor(archived(State::initWithLineItemsResult_expanded(nullptr, false)));
+  EXPECT_EQ(content["root"], json({{"$class", "NBTransitIncidentViewControllerState"}, {"expanded", false}}));
+}
+
+/// Everything that rows, the updater and the map application ask a line item, as a text.
+std::string answersOf(const TransitLineItem& item) {
+  const auto text = [](const std::optional<std::string>& value) { return value ? "'" + *value + "' " : "- "; };
+  const auto date = [](std::optional<Date> value) { return value ? isoTextOfDate(*value) + " " : "- "; };
+  const auto artwork = [&](const TransitArtworkRef& value) {
+    if (!value) return std::string("- ");
+    std::string all = text(value->accessibilityText()) + std::to_string(value->artworkSourceType());
+    if (const auto& shield = value->shieldDataSource())
+      all += text(shield->shieldText) + text(shield->shieldColorString) + text(shield->shieldTextColorString);
+    if (const auto& icon = value->iconDataSource()) all += std::to_string(icon->defaultTransitType);
+    return all;
+  };
+  std::string all = std::to_string(item.muid()) + text(item.name()) + text(item.lineColorString());
+  if (const auto& locator = item.identifier()->locator())
+    all += locator->feed + locator->agencyID + locator->routeID + locator->shortName +
+           std::to_string(static_cast<int>(locator->mode));
+  if (item.system())
+    all += std::to_string(item.system()->muid()) + text(item.system()->name()) + artwork(item.system()->artwork());
+  all += artwork(item.artwork()) + artwork(item.modeArtwork()) + artwork(item.alternateArtwork());
+  for (const bool flag :
+       {item.isBus(), item.hasLineColorString(), item.showVehicleNumber(), item.hasIncidentComponent(),
+        item.departuresAreVehicleSpecific(), item.isIncidentsTTLExpired(), item.hasEncyclopedicInfo()})
+    all += flag ? "y" : "n";
+  for (const TransitIncidentRef& i : item.incidents()) {
+    all += "\n" + std::to_string(i->muid()) + text(i->title()) + text(i->summary()) + text(i->fullDescription()) +
+           text(i->messageForRoutePlanning()) + text(i->messageForRouteStepping()) + text(i->messageForNonRoutable()) +
+           date(i->startDate()) + date(i->endDate()) + date(i->creationDate()) + date(i->lastUpdated()) +
+           std::to_string(i->iconType()) + (i->isBlockingIncident() ? "blocking" : "") + text(i->linkURL());
+    for (const auto& entity : i->affectedEntities())
+      all += std::to_string(entity->muid()) + (entity->hasNextStopIDs() ? "stops" : "");
+  }
+  return all;
+}
+
+TransitLineItemRef wholeLineItem() {
+  BasicTransitIncident::Fields incidentFields;
+  incidentFields.muid = UINT64_MAX;
+  incidentFields.title = "Title";
+  incidentFields.summary = "";
+  incidentFields.fullDescription = "Full\nof signs: \xe2\x80\xae \xff";  // feeds are not always UTF-8
+  incidentFields.messageForRoutePlanning = "planning";
+  incidentFields.messageForRouteStepping = "stepping";
+  incidentFields.messageForNonRoutable = "not routable";
+  incidentFields.startDate = *dateFromISOText("0001-01-01T00:00:00Z");
+  incidentFields.endDate = *dateFromISOText("9999-12-31T23:59:59.999999Z");
+  incidentFields.creationDate = Date{};
+  incidentFields.iconType = -5;
+  incidentFields.isBlockingIncident = true;
+  incidentFields.affectedEntities = {std::make_shared<BasicAffectedEntity>(9)};
+  incidentFields.linkURL = "https://example.org/1";
+  const auto whole = std::make_shared<const BasicTransitIncident>(incidentFields);
+  BasicTransitLineItem::Fields fields;
+  fields.identifier = std::make_shared<const MapItemIdentifier>(
+      42, TransitLineLocator{"feed", "", "route", "S", TransitMode::monorail});
+  fields.name = "S";
+  fields.system = std::make_shared<const TransitSystem>(3, "Network", modeArtwork(TransitMode::rail));
+  fields.artwork = shieldArtwork("Line S");
+  fields.modeArtwork = modeArtwork(TransitMode::monorail);
+  fields.alternateArtwork = shieldArtwork("S");
+  fields.lineColorString = "#123456";
+  fields.isBus = true;
+  fields.incidents = {whole, incident(1), whole};
+  return std::make_shared<const BasicTransitLineItem>(std::move(fields));
+}
+
+TEST_F(Archive, RestoredLineItemsAnswerLikeTheFetchedOnes) {
+  const std::vector<TransitLineItemRef> items{wholeLineItem(), lineItem(2, "B")};
+  const auto state = State::unarchiveFromData_error(
+      archived(State::initWithLineItemsResult_expanded(Result::resultWithValue(BoxedArray::of(items)), true)), nullptr);
+  ASSERT_TRUE(state);
+  std::vector<TransitLineItemRef> restored;
+  state->lineItemsResult()->withValue_orError(
+      [&](const ObjectRef& value) {
+        restored = dynamic_cast<const BoxedArray&>(*value).elementsOfClass<TransitLineItem>();
+      },
+      [](const ErrorRef&) {});
+  ASSERT_EQ(restored.size(), items.size());
+  for (std::size_t index = 0; index < items.size(); ++index) {
+    EXPECT_EQ(answersOf(*restored[index]), answersOf(*items[index]));
+    EXPECT_TRUE(restored[index]->artwork()->isEqual(items[index]->artwork().get()));
+    // A snapshot of the snapshot is the same again.
+    EXPECT_TRUE(StoredTransitLineItem::initWithLineItem(restored[index])->isEqual(restored[index].get()));
+  }
+}
+
+TEST_F(Archive, BrokenStatesEndInNothingAndOnlyUndecodableOnesInAnError) {
+  const json line{{"$class", "StoredTransitLineItem"}, {"record", json::binary({})}};
+  const auto state = [](json fields) {
+    fields.emplace("$class", "NBTransitIncidentViewControllerState");
+    return archiveOf(fields);
+  };
+  const auto raw = [](std::string_view hex) {
+    Bytes bytes;
+    for (std::size_t i = 0; i + 1 < hex.size(); i += 2)
+      bytes.push_back(static_cast<std::uint8_t>(std::stoi(std::string(hex.substr(i, 2)), nullptr, 16)));
+    return bytes;
+  };
+  const std::string marker = "a2682461726368697665";  // a map of two, "$archive"
+  json deep = 1;
+  for (int i = 0; i < 1000; ++i) deep = json::array({deep});
+  Bytes withRest = state({{"lineItemResultSuccess", json::array()}});
+  withRest.push_back(0);
+  const struct {
+    Bytes bytes;
+    std::string error;  ///< part of the decoding error; empty: nothing, and no error
+  } cases[] = {
+      // Bytes that are no archive.
+      {{}, ""},
+      {raw("00"), ""},
+      {json::to_cbor({{"root", 1}}), ""},
+      {json::to_cbor({{"$archive", 2}, {"root", 1}}), ""},
+      {json::to_cbor({{"$archive", "1"}, {"root", 1}}), ""},
+      {archiveOf(deep), ""},
+      {withRest, ""},
+      {Bytes(std::size_t{100} << 20), ""},
+      {raw(marker + "0164726f6f749bffffffffffffffff"), ""},               // an array of 2^64 - 1
+      {raw(marker + "0164726f6f745bffffffffffffffff00"), ""},             // as many bytes
+      {raw(marker + "0164726f6f747bffffffffffffffff61"), ""},             // as long a text
+      {raw("a3682461726368697665016161016161" + std::string("02")), ""},  // a key twice
+      {raw(marker + "0164726f6f7461ff"), ""},                             // no UTF-8
+      {raw(marker + "0164726f6f74c100"), ""},                             // a tag
+      {archiveOf(std::vector<int>(300000)), ""},                          // too many values
+      // Archives without a state, or with one that holds no result.
+      {json::to_cbor({{"$archive", 1}}), ""},
+      {state({{"expanded", true}}), ""},
+      {state({{"lineItemResultSuccess", line}}), ""},
+      // Archives that hold what may not stand there.
+      {archiveOf(1), "root: a number is not allowed here"},
+      {archiveOf(nullptr), "root: null stands where an object is needed"},
+      {archiveOf({{"expanded", true}}), "root: the object has no class name"},
+      {archiveOf({{"$class", "Foreign"}}), "root: the class \"Foreign\" is not allowed here"},
+      {state({{"lineItemResultSuccess", {line, {{"$class", "Foreign"}}}}}),
+       "root.lineItemResultSuccess[1]: the class \"Foreign\" is not allowed here"},
+      {state({{"lineItemResultSuccess", {{line, {1}}}}}), "root.lineItemResultSuccess[0][1][0]: a number"},
+      {state({{"lineItemResultSuccess", "text"}}), "root.lineItemResultSuccess: a text is not allowed here"},
+      {state({{"lineItemResultSuccess", {{{"$class", "StoredTransitLineItem"}}}}}), "[0]: the bytes of the record"},
+      {state({{"lineItemResultSuccess", {{{"$class", "StoredTransitLineItem"}, {"record", 1}}}}}),
+       "root.lineItemResultSuccess[0].record: not a byte string but of the kind \"number\""},
+      {state({{"lineItemResultSuccess", {{{"$class", "StoredTransitLineItem"}, {"record", json::binary({0x12, 9})}}}}}),
+       "root.lineItemResultSuccess[0]: the record is broken: name: the length exceeds"},
+      {state({{"lineItemResultSuccess", json::array()}, {"expanded", 1}}), "root.expanded: not a boolean"},
+      {state({{"lineItemResultError", {{"$class", "Error"}, {"code", 1}, {"userInfo", json::object()}}}}), "no domain"},
+      {state({{"lineItemResultError",
+               {{"$class", "Error"}, {"domain", "D"}, {"code", 1.5}, {"userInfo", json::object()}}}}),
+       "root.lineItemResultError.code: not a signed 64-bit integer"},
+      {state({{"lineItemResultError", {{"$class", "Error"}, {"domain", "D"}, {"code", 1}}}}),
+       "userInfo: a map is missing"},
+      {state(
+           {{"lineItemResultError", {{"$class", "Error"}, {"domain", "D"}, {"code", 1}, {"userInfo", {{"x", line}}}}}}),
+       "root.lineItemResultError.userInfo.x: the class"},
+  };
+  for (const auto& test : cases) {
+    ErrorRef error;
+    EXPECT_FALSE(State::unarchiveFromData_error(test.bytes, &error));
+    const std::string reason = error ? error->reason() : "";
+    EXPECT_TRUE(test.error.empty() ? !error : reason.find(test.error) != std::string::npos)
+        << "expected: " << test.error << "\ngot: " << reason;
+    // What is no archive at all says why to those who ask.
+    const auto opened = CBORKeyedArchive::openData(test.bytes);
+    EXPECT_NE(opened.unarchiver == nullptr, opened.error == nullptr);
+  }
+  const Bytes whole = archived(State::initWithLineItemsResult_expanded(
+      Result::resultWithValue(BoxedArray::of<TransitLineItem>({wholeLineItem()})), true));
+  for (std::size_t length = 0; length < whole.size(); ++length)
+    EXPECT_FALSE(archive.unarchiverForReadingFromData(std::span(whole).first(length))) << length;
+}
+
+TEST_F(Archive, TheEarlierClassNameIsReadAsAState) {
+  ErrorRef error;
+  const auto state = State::unarchiveFromData_error(
+      archiveOf({{"$class", "NBTransitListItemData"}, {"lineItemResultSuccess", json::array()}, {"expanded", true}}),
+      &error);
+  ASSERT_TRUE(state) << error->reason();
+  EXPECT_TRUE(state->expanded());
+}
+
+TEST_F(Archive, AFailureIsRaisedUntilThePolicyIsSet) {
+  const auto unarchiver = archive.unarchiverForReadingFromData(archiveOf(1));
+  EXPECT_THROW(unarchiver->decodeTopLevelObjectOfClasses_forKey({&kStringClass}, "root"), std::runtime_error);
+}
+
+}  // namespace
+}  // namespace nimbo
