@@ -18,7 +18,7 @@ std::string textIn(std::string_view alert, AlertField field, const LanguagePrefe
 }
 
 /// The text on one line.
-std::string onOneLine(std::string text) {
+std::string onOneLine(std::string_view text) {
   std::string result;
   for (const char c : text)
     if (c != '\n')
@@ -67,10 +67,11 @@ std::string_view leadingSentences(std::string_view paragraph) {
   return paragraph.substr(0, end > 0 ? end : paragraph.size());
 }
 
-/// A line that only announces the next one ("What's happening?", "Affected stops:").
+/// A line that only announces the next one: "What's happening?", "Affected stops:", "Reason".
 bool isHeading(std::string_view line) {
-  constexpr std::size_t kLongestHeading = 40;
-  return line.size() <= kLongestHeading && (line.ends_with(':') || line.ends_with('?'));
+  constexpr std::size_t kLongestHeading = 40, kLongestWord = 12;
+  return line.size() <= kLongestHeading &&
+         (line.ends_with(':') || line.ends_with('?') || (line.size() <= kLongestWord && !line.ends_with('.')));
 }
 
 bool isWebAddress(std::string_view text) {
@@ -85,7 +86,8 @@ std::string summaryOfText(std::string_view text) {
   std::string paragraph(firstLine(text));
   for (std::string_view rest = text; isHeading(paragraph) && rest.find('\n') != std::string_view::npos;) {
     rest.remove_prefix(rest.find('\n') + 1);
-    if (!firstLine(rest).empty()) paragraph.append(" ").append(firstLine(rest));
+    if (firstLine(rest).empty()) continue;
+    paragraph.append(paragraph.ends_with(':') || paragraph.ends_with('?') ? " " : ": ").append(firstLine(rest));
   }
   return std::string(firstCharacters(paragraph, kLongestParagraph) == paragraph ? paragraph
                                                                                 : leadingSentences(paragraph));

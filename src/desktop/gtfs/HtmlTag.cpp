@@ -92,7 +92,10 @@ std::optional<HtmlTag> HtmlTagFinder::tagAt(std::size_t position) const {
     return HtmlTag{element->effect, text.size()};
   }
   std::size_t length = lengthOfTag(text);
-  if (!isClosing && (name == "script" || name == "style")) length += lengthThrough(text.substr(length), "</" + name);
+  if (!isClosing && (name == "script" || name == "style")) {
+    length += lengthThrough(text.substr(length), "</" + name);
+    length += lengthThrough(text.substr(length), ">");
+  }
   return HtmlTag{element->effect, length};
 }
 

@@ -1,0 +1,86 @@
+#include <gtest/gtest.h>
+
+#include "desktop/gtfs/AlertTexts.h"
+#include "desktop/gtfs/PlainText.h"
+#include "desktop/gtfs/Translation.h"
+
+namespace nimbo {
+namespace {
+
+TEST(PlainText, IsWhatARiderReads) {
+  const struct {
+    const char* what;
+    std::string raw, plain;
+  } cases[] = {
+      {"plain lines", "  Bus 5\r\n\r\n\r\n detour \t here ", "Bus 5\n\ndetour here"},
+      {"paragraphs and breaks, whose line ends in the source are spaces",
+       "<p>One<br />\ntwo</p>\n<ul><li>three\nfour</li></ul>", "One\ntwo\nthree four"},
+      {"inline tags", "No <b class=\"x>y\">service</b> on <a href='/l'>Line 1</a>", "No service on Line 1"},
+      {"no-break space, folded", "A&nbsp;&#160;B", "A B"},
+      {"entities, decoded once", "Fish &amp; Chips &lt;b&gt; &amp;lt; &#8217;&#x2019; &eacute; &#150;",
+       "Fish & Chips <b> &lt; ’’ é –"},
+      {"what is no entity", "AT&T &unknown; &#xZZ; & &;", "AT&T &unknown; &#xZZ; & &;"},
+      {"what is no tag", "<5 min, the <F> train, a < b, <a or b", "<5 min, the <F> train, a < b, <a or b"},
+      {"a tag cut off", "Trains stop. <a href=\"https://exa", "Trains stop."},
+      {"a quotation mark that never closes", "<span style=\"x>Shuttle</span> bus", "Shuttle bus"},
+      {"script, style, comment", "<style>p{}</style>A<!-- b --><script>if (a<b) c()</script>D", "AD"},
+      {"icon words", "[A] trains <strong>[shuttle bus icon]</strong>", "[A] trains [shuttle bus icon]"},
+      {"invisible characters", "[R]\u200C and \u200Bm\u00ADore\uFEFF", "[R] and more"},
+      {"joiners that matter", "می\u200Cشود \U0001F468\u200D\U0001F469", "می\u200Cشود \U0001F468\u200D\U0001F469"},
+      {"stray direction marks", "\u200ELine\u202E 5\u2069", "Line 5"},
+      {"direction marks of a right-to-left text", "خط A\u200F.", "خط A\u200F."},
+      {"controls", std::string("a\0b\x07\x7F", 5) + "c", "abc"},
+      {"bytes that are no UTF-8",
+       "Stra\xDF"
+       "e \x96 5\x80",
+       "Straße – 5€"},
+      {"nothing", "<p> &nbsp;</p>\u200F", ""},
+  };
+  for (const auto& [what, raw, plain] : cases) EXPECT_EQ(plainText(raw), plain) << what;
+}
+
+TEST(PlainText, TakesLinearTimeForHostileMarkup) {
+  for (const char* unit : {"<a ", "<a =\"", "<!--", "&#", "<style>", "<p", "\u200D"}) {
+    std::string text;
+    while (text.size() < 1'000'000) text += unit;
+    plainText(text);  // minutes, were it quadratic
+  }
+}
+
+TEST(Translation, ComesInTheBestLanguageThereIs) {
+  const struct {
+    const char* what;
+    std::vector<Translation> translations;
+    const char* user;
+    const char* chosen;
+  } cases[] = {
+      {"exact tag, whatever the case and separator", {{"de", "de"}, {"at", "DE_at"}}, "de-AT", "at"},
+      {"same language", {{"en", "en"}, {"br", "pt-BR"}}, "pt", "br"},
+      {"untagged before the feed's", {{"bg", "bg"}, {"none", ""}}, "ja", "none"},
+      {"the feed's before English", {{"en", "en"}, {"bg", "bg"}}, "ja", "bg"},
+      {"English before any", {{"fr", "fr"}, {"en", "en-GB"}}, "ja", "en"},
+      {"any", {{" \n", "ja"}, {"fr", "fr"}, {"it", "it"}}, "ja", "fr"},
+      {"markup only without anything else", {{"<b>", "en-html"}, {"en", "en"}}, "en", "en"},
+      {"markup of another language after plain text", {{"<b>", "de-html"}, {"en", "en"}}, "de", "en"},
+      {"markup alone", {{"<i>", "fr-html"}, {"<b>", "en-html"}}, "en", "<b>"},
+      {"nothing", {{"", "en"}, {" ", ""}}, "en", ""},
+  };
+  for (const auto& [what, translations, user, chosen] : cases)
+    EXPECT_EQ(chooseTranslation(translations, {user, "bg"}), chosen) << what;
+}
+
+TEST(SummaryOfText, EndsWithASentenceOrParagraph) {
+  const std::string sentence = std::string(120, 'x') + ". ";
+  const std::pair<std::string, std::string> cases[] = {
+      {"Buses turn at A.\nStops B and C are closed.", "Buses turn at A."},
+      {"What's happening?\nTrack works", "What's happening? Track works"},
+      {"Affected stops:\n\nA\nB", "Affected stops: A"},
+      {"Reason\n\nStrike of the drivers.", "Reason: Strike of the drivers."},
+      {sentence + "It is v. 2.5 now. " + sentence, sentence + "It is v. 2.5 now."},
+      {std::string(300, 'y') + " end", std::string(300, 'y') + " end"},
+  };
+  for (const auto& [text, summary] : cases) EXPECT_EQ(summaryOfText(text), summary);
+}
+
+}  // namespace
+}  // namespace nimbo
