@@ -16,14 +16,17 @@ std::vector<std::string> arguments(const CommandContext& context, const WidgetPr
 
 }  // namespace
 
+json displayModesOf(const WidgetPresentation& presentation) {
+  return {{"compact", {presentation.width, presentation.compactHeight}},
+          {"expanded", {presentation.width, presentation.expandedHeight}}};
+}
+
 json initializationOf(const WidgetPresentation& presentation) {
   const std::string application(kHostApplicationIdentifier);
   json params = {{"textSize", presentation.textSize},
                  {"scale", presentation.scale},
                  {"appearance", presentation.appearance},
-                 {"displayModes",
-                  {{"compact", {presentation.width, presentation.compactHeight}},
-                   {"expanded", {presentation.width, presentation.expandedHeight}}}},
+                 {"displayModes", displayModesOf(presentation)},
                  {"activeDisplayMode", "compact"},
                  {"bundle",
                   {{"kind", "extension"},

@@ -26,6 +26,9 @@ struct WidgetPresentation {
   bool operator==(const WidgetPresentation&) const = default;
 };
 
+/// `displayModes` of docs/protocol.md.
+nlohmann::json displayModesOf(const WidgetPresentation& presentation);
+
 /// The parameters of `initialize` that present the widget so, in the compact mode.
 nlohmann::json initializationOf(const WidgetPresentation& presentation);
 

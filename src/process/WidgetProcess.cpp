@@ -1,6 +1,7 @@
 #include "process/WidgetProcess.h"
 
 #include <algorithm>
+#include <map>
 #include <utility>
 
 #include "desktop/drawing/Rendering.h"
@@ -34,6 +35,16 @@ BundleRecordRef bundleRecord(const Parameters& params) {
     return std::make_shared<const ExtensionRecord>(
         identifier, params.has("containing") ? bundleRecord(params.object("containing")) : nullptr);
   return std::make_shared<const BundleRecord>(identifier);
+}
+
+using MaximumSizes = std::map<WidgetDisplayMode, Size>;
+
+/// The most room of both modes; absent when the host says nothing of it.
+std::optional<MaximumSizes> maximumSizes(const Parameters& params) {
+  if (!params.has("displayModes")) return std::nullopt;
+  const Parameters modes = params.object("displayModes");
+  return MaximumSizes{{WidgetDisplayMode::Compact, modes.size("compact")},
+                      {WidgetDisplayMode::Expanded, modes.size("expanded")}};
 }
 
 }  // namespace
@@ -109,11 +120,7 @@ json WidgetProcess::initialize(const Parameters& params) {
   const auto appearance = params.has("appearance") ? params.appearance("appearance") : Appearance::light;
   const auto mode =
       params.has("activeDisplayMode") ? params.displayMode("activeDisplayMode") : WidgetDisplayMode::Compact;
-  std::optional<std::pair<Size, Size>> sizes;
-  if (params.has("displayModes")) {
-    const Parameters modes = params.object("displayModes");
-    sizes = {modes.size("compact"), modes.size("expanded")};
-  }
+  const auto sizes = maximumSizes(params);
   const BundleRecordRef record = params.has("bundle") ? bundleRecord(params.object("bundle")) : nullptr;
 
   auto logSink = std::make_unique<HostLogSink>(
@@ -133,10 +140,8 @@ json WidgetProcess::initialize(const Parameters& params) {
   environment.setAppearance(appearance);
   _host.setActiveDisplayMode(mode);
   _host.setBundleRecord(record);
-  if (sizes) {
-    _host.setMaximumSize(WidgetDisplayMode::Compact, sizes->first);
-    _host.setMaximumSize(WidgetDisplayMode::Expanded, sizes->second);
-  }
+  if (sizes)
+    for (const auto& [which, size] : *sizes) _host.setMaximumSize(which, size);
   _controller = NBTransitIncidentsViewController::initWithNibName_bundle("", "", sizes ? &_host : nullptr);
   return {{"name", "nimbo-transit-widget"}, {"version", NIMBO_VERSION}, {"protocol", kProtocolVersion}};
 }
@@ -211,6 +216,8 @@ json WidgetProcess::setActiveDisplayMode(const Parameters& params) {
 
 json WidgetProcess::transitionToSize(const Parameters& params) {
   const Size size = params.size("size");
+  if (const auto sizes = maximumSizes(params))
+    for (const auto& [mode, maximum] : *sizes) _host.setMaximumSize(mode, maximum);
   _controller->viewWillTransitionToSize_withTransitionCoordinator(size, nullptr);
   resizeView(size);
   return json::object();

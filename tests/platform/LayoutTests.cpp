@@ -84,6 +84,8 @@ TEST_F(Layout, LogsAContradictionOnceAndLeavesTheBoundOutWhileItLasts) {
   ASSERT_THAT(platform.log.lines(), SizeIs(1));
   EXPECT_THAT(platform.log.lines()[0].text, HasSubstr("\"room for a finger: box.height >= 40\" is left out"));
   EXPECT_THAT(platform.log.lines()[0].text, HasSubstr("box.height = 10"));
+  EXPECT_THAT(box->layoutDump(), HasSubstr("box.height = 10 + dummy(box.height = 10)"));
+  EXPECT_THAT(box->layoutDump(), HasSubstr("left out: room for a finger: box.height >= 40"));
   height->setConstant(50);
   root->layoutIfNeeded();
   minimum->setConstant(60);

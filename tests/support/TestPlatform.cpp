@@ -12,8 +12,6 @@ TestPlatform::~TestPlatform() {
   loop.clear();
 }
 
-Date TestPlatform::startDate() {
-  return *dateFromISOText("2026-01-05T12:00:00Z");
-}
+Date TestPlatform::startDate() { return *dateFromISOText("2026-01-05T12:00:00Z"); }
 
 }  // namespace nimbo

@@ -3,6 +3,7 @@
 #include <cairo.h>
 
 #include <algorithm>
+#include <cmath>
 #include <stdexcept>
 
 #include "desktop/drawing/CairoImage.h"
@@ -14,6 +15,16 @@ namespace {
 
 void setColor(cairo_t* context, const Color& color) {
   cairo_set_source_rgba(context, color.red, color.green, color.blue, color.alpha);
+}
+
+/// The nearest corner of a device pixel.
+Point onPixel(cairo_t* context, Point point) {
+  double scaleX = 1, scaleY = 1;
+  cairo_surface_get_device_scale(cairo_get_target(context), &scaleX, &scaleY);
+  cairo_user_to_device(context, &point.x, &point.y);
+  point = {std::round(point.x * scaleX) / scaleX, std::round(point.y * scaleY) / scaleY};
+  cairo_device_to_user(context, &point.x, &point.y);
+  return point;
 }
 
 }  // namespace
@@ -38,9 +49,11 @@ void CairoPainter::drawImage(const Image& image, const Rect& rect, double alpha,
   if (!(size.width > 0 && size.height > 0 && rect.width > 0 && rect.height > 0)) return;
   const double fit = std::min(rect.width / size.width, rect.height / size.height);
 
+  // Between two pixels an image would be blurred, and slower to draw.
+  const Point origin =
+      onPixel(_context, {rect.x + (rect.width - size.width * fit) / 2, rect.y + (rect.height - size.height * fit) / 2});
   cairo_save(_context);
-  cairo_translate(_context, rect.x + (rect.width - size.width * fit) / 2,
-                  rect.y + (rect.height - size.height * fit) / 2);
+  cairo_translate(_context, origin.x, origin.y);
   cairo_scale(_context, fit, fit);
   if (tint.alpha > 0) {
     cairo_set_source_rgba(_context, tint.red, tint.green, tint.blue, tint.alpha * alpha);

@@ -72,6 +72,9 @@ std::string plainText(const ServerFormattedString& string) {
   return trimmed(text);
 }
 
+/// The next length at which a right edge is as sharp as the left one.
+double wholePixels(double length, double screenScale) { return std::ceil(length * screenScale - 1e-6) / screenScale; }
+
 void setColor(cairo_t* context, const Color& color) {
   cairo_set_source_rgba(context, color.red, color.green, color.blue, color.alpha);
 }
@@ -185,8 +188,7 @@ ImageRef CairoShieldRenderer::renderShield(const TransitShield& shield, const Lo
     layout = fit(text, metrics, metrics.maximumWidth - 2 * padding, pointSize);
     size.width = std::max(size.width, layout->size().width + 2 * padding);
   }
-  // Whole pixels, so that the right edge is as sharp as the left one.
-  size.width = std::ceil(size.width * look.screenScale - 1e-6) / look.screenScale;
+  size.width = wholePixels(size.width, look.screenScale);
   return drawFramed(size.width, look, [&](cairo_t* context) {
     fillShape(context, size, radius, colors);
     drawCentered(context, *layout, pointSize, size, colors.text);
@@ -219,7 +221,7 @@ ImageRef CairoShieldRenderer::renderText(const std::string& text, const Look& lo
 ImageRef CairoShieldRenderer::drawFramed(double width, const Look& look,
                                          const std::function<void(cairo_t*)>& draw) const {
   const double height = look.metrics.height;
-  const double wholeWidth = look.hasBadge ? width + badgeOverhang(height) : width;
+  const double wholeWidth = wholePixels(look.hasBadge ? width + badgeOverhang(height) : width, look.screenScale);
   return drawImage({wholeWidth, height}, look.screenScale, [&](cairo_t* context) {
     draw(context);
     if (look.hasBadge) drawBadge(context, wholeWidth, height);
@@ -232,7 +234,7 @@ TextLayoutRef CairoShieldRenderer::fit(const std::string& text, const ShieldMetr
     return _text.layOut(text, {pointSize, true}, maxWidth, 1, TextAlignment::natural, false);
   };
   pointSize = metrics.textSize;
-  const TextLayoutRef whole = layOut(std::numeric_limits<double>::infinity());
+  TextLayoutRef whole = layOut(std::numeric_limits<double>::infinity());
   const double wholeWidth = whole->size().width;
   if (wholeWidth <= width && !whole->isTruncated()) return whole;
   pointSize = std::clamp(metrics.textSize * width / wholeWidth, metrics.smallestTextSize, metrics.textSize);

@@ -15,6 +15,22 @@ using IterHandle = std::unique_ptr<PangoLayoutIter, IterDeleter>;
 
 double points(int pangoUnits) { return static_cast<double>(pangoUnits) / PANGO_SCALE; }
 
+/// How much wider than itself Pango made the ellipsis that ends a line, to fill the width that the line was given.
+int ellipsisPadding(const PangoLayoutLine* line) {
+  const GSList* runs = line->runs;
+  while (runs && runs->next) runs = runs->next;
+  if (!runs) return 0;
+  const auto* last = static_cast<const PangoLayoutRun*>(runs->data);
+  if (!(last->item->analysis.flags & PANGO_ANALYSIS_FLAG_IS_ELLIPSIS)) return 0;
+  int natural = 0;
+  for (int i = 0; i < last->glyphs->num_glyphs; ++i) {
+    PangoRectangle glyph;
+    pango_font_get_glyph_extents(last->item->analysis.font, last->glyphs->glyphs[i].glyph, nullptr, &glyph);
+    natural += glyph.width;
+  }
+  return std::max(0, pango_glyph_string_get_width(last->glyphs) - natural);
+}
+
 }  // namespace
 
 PangoTextLayout::PangoTextLayout(GObjectHandle<PangoLayout> layout, TextAlignment alignment, bool rightToLeft,
@@ -31,6 +47,7 @@ PangoTextLayout::PangoTextLayout(GObjectHandle<PangoLayout> layout, TextAlignmen
     }
     _lastBaseline = points(pango_layout_iter_get_baseline(iter.get()));
   }
+  if (_lineCount == 1) _size.width -= points(ellipsisPadding(pango_layout_get_line_readonly(_layout.get(), 0)));
   _isTruncated = wasCut || pango_layout_is_ellipsized(_layout.get());
 }
 

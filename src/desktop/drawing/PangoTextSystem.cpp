@@ -1,5 +1,6 @@
 #include "desktop/drawing/PangoTextSystem.h"
 
+#include <hb.h>
 #include <pango/pangocairo.h>
 
 #include <algorithm>
@@ -22,25 +23,37 @@ constexpr double kUnlimitedWidth = 1e6;
 struct FontDescriptionDeleter {
   void operator()(PangoFontDescription* description) const { pango_font_description_free(description); }
 };
+struct HarfBuzzFontDeleter {
+  void operator()(hb_font_t* font) const { hb_font_destroy(font); }
+};
 struct FontOptionsDeleter {
   void operator()(cairo_font_options_t* options) const { cairo_font_options_destroy(options); }
 };
 
-void checkSize(const FontDescriptor& font) {
+using FontDescription = std::unique_ptr<PangoFontDescription, FontDescriptionDeleter>;
+
+FontDescription describe(const FontDescriptor& font) {
   if (!(font.pointSize > 0) || !std::isfinite(font.pointSize))
     throw std::invalid_argument("a font's point size is above 0");
-}
-
-GObjectHandle<PangoLayout> makeLayout(PangoContext* context, const FontDescriptor& font) {
-  checkSize(font);
-  const std::unique_ptr<PangoFontDescription, FontDescriptionDeleter> description(pango_font_description_new());
+  FontDescription description(pango_font_description_new());
   pango_font_description_set_family_static(description.get(), "sans-serif");
   pango_font_description_set_weight(description.get(), font.bold ? PANGO_WEIGHT_BOLD : PANGO_WEIGHT_NORMAL);
   pango_font_description_set_absolute_size(description.get(), std::min(font.pointSize, 1000.0) * PANGO_SCALE);
-  GObjectHandle<PangoLayout> layout(pango_layout_new(context));
-  pango_layout_set_font_description(layout.get(), description.get());
-  pango_layout_set_auto_dir(layout.get(), FALSE);
-  return layout;
+  return description;
+}
+
+/// Measures at a size of 1 point, from the font's own units; absent where the font has no capital H.
+std::optional<FontMetrics> unitMetrics(PangoFont* font) {
+  hb_face_t* const face = hb_font_get_face(pango_font_get_hb_font(font));
+  const std::unique_ptr<hb_font_t, HarfBuzzFontDeleter> unscaled(hb_font_create(face));
+  hb_font_extents_t line;
+  hb_codepoint_t glyph = 0;
+  hb_glyph_extents_t capital;
+  if (!hb_font_get_h_extents(unscaled.get(), &line) || !hb_font_get_nominal_glyph(unscaled.get(), 'H', &glyph) ||
+      !hb_font_get_glyph_extents(unscaled.get(), glyph, &capital))
+    return std::nullopt;
+  const double units = hb_face_get_upem(face);
+  return FontMetrics{line.ascender / units, -line.descender / units, capital.y_bearing / units};
 }
 
 /// The text in valid UTF-8.
@@ -110,22 +123,15 @@ PangoContext* PangoTextSystem::context(bool rightToLeft) {
 }
 
 FontMetrics PangoTextSystem::metrics(const FontDescriptor& font) {
-  checkSize(font);
+  const FontDescription description = describe(font);
   std::optional<FontMetrics>& unit = _unitMetrics[font.bold];
   if (!unit) {
-    // Large enough for the ink to be as exact as the font's own units.
-    constexpr double kSize = 1000;
-    const auto layout = makeLayout(context(false), {kSize, font.bold});
-    pango_layout_set_text(layout.get(), "H", 1);
-    PangoRectangle ink, line;
-    pango_layout_get_extents(layout.get(), &ink, &line);
-    const double baseline = pango_layout_get_baseline(layout.get());
-    if (pango_layout_get_unknown_glyphs_count(layout.get()) > 0) {
+    // The size asked for, because a text will follow in it: looking for fonts takes Pango a millisecond a size.
+    const GObjectHandle<PangoFont> face(pango_context_load_font(context(false), description.get()));
+    if (face) unit = unitMetrics(face.get());
+    if (!unit) {
       logMissingCharacters();
       unit = FontMetrics{0.8, 0.2, 0.7};
-    } else {
-      constexpr double kUnits = kSize * PANGO_SCALE;
-      unit = FontMetrics{baseline / kUnits, (line.height - baseline) / kUnits, (baseline - ink.y) / kUnits};
     }
   }
   return {unit->ascent * font.pointSize, unit->descent * font.pointSize, unit->capHeight * font.pointSize};
@@ -136,7 +142,9 @@ TextLayoutRef PangoTextSystem::layOut(const std::string& text, const FontDescrip
   std::string shown = valid(text);
   const bool wasCut = cutToMaximum(shown);
   if (maxLines > 0) joinLines(shown);
-  auto layout = makeLayout(context(rightToLeft), font);
+  GObjectHandle<PangoLayout> layout(pango_layout_new(context(rightToLeft)));
+  pango_layout_set_font_description(layout.get(), describe(font).get());
+  pango_layout_set_auto_dir(layout.get(), FALSE);
   pango_layout_set_text(layout.get(), shown.data(), static_cast<int>(shown.size()));
   if (!(maxWidth > 0)) {
     pango_layout_set_width(layout.get(), 0);

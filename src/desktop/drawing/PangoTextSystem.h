@@ -26,8 +26,9 @@ class PangoTextSystem final : public TextSystem {
   TextLayoutRef layOut(const std::string& text, const FontDescriptor& font, double maxWidth, std::size_t maxLines,
                        TextAlignment alignment, bool rightToLeft) override;
 
-  /// More than any row shows; shaping takes a millisecond for about 2000.
-  static constexpr std::size_t kMaximumCharacters = 4000;
+  /// More than any row shows. Pango breaks a single long word in time that grows with its square: a tenth of a second
+  /// for this many, two seconds for four times as many.
+  static constexpr std::size_t kMaximumCharacters = 1000;
 
  private:
   PangoContext* context(bool rightToLeft);

@@ -109,7 +109,7 @@ std::string DesktopPreferences::locale() const { return _languageChoice == kSyst
 
 void DesktopPreferences::apply() {
   Gtk::Settings::get_default()->property_gtk_application_prefer_dark_theme() = appearance() == Appearance::dark;
-  _style->load_from_data(windowStyle(textScale() / desktopTextScale()));
+  _style->load_from_data(windowStyle(appearance(), textScale() / desktopTextScale()));
   _lookChanged.emit();
 }
 

@@ -35,7 +35,7 @@ FavoritesPage::FavoritesPage(const PageContext& context)
   addSection(_linesTitle, "Window_Favorites_Lines", _linesList);
   _notice.set_wrap();
   _notice.set_xalign(0);
-  _notice.add_css_class("caption");
+  _notice.add_css_class("item-caption");
   content().append(_searching);
   content().append(_notice);
   readFavorites();
@@ -45,7 +45,7 @@ FavoritesPage::FavoritesPage(const PageContext& context)
 
 void FavoritesPage::addSection(Gtk::Label& title, const char* key, Gtk::ListBox& list) {
   title.set_text(LocalizedString(key));
-  title.add_css_class("heading");
+  title.add_css_class("item-heading");
   title.set_xalign(0);
   list.add_css_class("card");
   list.set_selection_mode(Gtk::SelectionMode::NONE);

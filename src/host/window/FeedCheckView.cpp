@@ -74,15 +74,15 @@ void FeedCheckView::show(const FeedCheckReport& report) {
   if (const auto& feed = report.staticFeed)
     addText(CommaDelimitedList(
                 {countText("Window_Feed_Lines", feed->lines), countText("Window_Feed_Agencies", feed->agencies)}),
-            "body");
+            "item-text");
   if (const auto& alerts = report.alerts) {
     addText(CommaDelimitedList({countText("Window_Feed_Incidents", alerts->incidents),
                                 countText("Window_Feed_AffectedLines", alerts->affectedLines)}),
-            "body");
+            "item-text");
     if (alerts->timestamp)
       addText(LocalizedFormat(LocalizedString("Window_Incident_Updated"),
                               {DateText(_context.preferences.locale()).textOf(*alerts->timestamp)}),
-              "caption");
+              "item-caption");
     if (alerts->staleness) addText(alerts->staleness->reason(), "failed");
   }
   for (const ErrorRef& error : {report.staticError, report.alertsError})
@@ -107,7 +107,7 @@ void FeedCheckView::addSkipped(const SkipReport& report) {
   for (const SkipReport::Entry& entry : report.entries()) {
     std::string text = std::to_string(entry.count) + " × " + entry.reason;
     if (!entry.example.empty()) text += " (" + entry.example + ")";
-    addText(text, "caption");
+    addText(text, "item-caption");
   }
 }
 

@@ -12,7 +12,7 @@ FeedForm::FeedForm(const PageContext& context, Added added)
   add_css_class("card");
   add_css_class("notice");
   auto* title = Gtk::make_managed<Gtk::Label>(LocalizedString("Window_Feed_AddTitle"));
-  title->add_css_class("heading");
+  title->add_css_class("item-heading");
   title->set_xalign(0);
   append(*title);
   addEntry(_name, "Window_Feed_Name", "Window_Feed_NamePrompt");
@@ -42,7 +42,7 @@ FeedForm::FeedForm(const PageContext& context, Added added)
 void FeedForm::addEntry(Gtk::Entry& entry, const char* labelKey, const char* promptKey) {
   auto* label = Gtk::make_managed<Gtk::Label>(LocalizedString(labelKey));
   label->set_xalign(0);
-  label->add_css_class("caption");
+  label->add_css_class("item-caption");
   append(*label);
   auto* row = Gtk::make_managed<Gtk::Box>(Gtk::Orientation::HORIZONTAL);
   row->add_css_class("linked");

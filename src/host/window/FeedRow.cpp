@@ -20,9 +20,9 @@ FeedRow::FeedRow(const PageContext& context, const Feed& feed, std::function<voi
     label->add_css_class(style);
     box->append(*label);
   };
-  addText(feed.name, "heading");
-  addText(feed.staticFeed.publicText(), "caption");
-  addText(feed.alerts.publicText(), "caption");
+  addText(feed.name, "item-heading");
+  addText(feed.staticFeed.publicText(), "item-caption");
+  addText(feed.alerts.publicText(), "item-caption");
   box->append(_check);
   auto* buttons = Gtk::make_managed<Gtk::Box>(Gtk::Orientation::HORIZONTAL, 8);
   _checkButton.set_label(LocalizedString("Window_Feed_Check"));

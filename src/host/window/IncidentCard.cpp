@@ -16,9 +16,9 @@ namespace nimbo {
 
 namespace {
 
-/// More shields than that are a wall.
-constexpr std::size_t kShieldLimit = 5;
-constexpr std::int64_t kShieldSize = 4;
+/// More lines than that are a wall.
+constexpr std::size_t kLineLimit = 8;
+constexpr std::int64_t kShieldSize = 3;
 
 /// The publisher's host of a web address; empty for any other address, which is not offered.
 std::string hostOfLink(const std::string& url) {
@@ -35,7 +35,7 @@ std::string hostOfLink(const std::string& url) {
 
 IncidentCard::IncidentCard(const PageContext& context, const TransitIncidents& periods,
                            std::optional<std::uint64_t> line)
-    : Gtk::Box(Gtk::Orientation::VERTICAL, 6), _context(context) {
+    : Gtk::Box(Gtk::Orientation::VERTICAL, 6), _context(context), _hasLine(line.has_value()) {
   add_css_class("card");
   add_css_class("notice");
   // Stops for the keyboard, which also brings a card that is out of sight into view.
@@ -46,32 +46,29 @@ IncidentCard::IncidentCard(const PageContext& context, const TransitIncidents& p
       _affected.push_back(entity->muid());
 
   const std::string title = IncidentStringProvider::cellTitleForIncident(&incident);
-  addText(title, "heading");
-  if (incident.isBlockingIncident()) addText(LocalizedString("Window_Incident_Blocking"), "failed");
+  addText(*this, title, "item-heading");
+  if (incident.isBlockingIncident()) addText(*this, LocalizedString("Window_Incident_Blocking"), "failed");
   addDates(periods);
   addTexts(incident);
-  append(_affectedShields);
-  _affectedText.set_wrap();
-  _affectedText.set_xalign(0);
-  append(_affectedText);
+  append(_affectedLines);
   showAffectedLines({});
   if (incident.linkURL()) addLink(*incident.linkURL());
   if (incident.lastUpdated())
-    addText(LocalizedFormat(LocalizedString("Window_Incident_Updated"),
+    addText(*this,
+            LocalizedFormat(LocalizedString("Window_Incident_Updated"),
                             {DateText(_context.preferences.locale()).textOf(*incident.lastUpdated())}),
-            "caption");
+            "item-caption");
   setAccessibleLabel(*this, title);
 }
 
-Gtk::Label& IncidentCard::addText(const std::string& text, const char* style) {
+void IncidentCard::addText(Gtk::Box& box, const std::string& text, const char* style) {
+  if (text.empty()) return;
   auto* label = Gtk::make_managed<Gtk::Label>(text);
   label->set_wrap();
   label->set_wrap_mode(Pango::WrapMode::WORD_CHAR);
   label->set_xalign(0);
   label->add_css_class(style);
-  label->set_visible(!text.empty());
-  append(*label);
-  return *label;
+  box.append(*label);
 }
 
 void IncidentCard::addTexts(const TransitIncident& incident) {
@@ -80,19 +77,22 @@ void IncidentCard::addTexts(const TransitIncident& incident) {
   for (const auto* text : {&incident.summary(), &incident.fullDescription()}) {
     if (!*text || (*text)->empty() || **text == said) continue;
     said = **text;
-    addText(said, "body");
+    addText(*this, said, "item-text");
   }
 }
 
 void IncidentCard::addDates(const TransitIncidents& periods) {
   const DateText dates(_context.preferences.locale());
   const Date now = Platform::current().clock().now();
+  const auto isOver = [now](const TransitIncidentRef& period) { return period->endDate() && *period->endDate() < now; };
+  const bool allAreOver = std::all_of(periods.begin(), periods.end(), isOver);
   std::string text;
   for (const TransitIncidentRef& period : periods) {
+    if (isOver(period) && !allAreOver) continue;
     const std::string line = dates.textOfPeriod(period->startDate(), period->endDate(), now);
     if (!line.empty()) text += (text.empty() ? "" : "\n") + line;
   }
-  addText(text, "caption");
+  addText(*this, text, "item-caption");
 }
 
 void IncidentCard::addLink(const std::string& url) {
@@ -101,28 +101,30 @@ void IncidentCard::addLink(const std::string& url) {
   auto* link =
       Gtk::make_managed<Gtk::LinkButton>(url, LocalizedFormat(LocalizedString("Window_Incident_Link"), {host}));
   link->set_halign(Gtk::Align::START);
+  link->add_css_class("link-text");
   append(*link);
 }
 
 void IncidentCard::showAffectedLines(const LinesByNumber& lines) {
-  std::vector<std::string> names;
-  while (Gtk::Widget* child = _affectedShields.get_first_child()) _affectedShields.remove(*child);
-  std::size_t shields = 0;
+  while (Gtk::Widget* child = _affectedLines.get_first_child()) _affectedLines.remove(*child);
+  std::size_t named = 0;
   for (const std::uint64_t muid : _affected) {
     const auto line = lines.find(muid);
-    if (line == lines.end()) continue;
-    names.push_back(nameOfLine(*line->second));
-    if (const TransitArtworkRef artwork = artworkOfLine(*line->second); artwork && ++shields <= kShieldLimit)
-      _affectedShields.append(*Gtk::make_managed<ShieldImage>(_context.preferences, artwork, kShieldSize));
+    if (line == lines.end() || named == kLineLimit) continue;
+    if (named++ == 0)
+      addText(_affectedLines, LocalizedString(_hasLine ? "Window_Incident_AlsoAffects" : "Window_Incident_Affects"),
+              "item-caption");
+    auto* row = Gtk::make_managed<Gtk::Box>(Gtk::Orientation::HORIZONTAL, 8);
+    row->append(*Gtk::make_managed<ShieldImage>(_context.preferences, artworkOfLine(*line->second), kShieldSize));
+    addText(*row, nameBesideShield(*line->second), "item-text");
+    _affectedLines.append(*row);
   }
-  _affectedShields.set_visible(shields > 0);
-  const std::size_t unknown = _affected.size() - names.size();
-  if (!names.empty() && unknown > 0)
-    names.push_back(LocalizedFormat(LocalizedString("Window_Incident_OtherLines"), {std::uint64_t{unknown}}));
-  _affectedText.set_text(
-      names.empty() ? LocalizedFormat(LocalizedString("Window_Incident_AffectsCount"), {std::uint64_t{unknown}})
-                    : LocalizedFormat(LocalizedString("Window_Incident_Affects"), {CommaDelimitedList(names)}));
-  _affectedText.set_visible(!_affected.empty());
+  const std::uint64_t rest = _affected.size() - named;
+  if (rest == 0) return;
+  const char* key = named > 0  ? "Window_Incident_OtherLines"
+                    : _hasLine ? "Window_Incident_AlsoAffectsCount"
+                               : "Window_Incident_AffectsCount";
+  addText(_affectedLines, LocalizedFormat(LocalizedString(key), {rest}), "item-caption");
 }
 
 }  // namespace nimbo

@@ -20,19 +20,19 @@ class IncidentCard final : public Gtk::Box {
   /// which is not named again.
   IncidentCard(const PageContext& context, const TransitIncidents& periods, std::optional<std::uint64_t> line);
 
-  /// The lines that it affects, but for the one that is known. Until it is told their names it counts them.
+  /// Names the lines that it affects, but for the one that is known. Until it is told their names it counts them.
   void showAffectedLines(const LinesByNumber& lines);
 
  private:
-  Gtk::Label& addText(const std::string& text, const char* style);
+  static void addText(Gtk::Box& box, const std::string& text, const char* style);
   void addTexts(const TransitIncident& incident);
   void addDates(const TransitIncidents& periods);
   void addLink(const std::string& url);
 
   const PageContext& _context;
+  bool _hasLine;
   std::vector<std::uint64_t> _affected;
-  Gtk::Box _affectedShields{Gtk::Orientation::HORIZONTAL, 6};
-  Gtk::Label _affectedText;
+  Gtk::Box _affectedLines{Gtk::Orientation::VERTICAL, 4};
 };
 
 }  // namespace nimbo

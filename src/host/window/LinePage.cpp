@@ -15,7 +15,7 @@ LinePage::LinePage(const PageContext& context, const TransitLineItemRef& line) :
   header->append(*Gtk::make_managed<ShieldImage>(context.preferences, artworkOfLine(*line), kShieldSize));
   auto* texts = Gtk::make_managed<Gtk::Box>(Gtk::Orientation::VERTICAL, 2);
   for (const auto& [text, style] :
-       {std::pair(nameOfLine(*line), "line-title"), std::pair(systemNameOfLine(*line), "caption")}) {
+       {std::pair(nameBesideShield(*line), "line-title"), std::pair(systemNameOfLine(*line), "item-caption")}) {
     auto* label = Gtk::make_managed<Gtk::Label>(text);
     label->add_css_class(style);
     label->set_xalign(0);

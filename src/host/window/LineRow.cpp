@@ -30,7 +30,8 @@ LineRow::LineRow(const PageContext& context, TransitLineRef line, bool isFavorit
   const std::string name = nameOfLine(*_line), system = systemNameOfLine(*_line);
   auto* texts = Gtk::make_managed<Gtk::Box>(Gtk::Orientation::VERTICAL, 2);
   texts->set_hexpand();
-  for (const auto& [text, style] : {std::pair(name, "body"), std::pair(system, "caption")}) {
+  for (const auto& [text, style] :
+       {std::pair(nameBesideShield(*_line), "item-text"), std::pair(system, "item-caption")}) {
     auto* label = Gtk::make_managed<Gtk::Label>(text);
     label->add_css_class(style);
     label->set_xalign(0);
@@ -40,31 +41,40 @@ LineRow::LineRow(const PageContext& context, TransitLineRef line, bool isFavorit
     texts->append(*label);
   }
   _box->append(*texts);
-  addButton(isFavorite ? "starred-symbolic" : "non-starred-symbolic",
-            LocalizedFormat(LocalizedString(isFavorite ? "Window_Favorites_Remove" : "Window_Favorites_Add"), {name}),
-            true, std::move(toggle));
+  Gtk::Button& star = addButton(
+      *_box, isFavorite ? "starred-symbolic" : "non-starred-symbolic",
+      LocalizedFormat(LocalizedString(isFavorite ? "Window_Favorites_Remove" : "Window_Favorites_Add"), {name}),
+      std::move(toggle));
+  if (isFavorite) star.add_css_class("starred");
   set_child(*_box);
   setAccessibleLabel(*this, CommaDelimitedList(system.empty() ? std::vector{name} : std::vector{name, system}));
 }
 
-void LineRow::addButton(const char* icon, const std::string& name, bool isEnabled, std::function<void()> act) {
+Gtk::Button& LineRow::addButton(Gtk::Box& box, const char* icon, const std::string& name, std::function<void()> act) {
   auto* button = Gtk::make_managed<Gtk::Button>();
   button->set_icon_name(icon);
   button->add_css_class("flat");
   button->set_valign(Gtk::Align::CENTER);
   button->set_tooltip_text(name);
-  button->set_sensitive(isEnabled);
   button->signal_clicked().connect(std::move(act));
   setAccessibleLabel(*button, name);
-  _box->append(*button);
+  box.append(*button);
+  return *button;
 }
 
 void LineRow::addMoving(bool up, bool down, std::function<void(int)> move) {
   const std::string name = nameOfLine(*_line);
-  addButton("go-up-symbolic", LocalizedFormat(LocalizedString("Window_Favorites_Up"), {name}), up,
-            [move] { move(-1); });
-  addButton("go-down-symbolic", LocalizedFormat(LocalizedString("Window_Favorites_Down"), {name}), down,
-            [move] { move(1); });
+  auto* arrows = Gtk::make_managed<Gtk::Box>(Gtk::Orientation::VERTICAL);
+  arrows->set_valign(Gtk::Align::CENTER);
+  const auto addArrow = [&](const char* icon, const char* key, bool isEnabled, int step) {
+    Gtk::Button& arrow =
+        addButton(*arrows, icon, LocalizedFormat(LocalizedString(key), {name}), [move, step] { move(step); });
+    arrow.add_css_class("small-button");
+    arrow.set_sensitive(isEnabled);
+  };
+  addArrow("go-up-symbolic", "Window_Favorites_Up", up, -1);
+  addArrow("go-down-symbolic", "Window_Favorites_Down", down, 1);
+  _box->append(*arrows);
   const auto keys = Gtk::EventControllerKey::create();
   keys->signal_key_pressed().connect(
       [up, down, move](guint key, guint, Gdk::ModifierType modifiers) {

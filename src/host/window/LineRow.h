@@ -24,7 +24,7 @@ class LineRow final : public Gtk::ListBoxRow {
   const TransitLineRef& line() const { return _line; }
 
  private:
-  void addButton(const char* icon, const std::string& name, bool isEnabled, std::function<void()> act);
+  static Gtk::Button& addButton(Gtk::Box& box, const char* icon, const std::string& name, std::function<void()> act);
 
   TransitLineRef _line;
   Gtk::Box* _box;

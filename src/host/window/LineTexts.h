@@ -9,6 +9,9 @@ namespace nimbo {
 /// The name by which riders know a line; its number where it has none.
 std::string nameOfLine(const TransitLine& line);
 
+/// The same for a place beside the line's shield, which says the short name already: "Ring Line" of "3, Ring Line".
+std::string nameBesideShield(const TransitLine& line);
+
 /// Name of the network that a line belongs to; empty where that is not known.
 std::string systemNameOfLine(const TransitLine& line);
 

@@ -5,9 +5,11 @@
 
 #include <string>
 
+#include "host/window/Column.h"
+
 namespace nimbo {
 
-/// A place in the window: content that scrolls, one column not wider than is good to read.
+/// A place in the window: a column of content that scrolls.
 class Page : public Gtk::ScrolledWindow {
  public:
   explicit Page(std::string title);
@@ -20,6 +22,7 @@ class Page : public Gtk::ScrolledWindow {
  private:
   std::string _title;
   Gtk::Box _content{Gtk::Orientation::VERTICAL, 12};
+  Column _column{_content};
 };
 
 }  // namespace nimbo

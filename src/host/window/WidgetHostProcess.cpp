@@ -59,6 +59,9 @@ void WidgetHostProcess::setPresentation(const WidgetPresentation& presentation) 
     if (_visible) start();
     return;
   }
+  if (displayModesOf(old) != displayModesOf(presentation))
+    ask("transitionToSize",
+        {{"size", {presentation.width, _contentHeight}}, {"displayModes", displayModesOf(presentation)}});
   if (old.scale != presentation.scale) ask("setScale", {{"scale", presentation.scale}});
   if (old.appearance != presentation.appearance) ask("setAppearance", {{"appearance", presentation.appearance}});
   if (old.textSize != presentation.textSize) ask("setTextSize", {{"category", presentation.textSize}});
@@ -234,6 +237,7 @@ void WidgetHostProcess::askForContent() {
 void WidgetHostProcess::show(const std::shared_ptr<SharedPicture>& picture, const json& snapshot) {
   auto content = std::make_shared<WidgetContent>(WidgetContent::ofSnapshot(snapshot));
   content->picture = picture;
+  _contentHeight = picture->layout().height / picture->layout().scale;
   // The expanded mode ends with the rows that need it, and comes back with them.
   setExpandedMode(_wantsExpanded && content->canExpand);
   _delegate.widgetDidChange(content);

@@ -105,6 +105,7 @@ class WidgetHostProcess {
   bool _awaitsContent = false;
   bool _contentIsStale = false;
   bool _isUpdating = false;
+  double _contentHeight = 0;  // points
   std::vector<std::shared_ptr<Timer>> _patience;
   Date _heardSince;
   std::size_t _heardLines = 0;

@@ -64,7 +64,7 @@ void WidgetPage::buildCard() {
   auto* header = Gtk::make_managed<Gtk::Box>(Gtk::Orientation::HORIZONTAL, 8);
   header->add_css_class("card-header");
   auto* name = Gtk::make_managed<Gtk::Label>(LocalizedString("Window_Widget_Title"));
-  name->add_css_class("heading");
+  name->add_css_class("item-heading");
   name->set_hexpand();
   name->set_xalign(0);
   _expand.add_css_class("flat");
@@ -74,6 +74,10 @@ void WidgetPage::buildCard() {
     header->append(*child);
 
   _view.signalSelected().connect([this](std::size_t row) { _process.selectRow(row); });
+  _view.signalWidthChanged().connect([this](double width) {
+    _width = width;
+    _process.setPresentation(presentation());
+  });
   _view.signalPressed().connect([this](std::size_t row, bool pressed) { _process.highlightRow(row, pressed); });
 
   _waiting.set_size_request(-1, static_cast<int>(WidgetPresentation::kDefaultRowHeight));
@@ -94,7 +98,7 @@ void WidgetPage::buildCard() {
   _failure.hide();
 
   _card.add_css_class("card");
-  _card.set_halign(Gtk::Align::CENTER);
+  _card.add_css_class("widget-card");
   _card.set_overflow(Gtk::Overflow::HIDDEN);
   for (Gtk::Widget* child : {static_cast<Gtk::Widget*>(header), static_cast<Gtk::Widget*>(&_failure),
                              static_cast<Gtk::Widget*>(&_waiting), static_cast<Gtk::Widget*>(&_view)})
@@ -155,6 +159,10 @@ void WidgetPage::updateVisibility() {
 WidgetPresentation WidgetPage::presentation() const {
   const DesktopPreferences& preferences = _context.preferences;
   WidgetPresentation presentation;
+  presentation.width = _width;
+  // A row holds as many lines of text whatever its size.
+  presentation.compactHeight = WidgetPresentation::kDefaultRowHeight * std::max(preferences.textScale(), 1.0);
+  presentation.expandedHeight = 4 * presentation.compactHeight;
   presentation.scale = get_scale_factor();
   presentation.textSize = nameOfContentSizeCategory(preferences.textSize());
   presentation.appearance = preferences.appearance() == Appearance::dark ? "dark" : "light";

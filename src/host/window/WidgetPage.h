@@ -39,6 +39,7 @@ class WidgetPage final : public Page, private WidgetHostProcess::Delegate {
   WidgetHostProcess _process;
   WidgetContentRef _content;
   bool _wantsExpanded;
+  double _width = WidgetPresentation::kDefaultWidth;
 
   Gtk::Box _card{Gtk::Orientation::VERTICAL};
   Gtk::Spinner _updating;

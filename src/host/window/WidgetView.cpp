@@ -2,6 +2,7 @@
 
 #include <gdkmm/frameclock.h>
 #include <gdkmm/memorytexture.h>
+#include <glibmm/main.h>
 #include <gtkmm/settings.h>
 #include <gtkmm/snapshot.h>
 
@@ -34,11 +35,12 @@ Glib::RefPtr<Gdk::Texture> textureOf(const std::shared_ptr<const SharedPicture>&
 WidgetView::WidgetView() {
   add_css_class("widget-view");
   set_overflow(Gtk::Overflow::HIDDEN);
-  set_halign(Gtk::Align::CENTER);
+  set_hexpand();
 }
 
 WidgetView::~WidgetView() {
   if (_tick != 0) remove_tick_callback(_tick);
+  _widthReport.disconnect();
   makeRows(0);
 }
 
@@ -66,7 +68,6 @@ void WidgetView::setContent(const WidgetContentRef& content) {
   for (std::size_t i = 0; i < _rows.size(); ++i) setAccessibleLabel(*_rows[i], content->rows[i].name);
   if (content) {
     const SharedPicture::Layout& layout = content->picture->layout();
-    _width = layout.width / layout.scale;
     animateHeightTo(layout.height / layout.scale);
   }
   queue_resize();
@@ -99,11 +100,21 @@ bool WidgetView::animate(gint64 frameTime) {
 
 void WidgetView::measure_vfunc(Gtk::Orientation orientation, int, int& minimum, int& natural, int& minimumBaseline,
                                int& naturalBaseline) const {
-  minimum = natural = static_cast<int>(std::ceil(orientation == Gtk::Orientation::HORIZONTAL ? _width : _height));
+  constexpr int kSmallestWidth = 280;
+  minimum = natural =
+      orientation == Gtk::Orientation::HORIZONTAL ? kSmallestWidth : static_cast<int>(std::ceil(_height));
   minimumBaseline = naturalBaseline = -1;
 }
 
-void WidgetView::size_allocate_vfunc(int, int, int) {
+void WidgetView::size_allocate_vfunc(int width, int, int) {
+  if (std::exchange(_width, width) != width) {
+    // Not while sizes are being found.
+    _widthReport.disconnect();
+    _widthReport = Glib::signal_idle().connect([this] {
+      _widthChanged.emit(_width);
+      return false;
+    });
+  }
   for (std::size_t i = 0; i < _rows.size(); ++i) {
     const Rect& frame = _content->rows[i].frame;
     int minimum, natural, ignored;

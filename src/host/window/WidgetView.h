@@ -22,6 +22,8 @@ class WidgetView final : public Gtk::Widget {
 
   /// A row was chosen, by its index.
   sigc::signal<void(std::size_t)>& signalSelected() { return _selected; }
+  /// The view has another width, in points, to which the widget may be drawn.
+  sigc::signal<void(double)>& signalWidthChanged() { return _widthChanged; }
   /// A row is pressed, or no longer.
   sigc::signal<void(std::size_t, bool)>& signalPressed() { return _pressed; }
 
@@ -40,12 +42,14 @@ class WidgetView final : public Gtk::Widget {
   WidgetContentRef _content;
   Glib::RefPtr<Gdk::Texture> _picture;
   std::vector<std::unique_ptr<Gtk::Button>> _rows;
-  double _width = 0;
+  int _width = 0;      // as allocated
   double _height = 0;  // on the way from _fromHeight to _toHeight
   double _fromHeight = 0;
   double _toHeight = 0;
   gint64 _animationStart = 0;  // microseconds of the frame clock; 0: with the next frame
   guint _tick = 0;
+  sigc::connection _widthReport;
+  sigc::signal<void(double)> _widthChanged;
   sigc::signal<void(std::size_t)> _selected;
   sigc::signal<void(std::size_t, bool)> _pressed;
 };

@@ -1,7 +1,6 @@
 #include "platform/ui/StackView.h"
 
 #include <algorithm>
-#include <ranges>
 
 namespace nimbo {
 
@@ -33,9 +32,9 @@ View* StackView::viewForFirstBaselineLayout() {
 }
 
 View* StackView::viewForLastBaselineLayout() {
-  for (const auto& view : std::views::reverse(_arranged))
-    if (takesRoom(*view)) return view.get();
-  return nullptr;
+  const auto found =
+      std::find_if(_arranged.rbegin(), _arranged.rend(), [](const auto& view) { return takesRoom(*view); });
+  return found == _arranged.rend() ? nullptr : found->get();
 }
 
 void StackView::appendGeneratedConstraints(std::vector<const LayoutConstraint*>& constraints) {

@@ -140,6 +140,11 @@ void View::setNeedsUpdateConstraints() {
   if (root._superview) root._superview->setNeedsLayout();
 }
 
+std::string View::layoutDump() {
+  const View& root = layoutRoot();
+  return root._engine ? root._engine->dump() : "no constraints in " + root.layoutName() + "\n";
+}
+
 void View::requireConstraintLayout() {
   View& root = layoutRoot();
   if (!root._engine) root._engine = std::make_unique<LayoutEngine>(root);

@@ -78,6 +78,8 @@ class View : public LayoutItem {
   const std::vector<std::shared_ptr<LayoutConstraint>>& constraints() const { return _constraints; }
   /// The constraints inside, or what they depend on, changed.
   void setNeedsUpdateConstraints();
+  /// How the frames around the view were found, by the names of views and constraints, for a bug report.
+  std::string layoutDump();
 
   /// The view whose first or last line of text is this one's; null when it is this view.
   virtual View* viewForFirstBaselineLayout() { return nullptr; }

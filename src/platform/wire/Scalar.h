@@ -1,6 +1,7 @@
 #pragma once
 
 #include <cstdint>
+#include <cstdio>
 #include <span>
 #include <string>
 #include <string_view>
@@ -19,11 +20,13 @@ struct Scalar {
   }
 };
 
-/// The name of an enumeration's value, or "(unknown: VALUE)".
+/// The name of an enumeration's value, or its number in words.
 inline std::string nameOfValue(std::span<const std::string_view> names, std::int32_t value) {
   if (value >= 0 && static_cast<std::size_t>(value) < names.size())
     return std::string(names[static_cast<std::size_t>(value)]);
-  return "(unknown: " + std::to_string(value) + ")";
+  char text[32];
+  std::snprintf(text, sizeof text, "(unknown: %i)", static_cast<int>(value));
+  return text;
 }
 
 /// The value of an enumeration's name; 0 for a text that is none.

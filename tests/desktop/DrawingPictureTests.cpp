@@ -1,0 +1,170 @@
+#include <gtest/gtest.h>
+#include <unistd.h>
+
+#include <cmath>
+#include <filesystem>
+#include <fstream>
+#include <limits>
+
+#include "DrawingInk.h"
+#include "desktop/drawing/CairoImageResources.h"
+#include "desktop/drawing/PangoTextSystem.h"
+#include "desktop/drawing/Rendering.h"
+#include "desktop/drawing/VectorImage.h"
+#include "support/TestPlatform.h"
+
+namespace nimbo {
+namespace {
+
+constexpr Color kBlack{0, 0, 0, 1}, kWhite{1, 1, 1, 1}, kRed{1, 0, 0, 1}, kNone{0, 0, 0, 0};
+
+TEST(Picture, RefusesSizesThatNoMemoryHolds) {
+  constexpr double kInfinity = std::numeric_limits<double>::infinity();
+  struct Case {
+    Size size;
+    double scale;
+    int width;  // 0: refused
+    int height;
+  };
+  for (const Case& c :
+       {Case{{0, 1}, 1, 1, 1}, Case{{320, 110}, 2, 640, 220}, Case{{10.1, 3}, 10, 101, 30}, Case{{3, 3}, 0.5, 2, 2},
+        Case{{10000, 110}, 1, 10000, 110}, Case{{10000, 10000}, 4, 0, 0}, Case{{10000, 1}, 4, 0, 0},
+        Case{{-1, 1}, 1, 0, 0}, Case{{1, 1}, 0, 0, 0}, Case{{std::nan(""), 1}, 1, 0, 0}, Case{{1, kInfinity}, 1, 0, 0},
+        Case{{1, 1}, kInfinity, 0, 0}}) {
+    const auto made = CairoSurface::make(c.size, c.scale);
+    ASSERT_EQ(made.surface != nullptr, c.width > 0) << c.size.width << " " << c.scale;
+    ASSERT_EQ(made.error == nullptr, c.width > 0);
+    if (made.surface) {
+      EXPECT_EQ(made.surface->pixelWidth(), c.width);
+      EXPECT_EQ(made.surface->pixelHeight(), c.height);
+    } else {
+      EXPECT_EQ(made.error->code(), kDrawingErrorBadSize);
+    }
+  }
+}
+
+TEST(Picture, ClipsAndMovesUntilRestored) {
+  const auto made = renderToSurface(
+      [](Painter& painter) {
+        painter.save({10, 0}, {0, 0, 10, 20});
+        painter.save({5, 5}, {0, 0, 100, 5});
+        painter.fillRect({-50, -50, 200, 200}, kRed);
+        painter.restore();
+        painter.restore();
+        painter.fillRect({0, 18, 2, 2}, kBlack);
+        EXPECT_THROW(painter.restore(), std::logic_error);
+      },
+      {40, 20}, 2, kWhite);
+  const Ink ink(*made.surface);
+  const auto red = ink.ofColor(0xff0000), black = ink.ofColor(0);
+  EXPECT_EQ((std::array{red.left, red.top, red.right, red.bottom}), (std::array{30, 10, 40, 20}));
+  EXPECT_EQ((std::array{black.left, black.top, black.right, black.bottom}), (std::array{0, 36, 4, 40}));
+}
+
+TEST(Picture, FitsImagesAndTintsTheirShape) {
+  const TestPlatform platform;
+  const auto image = CairoImageResources().image("good-v2", 2, false);
+  const auto drawn = [&](double alpha, const Color& tint) {
+    return Ink(*renderToSurface(
+                    [&](Painter& p) {
+                      p.drawImage(*image, {0, 0, 100, 50}, alpha, tint);
+                    },
+                    {100, 50}, 1, kWhite)
+                    .surface);
+  };
+  const auto plain = drawn(1, kNone).find([](std::uint32_t p) { return (p & 0xff) < 200; });
+  EXPECT_NEAR(plain.right - plain.left, plain.bottom - plain.top, 1);
+  EXPECT_NEAR(plain.left, 100 - plain.right, 1);
+  const Ink tinted = drawn(1, kRed);
+  EXPECT_GT(tinted.ofColor(0xff0000).count, 500u);
+  EXPECT_EQ(tinted.at(47, 32), 0xffffffff) << "the check stays open";
+  // At its own size an image is as sharp as it was drawn, wherever it stands.
+  const auto greys = [&](double x) {
+    const auto made = renderToSurface(
+        [&](Painter& p) {
+          p.save({0.26, 0}, {0, 0, 50, 50});
+          p.drawImage(*image, {x, x, 32, 32}, 1, kBlack);
+        },
+        {40, 40}, 2, kWhite);
+    return Ink(*made.surface).find([](auto p) { return (p & 0xff) > 0 && (p & 0xff) < 255; }).count;
+  };
+  EXPECT_EQ(greys(2.3), greys(1.74));
+  const std::uint32_t faint = drawn(0.3, kBlack).at(35, 15) & 0xff;
+  EXPECT_NEAR(faint, 255 * 0.7, 2);
+}
+
+TEST(Picture, RefusesWhatAnotherPlatformMade) {
+  const ImageDouble image({1, 1}, 1);
+  TextSystemDouble text;
+  const auto layout = text.layOut("a", {10, false}, 100, 1, TextAlignment::natural, false);
+  renderToSurface(
+      [&](Painter& painter) {
+        EXPECT_THROW(painter.drawImage(image, {0, 0, 1, 1}, 1, kNone), std::invalid_argument);
+        EXPECT_THROW(painter.drawText(*layout, {0, 0}, 10, kBlack), std::invalid_argument);
+      },
+      {10, 10}, 1, kWhite);
+}
+
+TEST(Picture, IsWrittenWholeOrNotAtAll) {
+  const auto folder = std::filesystem::temp_directory_path() / ("nimbo-pictures-" + std::to_string(getpid()));
+  const auto draw = [](Painter& painter) { painter.fillRect({0, 0, 5, 5}, kRed); };
+  EXPECT_NE(renderToPNG(draw, {10, 10}, 1, kWhite, folder / "a.png"), nullptr) << "a folder that is missing";
+  std::filesystem::create_directory(folder);
+  EXPECT_EQ(renderToPNG(draw, {10, 10}, 1, kWhite, folder / "a.png"), nullptr);
+  std::string head(8, 0);
+  std::ifstream(folder / "a.png", std::ios::binary).read(head.data(), 8);
+  EXPECT_EQ(head, "\x89PNG\r\n\x1a\n");
+
+  std::filesystem::create_directory(folder / "b.png");
+  const auto error = renderToPNG(draw, {10, 10}, 1, kWhite, folder / "b.png");
+  ASSERT_NE(error, nullptr);
+  EXPECT_NE(error->reason().find((folder / "b.png").native()), std::string::npos);
+  const std::filesystem::directory_iterator files(folder);
+  EXPECT_EQ(std::distance(begin(files), end(files)), 2) << "nothing half-written stays";
+  std::filesystem::remove_all(folder);
+}
+
+TEST(NamedImages, AreSharpAtAnyScaleAndReadableInBothAppearances) {
+  const TestPlatform platform;
+  CairoImageResources images;
+  for (const char* name : {"good-v2", "good-alt-v2", "advisories-v2", "WidgetGenericTransit"}) {
+    const auto small = Ink(images.image(name, 1, false)).drawn(), large = Ink(images.image(name, 4, false)).drawn();
+    EXPECT_EQ(images.image(name, 4, false)->size(), (Size{32, 32}));
+    EXPECT_NEAR(large.left, 4 * small.left, 4) << name;
+    EXPECT_NEAR(large.right, 4 * small.right, 4) << name;
+    EXPECT_NEAR(large.bottom, 4 * small.bottom, 4) << name;
+    EXPECT_GT(large.bottom - large.top, 80) << name;
+    // Few pixels are neither inside nor outside.
+    const auto edge = Ink(images.image(name, 4, false)).find([](auto p) { return p >> 24 > 0 && p >> 24 < 255; });
+    EXPECT_LT(edge.count, large.count / 4) << name;
+  }
+  EXPECT_GT(Ink(images.image("advisories-v2", 2, true)).ofColor(0xffffff).count, 300u);
+  EXPECT_EQ(images.image("good-v2", 2, true), images.image("good-v2", 2, true));
+  EXPECT_TRUE(platform.log.lines().empty());
+  EXPECT_EQ(images.image("no-such-image", 2, true), nullptr);
+  EXPECT_EQ(images.image("no-such-image", 2, true), nullptr);
+  EXPECT_EQ(platform.log.texts("Images", LogLevel::error).size(), 1u);
+}
+
+TEST(VectorImage, ReadsItsPartOfSVG) {
+  const auto parsed = VectorImage::parse(R"(<?xml version="1.0"?><!-- a > b --><svg viewBox="0 0 8 4">
+    <path d="M0 0 H2 V2 L0,2Z M5 0 6 0 6 1 C6 1.5 5 1.5 5 1 Z" fill="#ff0000"/>
+    <rect x="0" y="3" width="8" height="1" fill="currentColor"></rect>
+    <circle cx="7" cy="1" r=".5" fill="none" stroke="#0000ff" stroke-width="0.2" stroke-linecap="round"/></svg>)");
+  ASSERT_TRUE(parsed.image) << parsed.problem;
+  EXPECT_EQ(parsed.image->size(), (Size{8, 4}));
+  for (const char* svg :
+       {"", "<svg>", "<svg viewBox=\"0 0 0 4\"></svg>", "<svg viewBox=\"0 0 8 4\">", "<g/>",
+        "<svg viewBox=\"0 0 8 4\"><g/></svg>", "<svg viewBox=\"0 0 8 4\"><path d=\"M1\"/></svg>",
+        "<svg viewBox=\"0 0 8 4\"><path d=\"M0 0 A1 1\"/></svg>", "<svg viewBox=\"0 0 8 4\"><!--",
+        "<svg viewBox=\"0 0 8 4\"><path d=\"L1 1\"/></svg>", "<svg viewBox=\"0 0 8 4\"><path d=\"M0 0 Z 1\"/></svg>",
+        "<svg viewBox=\"0 0 8 4\"><path d=\"M0 1e999\"/></svg>", "<svg viewBox=\"0 0 8 4\"><rect width=\"1px\"/></svg>",
+        "<svg viewBox=\"0 0 8 4\"><path fill=\"red\" d=\"\"/></svg>"}) {
+    const auto bad = VectorImage::parse(svg);
+    EXPECT_FALSE(bad.image) << svg;
+    EXPECT_FALSE(bad.problem.empty()) << svg;
+  }
+}
+
+}  // namespace
+}  // namespace nimbo

@@ -1,0 +1,161 @@
+#include <gtest/gtest.h>
+#include <unistd.h>
+
+#include <cmath>
+#include <cstdlib>
+#include <filesystem>
+#include <fstream>
+#include <limits>
+#include <string>
+
+#include "DrawingInk.h"
+#include "desktop/drawing/PangoTextSystem.h"
+#include "desktop/drawing/Rendering.h"
+#include "support/TestPlatform.h"
+
+namespace nimbo {
+namespace {
+
+constexpr FontDescriptor kBody{17, false};
+constexpr double kUnlimited = std::numeric_limits<double>::infinity();
+constexpr Color kBlack{0, 0, 0, 1}, kWhite{1, 1, 1, 1};
+
+class PangoText : public testing::Test {
+ protected:
+  TextLayoutRef layOut(const std::string& text, double width = kUnlimited, std::size_t lines = 0,
+                       bool rightToLeft = false, TextAlignment alignment = TextAlignment::natural) {
+    return system.layOut(text, kBody, width, lines, alignment, rightToLeft);
+  }
+  /// Black on white within 200 points, 40 high.
+  Ink drawn(const TextLayout& layout, double scale = 1) {
+    return Ink(*renderToSurface(
+                    [&](Painter& painter) {
+                      painter.drawText(layout, {0, 0}, 200, kBlack);
+                    },
+                    {200, 40}, scale, kWhite)
+                    .surface);
+  }
+  static Ink::Found dark(const Ink& ink) {
+    return ink.find([](std::uint32_t pixel) { return (pixel & 0xff) < 160; });
+  }
+
+  TestPlatform platform;
+  PangoTextSystem system;
+};
+
+TEST_F(PangoText, MeasuresTheCapitalsThatItDraws) {
+  const FontMetrics metrics = system.metrics(kBody);
+  const auto layout = layOut("HHH");
+  EXPECT_NEAR(layout->firstBaseline(), metrics.ascent, 0.01);
+  EXPECT_NEAR(layout->size().height, metrics.ascent + metrics.descent, 0.01);
+  const auto ink = dark(drawn(*layout, 8));
+  EXPECT_NEAR(ink.bottom / 8.0, layout->firstBaseline(), 0.25);
+  EXPECT_NEAR((ink.bottom - ink.top) / 8.0, metrics.capHeight, 0.25);
+  EXPECT_DOUBLE_EQ(system.metrics({34, false}).capHeight, 2 * metrics.capHeight);
+  EXPECT_GT(system.layOut("Hamburg", {17, true}, kUnlimited, 1, TextAlignment::natural, false)->size().width,
+            layOut("Hamburg")->size().width);
+  EXPECT_THROW(system.metrics({0, false}), std::invalid_argument);
+  EXPECT_THROW(system.layOut("a", {std::nan(""), false}, 1, 1, TextAlignment::natural, false), std::invalid_argument);
+}
+
+TEST_F(PangoText, DrawsAsWideOnEveryScreenAsItMeasured) {
+  const auto layout = layOut("Mill Street");
+  for (const double scale : {1.0, 1.5, 4.0}) {
+    const auto ink = dark(drawn(*layout, scale));
+    EXPECT_NEAR((ink.right - ink.left) / scale, layout->size().width, 3) << scale;
+  }
+}
+
+TEST_F(PangoText, BreaksLinesAndCutsTheLastOne) {
+  const std::string text = "Trains run every twenty minutes between Mill Street and Harbour";
+  const auto all = layOut(text, 150), two = layOut(text, 150, 2), one = layOut(text, 150, 1);
+  EXPECT_GT(all->lineCount(), 2u);
+  EXPECT_FALSE(all->isTruncated());
+  EXPECT_EQ(two->lineCount(), 2u);
+  EXPECT_TRUE(two->isTruncated());
+  EXPECT_EQ(one->lineCount(), 1u);
+  EXPECT_TRUE(one->isTruncated());
+  EXPECT_NEAR(layOut(text, one->size().width, 1)->size().width, one->size().width, 0.01);
+  for (const auto& layout : {all, two, one}) EXPECT_LE(layout->size().width, 150);
+  EXPECT_NEAR(all->lastBaseline() - all->firstBaseline(),
+              static_cast<double>(all->lineCount() - 1) * one->size().height, 0.5);
+  // A box of exactly the measured width holds the text.
+  const auto whole = layOut(text, kUnlimited, 1);
+  EXPECT_FALSE(layOut(text, whole->size().width, 1)->isTruncated());
+  EXPECT_EQ(layOut("a\nb\r\nc\u2028d", kUnlimited, 1)->lineCount(), 1u);
+  EXPECT_EQ(layOut("a\nb\r\nc\u2028d")->lineCount(), 4u);
+  EXPECT_EQ(layOut("one word each", 0)->lineCount(), 3u);
+  EXPECT_EQ(layOut("", 100, 1)->lineCount(), 1u);
+}
+
+TEST_F(PangoText, BeginsLinesOnTheSideOfTheParagraph) {
+  const int width = 200;
+  const auto left = dark(drawn(*layOut("abc", width))), right = dark(drawn(*layOut("abc", width, 0, true)));
+  const auto arabic = dark(drawn(*layOut("تأخير", width, 1, true)));
+  const auto center = dark(drawn(*layOut("abc", width, 0, false, TextAlignment::center)));
+  EXPECT_LT(left.left, 4);
+  EXPECT_GT(right.right, width - 4);
+  EXPECT_GT(arabic.right, width - 4);
+  EXPECT_NEAR(center.left, width - center.right, 3);
+  // The direction orders the runs of a mixed text: the full stop goes to the end of the paragraph.
+  EXPECT_LT(dark(drawn(*layOut("abc.", width, 0, true))).left, dark(drawn(*layOut("abc", width, 0, true))).left);
+}
+
+TEST_F(PangoText, SurvivesAwkwardTexts) {
+  std::string marks;
+  for (int i = 0; i < 5000; ++i) marks += "\u0301";
+  const std::string texts[] = {marks,
+                               std::string("a\xff\xfe\xc3"),
+                               std::string("a\0b", 3),
+                               std::string(10000, 'x'),
+                               "\u202e\u202d\u2067abc",
+                               "a\u05d0b\u0627c",
+                               std::string(300000, '\n')};
+  for (const auto& text : texts)
+    for (const double width : {0.0, 1.0, 10000.0, -1.0, std::nan("")})
+      for (const std::size_t lines : {0u, 1u, 3u}) {
+        const auto layout = layOut(text, width, lines);
+        EXPECT_GE(layout->lineCount(), 1u);
+        EXPECT_TRUE(lines == 0 || layout->lineCount() <= lines);
+        EXPECT_TRUE(std::isfinite(layout->size().width) && std::isfinite(layout->size().height));
+      }
+  EXPECT_EQ(layOut("a\xff")->size().width, layOut("a\uFFFD")->size().width);
+}
+
+TEST_F(PangoText, CutsWhatNoRowCouldShow) {
+  const std::size_t limit = PangoTextSystem::kMaximumCharacters;
+  EXPECT_FALSE(layOut(std::string(limit, 'x'))->isTruncated());
+  const auto cut = layOut(std::string(limit + 1, 'x'));
+  EXPECT_TRUE(cut->isTruncated());
+  EXPECT_NEAR(cut->size().width, layOut(std::string(limit, 'x') + "…")->size().width, 0.01);
+  // The letter before the cut keeps its accent or goes with it.
+  const std::string head(limit - 1, 'x');
+  EXPECT_NEAR(layOut(head + "e\u0301xyz")->size().width, layOut(head + "…")->size().width, 0.01);
+}
+
+TEST_F(PangoText, LogsOnceThatCharactersHaveNoFont) {
+  layOut("\U0010FFFD and \U0010FFFC");
+  layOut("\U0010FFFD");
+  EXPECT_EQ(platform.log.texts("Text", LogLevel::error).size(), 1u);
+}
+
+TEST(PangoTextWithoutFonts, StillMeasuresAndLogs) {
+  testing::GTEST_FLAG(death_test_style) = "threadsafe";
+  const auto run = [] {
+    const auto config = std::filesystem::temp_directory_path() / ("nimbo-no-fonts-" + std::to_string(getpid()));
+    std::ofstream(config) << "<fontconfig></fontconfig>";
+    setenv("FONTCONFIG_FILE", config.c_str(), 1);
+    const TestPlatform platform;
+    PangoTextSystem system;
+    const FontMetrics metrics = system.metrics(kBody);
+    const auto layout = system.layOut("Mill Street", kBody, 60, 2, TextAlignment::natural, false);
+    std::filesystem::remove(config);
+    const bool isInOrder = metrics.ascent > 0 && metrics.descent > 0 && metrics.capHeight > 0 &&
+                           layout->size().width > 0 && platform.log.texts("Text").size() == 1;
+    std::_Exit(isInOrder ? 0 : 1);
+  };
+  EXPECT_EXIT(run(), testing::ExitedWithCode(0), "");
+}
+
+}  // namespace
+}  // namespace nimbo
