@@ -13,28 +13,34 @@
 
 namespace nimbo {
 
+/// What a static feed holds.
+struct CheckedStaticFeed {
+  std::size_t agencies = 0;
+  std::size_t lines = 0;
+  std::size_t trips = 0;
+  std::string language;  ///< empty where the feed does not say
+  SkipReport skipped;    ///< rows
+};
+
+/// What an alerts feed holds, and how it fits the static one.
+struct CheckedAlerts {
+  std::string version;
+  std::optional<Date> timestamp;
+  ErrorRef staleness;  ///< not null when the feed is too old to be used
+  std::size_t alerts = 0;
+  SkipReport skipped;  ///< entities and alerts that make no incident
+  // Against the static feed; 0 and empty where that cannot be read.
+  std::size_t periods = 0;  ///< of alerts that concern a line
+  std::size_t selectors = 0;
+  std::size_t incidents = 0;      ///< different ones, in force or to come
+  std::size_t affectedLines = 0;  ///< with an incident in force now
+  SkipReport unfit;               ///< selectors that fit no line: how a false "good service" comes about
+};
+
 /// What a feed holds and how well its two halves fit together.
 struct FeedCheckReport {
-  struct Static {
-    std::size_t agencies = 0;
-    std::size_t lines = 0;
-    std::size_t trips = 0;
-    std::string language;  ///< empty where the feed does not say
-    SkipReport skipped;    ///< rows
-  };
-  struct Alerts {
-    std::string version;
-    std::optional<Date> timestamp;
-    ErrorRef staleness;  ///< not null when the feed is too old to be used
-    std::size_t alerts = 0;
-    SkipReport skipped;  ///< entities and alerts that make no incident
-    // Against the static feed; 0 and empty where that cannot be read.
-    std::size_t periods = 0;  ///< of alerts that concern a line
-    std::size_t selectors = 0;
-    std::size_t incidents = 0;      ///< different ones, in force or to come
-    std::size_t affectedLines = 0;  ///< with an incident in force now
-    SkipReport unfit;               ///< selectors that fit no line: how a false "good service" comes about
-  };
+  using Static = CheckedStaticFeed;
+  using Alerts = CheckedAlerts;
 
   std::string name;
   std::optional<Static> staticFeed;

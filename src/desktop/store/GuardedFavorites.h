@@ -23,6 +23,7 @@ class GuardedFavorites final : public FavoritesPersisters, public TransitLineSer
  private:
   /// Shared with the persisters, which live as long as the platform's favourites store.
   struct State {
+    explicit State(FavoritesEditor favoritesEditor) : editor(std::move(favoritesEditor)) {}
     FavoritesEditor editor;
     std::mutex lock;
     ErrorRef failure;  // of the last reading
