@@ -170,6 +170,9 @@ TEST_F(Layout, PutsEdgesOnDevicePixelsOfTheScreen) {
                                          box->heightAnchor().constraintEqualToConstant(7.5)});
   root->layoutIfNeeded();
   EXPECT_EQ(box->frame(), (Rect{3.5, 46.5, 10, 7.5}));
+  Environment::current().setScreenScale(1);
+  root->layoutIfNeeded();
+  EXPECT_EQ(box->frame(), (Rect{3, 46, 11, 8}));
 }
 
 TEST_F(Layout, DropsConstraintsToAViewThatLeaves) {

@@ -3,6 +3,7 @@
 #include <algorithm>
 #include <cmath>
 #include <stdexcept>
+#include <utility>
 
 #include "platform/Platform.h"
 #include "platform/ui/DrawingContext.h"
@@ -189,7 +190,16 @@ void View::setNeedsLayout() {
   for (View* view = this; view; view = view->_superview) view->_subtreeNeedsLayout = true;
 }
 
+/// Everything is rounded to device pixels: another screen is another layout.
+void View::setNeedsLayoutInside() {
+  _needsLayout = _subtreeNeedsLayout = true;
+  if (_engine) _engine->setNeedsUpdate();
+  for (const auto& view : _subviews) view->setNeedsLayoutInside();
+}
+
 void View::layoutIfNeeded() {
+  const double scale = screenScale();
+  if (!_superview && std::exchange(_laidOutScale, scale) != scale) setNeedsLayoutInside();
   View& root = layoutRoot();
   if (&root != this && root._engine) root._engine->layOut();
   for (int round = 0; round < kMaxLayoutRounds && layoutOnce(); ++round) {

@@ -125,6 +125,7 @@ class View : public LayoutItem {
 
  private:
   View& layoutRoot();
+  void setNeedsLayoutInside();
   bool layoutOnce();
   void holdConstraint(std::shared_ptr<LayoutConstraint> constraint);
   void dropConstraint(const LayoutConstraint& constraint);
@@ -138,6 +139,7 @@ class View : public LayoutItem {
   std::vector<std::shared_ptr<LayoutConstraint>> _constraints;
   std::unique_ptr<LayoutEngine> _engine;  // of a layout root with constraints inside
   std::optional<bool> _rightToLeft;
+  double _laidOutScale = 0;  // of the screen, when the root of all views was last laid out
   int _compressionRank = 0;
   bool _hidden = false;
   bool _usesAutomaticConstraints = true;
