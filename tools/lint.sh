@@ -11,8 +11,8 @@ echo "lint: the form of ${#files[@]} files is right"
 [ -z "${NIMBO_LINT_FAST:-}" ] || exit 0
 
 # The widget's rooms and the platform, standard library alone: version 14 of clang-tidy stumbles over C++20 that the
-# compiler takes in the desktop's sources, which the warnings and the sanitizers watch.
-mapfile -t sources < <(git ls-files -co --exclude-standard -- 'src/*.cpp' | grep -vE '^src/(desktop|host|process)/')
+# compiler takes in the other folders, which the warnings and the sanitizers watch.
+mapfile -t sources < <(git ls-files -co --exclude-standard -- 'src/*.cpp' | grep -vE '^src/(desktop|host|process|handoff|platform/wire)/')
 printf '%s\n' "${sources[@]}" |
   xargs -P "$(nproc)" -n 4 clang-tidy -p "$build" --quiet --extra-arg=-Wno-unknown-warning-option --warnings-as-errors='*' 2>/dev/null
 echo "lint: clang-tidy has nothing to say of ${#sources[@]} files"
