@@ -8,7 +8,6 @@
 
 #include "DrawingInk.h"
 #include "desktop/drawing/CairoImageResources.h"
-#include "desktop/drawing/PangoTextSystem.h"
 #include "desktop/drawing/Rendering.h"
 #include "desktop/drawing/VectorImage.h"
 #include "support/TestPlatform.h"
@@ -91,18 +90,6 @@ TEST(Picture, FitsImagesAndTintsTheirShape) {
   EXPECT_EQ(greys(2.3), greys(1.74));
   const std::uint32_t faint = drawn(0.3, kBlack).at(35, 15) & 0xff;
   EXPECT_NEAR(faint, 255 * 0.7, 2);
-}
-
-TEST(Picture, RefusesWhatAnotherPlatformMade) {
-  const ImageDouble image({1, 1}, 1);
-  TextSystemDouble text;
-  const auto layout = text.layOut("a", {10, false}, 100, 1, TextAlignment::natural, false);
-  renderToSurface(
-      [&](Painter& painter) {
-        EXPECT_THROW(painter.drawImage(image, {0, 0, 1, 1}, 1, kNone), std::invalid_argument);
-        EXPECT_THROW(painter.drawText(*layout, {0, 0}, 10, kBlack), std::invalid_argument);
-      },
-      {10, 10}, 1, kWhite);
 }
 
 TEST(Picture, IsWrittenWholeOrNotAtAll) {

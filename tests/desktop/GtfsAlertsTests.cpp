@@ -298,6 +298,11 @@ TEST(Incident, OfOneIdentifierInSeveralEntities) {
   const IncidentReading languages = reader.read(dutch + english);
   ASSERT_EQ(languages.incidents[0].size(), 1u);
   EXPECT_EQ(languages.incidents[0][0]->title(), "Strike");
+  reader.query.language.user = "nl";  // whose text the third alert does not have
+  const IncidentReading inDutch = reader.read(dutch + english + "entity { id: 'y' alert { " + route("t2") +
+                                              " header_text { translation { text: 'Strike' language: 'en' } } } } ");
+  EXPECT_EQ(inDutch.incidents[0].at(0)->title(), "Staking");
+  EXPECT_EQ(inDutch.incidents[1].at(0)->title(), "Strike");
   const IncidentReading others = reader.read(english + flood);
   ASSERT_EQ(others.incidents[0].size(), 2u);
   EXPECT_NE(others.incidents[0][0]->muid(), others.incidents[0][1]->muid());

@@ -20,6 +20,7 @@ AlertEffect effectOf(std::uint64_t number) {
 
 AlertView readAlertView(std::string_view alert, const std::function<void(const EntitySelector&)>& onSelector) {
   AlertView view;
+  const auto take = [&](std::string_view& text, std::string_view message) { text = text.empty() ? message : alert; };
   for (auto message = messageIn<AlertField>(alert); message.next();) {
     switch (message.tag()) {
       case AlertField::informedEntity:
@@ -32,13 +33,16 @@ AlertView readAlertView(std::string_view alert, const std::function<void(const E
         view.content.effect = effectOf(takeNumber(message));
         break;
       case AlertField::url:
-        view.content.url = takeView(message);
+        take(view.content.url, takeView(message));
         break;
       case AlertField::headerText:
-        view.content.header = takeView(message);
+        take(view.content.header, takeView(message));
         break;
       case AlertField::descriptionText:
-        view.content.description = takeView(message);
+        take(view.content.description, takeView(message));
+        break;
+      case AlertField::effectDetail:
+        take(view.content.effectDetail, takeView(message));
         break;
       case AlertField::severityLevel:
         view.isSevere = takeNumber(message) == kSeveritySevere;

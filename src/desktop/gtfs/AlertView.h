@@ -12,16 +12,25 @@ namespace nimbo {
 /// An alert's texts as published and what else makes it the incident that it is: equal for an alert that a feed repeats
 /// under another identifier.
 struct AlertContent {
-  std::string_view header, description, url;  // TranslatedString messages
+  // TranslatedString messages; where one comes in pieces, the whole alert stands for it.
+  std::string_view header, description, url, effectDetail;
   std::int32_t cause = kUnknownCause;
   AlertEffect effect = AlertEffect::unknownEffect;
 
   bool operator==(const AlertContent&) const = default;
 
-  /// Equal for equal contents, made without reading the texts.
+  /// Equal for equal contents, made without reading the texts: most alerts that are no repetition differ in it.
   std::size_t sizeHash() const {
-    return ((header.size() * 131 + description.size()) * 131 + url.size()) * 131 +
-           static_cast<std::size_t>(cause) * 16 + static_cast<std::size_t>(effect);
+    return hashBy([](std::string_view text) { return text.size(); });
+  }
+  std::size_t hash() const { return hashBy(std::hash<std::string_view>()); }
+
+ private:
+  template <class Hash>
+  std::size_t hashBy(const Hash& ofText) const {
+    std::size_t hash = static_cast<std::size_t>(cause) * 16 + static_cast<std::size_t>(effect);
+    for (const std::string_view text : {header, description, url, effectDetail}) hash = hash * 131 + ofText(text);
+    return hash;
   }
 };
 

@@ -12,6 +12,8 @@ namespace nimbo {
 
 namespace {
 
+constexpr std::size_t kMostEntities = 100'000;  // no network comes near; each costs memory
+
 ErrorRef badAlerts(const std::string& place, const std::string& what) {
   return transitLineServiceError(TransitLineServiceError::badAlerts,
                                  "The alerts feed " + place + " cannot be used: " + what);
@@ -119,6 +121,7 @@ Outcome<AlertsFeed> AlertsFeed::read(std::string bytes, const std::string& place
   AlertsFeed feed;
   feed._bytes = std::make_shared<const std::string>(std::move(bytes));
   if (feed._bytes->empty()) return badAlerts(place, whatElse({}));
+  std::size_t entities = 0;
   try {
     for (auto message = messageIn<FeedMessageField>(*feed._bytes); message.next();) {
       switch (message.tag()) {
@@ -127,6 +130,10 @@ Outcome<AlertsFeed> AlertsFeed::read(std::string bytes, const std::string& place
           break;
         case FeedMessageField::entity: {
           const std::string_view body = takeView(message);
+          if (++entities > kMostEntities)
+            return transitLineServiceError(TransitLineServiceError::tooLarge,
+                                           "The alerts feed " + place + " holds more than " +
+                                               std::to_string(kMostEntities) + " entities. Check the address.");
           try {
             feed.readEntity(body);
           } catch (const protozero::exception&) {

@@ -5,6 +5,7 @@
 #include <protozero/exception.hpp>
 #include <tuple>
 #include <unordered_map>
+#include <unordered_set>
 
 #include "desktop/gtfs/AlertIncident.h"
 #include "desktop/gtfs/AlertPeriods.h"
@@ -21,7 +22,6 @@ struct Incident {
   std::string key;  // the least of its alerts
   AlertTexts texts;
   AlertEffect effect;
-  std::vector<AlertContent> contents;  // as published: the texts of one language may agree where others differ
   struct OnLine {
     std::vector<AlertPeriod> periods;
     bool isWholeLine = false;
@@ -29,7 +29,12 @@ struct Incident {
   std::map<std::size_t, OnLine> lines;  // by place in the query
 };
 
-using ContentKey = std::tuple<std::string, std::string, std::string, std::int32_t, AlertEffect>;
+/// Title, description, address, cause and effect.
+using TextsKey = std::tuple<std::string, std::string, std::string, std::int32_t, AlertEffect>;
+
+struct ContentHash {
+  std::size_t operator()(const AlertContent& content) const { return content.hash(); }
+};
 
 std::string_view reasonFor(SelectorFit fit) {
   switch (fit) {
@@ -109,18 +114,18 @@ class IncidentBuilder {
       _reading.skipped.add("alert without effect on the service, or about accessibility", alert.id);
       return;
     }
-    const auto texts = alertTextsIn(alert.body, view.content.effect, _query.language);
-    if (!texts) {
-      _reading.skipped.add("alert that says nothing", alert.id);
-      return;
-    }
     const AlertPeriods periods = alertPeriodsIn(alert.body);
     _reading.periods += periods.published;
     if (periods.periods.empty()) {
       _reading.skipped.add("alert whose periods end before they start", alert.id);
       return;
     }
-    Incident& incident = incidentFor(keyOf(alert), *texts, view.content);
+    const auto index = incidentOf(alert, view.content);
+    if (!index) {
+      _reading.skipped.add("alert that says nothing", alert.id);
+      return;
+    }
+    Incident& incident = _incidents[*index];
     for (const auto& [place, isWholeLine] : _lines) {
       Incident::OnLine& onLine = incident.lines[place];
       onLine.periods.insert(onLine.periods.end(), periods.periods.begin(), periods.periods.end());
@@ -137,30 +142,30 @@ class IncidentBuilder {
     if (_query.countsUnfit && fit != SelectorFit::lines) _reading.unfit.add(reasonFor(fit), exampleOf(selector));
   }
 
-  Incident& incidentFor(std::string key, const AlertTexts& texts, const AlertContent& content) {
-    const ContentKey contentKey{texts.title, texts.description.value_or(""), texts.linkURL.value_or(""), content.cause,
-                                content.effect};
-    const auto [place, isNew] = _incidentOfContent.try_emplace(contentKey, _incidents.size());
-    if (isNew) _incidents.push_back({std::move(key), texts, content.effect, {}, {}});
-    Incident& incident = _incidents[place->second];
-    if (std::find(incident.contents.begin(), incident.contents.end(), content) == incident.contents.end())
-      incident.contents.push_back(content);
-    return incident;
+  /// The incident that the alert is, or is one of; absent for one that says nothing. Texts are read once a content.
+  std::optional<std::size_t> incidentOf(const AlertEntity& alert, const AlertContent& content) {
+    if (const auto known = _incidentOfContent.find(content); known != _incidentOfContent.end()) return known->second;
+    const auto texts = alertTextsIn(alert.body, content.effect, _query.language);
+    if (!texts) return std::nullopt;
+    // Texts of one language may agree where those of others differ.
+    const auto [place, isNew] = _incidentOfTexts.try_emplace(
+        {texts->title, texts->description.value_or(""), texts->linkURL.value_or(""), content.cause, content.effect},
+        _incidents.size());
+    if (isNew) _incidents.push_back({keyOf(alert), *texts, content.effect, {}});
+    _incidentOfContent.emplace(content, place->second);
+    _sizesOfContents.insert(content.sizeHash());
+    return place->second;
   }
 
   /// Alerts of the same content that concern other lines, or are over, are the same incident: their identifiers count
   /// for its number too.
   void takeLeastKeys() {
-    std::unordered_multimap<std::size_t, std::pair<AlertContent, Incident*>> bySize;
-    for (Incident& incident : _incidents)
-      for (const AlertContent& content : incident.contents)
-        bySize.emplace(content.sizeHash(), std::pair{content, &incident});
     for (const auto& [alert, content] : _contents) {
-      const auto [begin, end] = bySize.equal_range(content.sizeHash());
-      for (auto found = begin; found != end; ++found) {
-        const auto& [wanted, incident] = found->second;
-        if (wanted == content) incident->key = std::min(incident->key, keyOf(*alert));
-      }
+      if (!_sizesOfContents.contains(content.sizeHash())) continue;
+      const auto found = _incidentOfContent.find(content);
+      if (found == _incidentOfContent.end()) continue;
+      std::string& key = _incidents[found->second].key;
+      key = std::min(key, keyOf(*alert));
     }
   }
 
@@ -196,7 +201,9 @@ class IncidentBuilder {
   std::map<std::size_t, bool> _lines;  // of the alert at hand: place in the query, whether it is about the whole line
   std::vector<std::pair<const AlertEntity*, AlertContent>> _contents;  // of all alerts
   std::vector<Incident> _incidents;
-  std::map<ContentKey, std::size_t> _incidentOfContent;
+  std::map<TextsKey, std::size_t> _incidentOfTexts;
+  std::unordered_map<AlertContent, std::size_t, ContentHash> _incidentOfContent;
+  std::unordered_set<std::size_t> _sizesOfContents;  // by `sizeHash`
 };
 
 }  // namespace
