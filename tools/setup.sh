@@ -1,5 +1,5 @@
 #!/usr/bin/env bash
-# Installs the Debian packages that are missing: setup.sh run|test|lint (test holds run, lint holds test).
+# Installs the Debian packages that are missing: setup.sh run|test|lint|bench (all hold run, lint holds test).
 # Quick when nothing is missing. Needs root, or a user with sudo.
 set -euo pipefail
 purpose=${1:-run}
@@ -13,8 +13,10 @@ packages=(
 )
 case $purpose in
   run) ;;
-  test | lint) packages+=(libgtest-dev libgmock-dev protobuf-compiler libprotobuf-dev python3 python3-kiwisolver zlib1g-dev) ;;
-  *) echo "usage: tools/setup.sh run|test|lint" >&2; exit 2 ;;
+  test | lint) packages+=(libgtest-dev libgmock-dev protobuf-compiler libprotobuf-dev python3 python3-kiwisolver zlib1g-dev libssl-dev) ;;
+  bench) packages+=(libbenchmark-dev protobuf-compiler libprotobuf-dev python3 python3-dev python3-kiwisolver
+    libgtkmm-4.0-dev libxdamage-dev xvfb) ;;
+  *) echo "usage: tools/setup.sh run|test|lint|bench" >&2; exit 2 ;;
 esac
 [ "$purpose" != lint ] || packages+=(clang-format clang-tidy git)
 

@@ -1,0 +1,242 @@
+"""Measures every row beside its peer, turn by turn, and prints one table of ratios.
+
+    table.py BUILD [--pairs N] [--rows WORD]
+
+A pair is one run of each side, one right after the other, the sides changing places from pair to pair. A row's figure
+is the median of its pairs' ratios; the spread is the middle half of them. Rows without a peer are in their own unit.
+"""
+
+import argparse
+import json
+import os
+import pathlib
+import shutil
+import sqlite3
+import statistics
+import subprocess
+import sys
+import tempfile
+
+FAVORITES = 20
+PAIR_SECONDS = 0.15  # that a function runs for in one pair
+
+
+class Row:
+    """One row: `measure` and `measure_peer` answer a figure each; without a peer the figure counts itself."""
+
+    def __init__(self, name, aim, measure, measure_peer=None, unit="", peer="-"):
+        self.name, self.aim, self.unit, self.peer = name, aim, unit, peer
+        self.measure, self.measure_peer = measure, measure_peer
+
+    def figures(self, pairs):
+        figures, ours, theirs = [], [], []
+        for number in range(pairs):
+            if not self.measure_peer:
+                figures.append(self.measure())
+                continue
+            sides = [(self.measure, ours), (self.measure_peer, theirs)]
+            for measure, values in sides if number % 2 == 0 else reversed(sides):
+                values.append(measure())
+            figures.append(ours[-1] / theirs[-1])
+        note = f"{statistics.median(ours):.3g} : {statistics.median(theirs):.3g}" if theirs else ""
+        return figures, note
+
+    def line(self, pairs):
+        figures, note = self.figures(pairs)
+        median = statistics.median(figures)
+        low, _, high = statistics.quantiles(figures, n=4)
+        verdict = "-" if self.aim is None else "met" if median <= self.aim else "missed"
+        aim = "-" if self.aim is None else f"{self.aim:g} {self.unit}".strip()
+        spread = f"{low:.3g} to {high:.3g}"
+        return f"| {self.name} | {self.peer} | {median:.3g} {self.unit} | {spread} | {aim} | {verdict} | {note} |"
+
+
+def run(*command, **options):
+    done = subprocess.run([str(word) for word in command], capture_output=True, text=True, **options)
+    if done.returncode != 0:
+        sys.exit(f"bench: {command[0]}: {done.stderr.strip() or done.stdout.strip()}")
+    return done.stdout
+
+
+class Bench:
+    def __init__(self, build, folder):
+        self.build, self.folder = build, folder
+        self.widget = build / "src/process/nimbo-transit-widget"
+        self.environment = dict(os.environ, GSETTINGS_BACKEND="memory", NO_AT_BRIDGE="1", GTK_A11Y="none")
+
+    # Functions: Google Benchmark, one of them at a time.
+
+    def function(self, name):
+        def measure():
+            report = json.loads(run(self.build / "bench/nimbo-bench", f"--benchmark_filter=^{name}$",
+                                    f"--benchmark_min_time={PAIR_SECONDS}", "--benchmark_format=json"))
+            result = report["benchmarks"][0]
+            if result.get("error_occurred"):
+                sys.exit(f"bench: {name}: {result['error_message']}")
+            scale = {"ns": 1e-9, "us": 1e-6, "ms": 1e-3}[result["time_unit"]]
+            # What a shared machine adds to the wall clock is none of the function's.
+            return result["real_time" if "manual_time" in result["name"] else "cpu_time"] * scale
+        return measure
+
+    def pair(self, name):
+        return self.function(name), self.function(name + "Peer")
+
+    def timed(self, name, scale):
+        measure = self.function(name)
+        return lambda: measure() * scale
+
+    # Whole processes.
+
+    def process(self, key, *arguments, scale=1):
+        def measure():
+            report = json.loads(run(self.build / "bench/nimbo-bench-process", *arguments, env=self.environment))
+            return report[key] * scale
+        return measure
+
+    def requests(self, name, *methods):
+        path = self.folder / name
+        modes = {"compact": [359, 110], "expanded": [359, 660]}
+        lines = [("initialize", {"locale": "en", "displayModes": modes, "activeDisplayMode": "expanded"})] + list(methods)
+        text = "".join(json.dumps({"jsonrpc": "2.0", "id": number, "method": method, "params": params}) + "\n"
+                       for number, (method, params) in enumerate(lines, 1))
+        path.write_text(text)
+        return path, f'"id":{len(lines)},'
+
+    def prepare(self):
+        """A state with saved rows, the same rows for the bare program, and a large feed."""
+        state = self.folder / "state"
+        arguments = ["--config", self.folder / "config", "--state", state]
+        appear = [("loadView", {}), ("performUpdate", {}), ("snapshot", {}), ("viewWillAppear", {}),
+                  ("viewWillDisappear", {}), ("viewDidDisappear", {}), ("shutdown", {})]
+        output = self.converse(arguments, appear)
+        snapshot = next(message["result"] for message in output if "rows" in message.get("result", {}))
+        with sqlite3.connect(self.folder / "bare.sqlite") as database:
+            database.execute("PRAGMA journal_mode = WAL")
+            database.execute("CREATE TABLE rows (title, text, shield, color)")
+            for row in snapshot["rows"]:
+                shield = ((row.get("artwork") or {}).get("shield")) or {}
+                color = int((shield.get("color") or "#000000")[1:], 16)
+                database.execute("INSERT INTO rows VALUES (?, ?, ?, ?)",
+                                 (row["primaryText"], row["secondaryText"], shield.get("text"), color))
+        self.arguments = arguments
+        run(self.build / "bench/nimbo-bench-feed", self.folder / "feed")
+        self.large = ["--config", self.folder / "large", "--state", self.folder / "large"]
+        program = self.build / "src/host/nimbo-transit"
+        run(program, *self.large, "feed", "add", "metro", "--static", self.folder / "feed", "--alerts",
+            self.folder / "feed/alerts.pb")
+        for number in range(FAVORITES):
+            run(program, *self.large, "favorite", "add", f"metro:R{number * 200}")
+
+    def converse(self, arguments, methods):
+        path, last = self.requests("prepare", *methods)
+        child = subprocess.Popen([str(word) for word in [self.widget, *arguments]], stdin=subprocess.PIPE,
+                                 stdout=subprocess.PIPE, text=True)
+        messages = []
+        for request in path.read_text().splitlines():
+            child.stdin.write(request + "\n")
+            child.stdin.flush()
+            wanted = json.loads(request)["id"]
+            while True:
+                message = json.loads(child.stdout.readline())
+                messages.append(message)
+                if message.get("id") == wanted and "method" not in message:
+                    break
+        child.wait()
+        return messages
+
+    def rows(self):
+        first, drawn = self.requests("first", ("loadView", {}), ("render", {"surface": "@PICTURE@"}))
+        start = ["--input", first, "--until", drawn, "--", self.widget, *self.arguments]
+        bare = ["--until", "drawn", "--", self.build / "bench/nimbo-bare-widget", self.folder / "bare.sqlite",
+                "@PICTURE@"]
+        update, updated = self.requests("update", ("loadView", {}), ("performUpdate", {}),
+                                        ("render", {"surface": "@PICTURE@"}))
+        loaded = ["--input", update, "--until", updated.replace("4", "3", 1), "--", self.widget]
+        window = ["--frame", "--", self.build / "src/host/window/nimbo-transit-desktop", *self.arguments]
+        bare_window = ["--frame", "--", self.build / "bench/nimbo-bare-window"]
+        mib = 1 / 1024
+        bare_rows = "bare program: SQLite, Pango, Cairo"
+        return [
+            Row("widget process, start to first pixels, saved rows", 1.25, self.process("seconds", *start),
+                self.process("seconds", *bare), peer=bare_rows),
+            Row("its peak resident memory before the first fetch", 24, self.process("peakKiB", *start, scale=mib),
+                unit="MiB"),
+            Row("the same beside the bare program", None, self.process("peakKiB", *start),
+                self.process("peakKiB", *bare), peer=bare_rows),
+            Row("its private dirty memory before the first fetch", 4,
+                self.process("privateDirtyKiB", *start, scale=mib), unit="MiB"),
+            Row("the same beside the bare program", None, self.process("privateDirtyKiB", *start),
+                self.process("privateDirtyKiB", *bare), peer=bare_rows),
+            Row("its peak resident memory, sample city loaded", 24,
+                self.process("peakKiB", *loaded, *self.arguments, scale=mib), unit="MiB"),
+            Row("its peak resident memory, 5000 routes and 5 MB of alerts loaded", 24,
+                self.process("peakKiB", *loaded, *self.large, scale=mib), unit="MiB"),
+            Row("redraw of six rows, nothing changed", 1.5, *self.pair("redraw"), peer="bare Pango and Cairo"),
+            Row("layout of six rows after a changed constant", 16.7, self.timed("layOut", 1e3), unit="ms"),
+            Row("decode of the hand-off record", 0.4, *self.pair("decode"), peer="libprotobuf, fresh message"),
+            Row("encode of the hand-off record", 1.0, *self.pair("encode"), peer="libprotobuf, built message"),
+            Row("alerts feed of 5 MB and 5000 alerts to the incidents of 20 favourites", 0.25,
+                self.function("alerts/manual_time"), self.function("alertsPeer/real_time"),
+                peer="libprotobuf lite, parse alone"),
+            Row("static feed of 5000 routes, from cache", 0.05, *self.pair("staticFeedFromCache"),
+                peer="libcsv, reading routes.txt"),
+            Row("rebuild, 20 lines with 10 incidents each, all shared by two", 0.2,
+                self.timed("rebuild/shared/20/10", 1e3), unit="ms"),
+            Row("rebuild, 500 lines with 20 incidents each, all shared by two", 16.7,
+                self.timed("rebuild/shared/500/20", 1e3), unit="ms"),
+            Row("rebuild, 500 lines with 20 incidents each, none shared", 16.7,
+                self.timed("rebuild/alone/500/20", 1e3), unit="ms"),
+            Row("its growth from 50 lines", None, self.function("rebuild/shared/500/20"),
+                self.function("rebuild/shared/50/20"), peer="the same of 50 lines"),
+            Row("equality of two equal list items of 20 rows", 5, self.timed("equality/20", 1e6), unit="µs"),
+            Row("one cell's constraints solved from nothing", 1.0, *self.pair("solveCell"),
+                peer="python3-kiwisolver's C++ solver"),
+            Row("one constant changed", 1.0, *self.pair("changeConstant"), peer="python3-kiwisolver's C++ solver"),
+            Row("save and restore of the view state, 20 lines", 1.2, *self.pair("saveAndRestore"),
+                peer="nlohmann CBOR of the same content"),
+            Row("the window's first frame", 0.6, self.process("seconds", *window),
+                self.process("seconds", *bare_window), peer="plain gtkmm window"),
+            Row("the window's resident memory", 40, self.process("residentKiB", *window, scale=mib), unit="MiB"),
+            Row("the same beside the plain window", None, self.process("residentKiB", *window),
+                self.process("residentKiB", *bare_window), peer="plain gtkmm window"),
+        ]
+
+
+class Display:
+    """An X server of its own for the windows."""
+
+    def __enter__(self):
+        read, write = os.pipe()
+        self.server = subprocess.Popen(["Xvfb", "-displayfd", str(write), "-screen", "0", "1280x1024x24", "-nolisten",
+                                        "tcp"], pass_fds=[write], stderr=subprocess.DEVNULL)
+        os.close(write)
+        with os.fdopen(read) as number:
+            os.environ["DISPLAY"] = ":" + number.readline().strip()
+        os.environ.pop("WAYLAND_DISPLAY", None)
+        return self
+
+    def __exit__(self, *_):
+        self.server.terminate()
+        self.server.wait()
+
+
+def main():
+    parser = argparse.ArgumentParser()
+    parser.add_argument("build", type=pathlib.Path)
+    parser.add_argument("--pairs", type=int, default=15)
+    parser.add_argument("--rows", default="", help="only rows whose name holds this")
+    arguments = parser.parse_args()
+    folder = pathlib.Path(tempfile.mkdtemp(prefix="nimbo-bench-"))
+    try:
+        with Display():
+            bench = Bench(arguments.build.resolve(), folder)
+            bench.prepare()
+            print("| row | peer | median | spread | aim | | ours : peer's |\n|---|---|---|---|---|---|---|")
+            for row in bench.rows():
+                if arguments.rows in row.name:
+                    print(row.line(arguments.pairs), flush=True)
+    finally:
+        shutil.rmtree(folder)
+
+
+main()
