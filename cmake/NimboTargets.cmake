@@ -14,3 +14,13 @@ function(nimbo_test name)
   target_link_libraries(${name} PRIVATE ${arg_LIBRARIES} nimbo_warnings GTest::gmock GTest::gtest_main)
   gtest_discover_tests(${name} DISCOVERY_TIMEOUT 60)
 endfunction()
+
+# nimbo_library_name(OUT FILE...): the name by which programs ask for the first of these shared libraries, such as
+# "libcurl.so.4".
+function(nimbo_library_name out file)
+  execute_process(COMMAND ${CMAKE_OBJDUMP} -p ${file} OUTPUT_VARIABLE dump COMMAND_ERROR_IS_FATAL ANY)
+  if(NOT dump MATCHES "SONAME +([^\n ]+)")
+    message(FATAL_ERROR "${file} is no shared library")
+  endif()
+  set(${out} ${CMAKE_MATCH_1} PARENT_SCOPE)
+endfunction()
