@@ -2,13 +2,14 @@
 
 #include "items/NBTransitIncidentsDataSourceBuilder.h"
 #include "support/MadeUpLines.h"
+#include "ui/ArtworkCache+Nimbo.h"
 
 namespace nimbo {
 namespace {
 
 NBTransitListItemRef build(const TransitLineItems& lines) {
   return NBTransitIncidentsDataSourceBuilder::initWithLineItems_maxNumberOfItems_artworkCache_analytics(
-             lines, 0, std::make_shared<ArtworkCache>(), nullptr)
+             lines, 0, memoryConstrainedImageViewCache(), nullptr)
       ->listItem();
 }
 

@@ -11,6 +11,7 @@
 #include "platform/ui/Environment.h"
 #include "platform/ui/SystemColors.h"
 #include "support/MadeUpLines.h"
+#include "ui/ArtworkCache+Nimbo.h"
 #include "ui/NBTransitIncidentDataSource.h"
 
 namespace nimbo {
@@ -28,7 +29,7 @@ class Rows {
     _table->setSeparatorEffect(VisualEffect::widgetTertiaryVibrancyEffect());
     _source = NBTransitIncidentDataSource::
         initWithTransitLineItemsResult_expanded_artworkCache_maxNumberOfRows_availableWidth(
-            result, true, std::make_shared<ArtworkCache>(), 0, kFrame.width);
+            result, true, memoryConstrainedImageViewCache(), 0, kFrame.width);
     _source->configureTableView(*_table);
     _view->setFrame({0, 0, BareRows::kWidth, kFrame.height});
     _view->addSubview(_table);
