@@ -1,8 +1,6 @@
 #include "platform/SerialQueue.h"
 
-#include <exception>
-
-#include "platform/Platform.h"
+#include "platform/Guarded.h"
 
 namespace nimbo {
 
@@ -36,12 +34,7 @@ void SerialQueue::run(const std::shared_ptr<State>& state, const std::string& la
       work = std::move(state->work.front());
       state->work.pop_front();
     }
-    try {
-      work();
-    } catch (const std::exception& exception) {
-      writeLog({kDefaultLogSubsystem, "SerialQueue"}, LogLevel::error, "Work on queue %@ threw: %@",
-               {label, exception.what()});
-    }
+    runGuarded("piece of work on the queue " + label, work);
   }
 }
 

@@ -243,6 +243,7 @@ TEST(SerialQueue, RunsWorkInOrderOnOneOtherThreadAndOutlivesExceptions) {
         order.push_back(i);
         threads.push_back(std::this_thread::get_id());
         if (i == 50) throw std::runtime_error("piece 50");
+        if (i == 51) throw i;
         if (i == 99) queue.dispatchAsync([&] { done.set_value(); });
       });
     }
@@ -252,13 +253,14 @@ TEST(SerialQueue, RunsWorkInOrderOnOneOtherThreadAndOutlivesExceptions) {
   EXPECT_TRUE(std::is_sorted(order.begin(), order.end()));
   EXPECT_NE(threads.front(), std::this_thread::get_id());
   EXPECT_EQ(std::count(threads.begin(), threads.end(), threads.front()), 100);
-  EXPECT_TRUE(platform.log.contains("Work on queue queue.under.test threw: piece 50"));
+  EXPECT_TRUE(platform.log.contains("A piece of work on the queue queue.under.test threw: piece 50"));
 }
 
 TEST(SerialQueue, FinishesThePieceThatRunsBeforeItGoes) {
   std::promise<void> started, proceed;
   bool finished = false;
   auto queue = std::make_unique<SerialQueue>("busy");
+  queue->dispatchAsync([] { throw std::runtime_error("with no platform to log it"); });
   queue->dispatchAsync([&] {
     started.set_value();
     proceed.get_future().wait();

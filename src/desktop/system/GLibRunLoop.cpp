@@ -5,7 +5,7 @@
 #include <utility>
 
 #include "desktop/system/GLibSources.h"
-#include "desktop/system/Guarded.h"
+#include "platform/Guarded.h"
 
 namespace nimbo {
 

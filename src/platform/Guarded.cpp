@@ -1,4 +1,4 @@
-#include "desktop/system/Guarded.h"
+#include "platform/Guarded.h"
 
 #include <exception>
 
