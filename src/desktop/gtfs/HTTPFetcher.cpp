@@ -14,6 +14,8 @@ using Code = TransitLineServiceError;
 
 constexpr long kMostRedirects = 5;
 constexpr long kConnectSeconds = 15;
+constexpr long kStalledSeconds = 30;  // a server that sends less than this for so long will not do better
+constexpr long kStalledBytesASecond = 100;
 constexpr std::size_t kLongestValidator = 1024;
 
 /// One fetch in progress.
