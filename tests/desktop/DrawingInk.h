@@ -12,6 +12,11 @@
 
 namespace nimbo {
 
+/// Device pixels; right and bottom are outside.
+struct PixelBox {
+  int left = 0, top = 0, right = 0, bottom = 0;
+};
+
 /// What was drawn on a surface, pixel by pixel.
 class Ink {
  public:
@@ -36,10 +41,11 @@ class Ink {
     std::size_t count = 0;
     int left = 1 << 20, top = 1 << 20, right = 0, bottom = 0;
   };
-  Found find(const std::function<bool(std::uint32_t)>& counts) const {
+  Found find(const std::function<bool(std::uint32_t)>& counts) const { return find({0, 0, _width, _height}, counts); }
+  Found find(const PixelBox& in, const std::function<bool(std::uint32_t)>& counts) const {
     Found found;
-    for (int y = 0; y < _height; ++y)
-      for (int x = 0; x < _width; ++x) {
+    for (int y = std::max(in.top, 0); y < std::min(in.bottom, _height); ++y)
+      for (int x = std::max(in.left, 0); x < std::min(in.right, _width); ++x) {
         if (!counts(at(x, y))) continue;
         ++found.count;
         found.left = std::min(found.left, x), found.right = std::max(found.right, x + 1);

@@ -180,8 +180,8 @@ TEST_F(Cells, StayInOrderWhateverTheyAreGiven) {
         EXPECT_LE(title.y, second.y);
         if (height >= 110) {
           EXPECT_GE(title.y, 0);
-          EXPECT_GE(title.height, 17);
-          EXPECT_GE(second.height, 15);
+          EXPECT_GE(title.height, text.empty() ? 0 : 17);
+          EXPECT_GE(second.height, text.empty() ? 0 : 15);
           EXPECT_LE(second.maxY(), height + 3);  // what is below the last baseline may stand out
         }
         RecordingPainter painter;

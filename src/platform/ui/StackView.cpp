@@ -24,7 +24,13 @@ void StackView::setBaselineRelativeArrangement(bool onBaselines) {
   setNeedsUpdateConstraints();
 }
 
-bool StackView::takesRoom(View& view) { return !view.isHidden() && !view.firstBaselineView().isHidden(); }
+bool StackView::takesRoom(View& view) { return !view.isBlank() && !view.firstBaselineView().isBlank(); }
+
+double StackView::distanceAcross(const Gap& gap) const {
+  if (!_onBaselines) return _spacing;
+  return std::max(_spacing, gap.above->lastBaselineView().reachBelowBaseline() +
+                                gap.below->firstBaselineView().reachAboveBaseline());
+}
 
 View* StackView::viewForFirstBaselineLayout() {
   const auto found = std::ranges::find_if(_arranged, [](const auto& view) { return takesRoom(*view); });
@@ -44,7 +50,7 @@ void StackView::appendGeneratedConstraints(std::vector<const LayoutConstraint*>&
     _takingRoom = std::move(takingRoom);
     makeConstraints();
   }
-  for (const auto& gap : _gaps) gap->setConstant(_spacing);
+  for (const Gap& gap : _gaps) gap.constraint->setConstant(distanceAcross(gap));
   for (const auto& constraint : _generated) constraints.push_back(constraint.get());
 }
 
@@ -68,7 +74,7 @@ void StackView::makeConstraints() {
       const auto gap = _onBaselines
                            ? view.firstBaselineAnchor().constraintEqualToAnchor(above->lastBaselineAnchor(), _spacing)
                            : view.topAnchor().constraintEqualToAnchor(above->bottomAnchor(), _spacing);
-      _gaps.push_back(gap);
+      _gaps.push_back({gap, above, &view});
       _generated.push_back(gap);
     } else {
       _generated.push_back(view.topAnchor().constraintEqualToAnchor(topAnchor()));

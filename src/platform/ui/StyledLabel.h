@@ -17,7 +17,7 @@ class StyledLabel : public View {
   /// In the preferred body font.
   StyledLabel();
 
-  /// UTF-8; absent shows nothing, in the room of one line.
+  /// UTF-8; absent shows nothing, in the room of one line outside stacks.
   const std::optional<std::string>& text() const { return _text; }
   void setText(std::optional<std::string> text);
   const FontRef& font() const { return _font; }
@@ -29,6 +29,8 @@ class StyledLabel : public View {
   /// Outside visual effects. The label colour until set.
   void setTextColor(SystemColor color) { _textColor = color; }
 
+  bool isBlank() const override { return isHidden() || !_text || _text->empty(); }
+
   std::string_view className() const override { return "StyledLabel"; }
 
  protected:
@@ -37,6 +39,8 @@ class StyledLabel : public View {
   bool adaptToSize(Size size) override;
   std::optional<double> firstBaselineFromTop() override;
   std::optional<double> lastBaselineFromBottom() override;
+  double reachAboveBaseline() override { return _font->capHeight(); }
+  double reachBelowBaseline() override { return _font->descent(); }
   void drawContent(Painter& painter, const DrawingContext& context) override;
   bool clipsToBounds() const override { return _clips; }
 

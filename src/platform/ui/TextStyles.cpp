@@ -12,4 +12,9 @@ double pointSizeForTextStyle(TextStyle style, ContentSizeCategory category) {
   return sizes.at(static_cast<std::size_t>(category));
 }
 
+double textScaleForCategory(ContentSizeCategory category) {
+  return pointSizeForTextStyle(TextStyle::headline, category) /
+         pointSizeForTextStyle(TextStyle::headline, ContentSizeCategory::large);
+}
+
 }  // namespace nimbo

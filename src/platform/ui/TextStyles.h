@@ -25,4 +25,7 @@ enum class TextStyle { headline, subheadline, body };
 ///     accessibilityExtraExtraExtraLarge          53              49
 double pointSizeForTextStyle(TextStyle style, ContentSizeCategory category);
 
+/// How much larger or smaller than at the size `large` a headline is.
+double textScaleForCategory(ContentSizeCategory category);
+
 }  // namespace nimbo

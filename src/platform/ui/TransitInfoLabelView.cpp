@@ -101,6 +101,7 @@ const TransitInfoLabelView::Row& TransitInfoLabelView::row() {
   const double belowMiddle = std::max(highest / 2, _font->descent() + _font->capHeight() / 2);
   made.size.height = ceiled(aboveMiddle + belowMiddle);
   made.baseline = aboveMiddle + _font->capHeight() / 2;
+  made.reachAbove = std::max(highest + _font->capHeight(), 2 * _font->capHeight()) / 2;
   return _row.emplace(std::move(made));
 }
 

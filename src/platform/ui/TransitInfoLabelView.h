@@ -58,6 +58,8 @@ class TransitInfoLabelView : public View {
   ContentSize contentSize() override;
   std::optional<double> firstBaselineFromTop() override;
   std::optional<double> lastBaselineFromBottom() override;
+  double reachAboveBaseline() override { return row().reachAbove; }
+  double reachBelowBaseline() override { return *lastBaselineFromBottom(); }
   void drawContent(Painter& painter, const DrawingContext& context) override;
 
  private:
@@ -68,8 +70,9 @@ class TransitInfoLabelView : public View {
     TextLayoutRef textLayout;
     double textX = 0;
     Size size;
-    double baseline = 0;  // from the top
-    double scale = 0;     // what it was measured for
+    double baseline = 0;    // from the top
+    double reachAbove = 0;  // of shields and capitals, from the baseline
+    double scale = 0;       // what it was measured for
     bool rightToLeft = false;
   };
   ImageRef image(std::size_t item, double screenScale, bool nightMode) const;

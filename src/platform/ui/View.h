@@ -88,6 +88,9 @@ class View : public LayoutItem {
   View& firstBaselineView();
   View& lastBaselineView();
 
+  /// Nothing is to be seen of the view: hidden, or without a text. A stack closes the gap.
+  virtual bool isBlank() const { return _hidden; }
+
   /// Of two views whose contents do not both have room, the one of the lower rank gets it. 0 until set.
   void setCompressionRank(int rank) { _compressionRank = rank; }
 
@@ -99,6 +102,7 @@ class View : public LayoutItem {
  protected:
   friend class LayoutEngine;
   friend class LayoutConstraint;
+  friend class StackView;
 
   /// Whether the constraints inside are solved apart from those around: the view's frame is set by its superview.
   virtual bool isLayoutRoot() const { return _superview == nullptr; }
@@ -116,6 +120,10 @@ class View : public LayoutItem {
   /// Distances of the baselines from the top and from the bottom; absent in views without text.
   virtual std::optional<double> firstBaselineFromTop() { return std::nullopt; }
   virtual std::optional<double> lastBaselineFromBottom() { return std::nullopt; }
+  /// How far what is drawn reaches above the first baseline and below the last, in points. A line of text reaches up to
+  /// its capitals.
+  virtual double reachAboveBaseline() { return 0; }
+  virtual double reachBelowBaseline() { return 0; }
   /// The subview is always as large as this view.
   void addFillingSubview(std::shared_ptr<View> view);
 
