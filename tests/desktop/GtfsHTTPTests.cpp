@@ -1,3 +1,5 @@
+#include <openssl/ssl.h>
+#include <openssl/x509.h>
 #include <zip.h>
 #include <zlib.h>
 
@@ -78,7 +80,7 @@ TEST(HTTPFetcher, GivesUpOnServersThatDoNotAnswer) {
   });
   const std::string address = server->address();
   const auto codeOf = [&](const std::string& text, const std::stop_token& stop) {
-    return static_cast<Code>(HTTPFetcher::fetch({*FeedAddress::parse(text), {}, 10, std::chrono::seconds(1)}, stop,
+    return static_cast<Code>(HTTPFetcher::fetch({*FeedAddress::parse(text), {}, 1000, std::chrono::seconds(1)}, stop,
                                                 [](auto) { return true; })
                                  .error()
                                  ->code());
@@ -92,6 +94,40 @@ TEST(HTTPFetcher, GivesUpOnServersThatDoNotAnswer) {
   EXPECT_EQ(codeOf(address, {}), Code::unreachable);
   const LoopbackServer plain([](const std::string&) { return Answer{"no TLS"}; });
   EXPECT_EQ(codeOf("https" + plain.address().substr(4), {}), Code::untrustedServer);
+  for (const char* begin : {"HTTP/1.1 200 OK\r\nX: ", "HTTP/1.1 200 OK\r\n\r\n"}) {
+    const LoopbackServer slow([&](const std::string&) { return Answer{begin, true, true}; });
+    EXPECT_EQ(codeOf(slow.address(), {}), Code::timedOut) << begin;
+  }
+}
+
+TEST(HTTPFetcher, TrustsNoCertificateThatNobodyVouchesFor) {
+  const std::unique_ptr<EVP_PKEY, decltype(&EVP_PKEY_free)> key(EVP_EC_gen("P-256"), EVP_PKEY_free);
+  const std::unique_ptr<X509, decltype(&X509_free)> certificate(X509_new(), X509_free);
+  X509_NAME* const name = X509_get_subject_name(certificate.get());
+  X509_NAME_add_entry_by_txt(name, "CN", MBSTRING_ASC, reinterpret_cast<const unsigned char*>("127.0.0.1"), -1, -1, 0);
+  X509_set_issuer_name(certificate.get(), name);
+  X509_gmtime_adj(X509_getm_notBefore(certificate.get()), 0);
+  X509_gmtime_adj(X509_getm_notAfter(certificate.get()), 3600);
+  X509_set_pubkey(certificate.get(), key.get());
+  ASSERT_NE(X509_sign(certificate.get(), key.get(), EVP_sha256()), 0);
+  const std::unique_ptr<SSL_CTX, decltype(&SSL_CTX_free)> context(SSL_CTX_new(TLS_server_method()), SSL_CTX_free);
+  SSL_CTX_use_certificate(context.get(), certificate.get());
+  SSL_CTX_use_PrivateKey(context.get(), key.get());
+  LoopbackServer server([](const std::string&) { return Answer{}; });
+  server.speakTLS([&](int connection) {
+    const std::unique_ptr<SSL, decltype(&SSL_free)> tls(SSL_new(context.get()), SSL_free);
+    SSL_set_fd(tls.get(), connection);
+    char request[4096];
+    if (SSL_accept(tls.get()) != 1 || SSL_read(tls.get(), request, sizeof request) <= 0) return;
+    const std::string answer = LoopbackServer::answer("200 OK", "believed");
+    SSL_write(tls.get(), answer.data(), static_cast<int>(answer.size()));
+  });
+  const auto outcome =
+      HTTPFetcher::fetch({*FeedAddress::parse("https" + server.address().substr(4)), {}, 10, std::chrono::seconds(20)},
+                         {}, [](auto) { return true; });
+  ASSERT_FALSE(outcome);
+  EXPECT_EQ(outcome.error()->code(), static_cast<std::int64_t>(Code::untrustedServer)) << outcome.error()->reason();
+  EXPECT_NE(outcome.error()->reason().find("certificate cannot be trusted"), std::string::npos);
 }
 
 /// An alerts feed on a server whose answer the test sets, read by a store with a cache of the test's own.
@@ -142,31 +178,59 @@ TEST_F(AlertsStoreTest, AsksConditionallyAndTakesPackedAnswers) {
 TEST_F(AlertsStoreTest, LetsTheLastAnswerStandInForAQuarterOfAnHour) {
   answer = good(2, -60);
   EXPECT_EQ(load(), "2 alerts of -60");
-  const Answer failures[] = {{LoopbackServer::answer("500 Oops", "")},
-                             {LoopbackServer::answer("200 OK", "<html>maintenance</html>")},
-                             {LoopbackServer::answer("200 OK", "")},
-                             good(1, -120)};  // older than what is held
-  for (const Answer& failure : failures) {
-    answer = failure;
-    EXPECT_EQ(load(), "2 alerts of -60");
+  const std::string one = LoopbackServer::answer("200 OK", feedBytes(alert("1", "T", ""), kNow));
+  std::string hundredThousand = feedBytes("");
+  for (int i = 0; i <= 100'000; ++i) hundredThousand += std::string_view("\x12\0", 2);
+  const struct {
+    Answer answer;
+    Code alone;  // without an answer that could stand in
+  } failures[] = {
+      {{LoopbackServer::answer("500 Oops", "")}, Code::serverFailure},
+      {{LoopbackServer::answer("304 Not Modified", "")}, Code::serverFailure},
+      {{LoopbackServer::answer("302 Found\r\nLocation: /", "")}, Code::serverFailure},
+      {{LoopbackServer::answer("302 Found\r\nLocation: file://" + folder.write("f", feedBytes("")).native(), "")},
+       Code::badAddress},
+      {{LoopbackServer::answer("200 OK", "<html>maintenance</html>")}, Code::badAlerts},
+      {{LoopbackServer::answer("200 OK", "")}, Code::badAlerts},
+      {{one.substr(0, one.size() - 1)}, Code::unreachable},
+      {{"HTTP/1.1 200 OK\r\nContent-Length: 20\r\n\r\n" + feedBytes(alert("1", "T", ""))}, Code::badAlerts},
+      {{LoopbackServer::answer("200 OK\r\nContent-Encoding: gzip", gzip(std::string(70'000'000, '\0')))},
+       Code::tooLarge},
+      {{"HTTP/1.1 200 OK\r\n\r\n" + std::string(1 << 20, '\0'), true}, Code::tooLarge},
+      {{"HTTP/1.1 200 OK\r\n" + std::string(1 << 16, 'x') + ": y\r\n", true}, Code::unreachable},
+      {{LoopbackServer::answer("200 OK", hundredThousand)}, Code::tooLarge},
+      {good(1, -1200), Code::staleAlerts}};
+  const AlertsStore other(FeedCache(folder.path() / "empty"));
+  for (const auto& failure : failures) {
+    answer = failure.answer;
+    EXPECT_EQ(load(), "2 alerts of -60") << answer.bytes.substr(0, 80);
+    const auto alone = other.load(feed, {});
+    ASSERT_FALSE(alone) << answer.bytes.substr(0, 80);
+    EXPECT_EQ("error " + std::to_string(alone.error()->code()), error(failure.alone)) << alone.error()->reason();
   }
+  answer = good(1, -120);  // older than what is held
+  EXPECT_EQ(load(), "2 alerts of -60");
   platform.time.advance(14 * 60 - 1);
   EXPECT_EQ(load(), "2 alerts of -60");
   platform.time.advance(60);  // now the publisher's time is more than 15 minutes ago
-  answer = failures[0];
+  answer = failures[0].answer;
   EXPECT_EQ(load(), error(Code::serverFailure));
   platform.time.advance(-86400);  // a clock that was wrong by a day tells no age
   EXPECT_EQ(load(), error(Code::serverFailure));
 }
 
 TEST_F(AlertsStoreTest, JudgesAgeByThePublishersOwnTime) {
-  answer = good(0, -20 * 60);
-  EXPECT_EQ(load(), error(Code::staleAlerts));
-  feed.maximumAlertsAge = std::chrono::minutes(60);
-  EXPECT_EQ(load(), "0 alerts of -1200");
+  for (const int made : {-1200, 1200}) {
+    answer = good(0, made);
+    feed.maximumAlertsAge = kDefaultMaximumAlertsAge;
+    EXPECT_EQ(load(), error(Code::staleAlerts));
+    feed.maximumAlertsAge = std::chrono::minutes(60);
+    EXPECT_EQ(load(), "0 alerts of " + std::to_string(made));
+  }
+  platform.time.advance(1200);
   feed.maximumAlertsAge = kDefaultMaximumAlertsAge;
-  answer = good(0, 0, "200 OK\r\nETag: \"a\"");
-  EXPECT_EQ(load(), "0 alerts of 0");
+  answer = good(0, 1260, "200 OK\r\nETag: \"a\"");
+  EXPECT_EQ(load(), "0 alerts of 1260");
   platform.time.advance(20 * 60);
   answer.bytes = LoopbackServer::answer("304 Not Modified", "");  // unchanged, which makes it no younger
   EXPECT_EQ(load(), error(Code::staleAlerts));

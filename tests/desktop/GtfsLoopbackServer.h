@@ -1,6 +1,7 @@
 #pragma once
 
 #include <arpa/inet.h>
+#include <poll.h>
 #include <sys/socket.h>
 
 #include <functional>
@@ -18,10 +19,11 @@ namespace nimbo {
 /// it, on a thread of its own.
 class LoopbackServer {
  public:
-  /// What goes back, byte for byte. `isEndless`: again and again until the client has enough.
+  /// What goes back, byte for byte.
   struct Answer {
     std::string bytes;
-    bool isEndless = false;
+    bool isEndless = false;  ///< again and again, until the client has enough
+    bool isSlow = false;     ///< each byte after a look whether the client has had enough
   };
   using Handler = std::function<Answer(const std::string& request)>;
 
@@ -38,6 +40,9 @@ class LoopbackServer {
     _port = ntohs(address.sin_port);
     _accepting = std::thread([this] { acceptAll(); });
   }
+
+  /// Hands connections over as they come, which then are no requests. Before the first of them.
+  void speakTLS(std::function<void(int connection)> serve) { _tls = std::move(serve); }
 
   /// Lets each answer that is on its way end first.
   ~LoopbackServer() {
@@ -69,6 +74,7 @@ class LoopbackServer {
   }
 
   void serve(const FileDescriptor& connection) {
+    if (_tls) return _tls(connection.get());
     std::string request;
     char buffer[4096];
     while (request.find("\r\n\r\n") == std::string::npos && !request.starts_with('\x16')) {  // or TLS begins
@@ -82,10 +88,12 @@ class LoopbackServer {
     }
     const Answer answer = _handler(request);
     bool isTaken = true;
+    pollfd client{connection.get(), POLLIN, 0};
     do {
       for (std::size_t sent = 0; isTaken && sent < answer.bytes.size();) {
-        const ssize_t count =
-            ::send(connection.get(), answer.bytes.data() + sent, answer.bytes.size() - sent, MSG_NOSIGNAL);
+        if (answer.isSlow && ::poll(&client, 1, 20) != 0) return;
+        const std::size_t piece = answer.isSlow ? 1 : answer.bytes.size() - sent;
+        const ssize_t count = ::send(connection.get(), answer.bytes.data() + sent, piece, MSG_NOSIGNAL);
         isTaken = count > 0;
         sent += isTaken ? static_cast<std::size_t>(count) : 0;
       }
@@ -96,6 +104,7 @@ class LoopbackServer {
   }
 
   Handler _handler;
+  std::function<void(int)> _tls;
   FileDescriptor _socket;
   std::uint16_t _port = 0;
   mutable std::mutex _lock;

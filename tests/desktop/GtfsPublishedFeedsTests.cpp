@@ -1,4 +1,5 @@
 #include <cstdlib>
+#include <iostream>
 #include <set>
 #include <sstream>
 
@@ -103,8 +104,8 @@ class PublishedFeeds : public testing::Test {
     platform.loop.waitAndDrain([&] { return isDone; });
   }
 
-  static void compare(const TransitLineItem& item, const FeedMessage& message, const std::set<std::string>& agencies,
-                      std::uint64_t now) {
+  void compare(const TransitLineItem& item, const FeedMessage& message, const std::set<std::string>& agencies,
+               std::uint64_t now) {
     const TransitLineLocator& locator = *item.identifier()->locator();
     std::set<std::string> titles;
     bool isAffected = false;
@@ -122,12 +123,14 @@ class PublishedFeeds : public testing::Test {
       EXPECT_TRUE(!title || titles.contains(*title)) << locator.routeID << ": " << *title;
     }
     EXPECT_EQ(isAffected, mustBeAffected) << locator.routeID;
+    ++(isAffected ? affectedLines : goodLines);
   }
 
   TestPlatform platform;
   TemporaryFolder folder;
   Paths paths = Paths::resolve(folder.path() / "config", folder.path() / "state");
   GTFSTransitLineService service{paths};
+  int affectedLines = 0, goodLines = 0;
 };
 
 TEST_F(PublishedFeeds, AgreeWithAnIndependentReading) {
@@ -140,6 +143,7 @@ TEST_F(PublishedFeeds, AgreeWithAnIndependentReading) {
       ++count;
     }
   EXPECT_GT(count, 0) << feeds;
+  std::cout << count << " feeds: " << affectedLines << " lines affected, " << goodLines << " good\n";
 }
 
 }  // namespace

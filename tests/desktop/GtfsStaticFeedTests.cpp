@@ -74,14 +74,18 @@ TEST(StaticFeed, AgencyMayBeMissing) {
 }
 
 TEST(StaticFeed, IsRefusedWithWhatIsWrong) {
+  std::string numbers;
+  for (int i = 0; i <= 200'000; ++i) numbers += std::to_string(i) + "\n";
   const std::pair<std::string, std::string> cases[] = {
       {"", "no column route_id"},
       {"a,b\n1,2\n", "no column route_id"},
       {"route_id,route_type\n", "no usable line"},
       {"route_id,route_long_name\n1,\"" + std::string(2 << 20, 'x'), "longer than 1 MiB"},
+      {"route_id\n" + numbers, "more than 200000 lines"},
+      {"agency_id\n" + numbers, "more than 200000 agencies"},
   };
-  for (const auto& [routes, what] : cases) {
-    MemoryFeedFiles files{{"routes.txt", routes}};
+  for (const auto& [table, what] : cases) {
+    MemoryFeedFiles files{{what.ends_with("agencies") ? "agency.txt" : "routes.txt", table}};
     const auto parsed = readStaticFeed(files, "city");
     ASSERT_FALSE(parsed) << what;
     EXPECT_NE(parsed.error()->reason().find(what), std::string::npos) << parsed.error()->reason();
@@ -173,17 +177,19 @@ TEST_F(StaticFeedStoreTest, KeepsTripsBesideTheLines) {
 }
 
 TEST_F(StaticFeedStoreTest, ReadsZipFiles) {
-  const auto makeZip = [&](const std::string& name, const std::string& entry) {
+  const auto makeZip = [&](const std::string& name, const std::string& entry, std::size_t emptyLines = 0) {
     const auto path = folder.path() / name;
     zip_t* archive = zip_open(path.c_str(), ZIP_CREATE, nullptr);
-    static const char kRoutes[] = "route_id,route_short_name\n1,Z\n";
-    zip_file_add(archive, entry.c_str(), zip_source_buffer(archive, kRoutes, sizeof kRoutes - 1, 0), 0);
+    const std::string routes = "route_id,route_short_name\n1,Z\n" + std::string(emptyLines, '\n');
+    zip_file_add(archive, entry.c_str(), zip_source_buffer(archive, routes.data(), routes.size(), 0), 0);
     zip_close(archive);
     return path;
   };
   EXPECT_EQ(names(store.load(feedAt(makeZip("top.zip", "routes.txt")), {})), "Z");
   EXPECT_EQ(names(store.load(feedAt(makeZip("sub.zip", "gtfs/routes.txt")), {})), "Z");
   EXPECT_NE(names(store.load(feedAt(makeZip("deep.zip", "../../routes.txt")), {})).find("no routes.txt"),
+            std::string::npos);
+  EXPECT_NE(names(store.load(feedAt(makeZip("large.zip", "routes.txt", 64 << 20)), {})).find("larger than the 64 MiB"),
             std::string::npos);
   const std::string whole = *readFile(folder.path() / "top.zip", 1 << 20);
   const std::pair<std::string, std::string> broken[] = {

@@ -12,6 +12,7 @@ namespace {
 constexpr std::uint64_t kLeastMilliseconds = 100'000'000'000;  // 10^11 seconds is the year 5138
 constexpr std::uint64_t kEndOfYear9999 = 253'402'300'799;
 constexpr TimeInterval kDay = 86400;
+constexpr std::size_t kMostOver = 16;
 constexpr std::size_t kMostComing = 16;
 
 /// How the fields with periods outrank each other; 0 for fields of another kind.
@@ -92,6 +93,10 @@ std::vector<AlertPeriod> joinedPeriods(std::vector<AlertPeriod> periods) {
 std::vector<AlertPeriod> periodsThatMatter(std::vector<AlertPeriod> periods, Date now) {
   const Date longAgo = dateByAdding(now, -kDay);
   std::erase_if(periods, [&](const AlertPeriod& period) { return endOf(period) < longAgo; });
+  const auto notOver =
+      std::find_if(periods.begin(), periods.end(), [&](const AlertPeriod& period) { return endOf(period) >= now; });
+  if (static_cast<std::size_t>(notOver - periods.begin()) > kMostOver)
+    periods.erase(periods.begin(), notOver - static_cast<std::ptrdiff_t>(kMostOver));
   const auto coming =
       std::find_if(periods.begin(), periods.end(), [&](const AlertPeriod& period) { return startOf(period) > now; });
   if (static_cast<std::size_t>(periods.end() - coming) > kMostComing)

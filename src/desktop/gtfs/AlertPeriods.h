@@ -34,8 +34,8 @@ AlertPeriods alertPeriodsIn(std::string_view alert);
 /// The same time as periods that neither overlap nor touch, the earliest first: an incident is in force once at a time.
 std::vector<AlertPeriod> joinedPeriods(std::vector<AlertPeriod> periods);
 
-/// Of joined periods those that may still matter to somebody who asks again soon: not over for more than a day (the
-/// clock may be set back), and of those to come the next 16.
+/// Of joined periods those that may still matter to somebody who asks again soon: of those over for no more than a day
+/// (the clock may be set back) the last 16, and of those to come the next 16.
 std::vector<AlertPeriod> periodsThatMatter(std::vector<AlertPeriod> periods, Date now);
 
 }  // namespace nimbo

@@ -1,5 +1,7 @@
 #include "desktop/gtfs/AlertsFeed.h"
 
+#include <array>
+#include <set>
 #include <unordered_map>
 
 #include "desktop/gtfs/AlertPeriods.h"
@@ -29,13 +31,29 @@ std::string whatElse(std::string_view bytes) {
   return "it is cut off or no GTFS-Realtime feed in binary form. Try again later, or check the address.";
 }
 
-/// Whether no text of the two alerts is in the same language.
-bool areInOtherLanguages(std::string_view a, std::string_view b) {
-  for (const AlertField field : {AlertField::headerText, AlertField::descriptionText}) {
-    const auto texts = translationsIn(a, field), others = translationsIn(b, field);
-    for (const Translation& text : texts)
-      for (const Translation& other : others)
-        if (text.language == other.language || text.language.empty() || other.language.empty()) return false;
+/// The languages of an alert's header and of its description.
+using Languages = std::array<std::set<std::string_view>, 2>;
+
+/// Absent when the alert is damaged, which is found again, and counted, when it is read.
+std::optional<Languages> languagesOf(std::string_view alert) {
+  constexpr std::array kFields{AlertField::headerText, AlertField::descriptionText};
+  Languages languages;
+  try {
+    for (std::size_t i = 0; i < kFields.size(); ++i)
+      for (const Translation& text : translationsIn(alert, kFields[i])) languages[i].insert(text.language);
+  } catch (const protozero::exception&) {
+    return std::nullopt;
+  }
+  return languages;
+}
+
+/// Whether no text of the one may be in the same language as the same text of the other.
+bool areApart(const Languages& languages, const Languages& others) {
+  for (std::size_t i = 0; i < languages.size(); ++i) {
+    if (languages[i].empty() || others[i].empty()) continue;
+    if (languages[i].contains({}) || others[i].contains({})) return false;
+    for (const std::string_view language : others[i])
+      if (languages[i].contains(language)) return false;
   }
   return true;
 }
@@ -94,21 +112,30 @@ void AlertsFeed::readEntity(std::string_view body) {
 }
 
 void AlertsFeed::joinLanguages() {
-  std::unordered_map<std::string_view, std::size_t> first;  // place of each identifier's first alert
+  struct First {
+    std::size_t place;
+    std::optional<Languages> languages;  // absent: it takes no others
+    bool isLookedInto = false;
+    std::string* joined = nullptr;
+  };
+  std::unordered_map<std::string_view, First> firsts;  // by identifier
   std::vector<AlertEntity> alerts;
   alerts.reserve(_alerts.size());
-  first.reserve(_alerts.size());
+  firsts.reserve(_alerts.size());
   for (AlertEntity& alert : _alerts) {
-    const auto [place, isNew] = first.try_emplace(alert.id, alerts.size());
+    const auto [found, isNew] = firsts.try_emplace(alert.id, First{alerts.size(), {}});
     if (!isNew) {
-      AlertEntity& other = alerts[place->second];
-      try {
-        if (areInOtherLanguages(other.body, alert.body)) {
-          // Messages one after the other are one message with the fields of both.
-          other.body = _joined->emplace_back(std::string(other.body).append(alert.body));
-          continue;
-        }
-      } catch (const protozero::exception&) {  // found again, and counted, when the alert is read
+      First& first = found->second;
+      AlertEntity& other = alerts[first.place];
+      if (!first.isLookedInto) first.languages = languagesOf(other.body);
+      first.isLookedInto = true;
+      if (auto languages = first.languages ? languagesOf(alert.body) : std::nullopt;
+          languages && areApart(*first.languages, *languages)) {
+        // Messages one after the other are one message with the fields of both.
+        if (!first.joined) first.joined = &_joined->emplace_back(other.body);
+        other.body = first.joined->append(alert.body);
+        for (std::size_t i = 0; i < languages->size(); ++i) (*first.languages)[i].merge((*languages)[i]);
+        continue;
       }
       alert.isRepeated = true;
     }

@@ -1,5 +1,7 @@
 #include "desktop/gtfs/AlertsStore.h"
 
+#include <cmath>
+
 #include "desktop/gtfs/FeedLog.h"
 #include "desktop/gtfs/FileReading.h"
 #include "desktop/gtfs/KeptAlerts.h"
@@ -39,12 +41,14 @@ void keep(const KeptAlerts& kept, const std::filesystem::path& path) {
 ErrorRef AlertsStore::staleness(const Feed& feed, const AlertsFeed& alerts) {
   if (!feed.alerts.isRemote() || !alerts.timestamp()) return nullptr;
   const TimeInterval age = ageOf(*alerts.timestamp());
-  if (age <= static_cast<TimeInterval>(std::chrono::seconds(feed.maximumAlertsAge).count())) return nullptr;
-  return transitLineServiceError(
-      TransitLineServiceError::staleAlerts,
-      "The alerts feed " + feed.alerts.publicText() + " was last renewed by its publisher " + ageText(age) +
-          " ago. Try again later; where that is its habit, set \"maximumAlertsAgeMinutes\" of feed \"" + feed.name +
-          "\" in feeds.json.");
+  if (std::abs(age) <= static_cast<TimeInterval>(std::chrono::seconds(feed.maximumAlertsAge).count())) return nullptr;
+  const std::string what = age > 0
+                               ? " was last renewed by its publisher " + ageText(age) + " ago. Try again later"
+                               : " is " + ageText(-age) + " ahead of the clock of this machine. Set the clock right";
+  return transitLineServiceError(TransitLineServiceError::staleAlerts,
+                                 "The alerts feed " + feed.alerts.publicText() + what +
+                                     "; where that is its habit, set \"maximumAlertsAgeMinutes\" of feed \"" +
+                                     feed.name + "\" in feeds.json.");
 }
 
 Outcome<AlertsFeed> AlertsStore::fetch(const Feed& feed, const std::stop_token& stop) const {

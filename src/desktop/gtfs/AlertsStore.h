@@ -21,7 +21,8 @@ class AlertsStore {
   /// What the source says now, however old.
   Outcome<AlertsFeed> fetch(const Feed& feed, const std::stop_token& stop) const;
 
-  /// Null when the feed's own timestamp is recent enough for its setting, or missing; also for a file.
+  /// Null when the feed's own timestamp is near enough for its setting, or missing; also for a file. One that is as far
+  /// ahead is no better than an old one: by a clock that is wrong, an incident in force counts as one to come.
   static ErrorRef staleness(const Feed& feed, const AlertsFeed& alerts);
 
  private:

@@ -7,7 +7,7 @@
 
 namespace nimbo {
 
-/// How old what a publisher says may be before it is no more taken for the present state.
+/// How old what a publisher says, or how far ahead its date, may be before it is no more taken for the present state.
 inline constexpr std::chrono::minutes kDefaultMaximumAlertsAge{15};
 
 /// A feed as the user set it up.

@@ -41,7 +41,8 @@ class HTTPFetcher {
   using Sink = std::function<bool(std::string_view piece)>;
 
   /// Fetches; the document's pieces go to `sink`. Errors name the address without its secrets, what went wrong and what
-  /// to do; pieces given before an error are worth nothing. Ends soon after `stop` is requested.
+  /// to do; pieces given before an error are worth nothing. A server that sends next to nothing for 30 seconds is given
+  /// up. Ends soon after `stop` is requested.
   static Outcome<HTTPAnswer> fetch(const HTTPRequest& request, const std::stop_token& stop, const Sink& sink);
 };
 

@@ -114,12 +114,14 @@ class IncidentBuilder {
       _reading.skipped.add("alert without effect on the service, or about accessibility", alert.id);
       return;
     }
-    const AlertPeriods periods = alertPeriodsIn(alert.body);
+    AlertPeriods periods = alertPeriodsIn(alert.body);
     _reading.periods += periods.published;
     if (periods.periods.empty()) {
       _reading.skipped.add("alert whose periods end before they start", alert.id);
       return;
     }
+    // Before each line gets its copy: an alert may have millions.
+    const auto mattering = periodsThatMatter(joinedPeriods(std::move(periods.periods)), _query.now);
     const auto index = incidentOf(alert, view.content);
     if (!index) {
       _reading.skipped.add("alert that says nothing", alert.id);
@@ -128,7 +130,7 @@ class IncidentBuilder {
     Incident& incident = _incidents[*index];
     for (const auto& [place, isWholeLine] : _lines) {
       Incident::OnLine& onLine = incident.lines[place];
-      onLine.periods.insert(onLine.periods.end(), periods.periods.begin(), periods.periods.end());
+      onLine.periods.insert(onLine.periods.end(), mattering.begin(), mattering.end());
       onLine.isWholeLine = onLine.isWholeLine || isWholeLine;
     }
   }

@@ -28,6 +28,7 @@ class StaticFeedBuilder {
   /// The index of a route's line.
   std::optional<std::uint32_t> lineOfRoute(std::string_view routeID) const;
   std::size_t lineCount() const { return _lines.size(); }
+  std::size_t agencyCount() const { return _agencies.size(); }
 
   StaticFeed finish(std::string_view fingerprint, Date checkedAt) const;
 

@@ -13,12 +13,19 @@ namespace {
 constexpr std::uint64_t kLargestTable = 64 << 20;
 constexpr std::uint64_t kLargestTripsTable = 512 << 20;
 constexpr std::size_t kMostTrips = 5'000'000;
+constexpr std::size_t kMostLines = 200'000;  // and agencies; a continent has fewer, and each costs memory
 
 using Values = std::span<const std::string_view>;
 
 ErrorRef badFeed(const StaticFeedFiles& files, const std::string& what) {
   return transitLineServiceError(TransitLineServiceError::badStaticFeed,
                                  "The static feed " + std::string(files.place()) + " cannot be used: " + what);
+}
+
+ErrorRef moreThanFit(const StaticFeedFiles& files, const std::string& what) {
+  return transitLineServiceError(TransitLineServiceError::tooLarge,
+                                 "The static feed " + std::string(files.place()) + " has more than " +
+                                     std::to_string(kMostLines) + " " + what + ". Check that it is the right one.");
 }
 
 /// Reads a table of the feed. False when the feed has none.
@@ -51,6 +58,7 @@ RouteType routeTypeFrom(std::string_view text, std::string_view routeID, SkipRep
 
 ErrorRef readAgencies(StaticFeedFiles& files, ParsedStaticFeed& parsed, std::string& language) {
   CsvTable table({"agency_id", "agency_name", "agency_lang"}, [&](Values row) {
+    if (parsed.feed.agencyCount() > kMostLines) return;
     if (row[0].empty() && row[1].empty())
       parsed.skipped.add("agency without agency_id and agency_name", {});
     else if (!parsed.feed.addAgency(row[0], row[1]))
@@ -58,7 +66,8 @@ ErrorRef readAgencies(StaticFeedFiles& files, ParsedStaticFeed& parsed, std::str
     else if (language.empty())
       language = row[2];
   });
-  return readTable(files, "agency.txt", kLargestTable, table).error();
+  const ErrorRef error = readTable(files, "agency.txt", kLargestTable, table).error();
+  return !error && parsed.feed.agencyCount() > kMostLines ? moreThanFit(files, "agencies") : error;
 }
 
 ErrorRef readFeedInfo(StaticFeedFiles& files, std::string& language) {
@@ -72,6 +81,7 @@ ErrorRef readRoutes(StaticFeedFiles& files, ParsedStaticFeed& parsed) {
   CsvTable table(
       {"route_id", "agency_id", "route_short_name", "route_long_name", "route_type", "route_color", "route_text_color"},
       [&](Values row) {
+        if (parsed.feed.lineCount() > kMostLines) return;
         if (row[0].empty()) {
           parsed.skipped.add("route without route_id", row[3]);
           return;
@@ -90,6 +100,7 @@ ErrorRef readRoutes(StaticFeedFiles& files, ParsedStaticFeed& parsed) {
   if (!*found)
     return badFeed(files, "it has no routes.txt. Give a folder or a zip file with agency.txt and routes.txt.");
   if (!table.hasColumn(0)) return badFeed(files, "its routes.txt has no column route_id. Fetch it anew.");
+  if (parsed.feed.lineCount() > kMostLines) return moreThanFit(files, "lines");
   if (parsed.feed.lineCount() == 0) return badFeed(files, "its routes.txt has no usable line. Fetch it anew.");
   return nullptr;
 }

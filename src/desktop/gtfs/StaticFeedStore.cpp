@@ -97,15 +97,15 @@ std::optional<StaticFeed> StaticFeedStore::readCache(const Feed& feed) const {
   return bytes ? StaticFeed::fromBytes(std::move(*bytes)) : std::nullopt;
 }
 
-LoadedStaticFeed StaticFeedStore::withTrips(const Feed& feed, StaticFeed staticFeed,
-                                            std::optional<TripRoutes> trips) const {
+LoadedStaticFeed StaticFeedStore::withTrips(const Feed& feed, StaticFeed staticFeed, std::optional<TripRoutes> trips,
+                                            const std::stop_token& stop) const {
   const auto held = std::make_shared<std::optional<TripRoutes>>(std::move(trips));
-  const auto lookup = [store = *this, feed, staticFeed, held](std::string_view tripID) {
+  const auto lookup = [store = *this, feed, staticFeed, stop, held](std::string_view tripID) {
     if (!*held) {
       if (const auto bytes = readFile(store._cache.trips(feed.name), kLargestCacheFile))
         *held = TripRoutes::fromBytes(*bytes, tripsKey(staticFeed), staticFeed.lineCount());
       if (!*held) {
-        auto fresh = store.readAnew(feed, {});
+        auto fresh = store.readAnew(feed, stop);
         const bool isSame = fresh && fresh->feed.fingerprint() == staticFeed.fingerprint();
         *held = isSame ? std::move(fresh->trips) : TripRoutes();
       }
@@ -162,19 +162,19 @@ Outcome<LoadedStaticFeed> StaticFeedStore::loadRemote(const Feed& feed, const st
   const bool isHeld = validators.has_value();
   if (isHeld) {
     const TimeInterval age = -intervalFromNow(cached->checkedAt());
-    if (age >= 0 && age < kRemoteCheckInterval) return withTrips(feed, *cached, std::nullopt);
+    if (age >= 0 && age < kRemoteCheckInterval) return withTrips(feed, *cached, std::nullopt, stop);
   }
   auto fetched = fetch(feed, validators.value_or(HTTPValidators()), stop);
-  if (fetched && *fetched) return withTrips(feed, (*fetched)->feed, std::move((*fetched)->trips));
+  if (fetched && *fetched) return withTrips(feed, (*fetched)->feed, std::move((*fetched)->trips), stop);
   if (!fetched) {
     if (!isHeld) return fetched.error();
     writeLog(kFeedLogFacility, LogLevel::error, "Keeping the older static feed of %{private}@: %{private}@",
              {feed.name, fetched.error()->reason()});
-    return withTrips(feed, *cached, std::nullopt);
+    return withTrips(feed, *cached, std::nullopt, stop);
   }
   StaticFeed checked = cached->checkedAgainAt(currentDate());
   keep(_cache.staticFeed(feed.name), checked.bytes());
-  return withTrips(feed, std::move(checked), std::nullopt);
+  return withTrips(feed, std::move(checked), std::nullopt, stop);
 }
 
 Outcome<LoadedStaticFeed> StaticFeedStore::load(const Feed& feed, const std::stop_token& stop) const {
@@ -182,10 +182,10 @@ Outcome<LoadedStaticFeed> StaticFeedStore::load(const Feed& feed, const std::sto
   if (feed.staticFeed.isRemote()) return loadRemote(feed, cached, stop);
   const std::string fingerprint = localFingerprint(feed.staticFeed.path());
   if (cached && !fingerprint.empty() && cached->fingerprint() == fingerprint)
-    return withTrips(feed, *cached, std::nullopt);
+    return withTrips(feed, *cached, std::nullopt, stop);
   auto fresh = readAnew(feed, stop);
   if (!fresh) return fresh.error();
-  return withTrips(feed, fresh->feed, std::move(fresh->trips));
+  return withTrips(feed, fresh->feed, std::move(fresh->trips), stop);
 }
 
 }  // namespace nimbo

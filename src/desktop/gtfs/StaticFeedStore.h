@@ -30,7 +30,7 @@ class StaticFeedStore {
   explicit StaticFeedStore(FeedCache cache) : _cache(std::move(cache)) {}
 
   /// From the cache where that is as good as the source. A remote source that does not answer costs nothing while the
-  /// cache has an older state.
+  /// cache has an older state. `stop` also ends a reading of the trips that comes later.
   Outcome<LoadedStaticFeed> load(const Feed& feed, const std::stop_token& stop) const;
 
   /// From the source.
@@ -43,7 +43,8 @@ class StaticFeedStore {
   Outcome<std::optional<FreshStaticFeed>> fetch(const Feed& feed, const HTTPValidators& validators,
                                                 const std::stop_token& stop) const;
   Outcome<FreshStaticFeed> parse(StaticFeedFiles& files, const Feed& feed, const std::string& fingerprint) const;
-  LoadedStaticFeed withTrips(const Feed& feed, StaticFeed staticFeed, std::optional<TripRoutes> trips) const;
+  LoadedStaticFeed withTrips(const Feed& feed, StaticFeed staticFeed, std::optional<TripRoutes> trips,
+                             const std::stop_token& stop) const;
 
   FeedCache _cache;
 };

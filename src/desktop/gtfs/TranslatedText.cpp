@@ -6,6 +6,8 @@ namespace nimbo {
 
 namespace {
 
+constexpr std::size_t kMostTranslations = 1000;  // no text is in more languages
+
 Translation readTranslation(std::string_view body) {
   Translation result;
   for (auto translation = messageIn<TranslationField>(body); translation.next();) {
@@ -28,9 +30,9 @@ Translation readTranslation(std::string_view body) {
 std::vector<Translation> translationsIn(std::string_view alert, AlertField field) {
   std::vector<Translation> result;
   auto message = messageIn<AlertField>(alert);
-  while (message.next(field)) {
+  while (result.size() < kMostTranslations && message.next(field)) {
     auto text = messageIn<TranslatedStringField>(takeView(message));
-    while (text.next(TranslatedStringField::translation)) {
+    while (result.size() < kMostTranslations && text.next(TranslatedStringField::translation)) {
       const Translation translation = readTranslation(takeView(text));
       if (!translation.text.empty()) result.push_back(translation);
     }
