@@ -104,6 +104,15 @@ void joinLines(std::string& text) {
   text = std::move(joined);
 }
 
+/// Digits belong to no script. The user's language would give "17" another font than "F1", and shields with them.
+void drawAsLatinIfASCII(PangoLayout* layout, const std::string& text) {
+  if (!std::all_of(text.begin(), text.end(), [](char byte) { return g_ascii_isprint(byte); })) return;
+  const std::unique_ptr<PangoAttrList, decltype(&pango_attr_list_unref)> attributes(pango_attr_list_new(),
+                                                                                    pango_attr_list_unref);
+  pango_attr_list_insert(attributes.get(), pango_attr_language_new(pango_language_from_string("en")));
+  pango_layout_set_attributes(layout, attributes.get());
+}
+
 }  // namespace
 
 PangoContext* PangoTextSystem::context(bool rightToLeft) {
@@ -146,6 +155,7 @@ TextLayoutRef PangoTextSystem::layOut(const std::string& text, const FontDescrip
   pango_layout_set_font_description(layout.get(), describe(font).get());
   pango_layout_set_auto_dir(layout.get(), FALSE);
   pango_layout_set_text(layout.get(), shown.data(), static_cast<int>(shown.size()));
+  drawAsLatinIfASCII(layout.get(), shown);
   if (!(maxWidth > 0)) {
     pango_layout_set_width(layout.get(), 0);
     pango_layout_set_wrap(layout.get(), PANGO_WRAP_WORD);
