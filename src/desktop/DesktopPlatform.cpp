@@ -52,7 +52,7 @@ DesktopPlatform::DesktopPlatform(Options options)
       _clock(options.virtualTime ? static_cast<Clock&>(*options.virtualTime) : _systemClock),
       _log(makeLogInto(std::move(options.logSink))),
       _strings(_locale),
-      _database(std::make_shared<StateDatabase>(_paths.state, _clock, &logNotice)),
+      _database(std::make_shared<StateDatabase>(_paths.state, _clock, options.notice ? options.notice : &logNotice)),
       _sharedSettings(_database),
       _analytics(_database),
       _transitLines(_paths),

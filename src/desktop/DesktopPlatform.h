@@ -42,6 +42,8 @@ class DesktopPlatform {
     ActivityLauncher& activityLauncher;
     /// Where log lines go; null: to the journal or standard error.
     std::unique_ptr<LogSink> logSink;
+    /// Told, on any thread, what the user must hear: a damaged state database was set aside. Null: it is logged.
+    StateDatabase::Notice notice;
   };
 
   explicit DesktopPlatform(Options options);

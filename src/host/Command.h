@@ -1,5 +1,7 @@
 #pragma once
 
+#include <cstdio>
+#include <functional>
 #include <optional>
 #include <stdexcept>
 #include <string>
@@ -16,6 +18,11 @@ struct CommandContext {
   Paths paths;
   /// Arguments that give the widget process the same folders.
   std::vector<std::string> widgetArguments;
+  /// Tells the user, whatever the command goes on to do, something that he must hear, such as that a damaged database
+  /// was set aside. Any thread.
+  std::function<void(const std::string& message)> tell = [](const std::string& message) {
+    std::fprintf(stderr, "nimbo-transit: %s\n", message.c_str());
+  };
 };
 
 /// Ends a command: the message says what failed, where, and what to do.

@@ -4,7 +4,9 @@
 
 #include "desktop/gtfs/FeedCatalog.h"
 #include "desktop/gtfs/FeedLibrary.h"
+#include "desktop/gtfs/LineNames.h"
 #include "host/FeedCommands.h"
+#include "host/GoneLines.h"
 #include "host/HostPlatform.h"
 
 namespace nimbo {
@@ -13,6 +15,17 @@ namespace {
 
 void require(const ErrorRef& error) {
   if (error) throw CommandFailure(error->reason());
+}
+
+/// Says which lines are gone, and which feeds cannot tell.
+void tellGoneLines(const CommandContext& context, const std::vector<TransitLineRef>& lines) {
+  std::vector<MapItemIdentifierRef> identifiers;
+  for (const TransitLineRef& line : lines) identifiers.push_back(line->identifier());
+  const FeedLibrary library(context.paths);
+  const auto gone = FeedCatalog(library).goneLines(identifiers);
+  if (!gone) throw CommandFailure(gone.error()->reason());
+  for (const auto& line : gone->lines) std::cerr << "nimbo-transit: " << goneLineText(writtenNameOfLine(*line)) << "\n";
+  for (const ErrorRef& error : gone->errors) std::cerr << "nimbo-transit: " << error->reason() << "\n";
 }
 
 std::vector<TransitLineRef> favoriteLines(HostPlatform& platform) {
@@ -27,10 +40,8 @@ std::vector<TransitLineRef> favoriteLines(HostPlatform& platform) {
 
 /// The number of the favourite that is written so, whether its feed still knows it or not.
 std::uint64_t muidOfFavorite(HostPlatform& platform, const std::string& name) {
-  for (const TransitLineRef& line : favoriteLines(platform)) {
-    const auto& locator = line->identifier()->locator();
-    if (locator && locator->feed + ":" + locator->routeID == name) return line->muid();
-  }
+  for (const TransitLineRef& line : favoriteLines(platform))
+    if (writtenNameOfLine(*line->identifier()) == name) return line->muid();
   throw CommandFailure("\"" + name + "\" is not among the favourites. \"favorite list\" shows them.");
 }
 
@@ -69,6 +80,8 @@ int runFavoriteList(const CommandContext& context) {
   const auto lines = favoriteLines(platform);
   printLines(lines);
   if (lines.empty()) std::cout << "No favourite lines. Add some with \"favorite add FEED:ROUTE_ID\".\n";
+  std::cout << std::flush;
+  tellGoneLines(context, lines);
   return kExitSuccess;
 }
 

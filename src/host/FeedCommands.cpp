@@ -7,6 +7,7 @@
 #include "desktop/gtfs/FeedCatalog.h"
 #include "desktop/gtfs/FeedCheck.h"
 #include "desktop/gtfs/FeedLibrary.h"
+#include "desktop/gtfs/LineNames.h"
 #include "host/HostPlatform.h"
 #include "host/TerminalText.h"
 
@@ -69,8 +70,7 @@ std::vector<std::string> columnsOfLine(const TransitLine& line) {
   const std::string shortName = locator ? locator->shortName : "";
   const std::string fullName =
       artwork && artwork->accessibilityText() ? *artwork->accessibilityText() : line.name().value_or("");
-  return {printableText(locator ? locator->feed + ":" + locator->routeID : std::to_string(line.muid())),
-          printableText(shortName), printableText(fullName),
+  return {printableText(writtenNameOfLine(*line.identifier())), printableText(shortName), printableText(fullName),
           printableText(line.system() ? line.system()->name().value_or("") : "")};
 }
 

@@ -14,7 +14,8 @@ class HostPlatform final : private ActivityLauncher {
       : _platform({.paths = context.paths,
                    .locale = std::move(locale),
                    .runLoop = context.runLoop,
-                   .activityLauncher = *this}) {}
+                   .activityLauncher = *this,
+                   .notice = [tell = context.tell](const ErrorRef& notice) { tell(notice->reason()); }}) {}
 
   DesktopPlatform* operator->() { return &_platform; }
 

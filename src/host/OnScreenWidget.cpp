@@ -1,6 +1,9 @@
 #include "host/OnScreenWidget.h"
 
+#include <algorithm>
+
 #include "platform/HostApplication.h"
+#include "platform/ui/TextStyles.h"
 
 namespace nimbo {
 
@@ -15,6 +18,10 @@ std::vector<std::string> arguments(const CommandContext& context, const WidgetPr
 }
 
 }  // namespace
+
+double WidgetPresentation::rowHeightForTextSize(ContentSizeCategory category) {
+  return kDefaultRowHeight * std::max(textScaleForCategory(category), 1.0);
+}
 
 json displayModesOf(const WidgetPresentation& presentation) {
   return {{"compact", {presentation.width, presentation.compactHeight}},
@@ -36,17 +43,19 @@ json initializationOf(const WidgetPresentation& presentation) {
   return params;
 }
 
+std::optional<std::string> failureOfUpdate(const json& answer) {
+  if (answer.value("updateResult", "") != "failed") return std::nullopt;
+  return answer.value("reason", "the update failed");
+}
+
 OnScreenWidget::OnScreenWidget(const CommandContext& context, const WidgetPresentation& presentation)
     : _client(context.runLoop, arguments(context, presentation)) {
+  _client.setNoticeHandler(context.tell);
   _client.call("initialize", initializationOf(presentation));
   for (const char* step : {"loadView", "viewWillAppear", "viewDidAppear"}) _client.call(step);
 }
 
-std::optional<std::string> OnScreenWidget::update() {
-  const json answer = _client.call("performUpdate");
-  if (answer.value("updateResult", "") != "failed") return std::nullopt;
-  return answer.value("reason", "the update failed");
-}
+std::optional<std::string> OnScreenWidget::update() { return failureOfUpdate(_client.call("performUpdate")); }
 
 void OnScreenWidget::expand() {
   if (_client.call("snapshot").value("largestAvailableDisplayMode", "") == "expanded")

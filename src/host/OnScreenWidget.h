@@ -6,6 +6,7 @@
 
 #include "host/Command.h"
 #include "host/WidgetClient.h"
+#include "platform/ui/Environment.h"
 
 namespace nimbo {
 
@@ -22,6 +23,8 @@ struct WidgetPresentation {
 
   static constexpr double kDefaultWidth = 359;
   static constexpr double kDefaultRowHeight = 110;
+  /// Points; never less than the default. Rows grow with large texts, which then have room for as many words.
+  static double rowHeightForTextSize(ContentSizeCategory category);
 
   bool operator==(const WidgetPresentation&) const = default;
 };
@@ -31,6 +34,9 @@ nlohmann::json displayModesOf(const WidgetPresentation& presentation);
 
 /// The parameters of `initialize` that present the widget so, in the compact mode.
 nlohmann::json initializationOf(const WidgetPresentation& presentation);
+
+/// Why an update failed, from the answer to `performUpdate`; absent when it did not.
+std::optional<std::string> failureOfUpdate(const nlohmann::json& answer);
 
 /// A widget process that is on the screen as long as this lives: it appears on construction, disappears, and so saves
 /// its rows, on `close`. Operations throw WidgetClientFailure.

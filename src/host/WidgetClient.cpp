@@ -8,6 +8,7 @@
 #include <sys/wait.h>
 #include <unistd.h>
 
+#include <cstdio>
 #include <cstdlib>
 #include <cstring>
 
@@ -57,7 +58,12 @@ WidgetClient::WidgetClient(GLibRunLoop& runLoop, const std::vector<std::string>&
   posix_spawn_file_actions_init(&actions);
   posix_spawn_file_actions_adddup2(&actions, toWidget.reading.get(), STDIN_FILENO);
   posix_spawn_file_actions_adddup2(&actions, fromWidget.writing.get(), STDOUT_FILENO);
-  const int failure = posix_spawn(&_process, program.c_str(), &actions, nullptr, argv.data(), environ);
+  // A group of its own: Ctrl+C in the terminal is for the host, which takes its leave of the widget.
+  posix_spawnattr_t attributes;
+  posix_spawnattr_init(&attributes);
+  posix_spawnattr_setflags(&attributes, POSIX_SPAWN_SETPGROUP);
+  const int failure = posix_spawn(&_process, program.c_str(), &actions, &attributes, argv.data(), environ);
+  posix_spawnattr_destroy(&attributes);
   posix_spawn_file_actions_destroy(&actions);
   if (failure != 0)
     throw WidgetClientFailure("cannot start " + program + ": " + std::strerror(failure) +
@@ -74,6 +80,13 @@ WidgetClient::WidgetClient(GLibRunLoop& runLoop, const std::vector<std::string>&
   handleOpening("openUserActivity");
   for (const char* heard : {"preferredContentSizeDidChange", "largestAvailableDisplayModeDidChange", "log"})
     _connection->setHandler(heard, [](const json&, const JSONRPCResponder&) {});
+  _connection->setHandler("notice", [this](const json& params, const JSONRPCResponder&) {
+    const std::string message = params.value("message", "");
+    if (_noticeHandler)
+      _noticeHandler(message);
+    else
+      std::fprintf(stderr, "%s: %s\n", kProgramName, message.c_str());
+  });
   _connection->start();
 }
 

@@ -28,6 +28,8 @@ class WidgetClient {
  public:
   /// Hears what a tapped row wants to open (method and parameters as in docs/protocol.md); answers whether it opened.
   using OpenHandler = std::function<bool(std::string_view method, const nlohmann::json& params)>;
+  /// Hears what the user must be told.
+  using NoticeHandler = std::function<void(const std::string& message)>;
 
   /// Starts the widget with these arguments. Throws WidgetClientFailure when it cannot be started.
   WidgetClient(GLibRunLoop& runLoop, const std::vector<std::string>& arguments);
@@ -37,6 +39,8 @@ class WidgetClient {
   WidgetClient& operator=(const WidgetClient&) = delete;
 
   void setOpenHandler(OpenHandler handler) { _openHandler = std::move(handler); }
+  /// Until this is called, notices go to standard error.
+  void setNoticeHandler(NoticeHandler handler) { _noticeHandler = std::move(handler); }
   JSONRPCConnection& connection() { return *_connection; }
   bool isRunning() const { return _running; }
   /// Ends a process that is not to be trusted to end by itself.
@@ -63,6 +67,7 @@ class WidgetClient {
   bool _running = false;
   std::unique_ptr<JSONRPCConnection> _connection;
   OpenHandler _openHandler;
+  NoticeHandler _noticeHandler;
 };
 
 }  // namespace nimbo

@@ -1,12 +1,13 @@
 #include "host/WidgetCommands.h"
 
 #include <cerrno>
-#include <cstdio>
+#include <charconv>
 #include <cstring>
 #include <filesystem>
 #include <fstream>
 #include <iostream>
 
+#include "host/GoneLines.h"
 #include "host/OnScreenWidget.h"
 #include "host/ScriptPlayer.h"
 #include "host/TerminalRows.h"
@@ -18,11 +19,22 @@ namespace {
 
 /// Reads "359x110".
 Size sizeOfText(const std::string& text) {
+  // Unlike scanf, from_chars takes "0x110" for no hexadecimal number.
   Size size;
-  char after = 0;
-  if (std::sscanf(text.c_str(), "%lfx%lf%c", &size.width, &size.height, &after) != 2)
+  const char* const end = text.data() + text.size();
+  auto read = std::from_chars(text.data(), end, size.width);
+  if (read.ec == std::errc() && read.ptr < end && *read.ptr == 'x')
+    read = std::from_chars(read.ptr + 1, end, size.height);
+  else
+    read.ec = std::errc::invalid_argument;
+  if (read.ec != std::errc() || read.ptr != end)
     throw CommandFailure("--size: \"" + text + "\" is no size such as 359x110");
   return size;
+}
+
+void tellGoneLines(const nlohmann::json& snapshot) {
+  for (const nlohmann::json& line : snapshot.value("goneLines", nlohmann::json::array()))
+    std::cerr << "nimbo-transit: " << goneLineText(line) << "\n";
 }
 
 }  // namespace
@@ -39,12 +51,30 @@ int runStatus(const CommandContext& context, const StatusOptions& options) {
   else
     std::cout << rowsAsText(snapshot, TerminalStyle::ofStandardOutput());
   widget.close();
+  tellGoneLines(snapshot);
   if (failure) throw CommandFailure(*failure);
+  return kExitSuccess;
+}
+
+int runUpdate(const CommandContext& context) {
+  WidgetClient client(context.runLoop, context.widgetArguments);
+  client.setNoticeHandler(context.tell);
+  // Never on screen, so that no use of the widget is recorded, and without a host's sizes, so that the display mode
+  // that was saved stays.
+  for (const char* step : {"initialize", "loadView", "viewWillAppear"}) client.call(step);
+  // The rows of the last time stay when there are no newer ones.
+  if (const auto failure = failureOfUpdate(client.call("performUpdate"))) throw CommandFailure(*failure);
+  for (const char* step : {"viewWillDisappear", "viewDidDisappear", "shutdown"}) client.call(step);
   return kExitSuccess;
 }
 
 int runRender(const CommandContext& context, const RenderOptions& options) {
   WidgetPresentation presentation;
+  // A name that is none is the widget's to refuse.
+  if (const auto category = contentSizeCategoryFromName(options.textSize)) {
+    presentation.compactHeight = WidgetPresentation::rowHeightForTextSize(*category);
+    presentation.expandedHeight = 4 * presentation.compactHeight;
+  }
   if (!options.size.empty()) {
     const Size size = sizeOfText(options.size);
     presentation.width = size.width;

@@ -16,6 +16,10 @@ struct StatusOptions {
 /// Prints how the favourite lines run. Fails, after printing the error row, when the update failed.
 int runStatus(const CommandContext& context, const StatusOptions& options);
 
+/// Fetches and saves the rows for the next start of the widget. A failed fetch fails, and leaves the rows of the last
+/// time.
+int runUpdate(const CommandContext& context);
+
 struct RenderOptions {
   bool expanded = false;
   std::string size;  ///< "WIDTHxHEIGHT", the most room in points; empty: as `status` has it

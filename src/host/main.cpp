@@ -3,10 +3,12 @@
 #include <CLI/CLI.hpp>
 #include <csignal>
 #include <iostream>
+#include <set>
 
 #include "host/FavoriteCommands.h"
 #include "host/FeedCommands.h"
 #include "host/StateCommands.h"
+#include "host/StatusBarCommand.h"
 #include "host/WidgetCommands.h"
 
 namespace nimbo {
@@ -21,6 +23,8 @@ class CommandLine {
  private:
   using Action = std::function<int(const CommandContext&)>;
   CLI::App* add(CLI::App& parent, const std::string& name, const std::string& description, Action action);
+  /// Prints a message on standard error, unless it was printed before.
+  void say(const std::string& message);
   void addWidgetCommands();
   void addFeedCommands();
   void addFavoriteCommands();
@@ -37,7 +41,8 @@ class CommandLine {
   std::string _file, _text, _key, _value;
   std::vector<std::string> _lines;
   std::size_t _position = 1;
-  bool _json = false;
+  bool _json = false, _waybar = false, _watch = false;
+  std::set<std::string> _said;
 };
 
 /// An option's text that must be an ISO date.
@@ -64,16 +69,27 @@ CLI::App* CommandLine::add(CLI::App& parent, const std::string& name, const std:
 }
 
 void CommandLine::addWidgetCommands() {
-  CLI::App* status = add(_app, "status", "Show how the favourite lines run",
-                         [this](const CommandContext& context) { return runStatus(context, _status); });
-  status->add_flag("--expanded", _status.expanded, "One row for each incident instead of one for all");
-  status->add_flag("--json", _status.json, "The widget's snapshot as JSON");
-  status->add_option("--now", _status.now, "ISO date by which incidents are judged")->check(checkDate);
+  CLI::App* status = add(_app, "status", "Show how the favourite lines run", [this](const CommandContext& context) {
+    if (_watch) return runStatusWatch(context);
+    return _waybar ? runStatusBar(context, _status.now) : runStatus(context, _status);
+  });
+  CLI::Option* expanded =
+      status->add_flag("--expanded", _status.expanded, "One row for each incident instead of one for all");
+  CLI::Option* json = status->add_flag("--json", _status.json, "The widget's snapshot as JSON");
+  CLI::Option* now =
+      status->add_option("--now", _status.now, "ISO date by which incidents are judged")->check(checkDate);
+  CLI::Option* waybar = status->add_flag("--waybar", _waybar, "One line of JSON for a status bar");
+  waybar->excludes(expanded)->excludes(json);
+  status->add_flag("--watch", _watch, "Go on printing a line whenever it changes")->needs(waybar)->excludes(now);
+
+  add(_app, "update", "Fetch, and keep the rows for the widget's next start",
+      [](const CommandContext& context) { return runUpdate(context); });
 
   CLI::App* render = add(_app, "render", "Draw the rows into a PNG file",
                          [this](const CommandContext& context) { return runRender(context, _render); });
   render->add_flag("--expanded", _render.expanded, "One row for each incident instead of one for all");
-  render->add_option("--size", _render.size, "Most room in points, as WIDTHxHEIGHT");
+  render->add_option("--size", _render.size,
+                     "Most room in points, as WIDTHxHEIGHT; grows with the text size until set");
   render->add_option("--scale", _render.scale, "Device pixels for each point")->capture_default_str();
   render->add_option("--text-size", _render.textSize, "extraSmall to accessibilityExtraExtraExtraLarge")
       ->capture_default_str();
@@ -151,11 +167,29 @@ int CommandLine::run(int argc, char** argv) {
   } catch (const CLI::ParseError& error) {
     return _app.exit(error) == 0 ? kExitSuccess : kExitUsage;
   }
-  std::vector<std::string> arguments;
-  if (_config) arguments.insert(arguments.end(), {"--config", std::filesystem::absolute(*_config)});
-  if (_state) arguments.insert(arguments.end(), {"--state", std::filesystem::absolute(*_state)});
-  GLibRunLoop runLoop;
-  return _chosen({runLoop, Paths::resolve(_config, _state), std::move(arguments)});
+  int status = kExitSuccess;
+  // A command without notices of its own has failed all the same when there is one.
+  const auto tell = [&](const std::string& notice) {
+    say(notice);
+    status = kExitFailure;
+  };
+  try {
+    std::vector<std::string> arguments;
+    if (_config) arguments.insert(arguments.end(), {"--config", std::filesystem::absolute(*_config)});
+    if (_state) arguments.insert(arguments.end(), {"--state", std::filesystem::absolute(*_state)});
+    GLibRunLoop runLoop;
+    status = std::max(_chosen({runLoop, Paths::resolve(_config, _state), std::move(arguments), tell}), status);
+  } catch (const std::exception& failure) {
+    say(failure.what());
+    status = kExitFailure;
+  }
+  return status;
+}
+
+void CommandLine::say(const std::string& message) {
+  if (!_said.insert(message).second) return;
+  std::cout << std::flush;
+  std::cerr << "nimbo-transit: " << message << "\n";
 }
 
 }  // namespace
@@ -163,11 +197,5 @@ int CommandLine::run(int argc, char** argv) {
 
 int main(int argc, char** argv) {
   std::signal(SIGPIPE, SIG_IGN);
-  try {
-    return nimbo::CommandLine().run(argc, argv);
-  } catch (const std::exception& failure) {
-    std::cout << std::flush;
-    std::cerr << "nimbo-transit: " << failure.what() << "\n";
-    return nimbo::kExitFailure;
-  }
+  return nimbo::CommandLine().run(argc, argv);
 }

@@ -110,10 +110,11 @@ json rowJSON(NBTransitIncidentsViewController& controller, IndexPath indexPath) 
 json resultJSON(const ResultRef& result) {
   if (!result) return {{"result", nullptr}};
   json answer = {{"result", result->isSuccess() ? "success" : "error"}};
-  result->withValue_orError([](const ObjectRef&) {},
-                            [&](const ErrorRef& error) {
-                              answer["error"] = {{"domain", error->domain()}, {"code", error->code()}};
-                            });
+  result->withValue_orError(
+      [](const ObjectRef&) {},
+      [&](const ErrorRef& error) {
+        answer["error"] = {{"domain", error->domain()}, {"code", error->code()}, {"reason", error->reason()}};
+      });
   return answer;
 }
 

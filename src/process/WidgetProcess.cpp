@@ -5,6 +5,7 @@
 #include <utility>
 
 #include "desktop/drawing/Rendering.h"
+#include "desktop/gtfs/LineNames.h"
 #include "platform/ui/SystemColors.h"
 #include "process/HostLogSink.h"
 #include "process/SharedSurface.h"
@@ -128,12 +129,14 @@ json WidgetProcess::initialize(const Parameters& params) {
       [this](const std::string& category, const std::string& text) {
         _connection.notify("log", {{"level", "error"}, {"category", category}, {"message", text}});
       });
-  _platform = std::make_unique<DesktopPlatform>(DesktopPlatform::Options{.paths = _options.paths,
-                                                                         .locale = locale.value_or(""),
-                                                                         .runLoop = _runLoop,
-                                                                         .virtualTime = _virtualTime.get(),
-                                                                         .activityLauncher = _host,
-                                                                         .logSink = std::move(logSink)});
+  _platform = std::make_unique<DesktopPlatform>(
+      DesktopPlatform::Options{.paths = _options.paths,
+                               .locale = locale.value_or(""),
+                               .runLoop = _runLoop,
+                               .virtualTime = _virtualTime.get(),
+                               .activityLauncher = _host,
+                               .logSink = std::move(logSink),
+                               .notice = [this](const ErrorRef& notice) { tellNotice(notice); }});
   Environment& environment = Environment::current();
   environment.setContentSizeCategory(textSize);
   environment.setScreenScale(scale);
@@ -253,7 +256,13 @@ json WidgetProcess::highlightRow(const Parameters& params) {
   return {{"highlighted", tableView.highlightedRow() == indexPath}};
 }
 
-json WidgetProcess::snapshot(const Parameters&) { return snapshotJSON(*_controller); }
+json WidgetProcess::snapshot(const Parameters&) {
+  _frameAnnounced = false;
+  json snapshot = snapshotJSON(*_controller);
+  json& gone = snapshot["goneLines"] = json::array();
+  for (const auto& identifier : _platform->transitLines().goneLines()) gone.push_back(writtenNameOfLine(*identifier));
+  return snapshot;
+}
 
 json WidgetProcess::render(const Parameters& params) {
   const bool toSurface = params.has("surface");
@@ -287,6 +296,10 @@ json WidgetProcess::setScale(const Parameters& params) {
   return json::object();
 }
 
+void WidgetProcess::tellNotice(const ErrorRef& notice) {
+  _runLoop.dispatchAsync([this, notice] { _connection.notify("notice", {{"message", notice->reason()}}); });
+}
+
 void WidgetProcess::announceFrame() {
   if (std::exchange(_frameAnnounced, true)) return;
   _connection.notify("frame", json::object());
@@ -307,6 +320,7 @@ json WidgetProcess::shutdown(const Parameters&) {
 void WidgetProcess::resizeView(Size size) {
   if (!_controller || !_controller->isViewLoaded()) return;
   _controller->view()->setFrame({0, 0, size.width, size.height});
+  announceFrame();
 }
 
 }  // namespace nimbo

@@ -63,7 +63,9 @@ class WidgetProcess {
 
   IndexPath existingRow(const Parameters& params) const;
   void resizeView(Size size);
-  /// Tells the host, once until it renders, that what the widget shows has changed.
+  /// Sends the host what its user must hear. Any thread.
+  void tellNotice(const ErrorRef& notice);
+  /// Tells the host, once until it looks or renders, that what the widget shows has changed.
   void announceFrame();
 
   Options _options;

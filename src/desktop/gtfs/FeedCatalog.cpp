@@ -1,5 +1,8 @@
 #include "desktop/gtfs/FeedCatalog.h"
 
+#include <map>
+
+#include "desktop/gtfs/FeedLookup.h"
 #include "desktop/gtfs/LineItems.h"
 #include "desktop/gtfs/TransitLineServiceError.h"
 #include "desktop/gtfs/Utf8.h"
@@ -43,6 +46,26 @@ Outcome<FeedCatalog::Lines> FeedCatalog::linesMatching(std::string_view text, co
 Outcome<FeedCatalog::Lines> FeedCatalog::linesNumbered(const std::set<std::uint64_t>& muids,
                                                        const std::stop_token& stop) const {
   return lines([&](const StaticFeed&, const StaticLine& line) { return muids.contains(line.muid); }, stop);
+}
+
+Outcome<FeedCatalog::GoneLines> FeedCatalog::goneLines(const std::vector<MapItemIdentifierRef>& identifiers) const {
+  if (const auto sources = _library.sources(); !sources) return sources.error();
+  std::map<std::string, std::vector<MapItemIdentifierRef>> byFeed;
+  for (const MapItemIdentifierRef& identifier : identifiers)
+    if (identifier->locator()) byFeed[identifier->locator()->feed].push_back(identifier);
+  GoneLines gone;
+  for (const auto& [name, ofFeed] : byFeed) {
+    const auto source = _library.sourceNamed(name);
+    const auto loaded = source ? (*source)->staticFeed({}) : source.error();
+    if (!loaded) {
+      gone.errors.push_back(loaded.error());
+      continue;
+    }
+    const auto found = findLines(loaded->feed, name, ofFeed);
+    for (std::size_t i = 0; i < found.size(); ++i)
+      if (!found[i]) gone.lines.push_back(ofFeed[i]);
+  }
+  return gone;
 }
 
 Outcome<TransitLineRef> FeedCatalog::lineNamed(std::string_view name) const {

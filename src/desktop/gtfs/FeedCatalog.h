@@ -29,6 +29,14 @@ class FeedCatalog {
   /// The lines of these numbers; those that no feed knows are left out. An error as above.
   Outcome<Lines> linesNumbered(const std::set<std::uint64_t>& muids, const std::stop_token& stop = {}) const;
 
+  /// Of these lines those that their feeds do not know any more, and the errors of feeds that could not be read or are
+  /// not set up. An error as above.
+  struct GoneLines {
+    std::vector<MapItemIdentifierRef> lines;
+    std::vector<ErrorRef> errors;
+  };
+  Outcome<GoneLines> goneLines(const std::vector<MapItemIdentifierRef>& identifiers) const;
+
   /// The line that is written "FEED:ROUTE_ID", or an error that says what to do.
   Outcome<TransitLineRef> lineNamed(std::string_view name) const;
 

@@ -26,7 +26,8 @@ std::optional<std::uint32_t> lineLike(const StaticFeed& feed, const TransitLineL
   return found;
 }
 
-/// The line of each identifier, by its index.
+}  // namespace
+
 std::vector<std::optional<std::uint32_t>> findLines(const StaticFeed& feed, const std::string& feedName,
                                                     std::span<const MapItemIdentifierRef> identifiers) {
   std::unordered_map<std::uint64_t, std::optional<std::uint32_t>> lineOfMuid;
@@ -43,8 +44,6 @@ std::vector<std::optional<std::uint32_t>> findLines(const StaticFeed& feed, cons
   }
   return lines;
 }
-
-}  // namespace
 
 Outcome<TransitLineItems> lookUpInFeed(const FeedSource& source, std::span<const MapItemIdentifierRef> identifiers,
                                        std::string_view language, const std::stop_token& stop) {

@@ -1,5 +1,6 @@
 #pragma once
 
+#include <optional>
 #include <span>
 #include <stop_token>
 #include <string_view>
@@ -10,9 +11,14 @@
 
 namespace nimbo {
 
+/// The index of each identifier's line in a feed; absent for one that the feed does not know: neither by its number nor
+/// by an agency, short name and mode that only one line has.
+std::vector<std::optional<std::uint32_t>> findLines(const StaticFeed& feed, const std::string& feedName,
+                                                    std::span<const MapItemIdentifierRef> identifiers);
+
 /// Looks lines up in one feed: their static data and their incidents by the alerts as they are now, texts in `language`
-/// (a BCP 47 tag). Answers an item for each identifier, null for one that the feed does not know: neither by its number
-/// nor by an agency, short name and mode that only one line has. Blocks its thread.
+/// (a BCP 47 tag). Answers an item for each identifier, null for one whose line `findLines` does not find. Blocks its
+/// thread.
 Outcome<TransitLineItems> lookUpInFeed(const FeedSource& source, std::span<const MapItemIdentifierRef> identifiers,
                                        std::string_view language, const std::stop_token& stop);
 

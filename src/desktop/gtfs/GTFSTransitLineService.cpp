@@ -5,6 +5,7 @@
 
 #include "desktop/gtfs/FeedLog.h"
 #include "desktop/gtfs/FeedLookup.h"
+#include "desktop/gtfs/LineNames.h"
 #include "desktop/gtfs/TransitLineServiceError.h"
 #include "platform/Platform.h"
 
@@ -82,11 +83,6 @@ Outcome<TransitLineItems> lookUpAll(const std::vector<MapItemIdentifierRef>& ide
   return items;
 }
 
-std::string nameOf(const MapItemIdentifier& identifier) {
-  const auto& locator = identifier.locator();
-  return locator ? locator->feed + ":" + locator->routeID : std::to_string(identifier.muid());
-}
-
 /// The lines that are left out, taken out of `items`.
 std::vector<MapItemIdentifierRef> takeGone(TransitLineItems& items,
                                            const std::vector<MapItemIdentifierRef>& identifiers) {
@@ -95,13 +91,14 @@ std::vector<MapItemIdentifierRef> takeGone(TransitLineItems& items,
     if (!items[i]) gone.push_back(identifiers[i]);
   std::erase(items, nullptr);
   for (const MapItemIdentifierRef& identifier : gone)
-    writeLog(kFeedLogFacility, LogLevel::error, "The line %{private}@ is gone from its feed", {nameOf(*identifier)});
+    writeLog(kFeedLogFacility, LogLevel::error, "The line %{private}@ is gone from its feed",
+             {writtenNameOfLine(*identifier)});
   return gone;
 }
 
 ErrorRef allGone(const std::vector<MapItemIdentifierRef>& gone) {
   std::string names;
-  for (const MapItemIdentifierRef& identifier : gone) names += " " + nameOf(*identifier);
+  for (const MapItemIdentifierRef& identifier : gone) names += " " + writtenNameOfLine(*identifier);
   return transitLineServiceError(
       TransitLineServiceError::unknownLine,
       "No line of the favourites is in its feed any more:" + names + ". Choose the lines anew.");

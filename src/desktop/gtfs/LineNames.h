@@ -4,6 +4,7 @@
 #include <string_view>
 
 #include "desktop/gtfs/StaticFeed.h"
+#include "platform/transit/MapItemIdentifier.h"
 
 namespace nimbo {
 
@@ -18,6 +19,12 @@ inline std::string fullNameOfLine(const StaticLine& line) {
   if (!line.shortName.empty() && !line.longName.empty() && line.longName != line.shortName)
     name.append(", ").append(line.longName);
   return name;
+}
+
+/// A line as its user writes it, "FEED:ROUTE_ID"; its number where only that is known.
+inline std::string writtenNameOfLine(const MapItemIdentifier& identifier) {
+  const auto& locator = identifier.locator();
+  return locator ? locator->feed + ":" + locator->routeID : std::to_string(identifier.muid());
 }
 
 }  // namespace nimbo

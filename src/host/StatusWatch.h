@@ -1,0 +1,63 @@
+#pragma once
+
+#include <functional>
+#include <memory>
+#include <nlohmann/json.hpp>
+#include <string>
+#include <string_view>
+
+#include "host/Backoff.h"
+#include "host/OnScreenWidget.h"
+#include "host/WidgetClient.h"
+
+namespace nimbo {
+
+/// Follows a widget on screen for a status bar: tells a line of `statusBarLine` whenever it is another one than the
+/// line before. The widget keeps its own schedule; what it leaves to its host is done here: a failed update is tried
+/// again, and a process that ends, hangs or speaks nonsense is replaced, both after waiting times that grow. Main
+/// thread only.
+class StatusWatch {
+ public:
+  using Show = std::function<void(const std::string& line)>;
+
+  /// Starts the widget. `context`, and what `show` holds, outlive this.
+  StatusWatch(const CommandContext& context, WidgetPresentation presentation, Show show);
+  /// Takes the widget off the screen, which saves its rows, and ends the process.
+  ~StatusWatch();
+  StatusWatch(const StatusWatch&) = delete;
+  StatusWatch& operator=(const StatusWatch&) = delete;
+
+  // Seconds before the first and the later attempts.
+  static constexpr TimeInterval kFirstRestart = 1, kLongestRestart = 300;
+  static constexpr TimeInterval kFirstUpdate = 60, kLongestUpdate = 1800;
+
+ private:
+  using Completion = std::function<void(const nlohmann::json& result)>;
+
+  void start();
+  void update();
+  void look();
+  void showSnapshot(const nlohmann::json& snapshot);
+  void showLine(const std::string& line);
+  void ask(std::string_view method, const nlohmann::json& params = nlohmann::json::object(),
+           Completion completion = nullptr);
+  void waitForAnswer();
+  /// Gives this process up. Another one follows later.
+  void fail(const std::string& reason);
+  void cancel(std::shared_ptr<Timer>& timer);
+
+  const CommandContext& _context;
+  WidgetPresentation _presentation;
+  Show _show;
+  std::string _lastLine;
+  Backoff _restarts{kFirstRestart, kLongestRestart};
+  Backoff _updates{kFirstUpdate, kLongestUpdate};
+  std::shared_ptr<Timer> _restart;   // until then the process is not heard any more
+  std::shared_ptr<Timer> _update;    // the next attempt after a failed one
+  std::shared_ptr<Timer> _patience;  // with the answer that is waited for
+  std::unique_ptr<WidgetClient> _client;
+  std::size_t _unanswered = 0;
+  bool _updating = false;
+};
+
+}  // namespace nimbo
