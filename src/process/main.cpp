@@ -7,6 +7,8 @@
 #include <csignal>
 #include <cstdio>
 
+#include "process/Sandbox.h"
+#include "desktop/drawing/PangoTextSystem.h"
 #include "process/WidgetProcess.h"
 
 namespace {
@@ -41,11 +43,14 @@ int main(int argc, char** argv) {
   }
 
   std::signal(SIGPIPE, SIG_IGN);
+  if (const nimbo::ErrorRef refused = nimbo::giveUpPrivileges())
+    std::fprintf(stderr, "nimbo-transit-widget: %s\n", refused->reason().c_str());
   const int output = takeStandardOutput();
   if (output < 0) {
     std::perror("nimbo-transit-widget: standard output");
     return 1;
   }
+  nimbo::PangoTextSystem::lookForFonts();
   try {
     return nimbo::WidgetProcess(std::move(options), STDIN_FILENO, output).run();
   } catch (const std::exception& exception) {
