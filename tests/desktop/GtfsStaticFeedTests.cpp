@@ -274,7 +274,7 @@ TEST(FeedAddress, HidesItsSecretsFromMessages) {
       {"/data/./y?z", "/data/y?z"},
   };
   for (const auto& [text, shown] : cases) EXPECT_EQ(FeedAddress::parse(text)->publicText(), shown);
-  for (const char* text : {"", "  ", "ftp://example.org/x", "javascript://x", "http://", "a\nb"})
+  for (const char* text : {"", "  ", "ftp://example.org/x", "gopher://x", "http:/u:p@x", "data:,x", "http://", "a\nb"})
     EXPECT_FALSE(FeedAddress::parse(text)) << text;
 }
 

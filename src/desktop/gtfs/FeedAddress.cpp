@@ -41,6 +41,11 @@ Outcome<FeedAddress> FeedAddress::parse(std::string_view text) {
   else if (!scheme.empty())
     return badAddress("Addresses that begin with \"" + scheme +
                       "://\" are not read. Give a path or an http or https address.");
+  for (const std::string_view begin : {"http:", "https:", "data:"})  // where keys may follow: nothing of it is shown
+    if (asciiLowerCase(text.substr(0, begin.size())) == begin)
+      return badAddress(
+          "An address that begins with \"" + std::string(begin) +
+          "\" goes on with \"//\" and its server, or is not read. Give a path or an http or https address.");
   std::error_code error;
   const std::filesystem::path path = std::filesystem::absolute(std::filesystem::path(text), error).lexically_normal();
   if (error) return badAddress("The path \"" + std::string(text) + "\" cannot be used: " + error.message() + ".");
