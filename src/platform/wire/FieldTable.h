@@ -31,6 +31,9 @@ struct Field {
   std::string_view name;  ///< key in the dictionary representation; a literal
   Member Struct::*member;
 };
+// Said for compilers that do not deduce the arguments of aggregates by themselves.
+template <class Struct, class Member>
+Field(std::uint32_t, std::string_view, Member Struct::*) -> Field<Struct, Member>;
 
 /// The fields of a struct: a specialisation has `static constexpr std::tuple fields{Field{...}, ...}`, ascending.
 template <class Struct>

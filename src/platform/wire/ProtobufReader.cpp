@@ -2,7 +2,6 @@
 
 #include <algorithm>
 #include <bit>
-#include <ranges>
 
 #include "platform/wire/WireType.h"
 
@@ -91,7 +90,8 @@ bool ProtobufReader::skipValueWithTag(std::uint32_t field, std::uint32_t wireTyp
 std::string ProtobufReader::failureText() const {
   if (!_failureReason) return {};
   std::string text;
-  for (const std::string& name : std::views::reverse(_failedFields)) text += (text.empty() ? "" : ".") + name;
+  for (auto name = _failedFields.rbegin(); name != _failedFields.rend(); ++name)
+    text += (text.empty() ? "" : ".") + *name;
   if (!text.empty()) text += ": ";
   return text + _failureReason + ", at byte " + std::to_string(_failureOffset);
 }
