@@ -13,8 +13,6 @@ struct IterDeleter {
 };
 using IterHandle = std::unique_ptr<PangoLayoutIter, IterDeleter>;
 
-double points(int pangoUnits) { return static_cast<double>(pangoUnits) / PANGO_SCALE; }
-
 /// How much wider than itself Pango made the ellipsis that ends a line, to fill the width that the line was given.
 int ellipsisPadding(const PangoLayoutLine* line) {
   const GSList* runs = line->runs;
@@ -33,9 +31,9 @@ int ellipsisPadding(const PangoLayoutLine* line) {
 
 }  // namespace
 
-PangoTextLayout::PangoTextLayout(GObjectHandle<PangoLayout> layout, TextAlignment alignment, bool rightToLeft,
-                                 bool wasCut)
-    : _layout(std::move(layout)), _alignment(alignment), _rightToLeft(rightToLeft) {
+PangoTextLayout::PangoTextLayout(GObjectHandle<PangoLayout> layout, double scale, TextAlignment alignment,
+                                 bool rightToLeft, bool wasCut)
+    : _layout(std::move(layout)), _scale(scale), _alignment(alignment), _rightToLeft(rightToLeft) {
   int width = 0, height = 0;
   pango_layout_get_size(_layout.get(), &width, &height);
   _size = {points(width), points(height)};
@@ -51,6 +49,8 @@ PangoTextLayout::PangoTextLayout(GObjectHandle<PangoLayout> layout, TextAlignmen
   _isTruncated = wasCut || pango_layout_is_ellipsized(_layout.get());
 }
 
+double PangoTextLayout::points(int pangoUnits) const { return pangoUnits * _scale / PANGO_SCALE; }
+
 void PangoTextLayout::draw(cairo_t* context, Point origin, double width) const {
   const IterHandle iter(pango_layout_get_iter(_layout.get()));
   do {
@@ -62,8 +62,12 @@ void PangoTextLayout::draw(cairo_t* context, Point origin, double width) const {
       x = room / 2;
     else if (_rightToLeft)
       x = room;
-    cairo_move_to(context, origin.x + x, origin.y + points(pango_layout_iter_get_baseline(iter.get())));
+    cairo_save(context);
+    cairo_translate(context, origin.x + x, origin.y + points(pango_layout_iter_get_baseline(iter.get())));
+    cairo_scale(context, _scale, _scale);
+    cairo_move_to(context, 0, 0);
     pango_cairo_show_layout_line(context, pango_layout_iter_get_line_readonly(iter.get()));
+    cairo_restore(context);
   } while (pango_layout_iter_next_line(iter.get()));
 }
 

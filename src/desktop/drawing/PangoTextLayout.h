@@ -12,8 +12,10 @@ namespace nimbo {
 /// every screen.
 class PangoTextLayout final : public TextLayout {
  public:
-  /// `layout` is complete and starts every line at its left edge. `wasCut`: text was left out of it already.
-  PangoTextLayout(GObjectHandle<PangoLayout> layout, TextAlignment alignment, bool rightToLeft, bool wasCut);
+  /// `layout` is complete and starts every line at its left edge. `scale`: points for each of its own, above 0.
+  /// `wasCut`: text was left out of it already.
+  PangoTextLayout(GObjectHandle<PangoLayout> layout, double scale, TextAlignment alignment, bool rightToLeft,
+                  bool wasCut);
 
   Size size() const override { return _size; }
   std::size_t lineCount() const override { return _lineCount; }
@@ -28,7 +30,10 @@ class PangoTextLayout final : public TextLayout {
   std::string_view className() const override { return "PangoTextLayout"; }
 
  private:
+  double points(int pangoUnits) const;
+
   GObjectHandle<PangoLayout> _layout;
+  double _scale;
   TextAlignment _alignment;
   bool _rightToLeft;
   Size _size;

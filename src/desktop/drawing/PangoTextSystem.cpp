@@ -20,6 +20,17 @@ constexpr LogFacility kTextLogFacility{kDefaultLogSubsystem, "Text"};
 /// Pango counts in 1024ths of a point with 32 bits.
 constexpr double kUnlimitedWidth = 1e6;
 
+/// The one size in which texts are laid out, in points; nothing is hinted, so that other sizes are the same, scaled.
+/// Pango looks through all fonts anew for each size: a start with five rows takes 0.6 of the instructions.
+constexpr double kLayoutSize = 32;
+
+/// How large a font is, measured in `kLayoutSize`.
+double scaleOf(const FontDescriptor& font) {
+  if (!(font.pointSize > 0) || !std::isfinite(font.pointSize))
+    throw std::invalid_argument("a font's point size is above 0");
+  return std::min(font.pointSize, 1000.0) / kLayoutSize;
+}
+
 struct FontDescriptionDeleter {
   void operator()(PangoFontDescription* description) const { pango_font_description_free(description); }
 };
@@ -33,12 +44,10 @@ struct FontOptionsDeleter {
 using FontDescription = std::unique_ptr<PangoFontDescription, FontDescriptionDeleter>;
 
 FontDescription describe(const FontDescriptor& font) {
-  if (!(font.pointSize > 0) || !std::isfinite(font.pointSize))
-    throw std::invalid_argument("a font's point size is above 0");
   FontDescription description(pango_font_description_new());
   pango_font_description_set_family_static(description.get(), "sans-serif");
   pango_font_description_set_weight(description.get(), font.bold ? PANGO_WEIGHT_BOLD : PANGO_WEIGHT_NORMAL);
-  pango_font_description_set_absolute_size(description.get(), std::min(font.pointSize, 1000.0) * PANGO_SCALE);
+  pango_font_description_set_absolute_size(description.get(), kLayoutSize * PANGO_SCALE);
   return description;
 }
 
@@ -115,11 +124,12 @@ void drawAsLatinIfASCII(PangoLayout* layout, const std::string& text) {
 
 }  // namespace
 
+void PangoTextSystem::lookForFonts() { pango_cairo_font_map_get_default(); }
+
 PangoContext* PangoTextSystem::context(bool rightToLeft) {
   GObjectHandle<PangoContext>& context = _contexts[rightToLeft];
   if (context) return context.get();
-  if (!_fontMap) _fontMap.reset(pango_cairo_font_map_new());
-  context.reset(pango_font_map_create_context(_fontMap.get()));
+  context.reset(pango_font_map_create_context(pango_cairo_font_map_get_default()));
   pango_context_set_base_dir(context.get(), rightToLeft ? PANGO_DIRECTION_RTL : PANGO_DIRECTION_LTR);
   pango_context_set_language(context.get(), pango_language_from_string(_language.c_str()));
   pango_context_set_round_glyph_positions(context.get(), FALSE);
@@ -132,22 +142,22 @@ PangoContext* PangoTextSystem::context(bool rightToLeft) {
 }
 
 FontMetrics PangoTextSystem::metrics(const FontDescriptor& font) {
-  const FontDescription description = describe(font);
+  const double size = scaleOf(font) * kLayoutSize;
   std::optional<FontMetrics>& unit = _unitMetrics[font.bold];
   if (!unit) {
-    // The size asked for, because a text will follow in it: looking for fonts takes Pango a millisecond a size.
-    const GObjectHandle<PangoFont> face(pango_context_load_font(context(false), description.get()));
+    const GObjectHandle<PangoFont> face(pango_context_load_font(context(false), describe(font).get()));
     if (face) unit = unitMetrics(face.get());
     if (!unit) {
       logMissingCharacters();
       unit = FontMetrics{0.8, 0.2, 0.7};
     }
   }
-  return {unit->ascent * font.pointSize, unit->descent * font.pointSize, unit->capHeight * font.pointSize};
+  return {unit->ascent * size, unit->descent * size, unit->capHeight * size};
 }
 
 TextLayoutRef PangoTextSystem::layOut(const std::string& text, const FontDescriptor& font, double maxWidth,
                                       std::size_t maxLines, TextAlignment alignment, bool rightToLeft) {
+  const double scale = scaleOf(font);
   std::string shown = valid(text);
   const bool wasCut = cutToMaximum(shown);
   if (maxLines > 0) joinLines(shown);
@@ -159,8 +169,8 @@ TextLayoutRef PangoTextSystem::layOut(const std::string& text, const FontDescrip
   if (!(maxWidth > 0)) {
     pango_layout_set_width(layout.get(), 0);
     pango_layout_set_wrap(layout.get(), PANGO_WRAP_WORD);
-  } else if (maxWidth < kUnlimitedWidth) {
-    pango_layout_set_width(layout.get(), static_cast<int>(std::lround(maxWidth * PANGO_SCALE)));
+  } else if (const double width = maxWidth / scale; width < kUnlimitedWidth) {
+    pango_layout_set_width(layout.get(), static_cast<int>(std::lround(width * PANGO_SCALE)));
     pango_layout_set_wrap(layout.get(), PANGO_WRAP_WORD_CHAR);
   }
   if (maxLines > 0) {
@@ -168,7 +178,7 @@ TextLayoutRef PangoTextSystem::layOut(const std::string& text, const FontDescrip
     pango_layout_set_height(layout.get(), -static_cast<int>(std::min<std::size_t>(maxLines, 1'000'000)));
   }
   if (pango_layout_get_unknown_glyphs_count(layout.get()) > 0) logMissingCharacters();
-  return std::make_shared<const PangoTextLayout>(std::move(layout), alignment, rightToLeft, wasCut);
+  return std::make_shared<const PangoTextLayout>(std::move(layout), scale, alignment, rightToLeft, wasCut);
 }
 
 void PangoTextSystem::logMissingCharacters() {

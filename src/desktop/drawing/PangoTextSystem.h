@@ -8,7 +8,6 @@
 #include "platform/ui/TextSystem.h"
 
 typedef struct _PangoContext PangoContext;
-typedef struct _PangoFontMap PangoFontMap;
 
 namespace nimbo {
 
@@ -18,6 +17,10 @@ class PangoTextSystem final : public TextSystem {
  public:
   /// `language` is the user's, as a BCP 47 tag ("ja"): it chooses between the shapes that languages give a character.
   explicit PangoTextSystem(std::string language = "en") : _language(std::move(language)) {}
+
+  /// Begins to look for fonts, on a thread of Pango's: for a program that will show text soon, and has other things to
+  /// do until then. Main thread.
+  static void lookForFonts();
 
   /// Throws std::invalid_argument for a point size that is not above 0.
   FontMetrics metrics(const FontDescriptor& font) override;
@@ -35,7 +38,6 @@ class PangoTextSystem final : public TextSystem {
   void logMissingCharacters();
 
   std::string _language;
-  GObjectHandle<PangoFontMap> _fontMap;
   // One for each paragraph direction: changing a context lays out anew what was made with it.
   std::array<GObjectHandle<PangoContext>, 2> _contexts;
   std::array<std::optional<FontMetrics>, 2> _unitMetrics;  // at a size of 1 point: regular, bold
