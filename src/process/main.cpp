@@ -7,8 +7,8 @@
 #include <csignal>
 #include <cstdio>
 
-#include "process/Sandbox.h"
 #include "desktop/drawing/PangoTextSystem.h"
+#include "process/Sandbox.h"
 #include "process/WidgetProcess.h"
 
 namespace {
