@@ -155,7 +155,15 @@ TEST_F(FavoritesTest, FailTheLookupRatherThanSeemToBeNone) {
   std::filesystem::remove(file());
   EXPECT_EQ(makeEditor().add({lineItem(2, "B")}), nullptr);
   EXPECT_EQ(lookUp(), "");
-  EXPECT_EQ(platform.transitLines.lookups(), (std::vector<std::vector<std::uint64_t>>{{1}, {2}}));
+  // Damage that takes favourites is no emptied list either, until the user has seen to it.
+  connect().prepare("PRAGMA wal_checkpoint(TRUNCATE)").step();
+  const auto page = connect().integer("SELECT rootpage FROM sqlite_schema WHERE name = 'favorites'");
+  overwrite(file(), (page - 1) * 4096, std::string(4096, '\xee'));
+  for (int i = 0; i < 3; ++i) EXPECT_THAT(lookUp(), testing::HasSubstr(".broken-2026-01-05T12-00-00"));
+  EXPECT_EQ(notices.size(), 1u);
+  EXPECT_EQ(makeEditor().add({lineItem(3, "C")}), nullptr);
+  EXPECT_EQ(lookUp(), "");
+  EXPECT_EQ(platform.transitLines.lookups(), (std::vector<std::vector<std::uint64_t>>{{1}, {2}, {3}}));
 }
 
 TEST_F(FavoritesTest, LoseNothingWhenHostsChangeThemAtOnce) {

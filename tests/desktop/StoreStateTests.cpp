@@ -88,6 +88,18 @@ TEST_F(StateDatabaseTest, KeepsWhatCanBeReadOfADamagedFileInEveryProcess) {
   EXPECT_EQ(notices.size(), 1u);
 }
 
+TEST_F(StateDatabaseTest, EndsAReplacementThatWasCutShort) {
+  ASSERT_EQ(makeSettings()->setValue_forKey("kept", "key"), nullptr);
+  // Half made beside the damaged one, or made and the damaged one set aside.
+  std::ofstream(file().string() + ".new") << "half";
+  EXPECT_EQ(makeSettings()->stringForKey("key"), "kept");
+  fs::rename(file(), file().string() + ".new");
+  std::ofstream(file().string() + "-wal") << "the damaged one's";
+  EXPECT_EQ(makeSettings()->stringForKey("key"), "kept");
+  EXPECT_EQ(contentOf(setAside().string() + "-wal"), "the damaged one's");
+  EXPECT_FALSE(fs::exists(file().string() + ".new"));
+}
+
 TEST_F(StateDatabaseTest, LeavesDatabasesOfOthersAsTheyAre) {
   fs::create_directory(folder());
   for (const char* statements : {"CREATE TABLE t(x); PRAGMA user_version = 2", "CREATE TABLE favorites(name)"}) {

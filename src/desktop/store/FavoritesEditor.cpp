@@ -4,6 +4,7 @@
 #include <stdexcept>
 
 #include "desktop/store/FavoriteLineContent.h"
+#include "desktop/store/StateDatabaseSchema.h"
 
 namespace nimbo {
 
@@ -23,6 +24,17 @@ ErrorRef refusal(FavoritesError code, std::string reason) {
 
 ErrorRef unknownLine(std::uint64_t muid) {
   return refusal(FavoritesError::unknown, "The line " + std::to_string(muid) + " is no favourite.");
+}
+
+/// An error while favourites are missing that a damaged database had.
+ErrorRef lossOf(SQLiteConnection& connection) {
+  SQLiteStatement query = connection.prepare("SELECT value FROM settings WHERE key = ?");
+  query.bind(1, kFavoritesLostKey);
+  if (!query.step()) return nullptr;
+  return refusal(FavoritesError::lost, "Not all favourites could be read in a damaged database, which is kept as " +
+                                           query.text(0) + ": " +
+                                           std::to_string(connection.integer("SELECT count(*) FROM favorites")) +
+                                           " of them are left. Add those that you miss; that ends this message.");
 }
 
 bool wereSet(SQLiteConnection& connection) {
@@ -58,6 +70,9 @@ void append(SQLiteConnection& connection, const TransitLine& line) {
 }
 
 void markAsSet(SQLiteConnection& connection) {
+  SQLiteStatement remove = connection.prepare("DELETE FROM settings WHERE key = ?");
+  remove.bind(1, kFavoritesLostKey);
+  remove.step();
   SQLiteStatement insert = connection.prepare("INSERT OR REPLACE INTO settings(key, value) VALUES (?, 1)");
   insert.bind(1, kFavoritesWereSetKey);
   insert.step();
@@ -89,7 +104,7 @@ ErrorRef FavoritesEditor::list(Favorites& favorites) const {
   std::optional<Favorites> stored;
   const ErrorRef error = _database->read([&](SQLiteConnection& connection) -> ErrorRef {
     if (wereSet(connection)) stored = storedFavorites(connection);
-    return nullptr;
+    return lossOf(connection);
   });
   if (error) return error;
   if (!stored) {

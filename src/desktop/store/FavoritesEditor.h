@@ -8,7 +8,7 @@ namespace nimbo {
 /// Domain of the errors of favourites; the codes are FavoritesError.
 inline constexpr std::string_view kFavoritesErrorDomain = "org.nimbo.Favorites";
 
-enum class FavoritesError : std::int64_t { duplicate = 1, unknown = 2, position = 3 };
+enum class FavoritesError : std::int64_t { duplicate = 1, unknown = 2, position = 3, lost = 4 };
 
 /// Setting that tells an emptied list of favourites from one that was never begun.
 inline constexpr std::string_view kFavoritesWereSetKey = "Nimbo.Favorites.wereSet";
@@ -26,7 +26,8 @@ class FavoritesEditor final {
   FavoritesEditor(std::shared_ptr<StateDatabase> database, FirstFavorites firstFavorites);
 
   /// Sets `favorites` to all favourites in their order; while none were ever set, to the first ones. A line whose
-  /// content cannot be read is a favourite without a line. Null on success, otherwise `favorites` stays.
+  /// content cannot be read is a favourite without a line. Null on success, otherwise `favorites` stays: also after
+  /// damage that took some of them, until the next change.
   ErrorRef list(Favorites& favorites) const;
 
   // The first change begins from the first favourites. Each answers null on success.

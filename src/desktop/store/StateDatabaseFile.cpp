@@ -38,6 +38,18 @@ std::string_view adviceFor(int sqliteCode) {
 
 fs::path withSuffix(const fs::path& path, std::string_view suffix) { return fs::path(path).concat(suffix); }
 
+bool isMissing(const fs::path& path) {
+  std::error_code failure;
+  return fs::status(path, failure).type() == fs::file_type::not_found;
+}
+
+/// Makes the file where it is missing, for its owner only; SQLite gives the files that it makes beside it the same
+/// mode. One that exists is not touched: closing it would drop the locks that this process may hold on it.
+ErrorRef makeFile(const fs::path& path) {
+  const FileDescriptor made(::open(path.c_str(), O_RDWR | O_CREAT | O_EXCL | O_CLOEXEC, 0600));
+  return !made && errno != EEXIST ? fileError("make", path, errno) : nullptr;
+}
+
 bool mayWriteTo(const fs::path& folder) { return ::faccessat(AT_FDCWD, folder.c_str(), W_OK, AT_EACCESS) == 0; }
 
 StateDatabaseFile::Opened failed(ErrorRef error) {
@@ -74,11 +86,11 @@ ErrorRef StateDatabaseFile::errorOfFailure(const SQLiteFailure& failure, Purpose
 StateDatabaseFile::Opened StateDatabaseFile::open(Purpose purpose) {
   if (purpose == Purpose::writing) {
     if (ErrorRef error = makeFolders(_folder)) return failed(std::move(error));
-  } else {
-    std::error_code failure;
-    if (fs::status(_path, failure).type() == fs::file_type::not_found) return {};
+  } else if (isMissing(_path) && isMissing(pathOfNew())) {
+    return {};
   }
   const FolderLock lock(_folder);
+  if (isMissing(_path) && !isMissing(pathOfNew())) putNewInPlace(nameForDamaged());
   try {
     return openLocked(purpose);
   } catch (const SQLiteFailure& failure) {
@@ -88,12 +100,8 @@ StateDatabaseFile::Opened StateDatabaseFile::open(Purpose purpose) {
 }
 
 StateDatabaseFile::Opened StateDatabaseFile::openLocked(Purpose purpose) {
-  if (purpose == Purpose::writing) {
-    // SQLite gives the files that it makes beside this one the same mode. A file that exists is not touched: closing it
-    // would drop the locks that this process may hold on it.
-    const FileDescriptor made(::open(_path.c_str(), O_RDWR | O_CREAT | O_EXCL | O_CLOEXEC, 0600));
-    if (!made && errno != EEXIST) return failed(fileError("make", _path, errno));
-  }
+  if (purpose == Purpose::writing)
+    if (ErrorRef error = makeFile(_path)) return failed(std::move(error));
   Opened opened;
   opened.connection = connect(opened.isSnapshot);
   const std::int64_t version = opened.connection->integer("PRAGMA user_version");
@@ -151,19 +159,34 @@ StateDatabaseFile::Opened StateDatabaseFile::replaceDamaged(std::unique_ptr<SQLi
   }
 }
 
-StateDatabaseFile::Opened StateDatabaseFile::replaceLocked() {
-  const fs::path aside = nameForDamaged();
-  if (::rename(_path.c_str(), aside.c_str()) != 0) return failed(fileError("set aside the damaged", _path, errno));
+fs::path StateDatabaseFile::pathOfNew() const { return withSuffix(_path, ".new"); }
+
+void StateDatabaseFile::putNewInPlace(const fs::path& aside) const {
   // The log belongs to the damaged file; its index is made anew wherever it is missing.
   ::rename(withSuffix(_path, "-wal").c_str(), withSuffix(aside, "-wal").c_str());
   ::unlink(withSuffix(_path, "-shm").c_str());
-  Opened opened;
+  ::rename(pathOfNew().c_str(), _path.c_str());
+}
+
+StateDatabaseFile::Opened StateDatabaseFile::replaceLocked() {
+  // The new one is whole before the damaged one goes: whenever this is cut short, the next opening finds the damaged
+  // one and begins again, or finds it gone and puts the new one in its place.
+  const fs::path aside = nameForDamaged();
   SalvagedCounts counts;
+  Opened opened;
   try {
+    for (const char* suffix : {"", "-wal", "-shm"}) ::unlink(withSuffix(pathOfNew(), suffix).c_str());
+    if (ErrorRef error = makeFile(pathOfNew())) return failed(std::move(error));
+    {
+      SQLiteConnection fresh(pathOfNew(), SQLiteConnection::Access::readWrite, kMaximumStateValueBytes);
+      createStateSchema(fresh);
+      counts = salvageState(_path, aside, fresh);
+    }
+    if (::rename(_path.c_str(), aside.c_str()) != 0) return failed(fileError("set aside the damaged", _path, errno));
+    putNewInPlace(aside);
     opened = openLocked(Purpose::writing);
-    if (opened.connection) counts = salvageState(aside, *opened.connection);
   } catch (const SQLiteFailure& failure) {
-    opened = failed(errorOfFailure(failure, Purpose::writing));
+    return failed(errorOfFailure(failure, Purpose::writing));
   }
   opened.notice = error(StateDatabaseError::setAside,
                         _path.native() + " was damaged and is now kept as " + aside.native() +

@@ -56,8 +56,13 @@ class StateDatabaseFile final {
   Opened openLocked(Purpose purpose);
   std::unique_ptr<SQLiteConnection> connect(bool& isSnapshot) const;
   Opened replaceLocked();
+  /// Ends a replacement once the damaged file is set aside: its log goes after it, to this name, and the new file
+  /// comes.
+  void putNewInPlace(const std::filesystem::path& aside) const;
 
   ErrorRef error(StateDatabaseError code, std::string reason) const;
+  /// Where a new file is made while the damaged one is still there.
+  std::filesystem::path pathOfNew() const;
   /// A name for a damaged file that nothing has yet: "state.sqlite.broken-2026-01-05T12-00-00".
   std::filesystem::path nameForDamaged() const;
 

@@ -7,9 +7,8 @@ namespace nimbo {
 
 namespace {
 
-/// Copies the rows of a table up to the first that cannot be read.
-std::size_t copyReadableRows(SQLiteConnection& from, SQLiteConnection& into, const std::string& table) {
-  std::size_t count = 0;
+/// Copies the rows of a table up to the first that cannot be read, and counts them. Whether that was all of them.
+bool copyReadableRows(SQLiteConnection& from, SQLiteConnection& into, const std::string& table, std::size_t& count) {
   try {
     SQLiteStatement rows = from.prepare("SELECT * FROM " + table);
     std::string parameters = "?";
@@ -20,10 +19,10 @@ std::size_t copyReadableRows(SQLiteConnection& from, SQLiteConnection& into, con
       insert.step();
       insert.reset();
     }
+    return true;
   } catch (const SQLiteFailure&) {
-    // The rest of the table is lost; the count says what is not.
+    return false;  // the rest of the table is lost; the count says what is not
   }
-  return count;
 }
 
 }  // namespace
@@ -43,16 +42,24 @@ void createStateSchema(SQLiteConnection& connection) {
   transaction.commit();
 }
 
-SalvagedCounts salvageState(const std::filesystem::path& damaged, SQLiteConnection& into) {
+SalvagedCounts salvageState(const std::filesystem::path& damaged, const std::filesystem::path& aside,
+                            SQLiteConnection& into) {
   SQLiteTransaction transaction(into, SQLiteTransaction::Kind::writing);
   SalvagedCounts counts;
+  bool hasAllFavorites = false;
   try {
     SQLiteConnection from(damaged, SQLiteConnection::Access::readWrite, kMaximumStateValueBytes);
     from.keepLogOnClose();
-    counts.favorites = copyReadableRows(from, into, "favorites");
-    counts.settings = copyReadableRows(from, into, "settings");
+    copyReadableRows(from, into, "settings", counts.settings);
+    hasAllFavorites = copyReadableRows(from, into, "favorites", counts.favorites);
   } catch (const SQLiteFailure&) {
     // It cannot be opened at all.
+  }
+  if (!hasAllFavorites) {
+    SQLiteStatement insert = into.prepare("INSERT OR REPLACE INTO settings(key, value) VALUES (?, ?)");
+    insert.bind(1, kFavoritesLostKey);
+    insert.bind(2, aside.native());
+    insert.step();
   }
   transaction.commit();
   return counts;
