@@ -60,6 +60,10 @@ class Controller : public testing::Test {
     platform.transitLines.answer(items, error);
     platform.loop.runUntilIdle();
   }
+  /// That of the only row of the compact mode.
+  std::optional<std::string> title() {
+    return dynamic_cast<const NBTransitItem&>(*controller->dataSource()->listItem()->summaryItem()).primaryText();
+  }
   NBTransitIncidentsViewController::UpdateHandler record(const std::string& name) {
     return [this, name](WidgetUpdateResult result) {
       answers.push_back(name + (result == WidgetUpdateResult::NewData ? ":new" : ":failed"));
@@ -116,13 +120,27 @@ TEST_F(Controller, KeepsAnUpdaterOnlyWhileVisibleWithLineItems) {
 TEST_F(Controller, ChangesRowsByTheClockWithoutFetching) {
   appear();
   answer({lineItem(1, "1", {incident(9, dateByAdding(platform.time.now(), 600))})});
-  const auto title = [&] {
-    return dynamic_cast<const NBTransitItem&>(*controller->dataSource()->listItem()->summaryItem()).primaryText();
-  };
   EXPECT_EQ(title(), "TransitWidget_GoodService_Title");
   platform.time.advance(600);
   EXPECT_EQ(title(), "Incident 9");
   EXPECT_EQ(platform.transitLines.lookups().size(), 1u);
+}
+
+TEST_F(Controller, JudgesItsRowsAnewWhereverTheClockJumps) {
+  const auto at = [](double hours) { return dateByAdding(TestPlatform::startDate(), 3600 * hours); };
+  const TransitLineItems items{lineItem(1, "1",
+                                        {incident(1, dateFromISOText("0001-01-01"), at(2)), incident(2, at(2), at(26)),
+                                         incident(3, at(26), dateFromISOText("9999-12-31"))})};
+  appear();
+  answer(items);
+  EXPECT_EQ(title(), "Incident 1");
+  platform.time.setNow(at(27));
+  platform.time.advance(0);
+  EXPECT_EQ(title(), "Incident 3") << "asleep over several dates";
+  platform.time.setNow(at(2.5));
+  platform.time.advance(1800);
+  answer(items);
+  EXPECT_EQ(title(), "Incident 2") << "set back a day";
 }
 
 TEST_F(Controller, TurnsTheHostsSizesIntoRowsAndWidth) {
