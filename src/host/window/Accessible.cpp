@@ -8,8 +8,13 @@ void setAccessibleLabel(Gtk::Widget& widget, const std::string& label) {
   gtk_accessible_update_property(GTK_ACCESSIBLE(widget.gobj()), GTK_ACCESSIBLE_PROPERTY_LABEL, label.c_str(), -1);
 }
 
-void hideFromAccessibility(Gtk::Widget& widget) {
-  gtk_accessible_update_state(GTK_ACCESSIBLE(widget.gobj()), GTK_ACCESSIBLE_STATE_HIDDEN, TRUE, -1);
+void setAccessibleDescription(Gtk::Widget& widget, const std::string& description) {
+  gtk_accessible_update_property(GTK_ACCESSIBLE(widget.gobj()), GTK_ACCESSIBLE_PROPERTY_DESCRIPTION,
+                                 description.c_str(), -1);
+}
+
+void hideFromAccessibility(Gtk::Widget& widget, bool hidden) {
+  gtk_accessible_update_state(GTK_ACCESSIBLE(widget.gobj()), GTK_ACCESSIBLE_STATE_HIDDEN, hidden, -1);
 }
 
 }  // namespace nimbo

@@ -11,7 +11,10 @@ namespace nimbo {
 /// What a screen reader says of a widget, in place of the texts in it.
 void setAccessibleLabel(Gtk::Widget& widget, const std::string& label);
 
-/// Hides a widget that only decorates from screen readers.
-void hideFromAccessibility(Gtk::Widget& widget);
+/// What a screen reader says of a widget after its label.
+void setAccessibleDescription(Gtk::Widget& widget, const std::string& description);
+
+/// Hides a widget that only decorates, or is out of sight, from screen readers; or shows it again.
+void hideFromAccessibility(Gtk::Widget& widget, bool hidden = true);
 
 }  // namespace nimbo

@@ -39,7 +39,7 @@ FavoritesPage::FavoritesPage(const PageContext& context)
   content().append(_searching);
   content().append(_notice);
   readFavorites();
-  showFavorites();
+  lookForGone();
   search();
 }
 
@@ -68,7 +68,24 @@ void FavoritesPage::readFavorites() {
       _favorites.push_back(line->transitLine());
 }
 
+void FavoritesPage::lookForGone() {
+  std::vector<MapItemIdentifierRef> identifiers;
+  for (const TransitLineRef& line : _favorites) identifiers.push_back(line->identifier());
+  _goneLookup = _context.workers.start([this, identifiers, &library = _context.library](const std::stop_token&) {
+    const auto gone = FeedCatalog(library).goneLines(identifiers);
+    return [this, gone] {
+      if (!gone || gone->lines.empty()) return;  // feeds that cannot be read are told of by the search
+      for (const MapItemIdentifierRef& line : gone->lines) _gone.insert(line->muid());
+      showFavorites();
+    };
+  });
+}
+
 void FavoritesPage::showFavorites() {
+  // Whoever takes stars away by keyboard goes on with the next one.
+  int focusedIndex = -1;
+  for (int i = 0; const Gtk::ListBoxRow* row = _favoritesList.get_row_at_index(i); ++i)
+    if ((row->get_state_flags() & Gtk::StateFlags::FOCUS_WITHIN) != Gtk::StateFlags()) focusedIndex = i;
   clear(_favoritesList);
   for (std::size_t i = 0; i < _favorites.size(); ++i) {
     const TransitLineRef& line = _favorites[i];
@@ -76,7 +93,10 @@ void FavoritesPage::showFavorites() {
     row->addMoving(i > 0, i + 1 < _favorites.size(), [this, line, i](int step) {
       move(line, static_cast<std::size_t>(static_cast<std::ptrdiff_t>(i) + step));
     });
+    if (_gone.contains(line->muid())) row->showGone();
     _favoritesList.append(*row);
+    if (static_cast<int>(i) == std::min(focusedIndex, static_cast<int>(_favorites.size()) - 1))
+      row->star().grab_focus();
   }
   const bool isSearching = !_query.get_text().empty();
   _favoritesTitle.set_visible(!isSearching);
@@ -129,7 +149,8 @@ void FavoritesPage::move(TransitLineRef line, std::size_t position) {
 void FavoritesPage::finish(const ErrorRef& failure) {
   readFavorites();
   showFavorites();
-  showFound();
+  for (int i = 0; auto* row = dynamic_cast<LineRow*>(_linesList.get_row_at_index(i)); ++i)
+    row->setFavorite(isFavorite(*row->line()));
   if (failure) _context.navigator.tell(failure->reason());
 }
 

@@ -5,7 +5,7 @@
 #include <gtkmm/searchentry.h>
 #include <gtkmm/spinner.h>
 
-#include <optional>
+#include <set>
 #include <vector>
 
 #include "desktop/gtfs/FeedCatalog.h"
@@ -23,6 +23,8 @@ class FavoritesPage final : public Page {
   void addSection(Gtk::Label& title, const char* key, Gtk::ListBox& list);
   void readFavorites();
   void showFavorites();
+  /// Looks up which favourites their feeds do not know any more.
+  void lookForGone();
   void search();
   void showFound();
   void toggle(TransitLineRef line);
@@ -33,12 +35,13 @@ class FavoritesPage final : public Page {
 
   const PageContext& _context;
   std::vector<TransitLineRef> _favorites;
+  std::set<std::uint64_t> _gone;  // favourites by their numbers
   FeedCatalog::Lines _found;
   Gtk::SearchEntry _query;
   Gtk::Label _favoritesTitle, _noFavorites, _linesTitle, _notice;
   Gtk::ListBox _favoritesList, _linesList;
   Gtk::Spinner _searching;
-  std::shared_ptr<Workers::Job> _search;
+  std::shared_ptr<Workers::Job> _search, _goneLookup;
 };
 
 }  // namespace nimbo

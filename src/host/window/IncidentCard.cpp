@@ -1,5 +1,6 @@
 #include "host/window/IncidentCard.h"
 
+#include <gtkmm/label.h>
 #include <gtkmm/linkbutton.h>
 
 #include <algorithm>
@@ -35,30 +36,36 @@ std::string hostOfLink(const std::string& url) {
 
 IncidentCard::IncidentCard(const PageContext& context, const TransitIncidents& periods,
                            std::optional<std::uint64_t> line)
-    : Gtk::Box(Gtk::Orientation::VERTICAL, 6), _context(context), _hasLine(line.has_value()) {
+    : _context(context), _hasLine(line.has_value()) {
   add_css_class("card");
   add_css_class("notice");
-  // Stops for the keyboard, which also brings a card that is out of sight into view.
-  set_focusable();
+  set_activatable(false);
+  set_child(_box);
   const TransitIncident& incident = *periods.front();
   for (const auto& entity : incident.affectedEntities())
     if (entity->muid() != line && std::find(_affected.begin(), _affected.end(), entity->muid()) == _affected.end())
       _affected.push_back(entity->muid());
 
   const std::string title = IncidentStringProvider::cellTitleForIncident(&incident);
-  addText(*this, title, "item-heading");
-  if (incident.isBlockingIncident()) addText(*this, LocalizedString("Window_Incident_Blocking"), "failed");
+  addText(_box, title, "item-heading");
+  if (incident.isBlockingIncident()) addSaid(LocalizedString("Window_Incident_Blocking"), "failed");
   addDates(periods);
   addTexts(incident);
-  append(_affectedLines);
+  _box.append(_affectedLines);
   showAffectedLines({});
   if (incident.linkURL()) addLink(*incident.linkURL());
   if (incident.lastUpdated())
-    addText(*this,
+    addText(_box,
             LocalizedFormat(LocalizedString("Window_Incident_Updated"),
                             {DateText(_context.preferences.locale()).textOf(*incident.lastUpdated())}),
             "item-caption");
   setAccessibleLabel(*this, title);
+  setAccessibleDescription(*this, _said);
+}
+
+void IncidentCard::addSaid(const std::string& text, const char* style) {
+  addText(_box, text, style);
+  if (!text.empty()) _said += (_said.empty() ? "" : "\n") + text;
 }
 
 void IncidentCard::addText(Gtk::Box& box, const std::string& text, const char* style) {
@@ -77,7 +84,7 @@ void IncidentCard::addTexts(const TransitIncident& incident) {
   for (const auto* text : {&incident.summary(), &incident.fullDescription()}) {
     if (!*text || (*text)->empty() || **text == said) continue;
     said = **text;
-    addText(*this, said, "item-text");
+    addSaid(said, "item-text");
   }
 }
 
@@ -92,7 +99,7 @@ void IncidentCard::addDates(const TransitIncidents& periods) {
     const std::string line = dates.textOfPeriod(period->startDate(), period->endDate(), now);
     if (!line.empty()) text += (text.empty() ? "" : "\n") + line;
   }
-  addText(*this, text, "item-caption");
+  addSaid(text, "item-caption");
 }
 
 void IncidentCard::addLink(const std::string& url) {
@@ -102,7 +109,7 @@ void IncidentCard::addLink(const std::string& url) {
       Gtk::make_managed<Gtk::LinkButton>(url, LocalizedFormat(LocalizedString("Window_Incident_Link"), {host}));
   link->set_halign(Gtk::Align::START);
   link->add_css_class("link-text");
-  append(*link);
+  _box.append(*link);
 }
 
 void IncidentCard::showAffectedLines(const LinesByNumber& lines) {

@@ -1,7 +1,7 @@
 #pragma once
 
 #include <gtkmm/box.h>
-#include <gtkmm/label.h>
+#include <gtkmm/listboxrow.h>
 
 #include <map>
 #include <optional>
@@ -14,7 +14,7 @@ namespace nimbo {
 using LinesByNumber = std::map<std::uint64_t, TransitLineRef>;
 
 /// One incident in full: what its publisher says, when, what it affects.
-class IncidentCard final : public Gtk::Box {
+class IncidentCard final : public Gtk::ListBoxRow {
  public:
   /// `periods` are the incident's, one at least, each with the same texts. `line` is the line on whose page it stands,
   /// which is not named again.
@@ -25,6 +25,8 @@ class IncidentCard final : public Gtk::Box {
 
  private:
   static void addText(Gtk::Box& box, const std::string& text, const char* style);
+  /// Adds a text of the incident, which is also said to a screen reader.
+  void addSaid(const std::string& text, const char* style);
   void addTexts(const TransitIncident& incident);
   void addDates(const TransitIncidents& periods);
   void addLink(const std::string& url);
@@ -32,6 +34,8 @@ class IncidentCard final : public Gtk::Box {
   const PageContext& _context;
   bool _hasLine;
   std::vector<std::uint64_t> _affected;
+  std::string _said;
+  Gtk::Box _box{Gtk::Orientation::VERTICAL, 6};
   Gtk::Box _affectedLines{Gtk::Orientation::VERTICAL, 4};
 };
 

@@ -35,8 +35,10 @@ std::vector<TransitIncidents> groupedByNumber(const TransitIncidents& incidents)
 }  // namespace
 
 IncidentCards::IncidentCards(const PageContext& context, const TransitIncidents& incidents,
-                             std::optional<std::uint64_t> line)
-    : Gtk::Box(Gtk::Orientation::VERTICAL, 12) {
+                             std::optional<std::uint64_t> line) {
+  // Cards are stops for the keyboard, which also brings one that is out of sight into view.
+  add_css_class("cards");
+  set_selection_mode(Gtk::SelectionMode::NONE);
   for (const TransitIncidents& periods : groupedByNumber(incidents)) {
     _cards.push_back(Gtk::make_managed<IncidentCard>(context, periods, line));
     append(*_cards.back());

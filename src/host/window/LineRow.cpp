@@ -19,62 +19,79 @@ constexpr int kShieldColumn = 56;
 }  // namespace
 
 LineRow::LineRow(const PageContext& context, TransitLineRef line, bool isFavorite, std::function<void()> toggle)
-    : _line(std::move(line)), _box(Gtk::make_managed<Gtk::Box>(Gtk::Orientation::HORIZONTAL, 8)) {
+    : _line(std::move(line)) {
   set_activatable(false);
-  _box->add_css_class("item");
+  set_child(_box);
+  _box.add_css_class("item");
   auto* shield = Gtk::make_managed<Gtk::Box>();
   shield->set_size_request(kShieldColumn, -1);
   shield->append(*Gtk::make_managed<ShieldImage>(context.preferences, artworkOfLine(*_line), kShieldSize));
-  _box->append(*shield);
+  _box.append(*shield);
 
-  const std::string name = nameOfLine(*_line), system = systemNameOfLine(*_line);
-  auto* texts = Gtk::make_managed<Gtk::Box>(Gtk::Orientation::VERTICAL, 2);
-  texts->set_hexpand();
-  for (const auto& [text, style] :
-       {std::pair(nameBesideShield(*_line), "item-text"), std::pair(system, "item-caption")}) {
-    auto* label = Gtk::make_managed<Gtk::Label>(text);
-    label->add_css_class(style);
-    label->set_xalign(0);
-    label->set_wrap();
-    label->set_wrap_mode(Pango::WrapMode::WORD_CHAR);
-    label->set_visible(!text.empty());
-    texts->append(*label);
-  }
-  _box->append(*texts);
-  Gtk::Button& star = addButton(
-      *_box, isFavorite ? "starred-symbolic" : "non-starred-symbolic",
-      LocalizedFormat(LocalizedString(isFavorite ? "Window_Favorites_Remove" : "Window_Favorites_Add"), {name}),
-      std::move(toggle));
-  if (isFavorite) star.add_css_class("starred");
-  set_child(*_box);
-  setAccessibleLabel(*this, CommaDelimitedList(system.empty() ? std::vector{name} : std::vector{name, system}));
+  _texts.set_hexpand();
+  _texts.set_valign(Gtk::Align::CENTER);
+  _box.append(_texts);
+  const std::string system = systemNameOfLine(*_line);
+  addText(nameBesideShield(*_line), "item-text");
+  addText(system, "item-caption");
+  _said.push_back(nameOfLine(*_line));
+  if (!system.empty()) _said.push_back(system);
+  setAccessibleLabel(*this, CommaDelimitedList(_said));
+
+  _star.signal_clicked().connect(std::move(toggle));
+  _box.append(_star);
+  setFavorite(isFavorite);
 }
 
-Gtk::Button& LineRow::addButton(Gtk::Box& box, const char* icon, const std::string& name, std::function<void()> act) {
-  auto* button = Gtk::make_managed<Gtk::Button>();
-  button->set_icon_name(icon);
-  button->add_css_class("flat");
-  button->set_valign(Gtk::Align::CENTER);
-  button->set_tooltip_text(name);
-  button->signal_clicked().connect(std::move(act));
-  setAccessibleLabel(*button, name);
-  box.append(*button);
-  return *button;
+void LineRow::addText(const std::string& text, const char* style) {
+  if (text.empty()) return;
+  auto* label = Gtk::make_managed<Gtk::Label>(text);
+  label->add_css_class(style);
+  label->set_xalign(0);
+  label->set_wrap();
+  label->set_wrap_mode(Pango::WrapMode::WORD_CHAR);
+  _texts.append(*label);
+}
+
+void LineRow::showGone() {
+  const std::string text = LocalizedString("Window_Favorites_Gone");
+  addText(text, "failed");
+  _said.push_back(text);
+  setAccessibleLabel(*this, CommaDelimitedList(_said));
+}
+
+void LineRow::setFavorite(bool isFavorite) {
+  setUpButton(_star, isFavorite ? "starred-symbolic" : "non-starred-symbolic",
+              LocalizedFormat(LocalizedString(isFavorite ? "Window_Favorites_Remove" : "Window_Favorites_Add"),
+                              {nameOfLine(*_line)}));
+  if (isFavorite)
+    _star.add_css_class("starred");
+  else
+    _star.remove_css_class("starred");
+}
+
+void LineRow::setUpButton(Gtk::Button& button, const char* icon, const std::string& name) {
+  button.set_icon_name(icon);
+  button.add_css_class("flat");
+  button.set_valign(Gtk::Align::CENTER);
+  button.set_tooltip_text(name);
+  setAccessibleLabel(button, name);
 }
 
 void LineRow::addMoving(bool up, bool down, std::function<void(int)> move) {
-  const std::string name = nameOfLine(*_line);
   auto* arrows = Gtk::make_managed<Gtk::Box>(Gtk::Orientation::VERTICAL);
   arrows->set_valign(Gtk::Align::CENTER);
   const auto addArrow = [&](const char* icon, const char* key, bool isEnabled, int step) {
-    Gtk::Button& arrow =
-        addButton(*arrows, icon, LocalizedFormat(LocalizedString(key), {name}), [move, step] { move(step); });
-    arrow.add_css_class("small-button");
-    arrow.set_sensitive(isEnabled);
+    auto* arrow = Gtk::make_managed<Gtk::Button>();
+    setUpButton(*arrow, icon, LocalizedFormat(LocalizedString(key), {nameOfLine(*_line)}));
+    arrow->signal_clicked().connect([move, step] { move(step); });
+    arrow->add_css_class("small-button");
+    arrow->set_sensitive(isEnabled);
+    arrows->append(*arrow);
   };
   addArrow("go-up-symbolic", "Window_Favorites_Up", up, -1);
   addArrow("go-down-symbolic", "Window_Favorites_Down", down, 1);
-  _box->append(*arrows);
+  _box.append(*arrows);
   const auto keys = Gtk::EventControllerKey::create();
   keys->signal_key_pressed().connect(
       [up, down, move](guint key, guint, Gdk::ModifierType modifiers) {

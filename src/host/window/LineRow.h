@@ -5,6 +5,8 @@
 #include <gtkmm/listboxrow.h>
 
 #include <functional>
+#include <string>
+#include <vector>
 
 #include "host/window/PageContext.h"
 #include "platform/transit/TransitLine.h"
@@ -17,17 +19,26 @@ class LineRow final : public Gtk::ListBoxRow {
   /// `toggle` hears a click on the star.
   LineRow(const PageContext& context, TransitLineRef line, bool isFavorite, std::function<void()> toggle);
 
+  void setFavorite(bool isFavorite);
+  /// Says that the line's feed does not know it any more.
+  void showGone();
+
   /// Adds buttons (and, while the row has the focus, Alt with an arrow key) that move the line up (-1) or down (1) in
   /// its list, where there is room that way.
   void addMoving(bool up, bool down, std::function<void(int)> move);
 
   const TransitLineRef& line() const { return _line; }
+  Gtk::Button& star() { return _star; }
 
  private:
-  static Gtk::Button& addButton(Gtk::Box& box, const char* icon, const std::string& name, std::function<void()> act);
+  static void setUpButton(Gtk::Button& button, const char* icon, const std::string& name);
+  void addText(const std::string& text, const char* style);
 
   TransitLineRef _line;
-  Gtk::Box* _box;
+  std::vector<std::string> _said;
+  Gtk::Box _box{Gtk::Orientation::HORIZONTAL, 8};
+  Gtk::Box _texts{Gtk::Orientation::VERTICAL, 2};
+  Gtk::Button _star;
 };
 
 }  // namespace nimbo

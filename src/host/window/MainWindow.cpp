@@ -45,8 +45,10 @@ void MainWindow::buildHeader() {
   _menu.set_tooltip_text(LocalizedString("Window_Menu"));
   _menu.set_menu_model(makeMainMenu());
   _menu.set_primary();
+  _menu.set_has_frame(false);
   // The focus stays on the page, where it comes back to when the page does.
   for (Gtk::Button* button : {&_back, &_update}) {
+    button->add_css_class("flat");
     button->set_focus_on_click(false);
     setAccessibleLabel(*button, button->get_tooltip_text());
   }
@@ -64,8 +66,8 @@ void MainWindow::buildMessageBar() {
   _messageBar.add_child(_message);
   _messageBar.set_message_type(Gtk::MessageType::WARNING);
   _messageBar.set_show_close_button();
-  _messageBar.set_revealed(false);
-  _messageBar.signal_response().connect([this](int) { _messageBar.set_revealed(false); });
+  _messageBar.set_visible(false);
+  _messageBar.signal_response().connect([this](int) { _messageBar.set_visible(false); });
 }
 
 void MainWindow::addActions() {
@@ -108,7 +110,7 @@ void MainWindow::showFront() {
   const bool isFirst = _pages.depth() == 1;
   _back.set_visible(!isFirst);
   _update.set_visible(isFirst);
-  _messageBar.set_revealed(false);
+  _messageBar.set_visible(false);
 }
 
 void MainWindow::push(std::unique_ptr<Page> page) { _pages.push(std::move(page)); }
@@ -129,7 +131,7 @@ void MainWindow::open(const OpenRequest& request) {
 
 void MainWindow::tell(const std::string& message) {
   _message.set_text(message);
-  _messageBar.set_revealed(true);
+  _messageBar.set_visible(true);
 }
 
 }  // namespace nimbo

@@ -1,5 +1,7 @@
 #include "host/window/PageStack.h"
 
+#include "host/window/Accessible.h"
+
 namespace nimbo {
 
 PageStack::PageStack(std::unique_ptr<Page> first) {
@@ -29,6 +31,8 @@ void PageStack::popToFirst() {
 void PageStack::show(Gtk::StackTransitionType transition) {
   set_transition_type(transition);
   set_visible_child(front());
+  for (const auto& page : _pages) hideFromAccessibility(*page, page.get() != &front());
+  for (const auto& page : _left) hideFromAccessibility(*page);
   _frontChanged.emit();
   dropLeft();
 }

@@ -39,7 +39,7 @@ WidgetRow rowOf(const json& row) {
   std::vector<std::string> texts = linesOf(row);
   for (const char* key : {"primaryText", "secondaryText"})
     if (std::string text = textOf(row, {key}); !text.empty()) texts.push_back(std::move(text));
-  return {{frame.at(0), frame.at(1), frame.at(2), frame.at(3)}, CommaDelimitedList(texts), row.at("highlightable")};
+  return {frame.at(1), frame.at(3), CommaDelimitedList(texts)};
 }
 
 }  // namespace

@@ -6,15 +6,14 @@
 #include <vector>
 
 #include "host/window/SharedPicture.h"
-#include "platform/ui/Geometry.h"
 
 namespace nimbo {
 
 /// A row of the widget as keyboard and screen reader know it.
 struct WidgetRow {
-  Rect frame;        ///< points, in the widget
-  std::string name;  ///< the line, how it runs, and the text
-  bool opens = false;
+  double y = 0;       ///< points, from the widget's top
+  double height = 0;  ///< points
+  std::string name;   ///< the line, how it runs, and the text
 };
 
 /// What the widget shows at one moment.

@@ -26,11 +26,13 @@ Gtk::Widget* makePlace(const char* icon, const std::string& name) {
   box->add_css_class("item");
   auto* image = Gtk::make_managed<Gtk::Image>();
   image->set_from_icon_name(icon);
+  hideFromAccessibility(*image);
   auto* label = Gtk::make_managed<Gtk::Label>(name);
   label->set_hexpand();
   label->set_xalign(0);
   auto* arrow = Gtk::make_managed<Gtk::Image>();
   arrow->set_from_icon_name("go-next-symbolic");
+  hideFromAccessibility(*arrow);
   for (Gtk::Widget* child :
        {static_cast<Gtk::Widget*>(image), static_cast<Gtk::Widget*>(label), static_cast<Gtk::Widget*>(arrow)})
     box->append(*child);
@@ -68,6 +70,7 @@ void WidgetPage::buildCard() {
   name->set_hexpand();
   name->set_xalign(0);
   _expand.add_css_class("flat");
+  _expand.set_valign(Gtk::Align::CENTER);
   _expand.signal_clicked().connect([this] { toggleExpanded(); });
   for (Gtk::Widget* child :
        {static_cast<Gtk::Widget*>(name), static_cast<Gtk::Widget*>(&_updating), static_cast<Gtk::Widget*>(&_expand)})
@@ -98,7 +101,6 @@ void WidgetPage::buildCard() {
   _failure.hide();
 
   _card.add_css_class("card");
-  _card.add_css_class("widget-card");
   _card.set_overflow(Gtk::Overflow::HIDDEN);
   for (Gtk::Widget* child : {static_cast<Gtk::Widget*>(header), static_cast<Gtk::Widget*>(&_failure),
                              static_cast<Gtk::Widget*>(&_waiting), static_cast<Gtk::Widget*>(&_view)})

@@ -116,13 +116,12 @@ void WidgetView::size_allocate_vfunc(int width, int, int) {
     });
   }
   for (std::size_t i = 0; i < _rows.size(); ++i) {
-    const Rect& frame = _content->rows[i].frame;
+    const WidgetRow& row = _content->rows[i];
     int minimum, natural, ignored;
     // A widget must be measured before it is placed.
     _rows[i]->measure(Gtk::Orientation::HORIZONTAL, -1, minimum, natural, ignored, ignored);
     const auto at = [](double length) { return static_cast<int>(std::lround(length)); };
-    _rows[i]->size_allocate(
-        {at(frame.x), at(frame.y), std::max(at(frame.width), minimum), std::max(at(frame.height), 1)}, -1);
+    _rows[i]->size_allocate({0, at(row.y), std::max(width, minimum), std::max(at(row.height), 1)}, -1);
   }
 }
 
