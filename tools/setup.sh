@@ -13,9 +13,11 @@ packages=(
 )
 case $purpose in
   run) ;;
-  test | lint) packages+=(libgtest-dev libgmock-dev protobuf-compiler libprotobuf-dev python3 python3-kiwisolver zlib1g-dev libssl-dev) ;;
+  test | lint) packages+=(libgtest-dev libgmock-dev protobuf-compiler libprotobuf-dev python3 python3-kiwisolver zlib1g-dev libssl-dev
+    desktop-file-utils appstream mandoc systemd zsh fish libxml2-utils) ;;
   bench) packages+=(libbenchmark-dev protobuf-compiler libprotobuf-dev python3 python3-dev python3-kiwisolver
     libgtkmm-4.0-dev libxdamage-dev xvfb) ;;
+  package) packages+=(libgtkmm-4.0-dev dpkg-dev file) ;;
   *) echo "usage: tools/setup.sh run|test|lint|bench" >&2; exit 2 ;;
 esac
 [ "$purpose" != lint ] || packages+=(clang-format clang-tidy git)

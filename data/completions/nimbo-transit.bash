@@ -1,0 +1,74 @@
+# bash completion for nimbo-transit(1)
+
+# Runs nimbo-transit with the folders of the line that is being completed and prints the first word of each line.
+_nimbo_transit_names() {
+  local folders=() i
+  for ((i = 1; i < COMP_CWORD - 1; i++)); do
+    case ${COMP_WORDS[i]} in
+      --config | --state) folders+=("${COMP_WORDS[i]}" "${COMP_WORDS[i + 1]}") ;;
+    esac
+  done
+  "${COMP_WORDS[0]}" "${folders[@]}" "$@" 2>/dev/null
+}
+
+_nimbo_transit() {
+  local cur prev words cword
+  # Names of lines hold colons.
+  _init_completion -n : || return
+
+  local command="" i
+  for ((i = 1; i < cword; i++)); do
+    case ${words[i]} in
+      --config | --state | --static | --alerts | --now | --virtual-time | --size | --scale | --text-size | --locale) ((i++)) ;;
+      -*) ;;
+      *)
+        case $command in
+          "") command=${words[i]} ;;
+          feed | favorite | settings) command+=" ${words[i]}" ;;
+        esac
+        ;;
+    esac
+  done
+
+  case $prev in
+    --config | --state) _filedir -d; return ;;
+    --static | --alerts) _filedir; return ;;
+    --text-size)
+      COMPREPLY=($(compgen -W "extraSmall small medium large extraLarge extraExtraLarge extraExtraExtraLarge
+        accessibilityMedium accessibilityLarge accessibilityExtraLarge accessibilityExtraExtraLarge
+        accessibilityExtraExtraExtraLarge" -- "$cur"))
+      return
+      ;;
+    --now | --virtual-time | --size | --scale | --locale) return ;;
+  esac
+
+  local options="--help --config --state" names=""
+  case $command in
+    "") options+=" --version" names="status update render script feed lines favorite settings analytics decode" ;;
+    status) options+=" --expanded --json --now --waybar --watch" ;;
+    render) options+=" --expanded --size --scale --text-size --dark --locale --now" ;;
+    script) options+=" --virtual-time" ;;
+    analytics) options+=" --json" ;;
+    feed) names="add remove list check" ;;
+    "feed add") options+=" --static --alerts" ;;
+    "feed remove" | "feed check") names=$(_nimbo_transit_names feed list | sed -n 's/^\([^ ]*\)$/\1/p') ;;
+    favorite) names="add remove move list" ;;
+    "favorite add") names=$(_nimbo_transit_names lines | cut -d ' ' -f 1) ;;
+    "favorite remove" | "favorite move") names=$(_nimbo_transit_names favorite list | sed -n 's/^\([^ ]*:[^ ]*\).*/\1/p') ;;
+    settings) names="get set unset" ;;
+    "settings "*)
+      names="Nimbo.TransitWidget.analytics.disabled Nimbo.TransitWidget.internal.injectFakeIncidents
+        Nimbo.TransitWidget.internal.randomNumberIncidents"
+      ;;
+  esac
+  if [[ $cur == -* ]]; then
+    COMPREPLY=($(compgen -W "$options" -- "$cur"))
+  elif [[ $command == render || $command == script || $command == decode ]]; then
+    _filedir
+  else
+    COMPREPLY=($(compgen -W "$names" -- "$cur"))
+    __ltrim_colon_completions "$cur"
+  fi
+}
+
+complete -F _nimbo_transit nimbo-transit

@@ -1,0 +1,52 @@
+// A status bar's widget when something fails, in virtual time.
+
+#include <gmock/gmock.h>
+
+#include <csignal>
+#include <cstdlib>
+
+#include "host/Programs.h"
+#include "host/StatusWatch.h"
+
+namespace nimbo {
+namespace {
+
+using nlohmann::json;
+
+TEST(StatusWatch, TriesAgainWhatFails) {
+  std::signal(SIGPIPE, SIG_IGN);
+  const Programs programs;
+  programs.setUpCity({"m1"}, {});
+  programs.publishBytes("no feed");
+  VirtualTime time(Programs::now());
+  GLibRunLoop loop(&time);
+  const CommandContext context{loop,
+                               {},
+                               {"--config", programs.folder.path() / "config", "--state",
+                                programs.folder.path() / "state", "--virtual-time", isoTextOfDate(Programs::now())}};
+  json shown = json::object();
+  const auto show = [&](const std::string& line) { shown = json::parse(line); };
+  const auto waitFor = [&](const std::string& word) {
+    while (shown.value("class", "") != word) loop.runOnce();
+  };
+  {
+    // A fetch that failed: the widget itself, whose time stands still, does nothing more.
+    setenv("NIMBO_TRANSIT_WIDGET", NIMBO_TRANSIT_WIDGET, 1);
+    const StatusWatch watch(context, {}, show);
+    waitFor("error");
+    programs.publish({});
+    time.advance(StatusWatch::kFirstUpdate);
+    waitFor("good");
+  }
+  for (const char* program : {"/bin/false", "/nonexistent"}) {
+    setenv("NIMBO_TRANSIT_WIDGET", program, 1);
+    const StatusWatch watch(context, {}, show);
+    waitFor("error");
+    setenv("NIMBO_TRANSIT_WIDGET", NIMBO_TRANSIT_WIDGET, 1);
+    time.advance(StatusWatch::kFirstRestart);
+    waitFor("good");
+  }
+}
+
+}  // namespace
+}  // namespace nimbo

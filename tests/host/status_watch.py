@@ -1,0 +1,75 @@
+#!/usr/bin/python3
+"""Follows the sample city with "status --waybar --watch" through a widget whose time this test moves.
+usage: status_watch.py NIMBO_TRANSIT WIDGET"""
+import json
+import os
+import signal
+import subprocess
+import sys
+import tempfile
+import threading
+
+program, widget = sys.argv[1:3]
+
+
+def play_widget(arguments):
+    """The widget with its host's messages and, from a FIFO, with seconds to advance."""
+    process = subprocess.Popen([widget, *arguments, "--virtual-time", "2026-01-05T12:00:00Z"],
+                               stdin=subprocess.PIPE, stdout=subprocess.PIPE, bufsize=0)
+
+    def advance():
+        with open(os.environ["TEST_ADVANCES"], "rb", buffering=0) as advances:
+            for line in advances:
+                process.stdin.write(b'{"jsonrpc":"2.0","id":"t","method":"advanceTime","params":{"seconds":%d}}\n'
+                                    % int(line))
+
+    def answer():
+        for line in process.stdout:
+            if json.loads(line).get("id") != "t":
+                os.write(1, line)
+
+    for work in (advance, answer):
+        threading.Thread(target=work, daemon=True).start()
+    for line in sys.stdin.buffer:
+        process.stdin.write(line)
+    process.stdin.close()
+    process.wait()
+    os._exit(0)
+
+
+if len(sys.argv) > 3:
+    play_widget(sys.argv[4:])
+
+with tempfile.TemporaryDirectory() as folder:
+    fifo, script = os.path.join(folder, "advances"), os.path.join(folder, "widget")
+    os.mkfifo(fifo)
+    with open(script, "w") as file:
+        file.write(f'#!/bin/sh\nexec /usr/bin/python3 {__file__} {program} {widget} -- "$@"\n')
+    os.chmod(script, 0o700)
+    command = [program, "--config", folder, "--state", folder]
+
+    def watch():
+        return subprocess.Popen(command + ["status", "--waybar", "--watch"], stdout=subprocess.PIPE,
+                                env=dict(os.environ, NIMBO_TRANSIT_WIDGET=script, TEST_ADVANCES=fifo, LC_ALL="C.UTF-8"))
+
+    bar = watch()
+    first = json.loads(bar.stdout.readline())
+    assert first["class"] == first["alt"] == "advisories" and "Weavers&apos; Row" in first["tooltip"], first
+    with open(fifo, "wb", buffering=0) as advances:
+        for seconds in (b"5400\n", b"1800\n"):  # an incident ends, and another one starts or ends
+            before = first
+            advances.write(seconds)
+            first = json.loads(bar.stdout.readline())
+            assert first != before and set(first) == {"text", "alt", "tooltip", "class"}, first
+        bar.send_signal(signal.SIGTERM)
+        rest = bar.stdout.read()
+        assert bar.wait() == 0 and b"error" not in rest, rest
+    saved = subprocess.run(command + ["settings", "get", "Nimbo.TransitWidget.savedUIData"], capture_output=True)
+    assert saved.returncode == 0, "a bar that ends takes the widget off the screen, which saves its rows"
+
+    bar = watch()
+    with open(fifo, "wb"):
+        bar.stdout.readline()
+        bar.stdout.close()
+        assert bar.wait() == 0, "a bar without a reader ends by itself"
+print("watched")
