@@ -44,11 +44,7 @@ void StatusWatch::start() {
 }
 
 void StatusWatch::update() {
-  _updating = true;
-  ask("performUpdate", json::object(), [this](const json&) {
-    _updating = false;
-    look();
-  });
+  ask("performUpdate", json::object(), [this](const json&) { look(); });
 }
 
 void StatusWatch::look() {
@@ -63,7 +59,7 @@ void StatusWatch::showSnapshot(const json& snapshot) {
   if (result == "success") {
     _updates.reset();
     cancel(_update);
-  } else if (!_updating && !_update) {
+  } else if (!_update) {
     // After a failed fetch the widget waits for its host.
     _update = _context.runLoop.scheduleTimer(_updates.next(), false, [this](Timer&) {
       _update = nullptr;
@@ -109,7 +105,6 @@ void StatusWatch::fail(const std::string& reason) {
   if (_client) _client->kill();
   cancel(_update);
   cancel(_patience);
-  _updating = false;
   _restart = _context.runLoop.scheduleTimer(_restarts.next(), false, [this](Timer&) {
     _restart = nullptr;
     start();

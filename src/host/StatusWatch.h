@@ -57,7 +57,6 @@ class StatusWatch {
   std::shared_ptr<Timer> _patience;  // with the answer that is waited for
   std::unique_ptr<WidgetClient> _client;
   std::size_t _unanswered = 0;
-  bool _updating = false;
 };
 
 }  // namespace nimbo

@@ -127,5 +127,56 @@ TEST(CommandLine, KeepsAnalyticsAndDecodesWhatIsHandedOver) {
   EXPECT_EQ(programs.run({"settings", "get", "Nimbo.TransitWidget.internal.injectFakeIncidents"}).output, "true\n");
 }
 
+TEST(CommandLine, TellsOfGoneLinesAndOfADatabaseSetAside) {
+  const Programs programs;
+  programs.setUpCity({"m1", "m2"}, {});
+  programs.folder.write("feed/routes.txt", "route_id,agency_id,route_short_name,route_type\nm2,M,2,1\n");
+  for (const auto& command : {std::vector<std::string>{"status", kNow}, {"favorite", "list"}}) {
+    const ProgramRun run = programs.run(command);
+    EXPECT_EQ(run.status, 0) << run.errors;
+    EXPECT_THAT(run.errors, AllOf(HasSubstr("favorite remove city:m1"), Not(HasSubstr("city:m2"))));
+  }
+
+  const std::string database = programs.folder.path() / "state" / "state.sqlite";
+  for (const auto& command : {std::vector<std::string>{"settings", "set", "a", "b"}, {"status", kNow}}) {
+    for (const char* suffix : {"-wal", "-shm"}) std::filesystem::remove(database + suffix);
+    programs.folder.write("state/state.sqlite", "bytes of no database");
+    const ProgramRun run = programs.run(command);
+    EXPECT_EQ(run.status, 1);
+    EXPECT_THAT(run.errors,
+                HasSubstr("nimbo-transit: " + database + " was damaged and is now kept as " + database + ".broken-"));
+  }
+}
+
+TEST(CommandLine, PrintsALineForAStatusBar) {
+  const Programs programs;
+  const auto bar = [&] { return json::parse(programs.run({"status", "--waybar", kNow}).output); };
+  programs.setUpCity({}, {});
+  EXPECT_EQ(bar()["class"], "none");
+  programs.run({"favorite", "add", "city:m1"});
+  EXPECT_EQ(bar()["class"], "good");
+  programs.publish({{"a", {"m1"}, "Lift <&> \"stairs\"", "On two lines"}});
+  EXPECT_EQ(bar(), (json{{"class", "advisories"},
+                         {"alt", "advisories"},
+                         {"text", "[1] Lift &lt;&amp;&gt; &quot;stairs&quot;"},
+                         {"tooltip", "<b>[1] Lift &lt;&amp;&gt; &quot;stairs&quot;</b>\nOn two lines"}}));
+  programs.publishBytes("<no feed>");
+  EXPECT_EQ(bar()["class"], "error");
+  EXPECT_THAT(bar()["tooltip"].get<std::string>(), AllOf(HasSubstr("alerts.pb"), Not(HasSubstr("<no"))));
+}
+
+TEST(CommandLine, UpdatesTheRowsForTheNextStart) {
+  const Programs programs;
+  const auto saved = [&] { return programs.run({"settings", "get", "Nimbo.TransitWidget.savedUIData"}).output; };
+  EXPECT_EQ(programs.run({"update"}).status, 0);
+  const std::string rows = saved();
+  EXPECT_THAT(rows, Not(testing::IsEmpty()));
+  EXPECT_EQ(programs.run({"analytics"}).output, "") << "nobody has looked at the widget";
+  programs.setUpCity({"m1"}, {});
+  programs.publishBytes("no feed");
+  EXPECT_EQ(programs.run({"update"}).status, 1);
+  EXPECT_TRUE(saved() == rows) << "rows of the last time are better than none";
+}
+
 }  // namespace
 }  // namespace nimbo
