@@ -40,7 +40,7 @@ Outcome<std::string> readFile(const std::filesystem::path& path, std::uint64_t l
   };
   if (static_cast<std::uint64_t>(status.st_size) > limit) return tooLarge();
   std::string bytes;
-  bytes.resize(static_cast<std::size_t>(status.st_size));
+  bytes.resize(static_cast<std::size_t>(status.st_size) + 1);  // room to see the end without moving everything
   std::size_t count = 0;
   for (;;) {
     if (count == bytes.size()) {  // also when the file has grown since

@@ -76,6 +76,7 @@ class IncidentBuilder {
   IncidentBuilder(const AlertsFeed& alerts, const StaticFeed& feed, const IncidentQuery& query)
       : _alerts(alerts), _query(query), _matcher(feed, indicesOf(query), query.trips) {
     _reading.incidents.resize(query.lines.size());
+    _contents.reserve(alerts.alerts().size());
   }
 
   IncidentReading build() {

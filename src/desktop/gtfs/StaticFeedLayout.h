@@ -1,5 +1,6 @@
 #pragma once
 
+#include <array>
 #include <cstdint>
 #include <cstring>
 #include <string_view>
@@ -52,17 +53,25 @@ T flatRecordAt(std::string_view bytes, std::size_t position) {
   return record;
 }
 
-/// Tells damage, not malice. Word by word, since the cache must be read much faster than the text it stands for.
+/// Tells damage, not malice. Word by word, since the cache must be read much faster than the text it stands for; four
+/// sums side by side take a third of the time of one, each step of which waits for the step before.
 inline std::uint64_t flatChecksum(std::string_view bytes) {
-  std::uint64_t sum = 0x9E3779B97F4A7C15 ^ bytes.size();
+  constexpr std::uint64_t kMultiplier = 0xFF51AFD7ED558CCD;
+  const auto mixed = [](std::uint64_t sum, std::uint64_t word) {
+    sum = (sum ^ word) * kMultiplier;
+    return sum ^ (sum >> 32);
+  };
+  std::array<std::uint64_t, 4> sums{bytes.size(), 1, 2, 3};
   std::size_t position = 0;
-  for (; position + 8 <= bytes.size(); position += 8) {
-    sum = (sum ^ flatRecordAt<std::uint64_t>(bytes, position)) * 0xFF51AFD7ED558CCD;
-    sum ^= sum >> 32;
-  }
-  for (; position < bytes.size(); ++position)
-    sum = (sum ^ static_cast<unsigned char>(bytes[position])) * 0xFF51AFD7ED558CCD;
-  return sum ^ (sum >> 32);
+  while (position + sizeof sums <= bytes.size())
+    for (std::uint64_t& sum : sums) {
+      sum = mixed(sum, flatRecordAt<std::uint64_t>(bytes, position));
+      position += sizeof sum;
+    }
+  std::uint64_t all = 0x9E3779B97F4A7C15;
+  for (const std::uint64_t sum : sums) all = mixed(all, sum);
+  for (; position < bytes.size(); ++position) all = mixed(all, static_cast<unsigned char>(bytes[position]));
+  return all;
 }
 
 }  // namespace nimbo
