@@ -4,12 +4,12 @@
 #include <gtkmm/stylecontext.h>
 
 #include <algorithm>
-#include <array>
 #include <charconv>
 #include <cmath>
 
 #include "host/window/WindowStyle.h"
 #include "platform/Platform.h"
+#include "platform/ui/TextStyles.h"
 
 namespace nimbo {
 
@@ -20,14 +20,17 @@ constexpr std::string_view kAppearanceKey = "Nimbo.Window.appearance";
 constexpr std::string_view kLanguageKey = "Nimbo.Window.language";
 constexpr std::string_view kTextSizeKey = "Nimbo.Window.textSizeSteps";
 
-/// How large a text of each category is beside one of `large`.
-constexpr std::array kTextScales{0.82, 0.88, 0.94, 1.0, 1.12, 1.24, 1.35, 1.65, 1.94, 2.35, 2.76, 3.12};
+constexpr int kLargestCategory = static_cast<int>(ContentSizeCategory::accessibilityExtraExtraExtraLarge);
 
-std::size_t categoryOfScale(double scale) {
-  const auto distance = [scale](double other) { return std::abs(std::log(other / scale)); };
-  const auto nearest = std::min_element(kTextScales.begin(), kTextScales.end(),
-                                        [&](double a, double b) { return distance(a) < distance(b); });
-  return static_cast<std::size_t>(nearest - kTextScales.begin());
+/// The category whose texts are nearest to this scale.
+int categoryOfScale(double scale) {
+  const auto distance = [scale](int category) {
+    return std::abs(std::log(textScaleForCategory(static_cast<ContentSizeCategory>(category)) / scale));
+  };
+  int nearest = 0;
+  for (int category = 1; category <= kLargestCategory; ++category)
+    if (distance(category) < distance(nearest)) nearest = category;
+  return nearest;
 }
 
 std::string storedText(std::string_view key, const char* otherwise) {
@@ -77,9 +80,9 @@ void DesktopPreferences::chooseLanguage(const std::string& choice) {
 }
 
 void DesktopPreferences::stepTextSize(int step) {
-  const int base = static_cast<int>(categoryOfScale(desktopTextScale()));
+  const int base = categoryOfScale(desktopTextScale());
   const int wanted = step == 0 ? base : static_cast<int>(textSize()) + step;
-  _textSizeSteps = std::clamp(wanted, 0, static_cast<int>(kTextScales.size()) - 1) - base;
+  _textSizeSteps = std::clamp(wanted, 0, kLargestCategory) - base;
   keep(_textSizeSteps == 0 ? kSystem : std::to_string(_textSizeSteps), kTextSizeKey);
   apply();
 }
@@ -99,11 +102,11 @@ double DesktopPreferences::desktopTextScale() const {
 }
 
 ContentSizeCategory DesktopPreferences::textSize() const {
-  const int category = static_cast<int>(categoryOfScale(desktopTextScale())) + _textSizeSteps;
-  return static_cast<ContentSizeCategory>(std::clamp(category, 0, static_cast<int>(kTextScales.size()) - 1));
+  return static_cast<ContentSizeCategory>(
+      std::clamp(categoryOfScale(desktopTextScale()) + _textSizeSteps, 0, kLargestCategory));
 }
 
-double DesktopPreferences::textScale() const { return kTextScales[static_cast<std::size_t>(textSize())]; }
+double DesktopPreferences::textScale() const { return textScaleForCategory(textSize()); }
 
 std::string DesktopPreferences::locale() const { return _languageChoice == kSystem ? "" : _languageChoice; }
 

@@ -25,7 +25,13 @@ FavoritesPage::FavoritesPage(const PageContext& context)
   _query.property_placeholder_text() = prompt;
   setAccessibleLabel(_query, prompt);
   _query.signal_search_changed().connect([this] { search(); });
-  _query.signal_stop_search().connect([this] { _query.set_text(""); });
+  _query.set_key_capture_widget(*this);
+  _query.signal_stop_search().connect([this] {
+    if (_query.get_text().empty())
+      activate_action("win.back");
+    else
+      _query.set_text("");
+  });
   content().append(_query);
   addSection(_favoritesTitle, "Window_Favorites_Yours", _favoritesList);
   _noFavorites.set_text(LocalizedString("TransitWidget_NoFavoriteTransitLines_SecondaryText"));

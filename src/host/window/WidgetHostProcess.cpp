@@ -104,6 +104,7 @@ void WidgetHostProcess::setUpConnection() {
   connection.setMalformedHandler([this](const std::string& problem) { failSoon("it speaks nonsense: " + problem); });
   connection.setClosedHandler([this] { failSoon("it ended"); });
   connection.setHandler("frame", [this](const json&, const JSONRPCResponder&) { askForContent(); });
+  _client->setNoticeHandler([this](const std::string& message) { _delegate.widgetTells(message); });
   _client->setOpenHandler([this](std::string_view method, const json& params) {
     try {
       return _delegate.widgetOpens(method, params);
@@ -159,7 +160,10 @@ void WidgetHostProcess::fail(const std::string& reason) {
   const Date now = _clock.now();
   std::erase_if(_crashes, [&](Date crash) { return intervalBetween(crash, now) > kCrashWindow; });
   _crashes.push_back(now);
-  if (_crashes.size() >= kCrashLimit) return giveUp(reason);
+  if (_crashes.size() >= kCrashLimit)
+    return giveUp("its process had to be started " + std::to_string(kCrashLimit) +
+                  " times within a minute, the last time since " + reason +
+                  ". Start the window in a terminal with NIMBO_LOG=debug to see why.");
   if (_visible) start();
 }
 

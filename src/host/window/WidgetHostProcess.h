@@ -26,6 +26,8 @@ class WidgetHostProcess {
     virtual void widgetDidChange(const WidgetContentRef& content) = 0;
     /// The process is not started again by itself; `reason` says why. `restart` is the way out.
     virtual void widgetDidFail(const std::string& reason) = 0;
+    /// Something that the user must be told.
+    virtual void widgetTells(const std::string& message) = 0;
     /// A fetch of the user's has begun or ended.
     virtual void widgetIsUpdating(bool updating) = 0;
     /// Opens what a row opens (a request of docs/protocol.md); answers whether it did.

@@ -4,8 +4,6 @@
 #include <gtkmm/image.h>
 #include <gtkmm/native.h>
 
-#include <algorithm>
-
 #include "desktop/rpc/Base64.h"
 #include "host/window/Accessible.h"
 #include "platform/Localization.h"
@@ -162,8 +160,7 @@ WidgetPresentation WidgetPage::presentation() const {
   const DesktopPreferences& preferences = _context.preferences;
   WidgetPresentation presentation;
   presentation.width = _width;
-  // A row holds as many lines of text whatever its size.
-  presentation.compactHeight = WidgetPresentation::kDefaultRowHeight * std::max(preferences.textScale(), 1.0);
+  presentation.compactHeight = WidgetPresentation::rowHeightForTextSize(preferences.textSize());
   presentation.expandedHeight = 4 * presentation.compactHeight;
   presentation.scale = get_scale_factor();
   presentation.textSize = nameOfContentSizeCategory(preferences.textSize());
@@ -199,6 +196,8 @@ void WidgetPage::widgetDidFail(const std::string& reason) {
   _failure.show();
   _waiting.hide();
 }
+
+void WidgetPage::widgetTells(const std::string& message) { _context.navigator.tell(message); }
 
 void WidgetPage::widgetIsUpdating(bool updating) { _updating.set_spinning(updating); }
 

@@ -32,6 +32,7 @@ class WidgetPage final : public Page, private WidgetHostProcess::Delegate {
 
   void widgetDidChange(const WidgetContentRef& content) override;
   void widgetDidFail(const std::string& reason) override;
+  void widgetTells(const std::string& message) override;
   void widgetIsUpdating(bool updating) override;
   bool widgetOpens(std::string_view method, const nlohmann::json& params) override;
 

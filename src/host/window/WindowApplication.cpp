@@ -12,7 +12,16 @@ WindowApplication::WindowApplication(const CommandContext& context)
     : Gtk::Application(kIdentifier, context.widgetArguments.empty()
                                         ? Gio::Application::Flags::HANDLES_OPEN
                                         : Gio::Application::Flags::HANDLES_OPEN | Gio::Application::Flags::NON_UNIQUE),
-      _context(context) {}
+      _context(context) {
+  // On the main thread, and once there is a window.
+  _context.tell = [this](const std::string& message) {
+    _context.runLoop.dispatchAsync([this, message] { tell(message); });
+  };
+}
+
+void WindowApplication::tell(const std::string& message) {
+  if (_window) _window->tell(message);
+}
 
 void WindowApplication::on_startup() {
   Gtk::Application::on_startup();

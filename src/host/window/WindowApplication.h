@@ -30,10 +30,11 @@ class WindowApplication final : public Gtk::Application {
 
  private:
   void makeWindow();
+  void tell(const std::string& message);
   /// The texts are another language's: everything that shows them is made anew.
   void changeLocale();
 
-  const CommandContext& _context;
+  CommandContext _context;
   std::unique_ptr<HostPlatform> _platform;
   std::unique_ptr<DesktopPreferences> _preferences;
   std::unique_ptr<MainWindow> _window;

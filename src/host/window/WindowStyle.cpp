@@ -22,6 +22,7 @@ headerbar { border: none; box-shadow: none; }
 .card-header { padding: 8px 8px 8px 16px; border-bottom: 1px solid alpha(@borders, 0.5); }
 .card-header:dir(rtl) { padding: 8px 16px 8px 8px; }
 button { border-radius: 8px; box-shadow: none; text-shadow: none; }
+button.flat:hover, row.activatable:hover { background: none; background-color: alpha(currentColor, 0.08); }
 button.text-button:not(.flat):not(.link):not(.suggested-action) {
   background: none;
   background-color: alpha(currentColor, 0.08);
@@ -37,6 +38,8 @@ button.link, link { color: @accent_text_color; }
   border: none; border-radius: 0; background: none; box-shadow: none;
 }
 .widget-row:focus-visible { outline: 2px solid @accent_text_color; outline-offset: -4px; border-radius: 12px; }
+/* The theme's own is an SVG file, whose library takes 7 MiB. */
+spinner { -gtk-icon-source: -gtk-icontheme("view-refresh-symbolic"); }
 .line-title { font-size: 150%; font-weight: bold; }
 .item-heading { font-size: 110%; font-weight: bold; }
 .item-caption { font-size: 90%; opacity: 0.75; }
@@ -77,7 +80,7 @@ std::string windowStyle(Appearance appearance, double textScale) {
   constexpr double kLargestHeaderScale = 1.4;
   return (appearance == Appearance::dark ? kDarkColors : kLightColors) +
          ("@define-color card_color " + cssColor(colorOf(SystemColor::background, appearance)) + ";") + kStyle +
-         "window, popover { font-size: " + percent(textScale) + "; }" +
+         "window, tooltip { font-size: " + percent(textScale) + "; }" +
          "headerbar { font-size: " + percent(std::min(textScale, kLargestHeaderScale) / textScale) + "; }";
 }
 

@@ -1,0 +1,120 @@
+"""A display, a session bus and a home of a test's own, and windows on them as keyboard, pointer and screen reader have
+them."""
+import os
+import re
+import subprocess
+import time
+from contextlib import ExitStack
+
+PATIENCE = 60  # seconds for anything to come true
+
+
+class Session(ExitStack):
+    """Starts Xvfb and a bus, and ends them. Nothing of the user's desktop is seen or touched."""
+
+    def __init__(self, folder):
+        super().__init__()
+        self.environment = {"PATH": os.environ["PATH"], "HOME": folder, "XDG_RUNTIME_DIR": folder, "LANG": "C.UTF-8",
+                            "TZ": "UTC", "GTK_A11Y": "atspi", "G_DEBUG": "fatal-criticals"}
+        # Without -noreset the server would forget everything whenever its last client leaves.
+        self.environment["DISPLAY"] = ":" + self.serve(
+            lambda fd: ["Xvfb", "-displayfd", str(fd), "-screen", "0", "1024x1024x24", "-noreset"])
+        self.environment["DBUS_SESSION_BUS_ADDRESS"] = self.serve(
+            lambda fd: ["dbus-daemon", "--session", "--nofork", f"--print-address={fd}"])
+        os.environ.update(self.environment)
+        global Atspi, GLib
+        import gi
+        gi.require_version("Atspi", "2.0")
+        from gi.repository import Atspi, GLib
+
+    def serve(self, command):
+        """Starts a server that tells its address on a file descriptor, and gives the address."""
+        reading, writing = os.pipe()
+        self.start(command(writing), pass_fds=[writing], stderr=subprocess.DEVNULL)
+        os.close(writing)
+        with os.fdopen(reading) as address:
+            return address.readline().strip()
+
+    def start(self, command, **options):
+        process = subprocess.Popen(command, env=self.environment | options.pop("env", {}), **options)
+        self.callback(process.wait)
+        self.callback(process.kill)
+        return process
+
+
+def wait(what, condition):
+    """The condition's first answer that is true; asked again whenever something happens, and every 20 ms."""
+    deadline, context = time.monotonic() + PATIENCE, GLib.MainContext.default()
+    while time.monotonic() < deadline:
+        try:
+            if answer := condition():
+                return answer
+        except GLib.Error:
+            pass  # what was looked at is gone
+        GLib.timeout_add(20, lambda: False)
+        context.iteration(True)
+    raise AssertionError(f"waited in vain: {what}")
+
+
+class Window:
+    def __init__(self, session, program, *arguments, **environment):
+        self.process = session.start([program, *arguments], env=environment)
+
+    def frame(self):
+        desktop = Atspi.get_desktop(0)
+        applications = [desktop.get_child_at_index(i) for i in range(desktop.get_child_count())]
+        return next((application.get_child_at_index(0) for application in applications if application
+                     and application.get_process_id() == self.process.pid and application.get_child_count()), None)
+
+    def nodes(self, node=None):
+        """What there is on the page, as a screen reader walks it."""
+        if node := node or self.frame():
+            node.clear_cache()
+            yield node
+            for i in range(node.get_child_count()):
+                if child := node.get_child_at_index(i):
+                    yield from self.nodes(child)
+
+    def find(self, name, role=None):
+        return next((node for node in self.nodes()
+                     if re.search(name, node.get_name()) and role in (None, node.get_role_name())), None)
+
+    def see(self, name, role=None):
+        try:
+            return wait(name, lambda: self.find(name, role))
+        except AssertionError as vain:
+            there = "\n".join(f"{node.get_role_name()}: {node.get_name()}" for node in self.nodes() if node.get_name())
+            raise AssertionError(f"{vain}; there is\n{there}") from None
+
+    def see_page(self, title):
+        wait(f"the page {title}", lambda: re.fullmatch(title, self.frame().get_name()))
+
+    def click(self, name, role="push button"):
+        def place():
+            box = self.see(name, role).get_extents(Atspi.CoordType.WINDOW)
+            return box.width > 0 and box.height > 1 and (box.x + box.width // 2, box.y + box.height // 2)
+
+        places = [None, wait(f"a place of {name}", place)]
+        # Until it stands still.
+        wait(f"rest of {name}", lambda: places.append(wait(name, place)) or places[-1] == places[-2])
+        press("mousemove", *map(str, places[-1]), "click", "1")
+
+    def comes_to_front(self):
+        """There is no window manager that would raise a window and give it the keyboard."""
+        window = wait("the window", lambda: subprocess.run(
+            ["xdotool", "search", "--onlyvisible", "--pid", str(self.process.pid)],
+            capture_output=True, text=True).stdout.split())[0]
+        press("windowraise", window, "windowfocus", "--sync", window)
+        return window
+
+    def children(self):
+        return subprocess.run(["pgrep", "-P", str(self.process.pid)], capture_output=True, text=True).stdout.split()
+
+    def quit(self):
+        press("key", "ctrl+q")
+        assert self.process.wait(PATIENCE) == 0, self.process.returncode
+
+
+def press(*events):
+    """Events of the X server's own, as from keyboard and pointer: see xdotool."""
+    subprocess.run(["xdotool", *events], check=True)

@@ -1,0 +1,233 @@
+#!/usr/bin/python3
+"""The window as its user has it. usage: window_test.py tour|faults NIMBO_TRANSIT_DESKTOP NIMBO_TRANSIT WIDGET"""
+import json
+import os
+import re
+import signal
+import socket
+import stat
+import subprocess
+import sys
+import tempfile
+import time
+import urllib.parse
+
+from window_session import PATIENCE, Session, Window, press, wait
+
+desktop, command_line, widget = sys.argv[2:]
+
+
+def message(*fields):
+    """Bytes of a protobuf message from numbers and values."""
+    def varint(value):
+        return bytes([value & 127 | 128]) + varint(value >> 7) if value > 127 else bytes([value])
+
+    def encoded(number, value):
+        if isinstance(value, int):
+            return varint(number << 3) + varint(value)
+        value = value.encode() if isinstance(value, str) else value
+        return varint(number << 3 | 2) + varint(len(value)) + value
+    return b"".join(encoded(number, value) for number, value in fields)
+
+
+def publish(folder, headers):
+    """Writes a city's feed, with an alert for line 1 under each header."""
+    os.makedirs(folder, exist_ok=True)
+    tables = {"agency.txt": "agency_id,agency_name,agency_url,agency_timezone\nM,Metro,https://example.org,UTC\n",
+              "routes.txt": "route_id,agency_id,route_short_name,route_long_name,route_type,route_color\n"
+                            "m1,M,1,Harbour Line,1,005599\nm2,M,2,Castle Line,1,CC0000\nm3,M,3,Ring,1,\n"}
+    for name, table in tables.items():
+        with open(os.path.join(folder, name), "w") as file:
+            file.write(table)
+    alerts = [(2, message((1, header), (5, message((5, message((2, "m1"))), (10, message((1, message((1, header)))))))))
+              for header in headers]
+    with open(os.path.join(folder, "alerts.pb"), "wb") as file:
+        file.write(message((1, message((1, "2.0"), (3, int(time.time())))), *alerts))
+
+
+def open_url(url):
+    subprocess.run([desktop, url], check=True, timeout=PATIENCE)
+
+
+def sample_activity_url(folder):
+    """What a row of the sample city hands over, by the command line, as an address."""
+    requests = [("initialize", {"locale": "en", "displayModes": {"compact": [359, 110], "expanded": [359, 440]},
+                                "bundle": {"kind": "application", "identifier": "org.example.Host"}}),
+                ("loadView", {}), ("viewWillAppear", {}), ("viewDidAppear", {}), ("performUpdate", {}),
+                ("setActiveDisplayMode", {"mode": "expanded"}), ("selectRow", {"section": 0, "row": 1})]
+    script = "\n".join(json.dumps({"jsonrpc": "2.0", "id": number, "method": method, "params": params})
+                       for number, (method, params) in enumerate(requests))
+    lines = subprocess.run([command_line, "--config", folder, "--state", folder, "script", "-"], input=script,
+                           capture_output=True, text=True, check=True).stdout.splitlines()
+    activity = next(line["params"] for line in map(json.loads, lines) if line.get("method") == "openUserActivity")
+    return "nimbo://activity?" + urllib.parse.urlencode({"type": activity["activityType"], **activity["userInfo"]})
+
+
+def private_memory(process):
+    with open(f"/proc/{process}/smaps_rollup") as rollup:
+        return sum(int(line.split()[1]) for line in rollup if line.startswith("Private_")) * 1024
+
+
+def restarted(window, old):
+    return wait("another widget process", lambda: [child for child in window.children() if child not in old])
+
+
+def tour(session, folder):
+    city = os.path.join(folder, "city")
+    publish(city, ["Signals fail", "Lift is out", "Stairs are wet", "Music plays"])
+    window = Window(session, desktop)
+    window.see("4 Advisories", "push button")
+    window.comes_to_front()
+
+    window.click("Set Up a Feed")
+    window.see_page("Feeds")
+    for entry, text in ("Name", "town"), ("Lines", city), ("Incidents", city + "/alerts.pb"):
+        window.click(entry, "text")
+        press("type", text)
+    press("key", "Return")
+    window.see("3 lines, 1 agency")
+    window.see("4 incidents")
+    press("key", "Escape")
+
+    window.click("Favorites", "list item")
+    window.see_page("Favorites")
+    window.see("1, Harbour Line, Metro", "list item")
+    for search, line in ("castle", "2, Castle Line"), ("harbour", "1, Harbour Line"):
+        press("key", "ctrl+a", "type", search)
+        wait("one line found", lambda: sum(node.get_role_name() == "list item" for node in window.nodes()) == 1)
+        window.click(f"Add {line} to favorites")
+        window.see(f"Remove {line} from favorites")
+        window.click("Search", "entry")
+    press("key", "Escape")
+    window.click("Move 1, Harbour Line up")
+    wait("the new order", lambda: [node.get_name() for node in window.nodes() if node.get_role_name() == "list item"]
+         [:2] == ["1, Harbour Line, Metro", "2, Castle Line, Metro"])
+    window.click("Search", "entry")
+    press("key", "Escape")
+
+    window.see("1, Harbour Line, .*4 Advisories", "push button")
+    window.click("4 Advisories")
+    for text in "Incidents", "Signals fail", "Music plays":
+        window.see(text)
+    press("key", "Escape")
+    window.click("Show More")
+    for row, page, text in (("1, Harbour Line, .*Signals fail", "1, Harbour Line", "Signals fail"),
+                            ("2 More", "Incidents", "Music plays"), ("Good Service", "Favorites", "Castle Line")):
+        window.click(row)
+        window.see_page(page)
+        window.see(text)
+        press("key", "alt+Left")
+        window.see_page("Nimbo Transit")
+    window.click("Good Service")
+    window.see_page("Favorites")
+    press("key", "alt+Left", "Up", "Up", "Return")  # the keyboard goes on from the row
+    window.see_page("1, Harbour Line")
+    press("key", "alt+Left")
+
+    publish(city, ["A bridge is up"])
+    press("key", "F5")
+    window.see("A bridge is up", "push button")
+    for news in "Cows walk the track", "The cows are gone", None:
+        old = window.children()
+        if news:
+            publish(city, [news])
+        os.kill(int(old[0]), signal.SIGKILL)
+        if news:
+            restarted(window, old)
+            window.see(news, "push button")
+    window.see("cannot be shown: .*3 times within a minute")
+    assert not window.children()
+    window.click("Try Again")
+    window.see("The cows are gone", "push button")
+
+    publish(os.path.join(folder, "other"), [])
+    subprocess.run([command_line, "feed", "add", "other", "--static", folder + "/other", "--alerts",
+                    folder + "/other/alerts.pb"], check=True)
+    subprocess.run([command_line, "favorite", "add", "other:m3"], check=True)
+    press("key", "F5")
+    window.see("3 other lines|2 other lines", "push button")
+    processes = [window.process.pid, *window.children()]
+    assert len(processes) == 2
+    memory = [private_memory(process) / 2**20 for process in processes]
+    print(f"private memory: {memory[0]:.1f} MiB in the window, {memory[1]:.1f} MiB in the widget process")
+    assert sum(memory) < 64
+
+    for url, sight in (("http://example.org/", "“http://example.org/” cannot be opened here"),
+                       ("nimbo://activity?type=org.nimbo.Map.Transit.Incident&bs=AAAA", "cannot be shown"),
+                       ("nimbo://?favorites=2&t=r", "Move 1, Harbour Line down"),
+                       (sample_activity_url(os.path.join(folder, "sample")), "Trains every 12 minutes"),
+                       ("nimbo://", "Good Service")):
+        open_url(url)
+        window.see(sight)
+
+    with socket.create_server(("127.0.0.1", 0)) as silent:
+        window.click("Feeds", "list item")
+        window.click("Name", "text")
+        address = f"http://127.0.0.1:{silent.getsockname()[1]}/feed"
+        press("type", "slow")
+        for entry in "Lines", "Incidents":
+            window.click(entry, "text")
+            press("type", address)
+        press("key", "Return")
+        window.see("Reading the feed")
+        press("key", "Escape")
+        window.see_page("Nimbo Transit")
+        window.quit()
+
+
+FAULTS = {  # what the widget program does, and what the window says
+    "#!/nonexistent": "cannot start .*Install it",
+    "#!/bin/sh\nexit 3": "it ended",
+    "#!/bin/sh\ncat >/dev/null": 'it does not answer "initialize"',
+    "#!/bin/sh\nexec yes '{\"jsonrpc\":\"2.0\",\"method\":\"log\",\"params\":{}}'": "it does not stop talking",
+    "#!/bin/sh\nexec yes nonsense": "it speaks nonsense",
+    "#!/bin/sh\nexec tr -d '\\n' </dev/zero": "it speaks nonsense",
+    '#!/bin/sh\nwhile read -r line; do echo "$line" | sed \'s/.*"id":\\([0-9]*\\).*/{"jsonrpc":"2.0","id":\\1,"result":[7]}/\';'
+    " done": "nonsense",
+}
+
+
+def faults(session, folder):
+    windows = []
+    for number, program in enumerate(FAULTS):
+        path = os.path.join(folder, f"widget{number}")
+        with open(path, "w") as file:
+            file.write(program)
+        os.chmod(path, stat.S_IRWXU)
+        windows.append(Window(session, desktop, "--state", path + ".state", NIMBO_TRANSIT_WIDGET=path))
+    for window, reason in zip(windows, FAULTS.values()):
+        window.see("cannot be shown: .*" + reason)
+        window.comes_to_front()
+        window.click("Feeds", "list item")
+        window.see_page("Feeds")
+        window.quit()
+
+    told = os.path.join(folder, "told")
+    path = os.path.join(folder, "listening")
+    with open(path, "w") as file:
+        file.write(f"#!/bin/sh\ntee '{told}' | '{widget}' \"$@\"\n")
+    os.chmod(path, stat.S_IRWXU)
+    window = Window(session, desktop, "--state", path + ".state", NIMBO_TRANSIT_WIDGET=path)
+    window.see("4 Advisories", "push button")
+    identifier = window.comes_to_front()
+    for events, method in ((("key", "ctrl+plus"), "setTextSize"), (("key", "F5"), "performUpdate"),
+                           (("windowunmap", identifier), "viewDidDisappear"), (("windowmap", identifier), "viewWillAppear"),
+                           (("windowsize", identifier, "500", "700"), "transitionToSize")):
+        with open(told) as file:
+            file.seek(0, os.SEEK_END)
+            press(*events)
+            wait(f"{method} after {events}", lambda: method in file.read())
+    window.comes_to_front()
+    window.quit()
+
+    blind = subprocess.run([desktop], env=session.environment | {"DISPLAY": ""}, capture_output=True, text=True)
+    assert blind.returncode == 1 and re.search("no display.*nimbo-transit in the terminal", blind.stderr), blind
+    for bus in "", "unix:path=/nonexistent":
+        window = Window(session, desktop, DBUS_SESSION_BUS_ADDRESS=bus, GTK_A11Y="none")
+        window.comes_to_front()
+        wait("the widget process", window.children)
+        window.quit()
+
+
+with tempfile.TemporaryDirectory() as home, Session(home) as running:
+    {"tour": tour, "faults": faults}[sys.argv[1]](running, home)
