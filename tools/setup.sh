@@ -1,5 +1,5 @@
 #!/usr/bin/env bash
-# Installs the Debian packages that are missing: setup.sh run|test|lint|bench (all hold run, lint holds test).
+# Installs the Debian packages that are missing: setup.sh run|test|lint|bench|fuzz (all hold run, lint holds test).
 # Quick when nothing is missing. Needs root, or a user with sudo.
 set -euo pipefail
 purpose=${1:-run}
@@ -9,16 +9,18 @@ packages=(
   g++ cmake ninja-build pkg-config ccache
   libglib2.0-dev libsqlite3-dev libcurl4-openssl-dev libprotozero-dev libzip-dev libcsv-dev libicu-dev
   nlohmann-json3-dev libcli11-dev libpango1.0-dev libcairo2-dev libfontconfig-dev libbz2-dev libsystemd-dev
-  fonts-dejavu-core ca-certificates
+  libgtkmm-4.0-dev fonts-dejavu-core ca-certificates
 )
 case $purpose in
   run) ;;
   test | lint) packages+=(libgtest-dev libgmock-dev protobuf-compiler libprotobuf-dev python3 python3-kiwisolver zlib1g-dev libssl-dev
-    desktop-file-utils appstream mandoc systemd zsh fish libxml2-utils) ;;
+    desktop-file-utils appstream mandoc systemd zsh fish libxml2-utils
+    xvfb xdotool dbus at-spi2-core python3-gi gir1.2-atspi-2.0 procps) ;;
   bench) packages+=(libbenchmark-dev protobuf-compiler libprotobuf-dev python3 python3-dev python3-kiwisolver
-    libgtkmm-4.0-dev libxdamage-dev xvfb) ;;
-  package) packages+=(libgtkmm-4.0-dev dpkg-dev file) ;;
-  *) echo "usage: tools/setup.sh run|test|lint|bench" >&2; exit 2 ;;
+    libxdamage-dev xvfb) ;;
+  fuzz) packages+=(clang libclang-rt-dev llvm) ;;  # the compiler with libFuzzer, the sanitizers, names in their reports
+  package) packages+=(dpkg-dev file) ;;
+  *) echo "usage: tools/setup.sh run|test|lint|bench|fuzz" >&2; exit 2 ;;
 esac
 [ "$purpose" != lint ] || packages+=(clang-format clang-tidy git)
 
