@@ -4,6 +4,7 @@
 #include <benchmark/benchmark.h>
 #include <csv.h>
 #include <gtfs-realtime.pb.h>
+#include <time.h>
 
 #include <chrono>
 #include <fstream>
@@ -21,8 +22,15 @@ namespace {
 constexpr std::size_t kFavorites = 20;
 
 std::uint64_t secondsNow() {
-  return static_cast<std::uint64_t>(
-      std::chrono::duration_cast<std::chrono::seconds>(currentDate().time_since_epoch()).count());
+  const auto now = std::chrono::system_clock::now().time_since_epoch();
+  return static_cast<std::uint64_t>(std::chrono::duration_cast<std::chrono::seconds>(now).count());
+}
+
+/// What this process has had of a processor: what others take on a shared machine does not count.
+double processorSeconds() {
+  timespec time{};
+  clock_gettime(CLOCK_PROCESS_CPUTIME_ID, &time);
+  return static_cast<double>(time.tv_sec) + 1e-9 * static_cast<double>(time.tv_nsec);
 }
 
 /// The made-up feed in a folder.
@@ -90,13 +98,13 @@ void alerts(benchmark::State& state) {
   state.counters["bytes"] = static_cast<double>(bytes.size());
   for (auto _ : state) {
     std::string fetched = bytes;  // a fetch brings bytes of its own
-    const auto begin = std::chrono::steady_clock::now();
+    const double begin = processorSeconds();
     {
       const auto feed = AlertsFeed::read(std::move(fetched), "bench");
       const IncidentReading reading = readIncidents(*feed, loaded->feed, query);
       if (reading.incidents.front().empty()) state.SkipWithError("there are no incidents");
     }
-    state.SetIterationTime(std::chrono::duration<double>(std::chrono::steady_clock::now() - begin).count());
+    state.SetIterationTime(processorSeconds() - begin);
   }
 }
 BENCHMARK(alerts)->UseManualTime()->Unit(benchmark::kMillisecond);
@@ -109,7 +117,7 @@ void alertsPeer(benchmark::State& state) {
     benchmark::DoNotOptimize(feed);
   }
 }
-BENCHMARK(alertsPeer)->UseRealTime()->Unit(benchmark::kMillisecond);
+BENCHMARK(alertsPeer)->Unit(benchmark::kMillisecond);
 
 }  // namespace
 }  // namespace nimbo

@@ -4,11 +4,13 @@ what the rider sees. None may be shown as good service.
 
 Usage: feeds.py BUILD_FOLDER [NAME...]     all feeds, or those whose name contains one of the given texts
 """
-import json, os, socket, sys, tempfile, threading, time, zipfile, zlib
+import json, os, signal, socket, sys, tempfile, threading, time, zipfile, zlib
 
 from city import AGENCY, LINES, ROUTES, WHOLE_AGENCY, City, entity, field, header, period, text, titled
 
 MIB = 1 << 20
+now = int(time.time())
+IN_FORCE = period(now - 3600, now + 3600)
 
 
 def filled(make, size=60 * MIB):
@@ -26,10 +28,9 @@ def periods(count, first, step):
 
 
 def alert_feeds():
-    now = int(time.time())
     yield "millions of entities", lambda: filled(lambda n: entity(str(n), b""))
     yield "100,000 alerts", lambda: header() + b"".join(
-        entity(str(n), titled(f"Title {n}") + periods(40, now - 1000, 60)) for n in range(100000))
+        entity(str(n), titled(f"Title {n}") + IN_FORCE + periods(40, now + 9000, 60)) for n in range(100000))
     yield "100,000 alerts of one identifier", lambda: header() + b"".join(
         entity("a", WHOLE_AGENCY + text(10, (f"Title {n}", f"l{n}"))) for n in range(100000))
     yield "an identifier's millions of translations", lambda: header() + b"".join(
@@ -38,8 +39,8 @@ def alert_feeds():
         "a", WHOLE_AGENCY * 10000000 + text(10, ("Title", "")))
     yield "millions of selectors by trip", lambda: header() + entity(
         "a", titled("T") + b"".join(field(5, field(4, field(1, f"t{n}"))) for n in range(4000000)))
-    yield "millions of periods to come", lambda: header() + entity("a", titled("T") + periods(3000000, now + 60, 2))
-    yield "millions of periods past", lambda: header() + entity("a", titled("T") + periods(3000000, now - 7000000, 2))
+    yield "millions of periods to come", lambda: header() + entity("a", titled("T") + IN_FORCE + periods(3000000, now + 9000, 2))
+    yield "millions of periods past", lambda: header() + entity("a", titled("T") + IN_FORCE + periods(3000000, now - 7000000, 2))
     yield "a text of 60 MiB", lambda: header() + entity("a", titled("x" * 60 * MIB))
     for mark in "<", "&", "<a", "&#", "\u200f", "\n", "</", "<!--":
         yield f"texts of {json.dumps(mark)}", lambda mark=mark: filled(
@@ -114,18 +115,24 @@ def static_feeds():
 
 
 class Server:
-    """Answers each path by its function."""
+    """A process that answers each path by what its function made. Apart from this one: a program that is started counts
+    the memory of who starts it as its own."""
 
-    def __init__(self):
-        self.answers = {}
-        self.listening = socket.create_server(("127.0.0.1", 0))
-        self.address = f"http://127.0.0.1:{self.listening.getsockname()[1]}"
-        threading.Thread(target=self.accept, daemon=True).start()
-
-    def accept(self):
-        while True:
-            connection, _ = self.listening.accept()
-            threading.Thread(target=self.serve, args=(connection,), daemon=True).start()
+    def __init__(self, make):
+        reading, writing = os.pipe()
+        self.pid = os.fork()
+        if self.pid == 0:
+            try:
+                self.answers = {path: made() for path, made in make.items()}
+                listening = socket.create_server(("127.0.0.1", 0))
+                os.write(writing, str(listening.getsockname()[1]).encode())
+                while True:
+                    threading.Thread(target=self.serve, args=(listening.accept()[0],), daemon=True).start()
+            finally:
+                os._exit(1)
+        os.close(writing)
+        self.address = f"http://127.0.0.1:{os.read(reading, 16).decode()}"
+        os.close(reading)
 
     def serve(self, connection):
         try:
@@ -140,20 +147,23 @@ class Server:
             pass
         connection.close()
 
+    def close(self):
+        os.kill(self.pid, signal.SIGKILL)
+        os.waitpid(self.pid, 0)
+
 
 def main():
     build, wanted = sys.argv[1], sys.argv[2:]
-    server = Server()
     good = header() + entity("a", titled("Works"))
     bad = 0
-    print(f"{'fault':45} {'seconds':>8} {'MiB':>6}  what the rider sees", flush=True)
+    print(f"| {'fault':42} | {'s':>5} | {'MiB':>5} | what the rider sees |\n|---|---:|---:|---|", flush=True)
 
     def show(name, make):
         nonlocal bad
         if wanted and not any(w in name for w in wanted):
             return
-        is_static = name.startswith("static: ")
-        server.answers = {"/good": plain(good), "/bad": plain(b"")}
+        is_static = name.startswith("static feed: ")
+        server = Server({"/good": lambda: plain(good), "/bad": make})
         city = City(build, alerts=server.address + ("/good" if is_static else "/bad"))
         city.run("favorite", "add", *(f"city:{line}" for line in LINES))
         if is_static:
@@ -161,13 +171,15 @@ def main():
                 settings = file.read().replace(city.folder + "/feed", server.address + "/bad")
             with open(city.folder + "/config/feeds.json", "w") as file:
                 file.write(settings)
-        server.answers["/bad"] = make()
         begin = time.monotonic()
         status, output, mib = city.run("status")
         seconds = time.monotonic() - begin
-        seen = " / ".join(line.strip() for line in output.splitlines() if line.strip()).replace(server.address, "")
-        bad += status not in (0, 1) or "Good Service" in output
-        print(f"{name:45} {seconds:8.1f} {mib:6}  {status}: {seen[:200]}", flush=True)
+        server.close()
+        title, _, reason = output.partition("nimbo-transit: ")
+        title = title.split("  ")[0].splitlines()[0].strip() if title.strip() else ""
+        reason = reason.strip().replace(server.address, "").split(". ")[0]
+        bad += status not in (0, 1) or "Good Service" in output or not title
+        print(f"| {name:42} | {seconds:5.1f} | {mib:5} | {title[:40]}{': ' + reason if reason else ''} |", flush=True)
 
     for name, make in alert_feeds():
         show(name, lambda: plain(make()))
@@ -178,10 +190,10 @@ def main():
             with tempfile.NamedTemporaryFile() as file:
                 write(file.name)
                 return plain(file.read())
-        show("static: " + name, zipped)
+        show("static feed: " + name, zipped)
     for name, make in transports(good):
         if "drip" in name or "silence" in name or "never" in name:
-            show("static: " + name, make)
+            show("static feed: " + name, make)
     if bad:
         sys.exit(f"{bad} faults were shown as good service, or ended the program")
 

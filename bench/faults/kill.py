@@ -77,10 +77,9 @@ class Round:
     def kill_widget(self):
         title = f"Works {self.number}"
         widget = self.save(title)
+        title = title if self.favorites else "No Favorite Lines"
         if self.chance.random() < 0.7:  # close to the saving
-            for line in widget.process.stdout:
-                if b"updateResult" in line:
-                    break
+            self.wait_for_update(widget)
             moment = self.moment(self.host_seconds / 4)
         else:
             moment = self.moment(self.widget_seconds)
@@ -92,6 +91,12 @@ class Round:
             sys.exit(f"the rows kept are {restored!r}, neither {self.title!r} nor {title!r}")
         self.kept += restored == title
         self.title = restored
+
+    @staticmethod
+    def wait_for_update(widget):
+        for line in widget.process.stdout:
+            if b"updateResult" in line:
+                return
 
     def restored_title(self):
         widget = self.city.widget()
@@ -118,6 +123,7 @@ class Round:
 
     def prepare_rows(self):
         widget = self.save(self.title)
+        self.wait_for_update(widget)
         widget.call("viewWillDisappear", "viewDidDisappear")
         widget.close()
 

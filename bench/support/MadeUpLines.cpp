@@ -18,6 +18,7 @@ std::filesystem::path makeFolder() {
 }
 
 TransitIncidentRef incident(std::uint64_t number) {
+  static const Date now = currentDate();  // what two fetches bring is equal
   const std::string text = std::to_string(number);
   BasicTransitIncident::Fields fields;
   fields.muid = 0x9E3779B97F4A7C15u * (number + 1);
@@ -25,8 +26,8 @@ TransitIncidentRef incident(std::uint64_t number) {
   fields.summary = "Trains run at a lower frequency between Northgate and Old Docks because of works, number " + text;
   fields.fullDescription = *fields.summary + ". Buses replace trains from 22:00 on. Allow more time for your journey.";
   fields.messageForRoutePlanning = fields.messageForRouteStepping = fields.messageForNonRoutable = fields.title;
-  fields.startDate = currentDate() - std::chrono::hours(1);
-  fields.endDate = currentDate() + std::chrono::hours(24);
+  fields.startDate = now - std::chrono::hours(1);
+  fields.endDate = now + std::chrono::hours(24);
   fields.affectedEntities = {std::make_shared<const BasicAffectedEntity>(number)};
   fields.linkURL = "https://example.org/incidents/" + text;
   return std::make_shared<const BasicTransitIncident>(std::move(fields));
