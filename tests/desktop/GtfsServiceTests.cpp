@@ -81,6 +81,10 @@ TEST_F(LineServiceTest, FailsWhenAFeedDoes) {
   EXPECT_EQ(lookup({line("north", "r1")}), "1 (In north); ");
   EXPECT_EQ(lookup({line("north", "r1"), line("south", "r1")}), error(Code::unreadableFile));
   EXPECT_EQ(lookup({line("north", "r1"), line("east", "r1")}), error(Code::unknownFeed));
+  std::string many;
+  for (int i = 0; i <= 5000; ++i) many += alert(std::to_string(i), "T" + std::to_string(i), route("r1"));
+  addFeed("west", {"1"}, folder.write("many.pb", feedBytes(many)));
+  EXPECT_EQ(lookup({line("west", "r1")}), error(Code::tooLarge));
   folder.write("config/feeds.json", "{");
   EXPECT_EQ(lookup({line("north", "r1")}), error(Code::configuration));
 }

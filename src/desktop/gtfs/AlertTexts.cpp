@@ -10,6 +10,7 @@ namespace nimbo {
 namespace {
 
 constexpr std::size_t kLongestRawText = 64 * 1024;  // bytes; no row shows more, and hostile texts end somewhere
+constexpr std::size_t kLongestTitle = 500;          // characters
 constexpr std::size_t kLongestParagraph = 200;      // characters that a row's second text can sensibly show
 
 std::string textIn(std::string_view alert, AlertField field, const LanguagePreference& preference) {
@@ -102,6 +103,7 @@ std::optional<AlertTexts> alertTextsIn(std::string_view alert, AlertEffect effec
   if (texts.title.empty()) texts.title = onOneLine(textIn(alert, AlertField::effectDetail, preference));
   if (texts.title.empty()) texts.title = effectWords(effect, preference.user);
   if (texts.title.empty()) return std::nullopt;
+  texts.title = std::string(firstCharacters(texts.title, kLongestTitle));
   if (const std::string_view rest = afterTitle(description, texts.title); !rest.empty()) {
     texts.summary = summaryOfText(rest);
     texts.description = description;

@@ -11,7 +11,7 @@ namespace nimbo {
 
 /// What an alert says, as plain text.
 struct AlertTexts {
-  std::string title;                       ///< one line, not empty
+  std::string title;                       ///< one line, not empty, 500 characters at most
   std::optional<std::string> summary;      ///< what the description says first beyond the title
   std::optional<std::string> description;  ///< whole; absent when it says no more than the title
   std::optional<std::string> linkURL;      ///< an http or https address

@@ -5,6 +5,7 @@
 
 #include "desktop/gtfs/IncidentReader.h"
 #include "desktop/gtfs/LineItems.h"
+#include "desktop/gtfs/TransitLineServiceError.h"
 #include "platform/Clock.h"
 
 namespace nimbo {
@@ -67,6 +68,10 @@ Outcome<TransitLineItems> lookUpInFeed(const FeedSource& source, std::span<const
     if (lines[i] && placeOfLine.try_emplace(*lines[i], query.lines.size()).second)
       query.lines.push_back({*lines[i], identifiers[i]->muid()});
   const IncidentReading reading = readIncidents(*alerts, feed, query);
+  if (reading.isCutShort)
+    return transitLineServiceError(TransitLineServiceError::tooLarge,
+                                   "The alerts feed of \"" + source.name() +
+                                       "\" has more incidents on these lines than any network has. Check the address.");
   LineItems makeItems(source.name(), feed);
   for (std::size_t i = 0; i < lines.size(); ++i)
     if (lines[i])

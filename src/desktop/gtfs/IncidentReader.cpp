@@ -17,6 +17,8 @@ namespace nimbo {
 
 namespace {
 
+constexpr std::size_t kMostIncidents = 5000;  // whole countries have fewer; each costs memory on every line
+
 /// An alert, or several of one content.
 struct Incident {
   std::string key;  // the least of its alerts
@@ -123,6 +125,11 @@ class IncidentBuilder {
     }
     // Before each line gets its copy: an alert may have millions.
     const auto mattering = periodsThatMatter(joinedPeriods(std::move(periods.periods)), _query.now);
+    if (_incidents.size() == kMostIncidents) {
+      _reading.isCutShort = true;
+      _reading.skipped.add("alert after the first 5000 incidents", alert.id);
+      return;
+    }
     const auto index = incidentOf(alert, view.content);
     if (!index) {
       _reading.skipped.add("alert that says nothing", alert.id);

@@ -35,6 +35,7 @@ struct IncidentReading {
   std::size_t periods = 0;                  ///< published ones of the alerts that concern the lines
   std::size_t selectors = 0;                ///< of all alerts
   SkipReport skipped;                       ///< alerts that make no incident, by reason
+  bool isCutShort = false;                  ///< the lines have more incidents than any network has: no verdict
   SkipReport unfit;                         ///< selectors that fit no line, by reason
 };
 
