@@ -146,7 +146,17 @@ void JSONRPCConnection::call(std::string_view method, const json& params, Comple
   }
 }
 
-void JSONRPCConnection::send(const json& message) { sendLine(lineOf(message)); }
+void JSONRPCConnection::send(const json& message) {
+  std::string line = lineOf(message);
+  // The other end would pass over the line, and wait for ever.
+  if (line.size() > kMaximumLine && message.contains("result"))
+    line = lineOf({{"jsonrpc", "2.0"},
+                   {"id", message["id"]},
+                   {"error",
+                    {{"code", JSONRPCError::kInternalError},
+                     {"message", "the answer is longer than " + std::to_string(kMaximumLine) + " bytes"}}}});
+  sendLine(line);
+}
 
 void JSONRPCConnection::sendLine(std::string_view line) {
   constexpr int kPatienceMilliseconds = 1000;

@@ -15,7 +15,8 @@
 namespace nimbo {
 
 /// JSON-RPC 2.0 over two descriptors, one message a line, both ends alike. A line that is no message gets its error
-/// answer and the connection goes on; a line longer than `kMaximumLine` bytes is skipped whole. A non-blocking output
+/// answer and the connection goes on; a line longer than `kMaximumLine` bytes is skipped whole, and an answer
+/// that would be one becomes an error. A non-blocking output
 /// that stays full for a second closes the connection. Main thread only.
 class JSONRPCConnection {
  public:
