@@ -5,10 +5,9 @@
 namespace nimbo {
 
 bool NBTransitIncidentFilter::shouldDisplayIncident(const TransitIncident& incident) const {
-  const std::optional<Date> start = incident.startDate();
-  if (start && intervalFromNow(*start) > 0) return false;
-  const std::optional<Date> end = incident.endDate();
-  return !end || intervalFromNow(*end) >= 0;
+  const Date now = currentDate();
+  const std::optional<Date> start = incident.startDate(), end = incident.endDate();
+  return (!start || *start <= now) && (!end || *end >= now);
 }
 
 }  // namespace nimbo

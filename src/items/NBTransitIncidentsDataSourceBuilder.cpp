@@ -40,6 +40,10 @@ NBTransitListItemRef NBTransitIncidentsDataSourceBuilder::_buildTransitListItem(
 NBTransitIncidentsDataSourceBuilder::Scan NBTransitIncidentsDataSourceBuilder::scanLines() {
   const NBTransitIncidentFilter& filter = *incidentFilter();
   Scan scan;
+  std::size_t incidentCount = 0;
+  for (const TransitLineItemRef& line : _lineItems) incidentCount += line->incidents().size();
+  const bool needsIncidentsToLine = _analytics || incidentCount >= _maxNumberOfItems;
+  if (needsIncidentsToLine) scan.incidentsToLine.reserve(incidentCount);
   for (const TransitLineItemRef& line : _lineItems) {
     bool lineHasRow = false;
     const TransitIncidents& incidents = line->incidents();
@@ -48,7 +52,7 @@ NBTransitIncidentsDataSourceBuilder::Scan NBTransitIncidentsDataSourceBuilder::s
       if (!filter.shouldDisplayIncident(*incident)) continue;
       const std::size_t displayed = scan.displayedMuids.firstIndexOf(incident->muid());
       if (displayed < scan.items.size()) {
-        scan.itemToLines[displayed].push_back(line);
+        scan.itemToLines[displayed].others.push_back(line);
         lineHasRow = true;
         continue;
       }
@@ -57,8 +61,8 @@ NBTransitIncidentsDataSourceBuilder::Scan NBTransitIncidentsDataSourceBuilder::s
       scan.displayedIncidents.push_back(incident);
       scan.displayedMuids.append(incident->muid());
       scan.items.push_back(std::move(item));
-      scan.incidentsToLine.emplace(incident, line);
-      scan.itemToLines.push_back({line});
+      if (needsIncidentsToLine) scan.incidentsToLine.emplace(incident, line);
+      scan.itemToLines.push_back({line, {}});
       lineHasRow = true;
     }
     if (!lineHasRow) scan.clearLines.push_back(line);

@@ -51,15 +51,21 @@ class NBTransitIncidentsDataSourceBuilder final : public NBTransitItemDataSource
   std::string_view className() const override { return "NBTransitIncidentsDataSourceBuilder"; }
 
  private:
-  /// The lines on which the incident of row k was found, at k; the first one made the row.
-  using ItemToLinesMap = std::vector<TransitLineItems>;
+  /// The lines on which the incident of a row was found. Most rows have one: no list is made for them.
+  struct RowLines {
+    TransitLineItemRef first;  ///< made the row; null once the lines speak through another row
+    TransitLineItems others;
+    TransitLineItems all() const;
+  };
+  /// Those of row k at k.
+  using ItemToLinesMap = std::vector<RowLines>;
 
   /// What a scan of the lines finds. Row k shows displayed incident k, whose number is displayed muid k.
   struct Scan {
     TransitIncidents displayedIncidents;
     NumberList displayedMuids;
     NBTransitItems items;
-    TransitIncidentToLineMap incidentsToLine;
+    TransitIncidentToLineMap incidentsToLine;  ///< empty when nobody is going to ask
     ItemToLinesMap itemToLines;
     TransitLineItems clearLines;
   };

@@ -119,18 +119,21 @@ NBTransitSummaryItemRef NBTransitIncidentsDataSourceBuilder::_summaryItemForInci
     const TransitIncidents& incidents, const NBTransitItems& items, const ItemToLinesMap& itemToLines) const {
   TransitArtworks shields;
   const TransitLineItem* previousLine = nullptr;  // many rows in a row are often of one line
+  const auto addShield = [&](const TransitLineItemRef& line) {
+    if (std::exchange(previousLine, line.get()) == line.get()) return;
+    TransitArtworkRef shield = shieldOfLine(*line);
+    if (!shield) return;
+    const auto isSame = [&](const TransitArtworkRef& other) {
+      return artworksAreEquivalent(other.get(), shield.get());
+    };
+    if (std::find(shields.begin(), shields.end(), shield) == shields.end() &&
+        std::none_of(shields.begin(), shields.end(), isSame))
+      shields.push_back(std::move(shield));
+  };
   for (std::size_t row = 0; row < items.size(); ++row) {
-    for (const TransitLineItemRef& line : itemToLines[row]) {
-      if (std::exchange(previousLine, line.get()) == line.get()) continue;
-      TransitArtworkRef shield = shieldOfLine(*line);
-      if (!shield) continue;
-      const auto isSame = [&](const TransitArtworkRef& other) {
-        return artworksAreEquivalent(other.get(), shield.get());
-      };
-      if (std::find(shields.begin(), shields.end(), shield) == shields.end() &&
-          std::none_of(shields.begin(), shields.end(), isSame))
-        shields.push_back(std::move(shield));
-    }
+    if (!itemToLines[row].first) continue;
+    addShield(itemToLines[row].first);
+    for (const TransitLineItemRef& line : itemToLines[row].others) addShield(line);
   }
   return NBTransitSummaryItem::initWithText_artworks_userActivityData(
       textWithCount("TransitWidget_Summary_advisory_count", incidents.size()), std::move(shields),

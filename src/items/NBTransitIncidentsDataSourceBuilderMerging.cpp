@@ -57,20 +57,26 @@ std::vector<std::string> distinctNames(const TransitLineItems& lines) {
 
 void NBTransitIncidentsDataSourceBuilder::_updateItemsAffectingSeveralLines_itemToLinesMap(
     NBTransitItems& items, ItemToLinesMap& itemToLines) const {
-  const auto isOfSeveral = [](const TransitLineItems& lines) { return lines.size() > 1; };
+  const auto isOfSeveral = [](const RowLines& lines) { return !lines.others.empty(); };
   if (std::none_of(itemToLines.begin(), itemToLines.end(), isOfSeveral)) return;
   NumberList keys;
   for (const NBTransitItemRef& item : items) keys.append(keyOfTexts(*item));
   for (std::size_t row = 0; row < items.size(); ++row) {
     if (!isOfSeveral(itemToLines[row])) continue;
     const NBTransitItemRef old = items[row];
-    const std::uint64_t key = keyOfTexts(*old);
+    const std::uint64_t key = keys.at(row);
     std::size_t place = keys.firstIndexOf(key);
     while (!items[place]->isEqual(old.get())) place = keys.firstIndexOf(key, place + 1);
-    items[place] = itemAffectingLines(*old, itemToLines[row]);
+    items[place] = itemAffectingLines(*old, itemToLines[row].all());
     keys.replace(place, keyOfTexts(*items[place]));
     itemToLines[place] = std::exchange(itemToLines[row], {});
   }
+}
+
+TransitLineItems NBTransitIncidentsDataSourceBuilder::RowLines::all() const {
+  TransitLineItems lines{first};
+  lines.insert(lines.end(), others.begin(), others.end());
+  return lines;
 }
 
 NBTransitItemRef NBTransitIncidentsDataSourceBuilder::itemAffectingLines(const NBTransitItem& item,

@@ -15,14 +15,14 @@ void NumberList::replace(std::size_t index, std::uint64_t value) {
 }
 
 std::size_t NumberList::firstIndexOf(std::uint64_t value, std::size_t from) const {
-  constexpr std::size_t kBlock = 32;  // compared without a branch, so that the compiler uses vector instructions
-  const std::uint32_t folded = fold(value);
+  constexpr std::size_t kBlock = 128;  // compared without a branch, so that the compiler uses vector instructions
+  const std::uint16_t folded = fold(value);
   const std::size_t count = _folded.size();
   std::size_t index = from;
   while (index < count) {
-    std::uint32_t hits = index + kBlock > count ? 1 : 0;
+    std::uint16_t hits = index + kBlock > count ? 1 : 0;
     if (!hits)
-      for (std::size_t i = 0; i < kBlock; ++i) hits |= _folded[index + i] == folded ? ~std::uint32_t{0} : 0;
+      for (std::size_t i = 0; i < kBlock; ++i) hits |= static_cast<std::uint16_t>(-(_folded[index + i] == folded));
     if (!hits) {
       index += kBlock;
       continue;

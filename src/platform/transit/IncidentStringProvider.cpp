@@ -4,23 +4,28 @@ namespace nimbo {
 
 namespace {
 
-/// The first text that is not empty; empty when there is none.
-std::string firstText(std::initializer_list<const std::optional<std::string>*> texts) {
+/// The first text that is not empty; an empty one when there is none.
+const std::string& firstText(std::initializer_list<const std::optional<std::string>*> texts) {
+  static const std::string none;
   for (const auto* text : texts)
     if (*text && !(*text)->empty()) return **text;
-  return {};
+  return none;
+}
+
+const std::string& titleOf(const TransitIncident& incident) {
+  return firstText({&incident.title(), &incident.summary()});
 }
 
 }  // namespace
 
 std::string IncidentStringProvider::cellTitleForIncident(const TransitIncident* incident) {
-  return incident ? firstText({&incident->title(), &incident->summary()}) : std::string();
+  return incident ? titleOf(*incident) : std::string();
 }
 
 std::string IncidentStringProvider::cellSecondaryTextForIncident(const TransitIncident* incident) {
   if (!incident) return {};
-  std::string text = firstText({&incident->summary(), &incident->fullDescription()});
-  return text == cellTitleForIncident(incident) ? std::string() : text;
+  const std::string& text = firstText({&incident->summary(), &incident->fullDescription()});
+  return text == titleOf(*incident) ? std::string() : text;
 }
 
 }  // namespace nimbo
