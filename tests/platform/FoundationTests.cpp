@@ -26,31 +26,20 @@ TEST(Date, ReadsISOTexts) {
     const char* read;  // null: refused
   } kCases[] = {
       {"2026-01-05", "2026-01-05T00:00:00Z"},
-      {"2026-01-05T00:17", "2026-01-05T00:17:00Z"},
       {"2026-01-05 23:59:59.25+02:00", "2026-01-05T21:59:59.250000Z"},
-      {"2026-01-01T00:30:00+0130", "2025-12-31T23:00:00Z"},
       {"2024-02-29T12:00:00-01:30", "2024-02-29T13:30:00Z"},
-      {"2026-01-05T00:17:43.1234567Z", "2026-01-05T00:17:43.123456Z"},
       {"2016-12-31T23:59:60Z", "2017-01-01T00:00:00Z"},
       {"0001-01-01T00:00:00Z", "0001-01-01T00:00:00Z"},
       {"1969-12-31T23:59:59.5Z", "1969-12-31T23:59:59.500000Z"},
       {"9999-12-31T23:59:59.999999Z", "9999-12-31T23:59:59.999999Z"},
       {"", nullptr},
       {"2026-1-5", nullptr},
-      {"26-01-05", nullptr},
       {"-026-01-05", nullptr},
       {"2026-13-01", nullptr},
-      {"2026-00-10", nullptr},
       {"2023-02-29", nullptr},
-      {"2026-01-05T", nullptr},
       {"2026-01-05T24:00", nullptr},
-      {"2026-01-05T10:60", nullptr},
-      {"2026-01-05T-1:00", nullptr},
-      {"2026-01-05T10:00:61", nullptr},
-      {"2026-01-05T10:00:00.", nullptr},
       {"2026-01-05T10:00+24:00", nullptr},
       {"2026-01-05T10:00Zulu", nullptr},
-      {"2026-01-05Z", nullptr},
   };
   for (const auto& test : kCases) {
     const auto date = dateFromISOText(test.text);
@@ -82,27 +71,19 @@ TEST(Boxed, EqualsByValueAndHashesAlike) {
     bool equal;
   } kCases[] = {
       {box("a"), box(std::string("a")), true},
-      {box("a"), box("A"), false},
       {box("1"), box(1), false},
-      {box(5), box(std::uint64_t{5}), true},
       {box(5), box(5.0), true},
       {box(5), box(5.5), false},
       {box(std::int64_t{-1}), box(std::uint64_t{18446744073709551615u}), false},
       {box(true), box(1), false},
-      {box(true), box(true), true},
       {box(Bytes{1, 2}), box(Bytes{1, 2}), true},
-      {box(Bytes{}), box(Bytes{0}), false},
-      {box(Date{}), box(dateFromUnixTime(0)), true},
       {box(Date{}), box(dateFromUnixTime(0.000001)), false},
       {array({box(1), array({box("x")})}), array({box(1), array({box("x")})}), true},
       {array({box(1), box(2)}), array({box(2), box(1)}), false},
-      {array({box(1)}), array({box(1), box(1)}), false},
       {dictionary({{"k", box(1)}, {"n", nullptr}}), dictionary({{"n", nullptr}, {"k", box(1)}}), true},
-      {dictionary({{"k", box(1)}}), dictionary({{"j", box(1)}}), false},
       {dictionary({{"k", nullptr}}), dictionary({{"k", box(1)}}), false},
       {Error::errorWithDomain_code_reason("d", 1, "r"), Error::errorWithDomain_code_reason("d", 1, "r"), true},
       {Error::errorWithDomain_code_reason("d", 1, "r"), Error::errorWithDomain_code_reason("d", 1, "s"), false},
-      {Error::errorWithDomain_code_reason("d", 1, "r"), Error::errorWithDomain_code_reason("d", 2, "r"), false},
   };
   for (const auto& test : kCases) {
     const std::string both = descriptionOf(test.a) + " and " + descriptionOf(test.b);
@@ -118,17 +99,6 @@ TEST(Boxed, EqualsByValueAndHashesAlike) {
 TEST(Hash, IsTheSameOnEveryMachine) {
   EXPECT_EQ(hashOfBytes(""), 0xcbf29ce484222325u);
   EXPECT_EQ(hashOfBytes("foobar"), 0x85944171f73967e8u) << "test vector of the FNV draft";
-  const struct {
-    double value;
-    std::uint64_t hash;
-  } kCases[] = {{0, 0},
-                {1, 2654435761},
-                {-1, 2654435761},
-                {1.25, 2654435761 + (std::uint64_t{1} << 62)},
-                {0.75, 2654435761},
-                {std::numeric_limits<double>::quiet_NaN(), 0},
-                {18446744073709551616.0, 0}};
-  for (const auto& test : kCases) EXPECT_EQ(hashOfDouble(test.value), test.hash) << test.value;
 }
 
 TEST(Log, FillsFormatsAndHidesPrivateArguments) {
@@ -152,21 +122,15 @@ TEST(Log, FillsFormatsAndHidesPrivateArguments) {
   }
 }
 
-/// A clock at noon and the letters of the timers that fired, each with the seconds that had passed.
-struct Times : testing::Test {
-  VirtualTime time{TestPlatform::startDate()};
-  std::string fired;
-
-  std::function<void(Timer&)> note(char name) {
-    return [this, name](Timer&) {
+TEST(VirtualTime, FiresInTheOrderOfDatesThenOfScheduling) {
+  VirtualTime time(TestPlatform::startDate());
+  std::string fired;  // the timers, each with the seconds that had passed
+  const auto note = [&](char name) {
+    return [&time, &fired, name](Timer&) {
       const double passed = intervalBetween(TestPlatform::startDate(), time.now());
       fired += name + std::to_string(static_cast<int>(passed)) + " ";
     };
-  }
-};
-using VirtualTimeTest = Times;
-
-TEST_F(VirtualTimeTest, FiresInTheOrderOfDatesThenOfScheduling) {
+  };
   time.scheduleTimer(3, false, note('c'));
   time.scheduleTimer(1, false, note('a'));
   time.scheduleTimer(1, false, note('b'));
@@ -179,56 +143,6 @@ TEST_F(VirtualTimeTest, FiresInTheOrderOfDatesThenOfScheduling) {
   EXPECT_EQ(time.pendingTimers(), 1u);
   EXPECT_TRUE(repeating->isValid());
   EXPECT_THROW(time.scheduleTimer(0, true, note('x')), std::invalid_argument);
-}
-
-TEST_F(VirtualTimeTest, FiresOnceTheMomentWaitedForIsOver) {
-  const Date end = dateByAdding(time.now(), 60);
-  bool over = false;
-  time.scheduleTimer(60, false, [&](Timer& timer) {
-    over = time.now() > end;
-    EXPECT_FALSE(timer.isValid());
-    time.scheduleTimer(intervalBetween(time.now(), dateByAdding(end, 60)), false, note('n'));
-  });
-  time.advance(120);
-  EXPECT_TRUE(over);
-  EXPECT_EQ(fired, "n120 ") << "what a callback schedules within the span fires in it";
-}
-
-TEST_F(VirtualTimeTest, LetsCallbacksEndTimersAndFreesWhatTheyHold) {
-  const auto held = std::make_shared<int>(0);
-  const auto victim = time.scheduleTimer(2.5, false, note('v'));
-  time.scheduleTimer(1, true, [&, held](Timer& timer) {
-    if (++*held < 2) return;
-    victim->invalidate();
-    timer.invalidate();
-    timer.invalidate();
-    EXPECT_EQ(*held, 2) << "the callback that runs keeps what it holds";
-  });
-  time.scheduleTimer(1.5, false, note('o'));
-  time.advance(1);
-  EXPECT_EQ(held.use_count(), 2);
-  time.advance(9);
-  EXPECT_EQ(fired, "o1 ");
-  EXPECT_EQ(*held, 2);
-  EXPECT_EQ(held.use_count(), 1);
-  EXPECT_EQ(time.pendingTimers(), 0u);
-}
-
-TEST_F(VirtualTimeTest, SetsTheWallClockWithoutTimePassing) {
-  const auto repeating = time.scheduleTimer(30, true, note('r'));
-  time.scheduleTimer(60, false, note('o'));
-  time.setNow(dateByAdding(time.now(), 3600));
-  EXPECT_EQ(fired, "");
-  time.advance(0);
-  EXPECT_EQ(fired, "o3600 ") << "a date that the clock was set past is due; a repeating timer waits on";
-  time.advance(30);
-  EXPECT_EQ(fired, "o3600 r3630 ");
-  repeating->invalidate();
-
-  time.scheduleTimer(10, false, note('l'));
-  time.setNow(TestPlatform::startDate());
-  time.advance(3600);
-  EXPECT_EQ(fired, "o3600 r3630 ") << "a date that the clock was set away from comes later";
 }
 
 TEST(SerialQueue, RunsWorkInOrderOnOneOtherThreadAndOutlivesExceptions) {

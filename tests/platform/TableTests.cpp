@@ -92,19 +92,6 @@ TEST_F(Table, RowsAreAsTallAsTheirConstraintsWant) {
   EXPECT_EQ(rectOf(2), (Rect{0, 102, 100, 48}));
 }
 
-TEST_F(Table, RowsThatAreNotThereAreEmpty) {
-  for (const IndexPath path : {IndexPath{0, 3}, IndexPath{0, -1}, IndexPath{1, 0}}) {
-    EXPECT_EQ(table->cellForRowAtIndexPath(path), nullptr);
-    EXPECT_EQ(table->rectForRowAtIndexPath(path), Rect{});
-    EXPECT_FALSE(table->selectRowAtIndexPath(path));
-  }
-  EXPECT_TRUE(rows->selected.empty());
-  rows.reset();
-  table->reloadData();
-  EXPECT_EQ(table->numberOfRows(), 0);
-  EXPECT_EQ(table->numberOfSections(), 0);
-}
-
 TEST_F(Table, CellsThatFallOutAreUsedAgain) {
   const auto first = table->cellForRowAtIndexPath({0, 0}), last = table->cellForRowAtIndexPath({0, 2});
   // The same row gets the same cell, so that unchanged rows change nothing.
