@@ -100,6 +100,8 @@ void setOptions(CURL* handle, Transfer& transfer, const CurlHeaders& headers) {
   set(CURLOPT_CONNECTTIMEOUT, kConnectSeconds);
   set(CURLOPT_TIMEOUT, static_cast<long>(transfer.request.timeLimit.count()));
   set(CURLOPT_MAXFILESIZE_LARGE, static_cast<curl_off_t>(transfer.request.limit));
+  set(CURLOPT_LOW_SPEED_TIME, kStalledSeconds);
+  set(CURLOPT_LOW_SPEED_LIMIT, kStalledBytesASecond);
   set(CURLOPT_NOSIGNAL, 1L);
   set(CURLOPT_QUICK_EXIT, 1L);  // a name being looked up must not hold up the end
   set(CURLOPT_HTTPHEADER, headers.get());
