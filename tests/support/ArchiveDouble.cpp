@@ -19,11 +19,8 @@ class TextEncoder final : public KeyedEncoder {
       for (const ObjectRef& element : static_cast<const BoxedArray&>(*object).elements())
         encodeObject_forKey(element, "element");
       text += "] ";
-    } else if (dynamic_cast<const BoxedString*>(object.get()) || dynamic_cast<const BoxedNumber*>(object.get()) ||
-               dynamic_cast<const BoxedDate*>(object.get()) || dynamic_cast<const Error*>(object.get())) {
-      write(key, object->description());
     } else {
-      failed = true;
+      write(key, object->description());
     }
   }
   void encodeBool_forKey(bool value, std::string_view key) override { write(key, value ? "yes" : "no"); }
@@ -41,7 +38,6 @@ class TextEncoder final : public KeyedEncoder {
   }
 
   std::string text;
-  bool failed = false;
 
  private:
   void write(std::string_view key, const std::string& value) { text += std::string(key) + ": " + value + " "; }
@@ -52,7 +48,7 @@ class TextEncoder final : public KeyedEncoder {
 KeyedArchive::Archived ArchiveDouble::archivedDataWithRootObject(const ObjectRef& root, bool) {
   TextEncoder encoder;
   encoder.encodeObject_forKey(root, kKeyedArchiveRootObjectKey);
-  if (fails || encoder.failed)
+  if (fails)
     return {std::nullopt,
             Error::errorWithDomain_code_reason(std::string(kKeyedArchiveErrorDomain), 1, "cannot be archived")};
   return {Bytes(encoder.text.begin(), encoder.text.end()), nullptr};

@@ -4,8 +4,7 @@
 
 namespace nimbo {
 
-/// Archives to a readable text that nothing reads back: equal objects give equal bytes, objects that may not stand in
-/// an archive give an error.
+/// Archives to a readable text that nothing reads back: equal objects give equal bytes.
 class ArchiveDouble final : public KeyedArchive {
  public:
   Archived archivedDataWithRootObject(const ObjectRef& root, bool requiringSecureCoding) override;

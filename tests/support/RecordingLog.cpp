@@ -33,18 +33,4 @@ void RecordingLog::clear() {
   _lines.clear();
 }
 
-void RecordingSignposts::event(const LogFacility& facility, std::string_view name, std::string_view message) {
-  {
-    const std::lock_guard guard(_lock);
-    _events.push_back(
-        {std::string(facility.subsystem), std::string(facility.category), std::string(name), std::string(message)});
-  }
-  _onEvent();
-}
-
-std::vector<RecordingSignposts::Event> RecordingSignposts::events() const {
-  const std::lock_guard guard(_lock);
-  return _events;
-}
-
 }  // namespace nimbo

@@ -1,12 +1,10 @@
 #pragma once
 
-#include <functional>
 #include <mutex>
 #include <optional>
 #include <string>
 #include <vector>
 
-#include "platform/Signposts.h"
 #include "platform/foundation/Log.h"
 
 namespace nimbo {
@@ -36,26 +34,6 @@ class RecordingLog final : public Log {
  private:
   mutable std::mutex _lock;
   std::vector<Line> _lines;
-};
-
-/// Keeps every point event. Any thread.
-class RecordingSignposts final : public Signposts {
- public:
-  struct Event {
-    std::string subsystem;
-    std::string category;
-    std::string name;
-    std::string message;
-  };
-
-  explicit RecordingSignposts(std::function<void()> onEvent) : _onEvent(std::move(onEvent)) {}
-  void event(const LogFacility& facility, std::string_view name, std::string_view message) override;
-  std::vector<Event> events() const;
-
- private:
-  std::function<void()> _onEvent;
-  mutable std::mutex _lock;
-  std::vector<Event> _events;
 };
 
 }  // namespace nimbo

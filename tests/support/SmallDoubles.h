@@ -6,8 +6,10 @@
 #include "platform/AnalyticsPipeline.h"
 #include "platform/Bzip2Compress.h"
 #include "platform/DeviceLockState.h"
+#include "platform/MemoryPressure.h"
 #include "platform/NetworkFailureDiagnosis.h"
 #include "platform/RandomSource.h"
+#include "platform/Signposts.h"
 
 namespace nimbo {
 
@@ -21,6 +23,26 @@ class ScriptedRandomSource final : public RandomSource {
     return number;
   }
   std::deque<std::uint32_t> numbers;
+};
+
+class SilentSignposts final : public Signposts {
+ public:
+  void event(const LogFacility&, std::string_view, std::string_view) override {}
+};
+
+/// Memory is never short.
+class CalmMemoryPressure final : public MemoryPressure {
+ public:
+  std::unique_ptr<MemoryPressureSource> makeSource(MemoryPressureKind, std::shared_ptr<SerialQueue>,
+                                                   std::function<void()>) override {
+    return std::make_unique<Source>();
+  }
+
+ private:
+  class Source final : public MemoryPressureSource {
+    void activate() override {}
+    void cancel() override {}
+  };
 };
 
 class NetworkFailureDiagnosisDouble final : public NetworkFailureDiagnosis {

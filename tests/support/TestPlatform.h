@@ -6,7 +6,6 @@
 #include "support/ArchiveDouble.h"
 #include "support/DrawingDoubles.h"
 #include "support/FavoritesDouble.h"
-#include "support/MemoryPressureDouble.h"
 #include "support/MemorySettings.h"
 #include "support/RecordingLog.h"
 #include "support/SmallDoubles.h"
@@ -30,14 +29,14 @@ class TestPlatform final {
   VirtualTime time{startDate()};
   TestRunLoop loop{time};
   RecordingLog log;
-  RecordingSignposts signposts{[this] { loop.wake(); }};
+  SilentSignposts signposts;
   ScriptedRandomSource random;
   StringTablesDouble strings;
   MemorySettings settings;
   FavoritesDouble favorites;
   TransitLineServiceDouble transitLines{loop};
   NetworkFailureDiagnosisDouble network;
-  MemoryPressureDouble memoryPressure;
+  CalmMemoryPressure memoryPressure;
   ActivityLauncherDouble activityLauncher{loop};
   RecordingAnalyticsPipeline analytics;
   DeviceLockStateDouble deviceLockState;

@@ -121,13 +121,5 @@ TEST_F(Analytics, EndsWithTheRowThatWasOpened) {
   EXPECT_EQ(platform.analytics.actions.size(), 2u);
 }
 
-TEST_F(Analytics, CountsAsCompactWithoutItsController) {
-  host.activeMode = WidgetDisplayMode::Expanded;
-  controller.reset();
-  session->startSessionIfNeeded();
-  session->recordCloseSessionSwiping();
-  EXPECT_FALSE(closed().record.initiallyExpanded);
-}
-
 }  // namespace
 }  // namespace nimbo

@@ -9,8 +9,6 @@
 namespace nimbo {
 namespace {
 
-using testing::IsEmpty;
-
 /// Shields whose text says how wide they are at size 7; each step smaller takes 20 points away.
 class Column : public testing::Test {
  protected:
@@ -51,20 +49,6 @@ class Column : public testing::Test {
   bool keepsRows = false;
 };
 
-TEST_F(Column, PutsABudgetThatMakesNoSenseRight) {
-  struct Case {
-    double givenDefault, givenMax, usedDefault, usedMax;
-  };
-  for (const Case& c :
-       {Case{-1, 30, 50, 50}, {-1, 80, 50, 80}, {0, -5, 0, 0}, {0, 9, 0, 9}, {73, 60, 73, 73}, {73, 186, 73, 186}}) {
-    const auto parameter = TransitDirectionsListArtworkWidthCalculator::initWithSizedArtworks_sizeParameter(
-                               {}, {c.givenDefault, c.givenMax, {}})
-                               ->sizeParameter();
-    EXPECT_EQ(parameter.defaultArtworkViewWidth, c.usedDefault) << c.givenDefault;
-    EXPECT_EQ(parameter.maxArtworkViewWidth, c.usedMax) << c.givenDefault;
-  }
-}
-
 TEST_F(Column, ShrinksTheWidestUntilItFits) {
   struct Case {
     std::vector<std::string> shields;
@@ -79,7 +63,6 @@ TEST_F(Column, ShrinksTheWidestUntilItFits) {
                         {{"200"}, {}, 180, {{"200", 6}}},
                         {{"200", "210", "90"}, {}, 180, {{"200", 6}, {"210", 5}}},
                         {{"400", "90"}, {}, 90, {{"400", 0}}},
-                        {{"400"}, {}, 73, {{"400", 0}}},
                         {{"200", "200"}, {}, 180, {{"200", 6}}}}) {
     double columnWidth = 0;
     const auto replacements = TransitDirectionsListArtworkWidthCalculator::initWithSizedArtworks_sizeParameter(
@@ -108,9 +91,6 @@ TEST_F(Column, ReplacesTheRowOfAShrunkShieldAndNoOther) {
   EXPECT_EQ(fitted[4]->primaryText(), "second");
   keepsRows = true;
   EXPECT_EQ(fit(rows, {73, 185, {}}), rows);
-  EXPECT_EQ(calculator.itemsFromItems_sizeParameter_outArtworkColumnWidth_downSizingBlock(rows, {73, 184, {}}, nullptr,
-                                                                                          nullptr),
-            rows);
 }
 
 TEST_F(Column, AnswersTheSameQuestionFromMemory) {
@@ -131,18 +111,7 @@ TEST_F(Column, AnswersTheSameQuestionFromMemory) {
     EXPECT_EQ(downSized, before + 1);
   }
   fit(question("201"), changed);
-  EXPECT_EQ(calculator.cachedOriginalItems()->size(), 1u);
   EXPECT_EQ(downSized, 8);
-  fit({}, {});
-  EXPECT_THAT(*calculator.cachedItemsForPreviousWidth(), IsEmpty());
-}
-
-TEST(ArtworkCacheForSmallMemory, SwitchesAtlasesOffWhereThereIsARenderer) {
-  TestPlatform platform;
-  const auto cache = memoryConstrainedImageViewCache();
-  EXPECT_FALSE(platform.shieldRenderer->cachesIconAtlases);
-  EXPECT_NE(cache, memoryConstrainedImageViewCache());
-  EXPECT_NE(cache->imageForArtwork(shieldArtwork("M4"), 7, 1, false), nullptr);
 }
 
 }  // namespace

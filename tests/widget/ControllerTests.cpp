@@ -5,6 +5,7 @@
 #include "platform/ui/Environment.h"
 #include "support/TestPlatform.h"
 #include "support/TransitFixtures.h"
+#include "support/WidgetHostDouble.h"
 #include "widget/NBTransitIncidentsViewController.h"
 
 namespace nimbo {
@@ -12,29 +13,6 @@ namespace {
 
 using testing::ElementsAre;
 using testing::IsEmpty;
-
-/// A host with sizes, which records what it is told.
-class HostDouble final : public WidgetHost {
- public:
-  WidgetDisplayMode activeDisplayMode() const override { return mode; }
-  Size maximumSizeForDisplayMode(WidgetDisplayMode which) const override {
-    return which == WidgetDisplayMode::Expanded ? expanded : compact;
-  }
-  void setLargestAvailableDisplayMode(WidgetDisplayMode which) override { largest = which; }
-  WidgetDisplayMode largestAvailableDisplayMode() const override { return largest; }
-  void openURL(const URL& url, std::function<void(bool)> completion) override {
-    opened.push_back(url.absoluteString());
-    completion(opens);
-  }
-  void preferredContentSizeDidChange(Size size) override { preferred.push_back(size); }
-
-  WidgetDisplayMode mode = WidgetDisplayMode::Compact;
-  WidgetDisplayMode largest = WidgetDisplayMode::Expanded;
-  Size compact{359, 110}, expanded{359, 350};
-  bool opens = true;
-  std::vector<std::string> opened;
-  std::vector<Size> preferred;
-};
 
 class Controller : public testing::Test {
  protected:
@@ -71,7 +49,7 @@ class Controller : public testing::Test {
   }
 
   TestPlatform platform;
-  HostDouble host;
+  WidgetHostDouble host;
   std::shared_ptr<NBTransitIncidentsViewController> controller;
   std::vector<std::string> answers;
 };
@@ -151,8 +129,8 @@ TEST_F(Controller, TurnsTheHostsSizesIntoRowsAndWidth) {
   } cases[] = {{110, 350, 3},      {110, 110, 1},       {110, 329.9, 2},       {110, 50, kNoLimit},
                {0, 350, kNoLimit}, {-5, 350, kNoLimit}, {110, -350, kNoLimit}, {1e-9, 1e300, kNoLimit}};
   for (const auto& c : cases) {
-    host.compact.height = c.compact;
-    host.expanded.height = c.expanded;
+    host.compactMaximum.height = c.compact;
+    host.expandedMaximum.height = c.expanded;
     load(&host);
     EXPECT_EQ(controller->dataSource()->maxNumberOfRows(), c.rows) << c.compact << " " << c.expanded;
     EXPECT_EQ(controller->dataSource()->availableWidth(), 359);
@@ -165,22 +143,22 @@ TEST_F(Controller, TurnsTheHostsSizesIntoRowsAndWidth) {
 
 TEST_F(Controller, FollowsModesAndTellsTheHostWhatItNeeds) {
   appear();
-  EXPECT_EQ(host.largest, WidgetDisplayMode::Compact) << "no rows to expand yet";
+  EXPECT_EQ(host.largestMode, WidgetDisplayMode::Compact) << "no rows to expand yet";
   answer({lineItem(1, "1", {incident(1), incident(2)})});
-  EXPECT_EQ(host.largest, WidgetDisplayMode::Expanded);
-  EXPECT_EQ(host.preferred.back(), (Size{359, 110}));
+  EXPECT_EQ(host.largestMode, WidgetDisplayMode::Expanded);
+  EXPECT_EQ(host.preferredSizes.back(), (Size{359, 110}));
 
-  host.mode = WidgetDisplayMode::Expanded;
+  host.activeMode = WidgetDisplayMode::Expanded;
   // The host's own mode counts, not the one that comes with the call.
   controller->widgetActiveDisplayModeDidChange_withMaximumSize(WidgetDisplayMode::Compact, {1, 1});
   EXPECT_TRUE(controller->dataSource()->isExpanded());
-  EXPECT_EQ(host.preferred.back(), (Size{359, 220}));
+  EXPECT_EQ(host.preferredSizes.back(), (Size{359, 220}));
 
-  host.compact.height = 80;
+  host.compactMaximum.height = 80;
   Environment::current().setContentSizeCategory(ContentSizeCategory::extraLarge);
   EXPECT_EQ(controller->dataSource()->rowHeight(), 80);
   disappear();
-  host.compact.height = 90;
+  host.compactMaximum.height = 90;
   Environment::current().setContentSizeCategory(ContentSizeCategory::large);
   EXPECT_EQ(controller->dataSource()->rowHeight(), 80) << "hidden: does not listen";
 }
@@ -207,14 +185,6 @@ TEST_F(Controller, AnswersTheHostAlsoWhenItIsGone) {
   EXPECT_TRUE(weak.expired()) << "a running fetch does not keep the controller alive";
   answer({lineItem(1, "1")});
   EXPECT_THAT(answers, ElementsAre("late:new"));
-}
-
-TEST_F(Controller, SignpostsMemoryPressure) {
-  load(&host);
-  platform.memoryPressure.fire(MemoryPressureKind::processCritical);
-  platform.loop.waitAndDrain([&] { return !platform.signposts.events().empty(); });
-  EXPECT_EQ(platform.signposts.events().at(0).name, "ProcessMemoryPressureCritical");
-  EXPECT_EQ(platform.signposts.events().at(0).message, " enableTelemetry=YES ");
 }
 
 }  // namespace

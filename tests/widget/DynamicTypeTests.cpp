@@ -29,16 +29,6 @@ class Listener final : public Object {
   StackView& _stack;
 };
 
-/// A view on a screen of its own.
-class ViewOnScreen final : public View {
- public:
-  explicit ViewOnScreen(double scale) : _scale(scale) {}
-  double screenScale() const override { return _scale; }
-
- private:
-  double _scale;
-};
-
 class DynamicType : public testing::Test {
  protected:
   static FontRef headline() { return Font::preferredFont(TextStyle::headline); }
@@ -55,13 +45,6 @@ class DynamicType : public testing::Test {
   std::shared_ptr<StackView> stack = std::make_shared<StackView>();
   std::shared_ptr<StyledLabel> label = std::make_shared<StyledLabel>();
 };
-
-TEST_F(DynamicType, ValueWithoutAFontIsUnscaled) {
-  EXPECT_EQ(DynamicTypeValue(21, nullptr).scaledValue(), 21);
-  EXPECT_EQ(DynamicTypeValue(21, [] { return FontRef(); }).scaledValue(), 21);
-  setTextSize(ContentSizeCategory::accessibilityExtraExtraExtraLarge);
-  EXPECT_DOUBLE_EQ(DynamicTypeValue(17, &headline).scaledValue(), 53);
-}
 
 TEST_F(DynamicType, FontsAndLengthsFollowAtOnceAndAfterEachChange) {
   const auto view = std::make_shared<View>();
@@ -90,19 +73,6 @@ TEST_F(DynamicType, FontsAndLengthsFollowAtOnceAndAfterEachChange) {
   EXPECT_EQ(label->font()->descriptor().pointSize, 15);
 }
 
-TEST_F(DynamicType, RegistersNothingWithoutAProvider) {
-  const auto view = std::make_shared<View>();
-  const auto width = view->widthAnchor().constraintEqualToConstant(7);
-  DynamicTypeWizard::autorefreshLabel_withFontProvider(label, nullptr);
-  DynamicTypeWizard::autoscaleStackView_spacing_withFontProvider(stack, 21, nullptr);
-  DynamicTypeWizard::autoscaledConstraint_constant_withFontProvider(width, 21, nullptr);
-  DynamicTypeWizard::updateUnscaledConstantValue_fontProvider_forConstraint(9, &headline, width);
-  setTextSize(ContentSizeCategory::extraLarge);
-  EXPECT_EQ(label->font()->descriptor().pointSize, 17);
-  EXPECT_EQ(stack->spacing(), 0);
-  EXPECT_EQ(width->constant(), 7);
-}
-
 TEST_F(DynamicType, OperationsRunInTheirGroups) {
   DynamicTypeWizard::autoscaleStackView_spacing_withFontProvider(stack, 17, &headline);
   const auto first = listener("first"), second = listener("second"), third = listener("third");
@@ -120,13 +90,6 @@ TEST_F(DynamicType, OperationsRunInTheirGroups) {
   EXPECT_THAT(heard, ElementsAre("first refresh at 19", "third refresh at 17"));
 }
 
-TEST_F(DynamicType, UnregisteringKeepsTheFont) {
-  DynamicTypeWizard::autorefreshLabel_withFontProvider(label, &headline);
-  DynamicTypeWizard::unregisterObject(*label);
-  setTextSize(ContentSizeCategory::extraLarge);
-  EXPECT_EQ(label->font()->descriptor().pointSize, 19);
-}
-
 TEST_F(DynamicType, RegistrationsEndWithTheirObjects) {
   int asked = 0;
   std::weak_ptr<StyledLabel> weakLabel = label;
@@ -142,22 +105,6 @@ TEST_F(DynamicType, RegistrationsEndWithTheirObjects) {
   setTextSize(ContentSizeCategory::extraLarge);
   EXPECT_EQ(asked, 1);
   EXPECT_THAT(heard, IsEmpty());
-}
-
-TEST_F(DynamicType, LengthsAreRoundedForTheScreenOfTheFirstItem) {
-  Environment::current().setScreenScale(3);
-  const auto view = std::make_shared<ViewOnScreen>(1.0), other = std::make_shared<ViewOnScreen>(2.0);
-  const auto guide = std::make_shared<LayoutGuide>(), loose = std::make_shared<LayoutGuide>();
-  other->addLayoutGuide(guide);
-  const DynamicTypeValue value(10.3, nullptr);
-  const auto rounded = [&](LayoutItem& item) {
-    const auto constraint = item.heightAnchor().constraintEqualToConstant(0);
-    ScaleConstraintToDynamicValue(*constraint, value);
-    return constraint->constant();
-  };
-  EXPECT_DOUBLE_EQ(rounded(*view), 10);
-  EXPECT_DOUBLE_EQ(rounded(*guide), 10.5);
-  EXPECT_DOUBLE_EQ(rounded(*loose), 31 / 3.0);
 }
 
 }  // namespace

@@ -3,7 +3,6 @@
 #include <atomic>
 #include <thread>
 
-#include "incidents/FavoritesStore+Nimbo.h"
 #include "incidents/NBTransitIncidentFetcher.h"
 #include "incidents/_NBTransitIncidentFetcherRequest.h"
 #include "support/TestPlatform.h"
@@ -89,8 +88,6 @@ TEST_F(Fetcher, DeliversTheErrorOfTheServiceAsItCame) {
     EXPECT_EQ(line.redacted.find("123456"), std::string::npos) << "not private: " << line.redacted;
   EXPECT_TRUE(platform.log.contains("123456"));
 }
-
-TEST_F(Fetcher, ReadsOneStoreOfFavorites) { EXPECT_EQ(defaultContainer(), defaultContainer()); }
 
 TEST(FetcherRequest, LosesNoHandlerThatComesWhileItDelivers) {
   constexpr int kHandlers = 2000;

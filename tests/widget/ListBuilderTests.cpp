@@ -279,15 +279,5 @@ TEST_F(ListBuilder, AnswersOneListItemAndEqualOnesForEqualLines) {
   EXPECT_FALSE(list->isEqual(build(Network("A/rail:1,2 B/bus:2 C:")).get()));
 }
 
-TEST_F(ListBuilder, AsksTheFilterThatWasSet) {
-  class NothingShown final : public NBTransitIncidentFilter {
-    bool shouldDisplayIncident(const TransitIncident&) const override { return false; }
-  };
-  const auto builder = NBTransitIncidentsDataSourceBuilder::initWithLineItems_maxNumberOfItems_artworkCache_analytics(
-      Network("A:1,2").lines, 0, cache, nullptr);
-  builder->setIncidentFilter(std::make_shared<const NothingShown>());
-  EXPECT_FALSE(builder->listItem()->hasExpandedItems());
-}
-
 }  // namespace
 }  // namespace nimbo

@@ -107,14 +107,5 @@ TEST_F(Updater, LivesAndFiresUntilInvalidated) {
   EXPECT_TRUE(updater.expired());
 }
 
-TEST_F(Updater, GoesOnWithoutItsObserver) {
-  const auto updater = start({lineWith({{10, 20}})});
-  observer.reset();
-  platform.time.advance(1800);
-  EXPECT_TRUE(updater->updateDates().empty());
-  EXPECT_EQ(updater->observer(), nullptr);
-  updater->invalidate();
-}
-
 }  // namespace
 }  // namespace nimbo
