@@ -118,15 +118,14 @@ std::string NBTransitIncidentsDataSourceBuilder::_advisoriesOverflowSecondaryTex
 NBTransitSummaryItemRef NBTransitIncidentsDataSourceBuilder::_summaryItemForIncidents_items_itemToLinesMap(
     const TransitIncidents& incidents, const NBTransitItems& items, const ItemToLinesMap& itemToLines) const {
   TransitArtworks shields;
-  const TransitLineItem* previousLine = nullptr;  // many rows in a row are often of one line
   const auto addShield = [&](const TransitLineItemRef& line) {
-    if (std::exchange(previousLine, line.get()) == line.get()) return;
     TransitArtworkRef shield = shieldOfLine(*line);
     if (!shield) return;
     const auto isSame = [&](const TransitArtworkRef& other) {
       return artworksAreEquivalent(other.get(), shield.get());
     };
-    if (std::find(shields.begin(), shields.end(), shield) == shields.end() &&
+    // From the back: many rows in a row are often of the same lines.
+    if (std::find(shields.rbegin(), shields.rend(), shield) == shields.rend() &&
         std::none_of(shields.begin(), shields.end(), isSame))
       shields.push_back(std::move(shield));
   };
