@@ -139,8 +139,6 @@ TEST_F(Shields, DrawAModeAsItsOwnSymbol) {
   std::sort(counts.begin(), counts.end());
   EXPECT_EQ(std::adjacent_find(counts.begin(), counts.end()), counts.end());
   EXPECT_TRUE(platform.log.lines().empty());
-  renderer.setCachesIconAtlases(false);
-  EXPECT_TRUE(render(fieldsOf(1, 3)));
 }
 
 TEST_F(Shields, FallBackWhereAnIconIsUnknown) {

@@ -11,31 +11,9 @@
 #include "desktop/gtfs/IncidentReader.h"
 #include "desktop/gtfs/StaticFeedReader.h"
 #include "gtfs-realtime.pb.h"
+#include "support/TemporaryFolder.h"
 
 namespace nimbo {
-
-/// A folder of the test's own, gone with it.
-class TemporaryFolder {
- public:
-  TemporaryFolder() {
-    std::string name = (std::filesystem::temp_directory_path() / "nimbo-gtfs-XXXXXX").native();
-    if (::mkdtemp(name.data())) _path = name;
-  }
-  ~TemporaryFolder() {
-    std::error_code ignored;
-    std::filesystem::remove_all(_path, ignored);
-  }
-  const std::filesystem::path& path() const { return _path; }
-
-  std::filesystem::path write(const std::string& name, std::string_view bytes) const {
-    std::filesystem::create_directories((_path / name).parent_path());
-    std::ofstream(_path / name, std::ios::binary) << bytes;
-    return _path / name;
-  }
-
- private:
-  std::filesystem::path _path;
-};
 
 /// A static feed's files in memory.
 class MemoryFeedFiles final : public StaticFeedFiles {

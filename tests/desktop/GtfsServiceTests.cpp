@@ -157,39 +157,6 @@ TEST_F(LineServiceTest, ServesTheSampleCityUntilAFeedIsSetUp) {
   EXPECT_EQ(lookup(favorites), error(Code::unknownFeed));
 }
 
-TEST_F(LineServiceTest, SampleCityShowsEveryKindOfRow) {
-  bool isDone = false;
-  std::vector<MapItemIdentifierRef> favorites;
-  for (const auto& favorite : SampleCity::favorites()) favorites.push_back(favorite->identifier());
-  service->lookup(favorites, [&](const TransitLineItems& items, const ErrorRef&) {
-    std::map<std::uint64_t, std::vector<TransitSystemRef>> systemsOfIncident;
-    int clearLines = 0, other = 0;
-    for (const auto& item : items) {
-      bool isClear = true;
-      for (const auto& incident : item->incidents()) {
-        const bool isNow = intervalFromNow(incident->startDate().value_or(Date::min())) <= 0 &&
-                           intervalFromNow(incident->endDate().value_or(Date::max())) >= 0;
-        if (isNow)
-          systemsOfIncident[incident->muid()].push_back(item->system());
-        else
-          ++other;
-        isClear = isClear && !isNow;
-      }
-      clearLines += isClear;
-    }
-    int sharedByOneAgency = 0, sharedByTwo = 0;
-    for (const auto& [muid, systems] : systemsOfIncident)
-      if (systems.size() > 1) ++(systems[0] == systems[1] ? sharedByOneAgency : sharedByTwo);
-    EXPECT_GT(systemsOfIncident.size(), 3u);  // more rows than three hold
-    EXPECT_GT(clearLines, 0);
-    EXPECT_GT(other, 0);
-    EXPECT_EQ(sharedByOneAgency, 1);
-    EXPECT_EQ(sharedByTwo, 1);
-    isDone = true;
-  });
-  platform.loop.waitAndDrain([&] { return isDone; });
-}
-
 TEST_F(LineServiceTest, CatalogFindsLines) {
   const FeedLibrary library(paths);
   const FeedCatalog catalog(library);

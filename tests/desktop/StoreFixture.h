@@ -2,11 +2,11 @@
 
 #include <gmock/gmock.h>
 
-#include <cstdlib>
 #include <fstream>
 #include <iterator>
 
 #include "desktop/store/StateDatabase.h"
+#include "support/TemporaryFolder.h"
 #include "support/TestPlatform.h"
 
 namespace nimbo {
@@ -14,12 +14,6 @@ namespace nimbo {
 /// A state folder of the test's own, which does not exist yet, and databases over it.
 class StoreTest : public testing::Test {
  protected:
-  StoreTest() {
-    std::string name = testing::TempDir() + "nimbo-store-XXXXXX";
-    _parent = ::mkdtemp(name.data());
-  }
-  ~StoreTest() override { std::filesystem::remove_all(_parent); }
-
   /// Another process's view, as far as the database can tell.
   std::shared_ptr<StateDatabase> makeDatabase() {
     return std::make_shared<StateDatabase>(folder(), platform.time,
@@ -28,7 +22,7 @@ class StoreTest : public testing::Test {
   /// A connection that knows no rules.
   SQLiteConnection connect() { return {file(), SQLiteConnection::Access::readWrite, 2 * kMaximumStateValueBytes}; }
 
-  std::filesystem::path folder() const { return _parent / "state"; }
+  std::filesystem::path folder() const { return _parent.path() / "state"; }
   std::filesystem::path file() const { return folder() / "state.sqlite"; }
 
   static std::string contentOf(const std::filesystem::path& path) {
@@ -45,7 +39,7 @@ class StoreTest : public testing::Test {
   std::vector<std::string> notices;
 
  private:
-  std::filesystem::path _parent;
+  TemporaryFolder _parent;
 };
 
 }  // namespace nimbo

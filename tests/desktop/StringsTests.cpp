@@ -110,12 +110,4 @@ TEST(StringTables, FallBackToTheLanguageAndThenToEnglish) {
   EXPECT_EQ(hebrew.stringForKey("no such key"), std::nullopt);
 }
 
-TEST(StringTables, AnswerABrokenPatternAsItStands) {
-  const TestPlatform platform;
-  for (const std::string pattern : {"{0, plural, one {x}", "{0, plural, one {x}}", "}{", "{"}) {
-    EXPECT_EQ(ICUStringTables("en").format(pattern, std::vector<FormatArgument>{std::uint64_t{1}}), pattern);
-    EXPECT_TRUE(platform.log.contains(pattern));
-  }
-}
-
 }  // namespace nimbo

@@ -1,4 +1,3 @@
-#include <dlfcn.h>
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 #include <stdlib.h>
@@ -34,7 +33,6 @@ TEST(SoftLinkedDeviceLockState, OpensTheFirstLibraryThatThereIs) {
   for (const auto& test : kCases) {
     SoftLinkedDeviceLockState state({test.system, test.internal});
     EXPECT_EQ(state.getDeviceLockState(), test.answer) << test.system << test.internal;
-    EXPECT_EQ(state.getDeviceLockState(), test.answer) << "later calls";
   }
   EXPECT_TRUE(platform.log.lines().empty());
 }
@@ -50,15 +48,6 @@ TEST(SoftLinkedDeviceLockState, CountsAsUnlockedWithoutALibraryAndLooksOnce) {
   EXPECT_EQ(state.getDeviceLockState(), 0);
   EXPECT_THAT(platform.log.texts("TransitWidget", LogLevel::error),
               ElementsAre("### Failed to Soft Linked: " + library.native()));
-
-  platform.log.clear();
-  Dl_info foreignLibrary{};
-  ASSERT_NE(::dladdr(::dlsym(RTLD_DEFAULT, "getenv"), &foreignLibrary), 0);
-  std::filesystem::remove(library);
-  SoftLinkedDeviceLockState foreign({library, foreignLibrary.dli_fname});
-  EXPECT_EQ(foreign.getDeviceLockState(), 0);
-  EXPECT_TRUE(platform.log.contains("No lock state: "));
-  EXPECT_TRUE(platform.log.contains("nimbo_getDeviceLockState"));
 }
 
 TEST(LockStateLibrary, CountsAsUnlockedWithoutABus) {

@@ -3,7 +3,6 @@
 #include <sys/stat.h>
 #include <unistd.h>
 
-#include <future>
 #include <memory>
 #include <string>
 
@@ -52,21 +51,6 @@ TEST_F(LinuxMemoryPressureTest, FollowsTheCountersOfTheCgroup) {
   warning->cancel();
   warning->activate();
   EXPECT_EQ(heardAfter("low 5\nhigh 9\nmax 9\noom 1\noom_kill 1\n"), "wcc") << "cancelled for good";
-}
-
-TEST_F(LinuxMemoryPressureTest, StartsNoHandlerAfterCancelling) {
-  root.write("events", "high 0\n");
-  LinuxMemoryPressure pressure(loop, {{}, root.path() / "events"});
-  const auto source = listen(pressure, MemoryPressureKind::processWarning, 'w');
-  std::promise<void> proceed;
-  queue->dispatchAsync([&] { proceed.get_future().wait(); });
-  root.write("events", "high 1\n");
-  loop.scheduleTimer(0, false, [&](Timer&) { loop.quit(); });
-  loop.run();
-  source->cancel();  // while its handler waits in the queue
-  proceed.set_value();
-  settle();
-  EXPECT_EQ(heard, "");
 }
 
 TEST_F(LinuxMemoryPressureTest, AsksTheKernelForStallTriggers) {

@@ -29,10 +29,11 @@ class TemporaryFolder final {
 
   const std::filesystem::path& path() const { return _path; }
 
-  /// Writes a file below the folder, making the folders on the way.
-  void write(const std::filesystem::path& name, std::string_view text) const {
+  /// Writes a file below the folder, making the folders on the way; its whole path.
+  std::filesystem::path write(const std::filesystem::path& name, std::string_view text) const {
     std::filesystem::create_directories((_path / name).parent_path());
     std::ofstream(_path / name, std::ios::binary) << text;
+    return _path / name;
   }
 
   /// What a file below the folder holds; empty when it is missing.
