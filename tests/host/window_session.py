@@ -89,9 +89,12 @@ class Window:
     def see_page(self, title):
         wait(f"the page {title}", lambda: re.fullmatch(title, self.frame().get_name()))
 
+    def box(self, name, role):
+        return self.see(name, role).get_extents(Atspi.CoordType.WINDOW)
+
     def click(self, name, role="push button"):
         def place():
-            box = self.see(name, role).get_extents(Atspi.CoordType.WINDOW)
+            box = self.box(name, role)
             return box.width > 0 and box.height > 1 and (box.x + box.width // 2, box.y + box.height // 2)
 
         places = [None, wait(f"a place of {name}", place)]

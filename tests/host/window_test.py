@@ -202,14 +202,17 @@ def faults(session, folder):
         window.see_page("Feeds")
         window.quit()
 
-    told = os.path.join(folder, "told")
+    told, gate = os.path.join(folder, "told"), os.path.join(folder, "gate")
+    os.mkfifo(gate)
     path = os.path.join(folder, "listening")
     with open(path, "w") as file:
-        file.write(f"#!/bin/sh\ntee '{told}' | '{widget}' \"$@\"\n")
+        file.write(f"#!/bin/sh\nread -r go <'{gate}'\ntee '{told}' | '{widget}' \"$@\"\n")
     os.chmod(path, stat.S_IRWXU)
     window = Window(session, desktop, "--state", path + ".state", NIMBO_TRANSIT_WIDGET=path)
-    window.see("4 Advisories", "push button")
     identifier = window.comes_to_front()
+    with open(gate, "w") as file:
+        file.write("The window has its size before the widget says anything.\n")
+    wait("a row of full height", lambda: window.box("4 Advisories", "push button").height == 110)
     for events, method in ((("key", "ctrl+plus"), "setTextSize"), (("key", "F5"), "performUpdate"),
                            (("windowunmap", identifier), "viewDidDisappear"), (("windowmap", identifier), "viewWillAppear"),
                            (("windowsize", identifier, "500", "700"), "transitionToSize")):

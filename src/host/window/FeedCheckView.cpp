@@ -59,6 +59,7 @@ void FeedCheckView::check(const Feed& feed, Done done) {
   line->append(*stop);
   append(*line);
   set_visible();
+  stop->grab_focus();
   _job = _context.workers.start([this, feed, done, &library = _context.library](const std::stop_token& token) {
     const FeedCheckReport report = checkFeed(feed, library.cache(), token);
     return [this, report, done] {

@@ -120,10 +120,10 @@ void FeedForm::setBusy(bool busy) {
 void FeedForm::check() {
   const auto entered = feed();
   if (!entered) return;
-  setBusy(true);
   _addAnyway.hide();
   _check.check(*entered, [this, entered = *entered](const FeedCheckReport* report) {
     setBusy(false);
+    _add.grab_focus();
     if (!report) return;
     const bool isStale = report->alerts && report->alerts->staleness;
     if (!report->staticError && !report->alertsError && !isStale)
@@ -131,6 +131,8 @@ void FeedForm::check() {
     else
       _addAnyway.show();
   });
+  // The keyboard is with the check by now.
+  setBusy(true);
 }
 
 void FeedForm::keep(const Feed& feed, const FeedCheckReport* report) {

@@ -37,8 +37,11 @@ FeedRow::FeedRow(const PageContext& context, const Feed& feed, std::function<voi
 }
 
 void FeedRow::check() {
+  _check.check(_feed, [this](const FeedCheckReport*) {
+    _checkButton.set_sensitive(true);
+    _checkButton.grab_focus();
+  });
   _checkButton.set_sensitive(false);
-  _check.check(_feed, [this](const FeedCheckReport*) { _checkButton.set_sensitive(true); });
 }
 
 }  // namespace nimbo

@@ -51,20 +51,31 @@ void WidgetHostProcess::setVisible(bool visible) {
 }
 
 void WidgetHostProcess::setPresentation(const WidgetPresentation& presentation) {
-  const WidgetPresentation old = std::exchange(_presentation, presentation);
-  if (!_client || old == presentation) return;
-  if (old.locale != presentation.locale) {
+  _presentation = presentation;
+  tellPresentation();
+}
+
+void WidgetHostProcess::tellPresentation() {
+  if (!_client || _told == _presentation) return;
+  if (_told.locale != _presentation.locale) {
     stop();
     setUpdating(false);
     if (_visible) start();
     return;
   }
-  if (displayModesOf(old) != displayModesOf(presentation))
-    ask("transitionToSize",
-        {{"size", {presentation.width, _contentHeight}}, {"displayModes", displayModesOf(presentation)}});
-  if (old.scale != presentation.scale) ask("setScale", {{"scale", presentation.scale}});
-  if (old.appearance != presentation.appearance) ask("setAppearance", {{"appearance", presentation.appearance}});
-  if (old.textSize != presentation.textSize) ask("setTextSize", {{"category", presentation.textSize}});
+  WidgetPresentation next = _presentation;
+  if (_contentHeight == 0) {
+    // The height that the widget has is not known yet, and a size that is told replaces it.
+    next.width = _told.width;
+    next.compactHeight = _told.compactHeight;
+    next.expandedHeight = _told.expandedHeight;
+  }
+  const WidgetPresentation old = std::exchange(_told, next);
+  if (displayModesOf(old) != displayModesOf(next))
+    ask("transitionToSize", {{"size", {next.width, _contentHeight}}, {"displayModes", displayModesOf(next)}});
+  if (old.scale != next.scale) ask("setScale", {{"scale", next.scale}});
+  if (old.appearance != next.appearance) ask("setAppearance", {{"appearance", next.appearance}});
+  if (old.textSize != next.textSize) ask("setTextSize", {{"category", next.textSize}});
 }
 
 void WidgetHostProcess::setExpanded(bool expanded) {
@@ -86,12 +97,14 @@ void WidgetHostProcess::start() {
     return giveUp(failure.what());
   }
   ++_generation;
+  _told = _presentation;
+  _contentHeight = 0;
   _isExpanded = _wantsExpanded;
   _awaitsContent = _contentIsStale = false;
   _heardSince = _clock.now();
   _heardLines = 0;
   setUpConnection();
-  json initialization = initializationOf(_presentation);
+  json initialization = initializationOf(_told);
   if (_isExpanded) initialization["activeDisplayMode"] = "expanded";
   ask("initialize", initialization);
   ask("loadView");
@@ -242,6 +255,7 @@ void WidgetHostProcess::show(const std::shared_ptr<SharedPicture>& picture, cons
   auto content = std::make_shared<WidgetContent>(WidgetContent::ofSnapshot(snapshot));
   content->picture = picture;
   _contentHeight = picture->layout().height / picture->layout().scale;
+  tellPresentation();
   // The expanded mode ends with the rows that need it, and comes back with them.
   setExpandedMode(_wantsExpanded && content->canExpand);
   _delegate.widgetDidChange(content);

@@ -82,6 +82,8 @@ class WidgetHostProcess {
   /// A request about a row, which may be gone by now.
   void askOfRow(std::string_view method, std::size_t row, nlohmann::json params = nlohmann::json::object());
   void call(std::string_view method, const nlohmann::json& params, JSONRPCConnection::Completion completion);
+  /// Tells the process what it does not know of the presentation.
+  void tellPresentation();
   void askForContent();
   void show(const std::shared_ptr<SharedPicture>& picture, const nlohmann::json& snapshot);
   void setExpandedMode(bool expanded);
@@ -107,7 +109,8 @@ class WidgetHostProcess {
   bool _awaitsContent = false;
   bool _contentIsStale = false;
   bool _isUpdating = false;
-  double _contentHeight = 0;  // points
+  WidgetPresentation _told;   // what the process knows of _presentation
+  double _contentHeight = 0;  // points; 0 until it has drawn
   std::vector<std::shared_ptr<Timer>> _patience;
   Date _heardSince;
   std::size_t _heardLines = 0;

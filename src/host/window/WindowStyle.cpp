@@ -78,10 +78,14 @@ std::string cssColor(const Color& color) {
 std::string windowStyle(Appearance appearance, double textScale) {
   // A title that is much larger leaves no room for the buttons beside it.
   constexpr double kLargestHeaderScale = 1.4;
+  const double headerScale = std::min(textScale, kLargestHeaderScale);
+  constexpr double kIconSize = 16;  // pixels, beside texts of the usual size
   return (appearance == Appearance::dark ? kDarkColors : kLightColors) +
          ("@define-color card_color " + cssColor(colorOf(SystemColor::background, appearance)) + ";") + kStyle +
          "window, tooltip { font-size: " + percent(textScale) + "; }" +
-         "headerbar { font-size: " + percent(std::min(textScale, kLargestHeaderScale) / textScale) + "; }";
+         "headerbar { font-size: " + percent(headerScale / textScale) + "; }" +
+         "popover { font-size: 100%; } headerbar popover { font-size: " + percent(textScale / headerScale) + "; }" +
+         ".page { -gtk-icon-size: " + std::to_string(std::lround(kIconSize * textScale)) + "px; }";
 }
 
 }  // namespace nimbo
