@@ -7,7 +7,6 @@
 #include "DrawingInk.h"
 #include "desktop/drawing/CairoImageResources.h"
 #include "desktop/drawing/Rendering.h"
-#include "desktop/drawing/VectorImage.h"
 #include "support/TemporaryFolder.h"
 #include "support/TestPlatform.h"
 
@@ -124,22 +123,6 @@ TEST(NamedImages, AreSharpAtAnyScaleAndReadableInBothAppearances) {
   EXPECT_GT(Ink(images.image("advisories-v2", 2, true)).ofColor(0xffffff).count, 300u);
   EXPECT_EQ(images.image("good-v2", 2, true), images.image("good-v2", 2, true));
   EXPECT_TRUE(platform.log.lines().empty());
-}
-
-TEST(VectorImage, ReadsItsPartOfSVG) {
-  const auto parsed = VectorImage::parse(R"(<?xml version="1.0"?><!-- a > b --><svg viewBox="0 0 8 4">
-    <path d="M0 0 H2 V2 L0,2Z M5 0 6 0 6 1 C6 1.5 5 1.5 5 1 Z" fill="#ff0000"/>
-    <rect x="0" y="3" width="8" height="1" fill="currentColor"></rect>
-    <circle cx="7" cy="1" r=".5" fill="none" stroke="#0000ff" stroke-width="0.2" stroke-linecap="round"/></svg>)");
-  ASSERT_TRUE(parsed.image) << parsed.problem;
-  EXPECT_EQ(parsed.image->size(), (Size{8, 4}));
-  for (const char* svg :
-       {"", "<svg>", "<svg viewBox=\"0 0 0 4\"></svg>", "<svg viewBox=\"0 0 8 4\">", "<g/>",
-        "<svg viewBox=\"0 0 8 4\"><g/></svg>", "<svg viewBox=\"0 0 8 4\"><path d=\"M0 0 A1 1\"/></svg>"}) {
-    const auto bad = VectorImage::parse(svg);
-    EXPECT_FALSE(bad.image) << svg;
-    EXPECT_FALSE(bad.problem.empty()) << svg;
-  }
 }
 
 }  // namespace

@@ -6,8 +6,6 @@
 
 #include <algorithm>
 #include <array>
-#include <chrono>
-#include <cmath>
 #include <functional>
 #include <memory>
 #include <stdexcept>
@@ -143,18 +141,6 @@ TEST_F(GLibRunLoopTest, LogsWhatCallbacksThrowAndGoesOn) {
       testing::ElementsAre("A descriptor callback threw: watch", "A piece of work on the main queue threw: work",
                            "A piece of work on the main queue threw: something that is no std::exception",
                            "A timer callback threw: timer", "A timer callback threw: timer"));
-}
-
-TEST(KernelTimer, SharesWakeUpsWithinItsTolerance) {
-  const struct {
-    double due, tolerance, fires;  // seconds
-  } kCases[] = {{1861.3, 180, 1920}, {1861.3, 2, 1862}, {1861.3, 0.1, 1861.3}, {1861.3, 0, 1861.3}};
-  using std::chrono::microseconds;
-  const auto micros = [](double seconds) { return microseconds(std::llround(seconds * 1e6)); };
-  for (const auto& test : kCases)
-    EXPECT_EQ(coalescedTime(micros(test.due), micros(test.tolerance)), micros(test.fires))
-        << test.due << " +" << test.tolerance;
-  EXPECT_EQ(coalescedTime(microseconds::max(), microseconds::max()), microseconds::max());
 }
 
 }  // namespace

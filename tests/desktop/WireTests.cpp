@@ -136,6 +136,19 @@ TEST(Wire, PresentZerosAndEmptyTextsKeepTheirPresence) {
   EXPECT_TRUE(ours.directionsPlan()->hasIsPlayingTrace());
 }
 
+TEST(Wire, ASecondMessageReplacesTheFirstAndPlacesAreAppended) {
+  proto::NimboActivity first, second;
+  first.mutable_directionsplan()->set_originstring("from");
+  first.add_searchplaces()->set_name("1");
+  second.mutable_directionsplan()->set_destinationstring("to");
+  second.add_searchplaces()->set_name("2");
+  NimboActivity read;
+  ASSERT_TRUE(readInto(read, first.SerializeAsString() + second.SerializeAsString()));
+  EXPECT_EQ(asText(read.directionsPlan()->data()), second.directionsplan().SerializeAsString());
+  ASSERT_EQ(read.searchPlacesCount(), 2u);
+  EXPECT_EQ(read.searchPlacesAtIndex(1)->name(), "2");
+}
+
 TEST(Wire, UnknownFieldsOfEveryKindAreSkippedAndDropped) {
   proto::NimboActivity theirs = filled(Fill::largest);
   const std::string known = theirs.SerializeAsString();

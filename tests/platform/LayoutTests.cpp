@@ -166,22 +166,6 @@ TEST_F(Layout, PutsEdgesOnDevicePixelsOfTheScreen) {
   EXPECT_EQ(box->frame(), (Rect{3, 46, 11, 8}));
 }
 
-TEST_F(Layout, DropsConstraintsToAViewThatLeaves) {
-  const auto left = constrainedView(*root, "left"), right = constrainedView(*root, "right");
-  pinToCorner(*left);
-  const auto inside = left->widthAnchor().constraintEqualToConstant(30);
-  const auto between = right->leadingAnchor().constraintEqualToAnchor(left->trailingAnchor(), 5);
-  LayoutConstraint::activateConstraints({inside, between, right->widthAnchor().constraintEqualToConstant(20)});
-  root->layoutIfNeeded();
-  EXPECT_EQ(right->frame().x, 35);
-  left->removeFromSuperview();
-  EXPECT_FALSE(between->isActive());
-  EXPECT_TRUE(inside->isActive());
-  right->leadingAnchor().constraintEqualToAnchor(root->leadingAnchor(), 12)->setActive(true);
-  root->layoutIfNeeded();
-  EXPECT_EQ(right->frame(), (Rect{12, 0, 20, 0}));
-}
-
 TEST_F(Layout, StackArrangesOnBaselinesAndClosesGaps) {
   const auto stack = std::make_shared<StackView>();
   stack->setUsesAutomaticConstraints(false);

@@ -146,18 +146,6 @@ TEST_F(Cells, FadedShieldsAreVibrantAndFullOnesAreNot) {
   }
 }
 
-TEST_F(Cells, EqualItemsChangeNothingAndNoneEmptiesTheRow) {
-  cell->setTransitItem(item("Title", "Text"));
-  const auto held = cell->transitItem();
-  cell->setTransitItem(item("Title", "Text"));
-  EXPECT_EQ(cell->transitItem(), held);
-  cell->setTransitItem(nullptr);
-  EXPECT_EQ(cell->primaryLabel()->text(), std::nullopt);
-  EXPECT_EQ(vibrantShield.imageSource(), nullptr);
-  layOut();
-  EXPECT_EQ(cell->frame().height, 110);
-}
-
 TEST_F(Cells, StayInOrderWhateverTheyAreGiven) {
   std::string words;
   for (int i = 0; i < 2000; ++i) words += "word ";

@@ -95,15 +95,6 @@ TEST_F(Controller, KeepsAnUpdaterOnlyWhileVisibleWithLineItems) {
   EXPECT_NE(controller->updater(), nullptr) << "made again from the last result";
 }
 
-TEST_F(Controller, ChangesRowsByTheClockWithoutFetching) {
-  appear();
-  answer({lineItem(1, "1", {incident(9, dateByAdding(platform.time.now(), 600))})});
-  EXPECT_EQ(title(), "TransitWidget_GoodService_Title");
-  platform.time.advance(600);
-  EXPECT_EQ(title(), "Incident 9");
-  EXPECT_EQ(platform.transitLines.lookups().size(), 1u);
-}
-
 TEST_F(Controller, JudgesItsRowsAnewWhereverTheClockJumps) {
   const auto at = [](double hours) { return dateByAdding(TestPlatform::startDate(), 3600 * hours); };
   const TransitLineItems items{lineItem(1, "1",

@@ -61,31 +61,6 @@ TEST_F(Updater, WaitsForTheDatesThatChangeTheRows) {
   }
 }
 
-TEST_F(Updater, TellsEachDateWhenItIsReached) {
-  const auto updater = start({lineWith({{10, 20}}), lineWith({{-5, 20}})});
-  platform.time.advance(599);
-  EXPECT_TRUE(observer->expired.empty());
-  platform.time.advance(1);
-  EXPECT_THAT(observer->expired, ElementsAre(at(10)));
-  EXPECT_THAT(updater->updateDates(), ElementsAre(at(20)));
-  platform.time.advance(600);
-  EXPECT_THAT(observer->expired, ElementsAre(at(10), at(20)));
-  EXPECT_TRUE(updater->updateDates().empty());
-  EXPECT_EQ(observer->refreshes, 0);
-  updater->invalidate();
-}
-
-TEST_F(Updater, AsksForARefreshEveryInterval) {
-  const auto updater = start({});
-  platform.time.advance(1799);
-  EXPECT_EQ(observer->refreshes, 0);
-  platform.time.advance(2 * 1800);
-  EXPECT_EQ(observer->refreshes, 2);
-  updater->invalidate();
-  platform.time.advance(10 * 1800);
-  EXPECT_EQ(observer->refreshes, 2);
-}
-
 TEST_F(Updater, StopsAtADateThatPassedUnseen) {
   const auto updater = start({lineWith({{10, 20}, {30, std::nullopt}})});
   platform.time.setNow(at(25));  // asleep meanwhile
