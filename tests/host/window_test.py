@@ -206,13 +206,19 @@ def faults(session, folder):
     os.mkfifo(gate)
     path = os.path.join(folder, "listening")
     with open(path, "w") as file:
-        file.write(f"#!/bin/sh\nread -r go <'{gate}'\ntee '{told}' | '{widget}' \"$@\"\n")
+        file.write(f"#!/bin/sh\ntee '{told}' | '{widget}' \"$@\" | {{ read -r go <'{gate}'; cat; }}\n")
     os.chmod(path, stat.S_IRWXU)
     window = Window(session, desktop, "--state", path + ".state", NIMBO_TRANSIT_WIDGET=path)
     identifier = window.comes_to_front()
+    window.click("Menu")
+    press("key", "Escape")
     with open(gate, "w") as file:
-        file.write("The window has its size before the widget says anything.\n")
-    wait("a row of full height", lambda: window.box("4 Advisories", "push button").height == 110)
+        file.write("The window has its size before it hears of the widget's.\n")
+    window.see("4 Advisories", "push button")
+    with open(told) as file:
+        sizes = wait("the window's width", lambda: [json.loads(line)["params"]["size"] for line in file
+                                                   if "transitionToSize" in line])
+    assert all(height == 110 for _, height in sizes), sizes
     for events, method in ((("key", "ctrl+plus"), "setTextSize"), (("key", "F5"), "performUpdate"),
                            (("windowunmap", identifier), "viewDidDisappear"), (("windowmap", identifier), "viewWillAppear"),
                            (("windowsize", identifier, "500", "700"), "transitionToSize")):
