@@ -2,9 +2,9 @@
 add_library(nimbo_warnings INTERFACE)
 target_compile_options(nimbo_warnings INTERFACE
   -Wall -Wextra -Wpedantic -Wshadow -Wnon-virtual-dtor -Wold-style-cast -Woverloaded-virtual -Wcast-align
-  -Wduplicated-cond -Wlogical-op -Wnull-dereference
+  "$<$<CXX_COMPILER_ID:GNU>:-Wduplicated-cond;-Wlogical-op>" -Wnull-dereference
   # g++ 12 reports members of moved-from optionals and variants as maybe uninitialized under the sanitizers.
-  -Wno-maybe-uninitialized
+  $<$<CXX_COMPILER_ID:GNU>:-Wno-maybe-uninitialized>
   # Designated initializers leave the fields they do not name at their defaults, on purpose.
   -Wno-missing-field-initializers
   $<$<BOOL:${NIMBO_WARNINGS_AS_ERRORS}>:-Werror>)

@@ -1,0 +1,66 @@
+// A publisher's alerts feed, up to the incidents of lines.
+
+#include "Fuzz.h"
+#include "desktop/gtfs/IncidentReader.h"
+#include "desktop/gtfs/StaticFeedBuilder.h"
+
+namespace nimbo {
+
+namespace {
+
+const StaticFeed& city() {
+  static const StaticFeed feed = [] {
+    StaticFeedBuilder builder("city");
+    builder.setLanguage("en");
+    for (const char* agency : {"M", "B"}) builder.addAgency(agency, agency);
+    for (const auto& [agency, route, type] : {std::tuple{"M", "m1", 1}, {"M", "m2", 1}, {"B", "b1", 3}}) {
+      StaticLine line;
+      line.routeID = line.shortName = route;
+      line.type = type;
+      builder.addLine(agency, line);
+    }
+    return builder.finish("", {});
+  }();
+  return feed;
+}
+
+std::vector<TransitIncidents> incidentsOf(const AlertsFeed& alerts, std::span<const std::uint32_t> lines) {
+  IncidentQuery query{"city", {}, {"de-AT", "en"}, true, Date(std::chrono::seconds(1'750'000'000)), {}, true};
+  for (const std::uint32_t line : lines) query.lines.push_back({line, city().line(line).muid});
+  query.trips = [](std::string_view trip) { return trip == "t" ? std::optional(1u) : std::nullopt; };
+  return readIncidents(alerts, city(), query).incidents;
+}
+
+void requireSound(const TransitIncident& incident) {
+  require(incident.title() && !incident.title()->empty() && incident.title()->find('\n') == std::string::npos,
+          "an incident has a title of one line");
+  for (const auto& text : {incident.title(), incident.summary(), incident.fullDescription()})
+    if (text) requirePlain(*text);
+  require(!incident.startDate() || !incident.endDate() || *incident.startDate() < *incident.endDate(),
+          "an incident starts before it ends");
+  const std::string link = incident.linkURL().value_or("http:");
+  require(link.starts_with("http:") || link.starts_with("https:"), "a link is a web address");
+}
+
+}  // namespace
+
+extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size) {
+  const auto alerts = AlertsFeed::read(std::string(textOf(data, size)), "fuzz");
+  if (!alerts) return 0;
+  const std::uint32_t all[] = {0, 1, 2};
+  const auto incidents = incidentsOf(*alerts, all);
+  for (const std::uint32_t line : all) {
+    const auto alone = incidentsOf(*alerts, std::array{line}).front();
+    require(alone.size() == incidents[line].size(), "a line has the same incidents whatever else is asked for");
+    for (std::size_t i = 0; i < alone.size(); ++i) {
+      requireSound(*incidents[line][i]);
+      require(alone[i]->title() == incidents[line][i]->title() &&
+                  alone[i]->startDate() == incidents[line][i]->startDate() &&
+                  alone[i]->endDate() == incidents[line][i]->endDate(),
+              "an incident is the same whatever else is asked for");
+    }
+  }
+  return 0;
+}
+
+}  // namespace nimbo

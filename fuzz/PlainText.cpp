@@ -1,0 +1,20 @@
+// What publishers write, as riders read it.
+
+#include "desktop/gtfs/PlainText.h"
+
+#include "Fuzz.h"
+#include "desktop/gtfs/AlertTexts.h"
+
+namespace nimbo {
+
+extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size) {
+  const std::string plain = plainText(textOf(data, size));
+  requirePlain(plain);
+  if (plain.find_first_of("<&") == std::string::npos) require(plainText(plain) == plain, "a plain text stays as it is");
+  const std::string summary = summaryOfText(plain);
+  requirePlain(summary);
+  require(summary.empty() == plain.empty() && summary.find('\n') == std::string::npos, "a summary is one line");
+  return 0;
+}
+
+}  // namespace nimbo
