@@ -42,7 +42,7 @@ void requireSound(const TransitIncident& incident) {
     if (text) requirePlain(*text);
   require(!incident.startDate() || !incident.endDate() || *incident.startDate() < *incident.endDate(),
           "an incident starts before it ends");
-  const std::string link = incident.linkURL().value_or("http:");
+  const std::string link = asciiLowerCase(incident.linkURL().value_or("http:"));
   require(link.starts_with("http:") || link.starts_with("https:"), "a link is a web address");
 }
 
