@@ -181,7 +181,7 @@ FAULTS = {  # what the widget program does, and what the window says
     "#!/bin/sh\ncat >/dev/null": 'it does not answer "initialize"',
     "#!/bin/sh\nexec yes '{\"jsonrpc\":\"2.0\",\"method\":\"log\",\"params\":{}}'": "it does not stop talking",
     "#!/bin/sh\nexec yes nonsense": "it speaks nonsense",
-    "#!/bin/sh\nexec tr -d '\\n' </dev/zero": "it speaks nonsense",
+    "#!/bin/sh\nexec tr -d '\\n' 3<&0 </dev/zero": "it speaks nonsense",
     '#!/bin/sh\nwhile read -r line; do echo "$line" | sed \'s/.*"id":\\([0-9]*\\).*/{"jsonrpc":"2.0","id":\\1,"result":[7]}/\';'
     " done": "nonsense",
 }
