@@ -20,6 +20,7 @@ void require(const ErrorRef& error) {
 /// Says which lines are gone, and which feeds cannot tell.
 void tellGoneLines(const CommandContext& context, const std::vector<TransitLineRef>& lines) {
   std::vector<MapItemIdentifierRef> identifiers;
+  identifiers.reserve(lines.size());
   for (const TransitLineRef& line : lines) identifiers.push_back(line->identifier());
   const FeedLibrary library(context.paths);
   const auto gone = FeedCatalog(library).goneLines(identifiers);
@@ -63,6 +64,7 @@ int runFavoriteAdd(const CommandContext& context, const std::vector<std::string>
 int runFavoriteRemove(const CommandContext& context, const std::vector<std::string>& names) {
   HostPlatform platform(context);
   std::vector<std::uint64_t> muids;
+  muids.reserve(names.size());
   for (const std::string& name : names) muids.push_back(muidOfFavorite(platform, name));
   require(platform->favoritesEditor().remove(muids));
   return kExitSuccess;

@@ -89,6 +89,7 @@ ObjectRef objectOfValue(const T& value) {
     return dictionaryOfFields(WireObjectOf<T>::fields(*value));
   } else if constexpr (VectorField<T>) {
     std::vector<ObjectRef> objects;
+    objects.reserve(value.size());
     for (const auto& element : value) objects.push_back(objectOfValue(element));
     return std::make_shared<const BoxedArray>(std::move(objects));
   } else if constexpr (OptionalField<T>) {
@@ -129,7 +130,7 @@ template <class T>
 void mergeMember(T& mine, const T& theirs) {
   if (!fieldIsPresent(theirs)) return;
   if constexpr (VectorField<T>) {
-    const T added = theirs;  // which may be `mine`
+    const T added = theirs;  // NOLINT(performance-unnecessary-copy-initialization): it may be `mine`
     mine.insert(mine.end(), added.begin(), added.end());
   } else if constexpr (SharedVectorField<T>) {
     if (!mine) mine = std::make_shared<typename T::element_type>();
