@@ -68,15 +68,22 @@ TEST(Trust, KeepsKeysAndFavoritesOutOfLogsAndFilesToTheUser) {
     EXPECT_THAT(log, Not(HasSubstr(secret)));
 }
 
+#if defined(__SANITIZE_ADDRESS__)
+constexpr bool kMayFork = true;  // the sanitizer looks for leaks from a process of its own
+#else
+constexpr bool kMayFork = false;
+#endif
+
 TEST(Trust, OfTheWidgetProcessIsGivenUp) {
   EXPECT_EXIT(
       {
         const auto isRefused = [](long result) { return result == -1 && errno == EPERM; };
-        bool holds = giveUpPrivileges() == nullptr;
+        const int inherited = ::dup(0);
+        bool holds = giveUpPrivileges() == nullptr && ::fcntl(inherited, F_GETFD) == -1;
         char* const none[] = {nullptr};
-        holds = holds && isRefused(::execv("/bin/true", none)) && isRefused(::fork()) && isRefused(::kill(1, 0)) &&
+        holds = holds && isRefused(::execv("/bin/true", none)) && isRefused(::kill(1, 0)) &&
                 isRefused(::socket(AF_PACKET, SOCK_RAW, 0)) && isRefused(::unshare(CLONE_NEWUSER)) &&
-                isRefused(::ioctl(0, TIOCSTI, "x"));
+                isRefused(::ioctl(0, TIOCSTI, "x")) && (kMayFork || isRefused(::fork()));
         std::thread([] {}).join();
         ::_exit(holds ? 0 : 1);
       },
