@@ -54,9 +54,8 @@ class Picture {
   /// Whether a line of pixels between the two has nothing on it.
   bool keepsApart(const PixelBox& above, const PixelBox& below) const {
     const Ink::Found first = drawnIn(above);
-    const PixelBox line{0, first.top, width(), 0};
     for (int y = first.top; y < drawnIn(below).bottom; ++y)
-      if (drawnIn({line.left, y, line.right, y + 1}).count == 0) return true;
+      if (drawnIn({0, y, width(), y + 1}).count == 0) return true;
     return false;
   }
 
