@@ -52,8 +52,7 @@ json artworkJSON(const NBConfiguredArtwork* artwork) {
 json openableJSON(const NBOpenable* openable) {
   if (const auto* url = dynamic_cast<const NBURLOpenable*>(openable)) return {{"url", url->url().absoluteString()}};
   if (const auto* activity = dynamic_cast<const NBUserActivityData*>(openable))
-    return {{"activityType", activity->activityType().value_or("")},
-            {"userInfo", userInfoJSON(activity->userInfo().get())}};
+    return {{"activityType", activity->activityType().value_or("")}};
   return nullptr;
 }
 

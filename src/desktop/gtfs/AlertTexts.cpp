@@ -9,13 +9,15 @@ namespace nimbo {
 
 namespace {
 
-constexpr std::size_t kLongestRawText = 64 * 1024;  // bytes; no row shows more, and hostile texts end somewhere
-constexpr std::size_t kLongestTitle = 500;          // characters
-constexpr std::size_t kLongestParagraph = 200;      // characters that a row's second text can sensibly show
+// In characters. Publishers have been seen to write titles of 255 and descriptions of 3591.
+constexpr std::size_t kLongestTitle = 500;
+constexpr std::size_t kLongestDescription = 10'000;
+constexpr std::size_t kLongestAddress = 2000;
+constexpr std::size_t kLongestParagraph = 200;  // that a row's second text can sensibly show
 
-std::string textIn(std::string_view alert, AlertField field, const LanguagePreference& preference) {
+std::string textIn(std::string_view alert, AlertField field, const LanguagePreference& preference, std::size_t limit) {
   const auto translations = translationsIn(alert, field);
-  return plainText(chooseTranslation(translations, preference).substr(0, kLongestRawText));
+  return plainText(chooseTranslation(translations, preference), limit);
 }
 
 /// The text on one line.
@@ -78,7 +80,7 @@ bool isHeading(std::string_view line) {
 bool isWebAddress(std::string_view text) {
   const std::string lower = asciiLowerCase(text.substr(0, 8));
   return (lower.starts_with("http://") || lower.starts_with("https://")) &&
-         text.find_first_of(" \n\"<>") == std::string_view::npos;
+         text.find_first_of(" \n\"<>") == std::string_view::npos && !text.ends_with("…");  // cut, it leads elsewhere
 }
 
 }  // namespace
@@ -97,18 +99,19 @@ std::string summaryOfText(std::string_view text) {
 std::optional<AlertTexts> alertTextsIn(std::string_view alert, AlertEffect effect,
                                        const LanguagePreference& preference) {
   AlertTexts texts;
-  const std::string description = textIn(alert, AlertField::descriptionText, preference);
-  texts.title = onOneLine(textIn(alert, AlertField::headerText, preference));
-  if (texts.title.empty()) texts.title = firstLine(description);
-  if (texts.title.empty()) texts.title = onOneLine(textIn(alert, AlertField::effectDetail, preference));
+  const auto titleIn = [&](AlertField field) { return textIn(alert, field, preference, kLongestTitle); };
+  const std::string description = textIn(alert, AlertField::descriptionText, preference, kLongestDescription);
+  texts.title = onOneLine(titleIn(AlertField::headerText));
+  if (texts.title.empty()) texts.title = firstLine(titleIn(AlertField::descriptionText));
+  if (texts.title.empty()) texts.title = onOneLine(titleIn(AlertField::effectDetail));
   if (texts.title.empty()) texts.title = effectWords(effect, preference.user);
   if (texts.title.empty()) return std::nullopt;
-  texts.title = std::string(firstCharacters(texts.title, kLongestTitle));
   if (const std::string_view rest = afterTitle(description, texts.title); !rest.empty()) {
     texts.summary = summaryOfText(rest);
     texts.description = description;
   }
-  if (std::string url = textIn(alert, AlertField::url, preference); isWebAddress(url)) texts.linkURL = std::move(url);
+  if (std::string url = textIn(alert, AlertField::url, preference, kLongestAddress); isWebAddress(url))
+    texts.linkURL = std::move(url);
   return texts;
 }
 

@@ -13,7 +13,7 @@ namespace nimbo {
 struct AlertTexts {
   std::string title;                       ///< one line, not empty, 500 characters at most
   std::optional<std::string> summary;      ///< what the description says first beyond the title
-  std::optional<std::string> description;  ///< whole; absent when it says no more than the title
+  std::optional<std::string> description;  ///< 10,000 characters at most; absent when it says no more than the title
   std::optional<std::string> linkURL;      ///< an http or https address
 
   bool operator==(const AlertTexts&) const = default;

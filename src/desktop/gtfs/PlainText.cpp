@@ -1,6 +1,7 @@
 #include "desktop/gtfs/PlainText.h"
 
 #include <algorithm>
+#include <optional>
 
 #include "desktop/gtfs/HtmlEntities.h"
 #include "desktop/gtfs/HtmlTag.h"
@@ -31,6 +32,8 @@ bool isUnwanted(char32_t c) {
 /// Takes characters and line ends; writes the folded text.
 class FoldingWriter {
  public:
+  explicit FoldingWriter(std::size_t limit) : _limit(limit) {}
+
   void write(char32_t c) {
     if (isLineEnd(c)) {
       lineEnd();
@@ -46,8 +49,14 @@ class FoldingWriter {
   void lineEnd() { ++_lineEndsPending, _joinerPending = 0; }
   void block() { _lineEndsPending = std::max(_lineEndsPending, 1), _joinerPending = 0; }
   void space() { _spacePending = true; }
+  /// Whether more was written than there is room for.
+  bool isFull() const { return _count > _limit; }
 
   std::string finish() {
+    if (isFull()) {
+      _text.resize(firstCharacters(_text, _limit - 1).size());
+      _text += "…";
+    }
     if (_hasRightToLeftLetter || !_hasDirectionMark) return std::move(_text);
     std::string result;
     for (std::size_t position = 0; position < _text.size();)
@@ -62,23 +71,30 @@ class FoldingWriter {
     _hasDirectionMark = _hasDirectionMark || isMark;
     _hasRightToLeftLetter = _hasRightToLeftLetter || isRightToLeftLetter(c);
     if (isMark) {
-      if (_lineEndsPending == 0 && !_spacePending) appendCharacter(_text, c);
+      if (_lineEndsPending == 0 && !_spacePending) put(c);
       return;
     }
     if (!_text.empty() && _lineEndsPending > 0)
-      _text.append(static_cast<std::size_t>(std::min(_lineEndsPending, 2)), '\n');
+      for (int i = 0; i < std::min(_lineEndsPending, 2); ++i) put('\n');
     else if (!_text.empty() && _spacePending)
-      _text += ' ';
+      put(' ');
     else if (_joinerPending && _previous >= 0x80 && c >= 0x80)
-      appendCharacter(_text, _joinerPending);
-    appendCharacter(_text, c);
+      put(_joinerPending);
+    put(c);
     _previous = c;
     _lineEndsPending = 0;
     _spacePending = false;
     _joinerPending = 0;
   }
 
+  void put(char32_t c) {
+    ++_count;
+    appendCharacter(_text, c);
+  }
+
+  std::size_t _limit;
   std::string _text;
+  std::size_t _count = 0;  // of the text's characters
   char32_t _previous = 0;
   char32_t _joinerPending = 0;
   int _lineEndsPending = 0;
@@ -99,11 +115,11 @@ bool hasLinesOfMarkup(std::string_view text, const HtmlTagFinder& tags) {
 
 }  // namespace
 
-std::string plainText(std::string_view text) {
+std::string plainText(std::string_view text, std::size_t limit) {
   const HtmlTagFinder tags(text);
-  const bool lineEndsAreSpaces = hasLinesOfMarkup(text, tags);
-  FoldingWriter writer;
-  for (std::size_t position = 0; position < text.size();) {
+  std::optional<bool> lineEndsAreSpaces;  // found out for texts that have any
+  FoldingWriter writer(limit);
+  for (std::size_t position = 0; position < text.size() && !writer.isFull();) {
     const std::string_view rest = text.substr(position);
     if (rest.front() == '<') {
       if (const auto tag = tags.tagAt(position)) {
@@ -132,8 +148,12 @@ std::string plainText(std::string_view text) {
     } else if (rest.starts_with("\r\n")) {
       ++position;
     }
-    const char32_t character = takeCharacter(text, position);
-    writer.write(lineEndsAreSpaces && isLineEnd(character) ? U' ' : character);
+    char32_t character = takeCharacter(text, position);
+    if (isLineEnd(character)) {
+      if (!lineEndsAreSpaces) lineEndsAreSpaces = hasLinesOfMarkup(text, tags);
+      if (*lineEndsAreSpaces) character = ' ';
+    }
+    writer.write(character);
   }
   return writer.finish();
 }

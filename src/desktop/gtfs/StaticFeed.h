@@ -40,9 +40,10 @@ class StaticFeed {
   std::string_view bytes() const { return *_bytes; }
 
   std::size_t agencyCount() const;
+  /// One without texts for an index that is not below the count.
   StaticAgency agency(std::size_t index) const;
   std::size_t lineCount() const;
-  /// In the order of routes.txt.
+  /// In the order of routes.txt; `index` is below the count.
   StaticLine line(std::size_t index) const;
 
   /// The language in which the feed is written, as a BCP 47 tag; empty where it does not say.

@@ -14,6 +14,11 @@ namespace {
 /// A text for the other end: bad UTF-8 inside a message is replaced rather than thrown on.
 std::string lineOf(const json& message) { return message.dump(-1, ' ', false, json::error_handler_t::replace) + "\n"; }
 
+JSONRPCError tooLong(const std::string& what) {
+  return {JSONRPCError::kInternalError,
+          "the " + what + " is longer than " + std::to_string(JSONRPCConnection::kMaximumLine) + " bytes"};
+}
+
 bool waitWritable(int fd, int milliseconds) {
   pollfd ready{fd, POLLOUT, 0};
   return ::poll(&ready, 1, milliseconds) != 0;
@@ -137,24 +142,22 @@ void JSONRPCConnection::notify(std::string_view method, const json& params) {
 }
 
 void JSONRPCConnection::call(std::string_view method, const json& params, Completion completion) {
+  if (!_open) return completion(nullptr, JSONRPCError{JSONRPCError::kConnectionClosed, "the connection is closed"});
   const std::int64_t id = _nextID++;
-  if (_open) {
-    _pending.emplace(id, std::move(completion));
-    send({{"jsonrpc", "2.0"}, {"id", id}, {"method", method}, {"params", params}});
-  } else {
-    completion(nullptr, JSONRPCError{JSONRPCError::kConnectionClosed, "the connection is closed"});
-  }
+  const std::string line = lineOf({{"jsonrpc", "2.0"}, {"id", id}, {"method", method}, {"params", params}});
+  if (line.size() > kMaximumLine) return completion(nullptr, tooLong("request"));
+  _pending.emplace(id, std::move(completion));
+  sendLine(line);
 }
 
 void JSONRPCConnection::send(const json& message) {
   std::string line = lineOf(message);
   // The other end would pass over the line, and wait for ever.
-  if (line.size() > kMaximumLine && message.contains("result"))
-    line = lineOf({{"jsonrpc", "2.0"},
-                   {"id", message["id"]},
-                   {"error",
-                    {{"code", JSONRPCError::kInternalError},
-                     {"message", "the answer is longer than " + std::to_string(kMaximumLine) + " bytes"}}}});
+  if (line.size() > kMaximumLine && message.contains("result")) {
+    const JSONRPCError error = tooLong("answer");
+    line = lineOf(
+        {{"jsonrpc", "2.0"}, {"id", message["id"]}, {"error", {{"code", error.code}, {"message", error.message}}}});
+  }
   sendLine(line);
 }
 

@@ -15,8 +15,8 @@
 namespace nimbo {
 
 /// JSON-RPC 2.0 over two descriptors, one message a line, both ends alike. A line that is no message gets its error
-/// answer and the connection goes on; a line longer than `kMaximumLine` bytes is skipped whole, and an answer
-/// that would be one becomes an error. A non-blocking output
+/// answer and the connection goes on; a line longer than `kMaximumLine` bytes is skipped whole: an answer that would be
+/// one becomes an error, and a request that would be one ends in an error without being sent. A non-blocking output
 /// that stays full for a second closes the connection. Main thread only.
 class JSONRPCConnection {
  public:
@@ -47,7 +47,8 @@ class JSONRPCConnection {
   void start();
 
   void notify(std::string_view method, const nlohmann::json& params);
-  /// Asks the other end; `completion` hears once, also (with an error) when the connection closes first.
+  /// Asks the other end; `completion` hears once, also (with an error) when the connection closes first; at once
+  /// when nothing can be sent.
   void call(std::string_view method, const nlohmann::json& params, Completion completion);
   /// Writes a line as it stands.
   void sendLine(std::string_view line);

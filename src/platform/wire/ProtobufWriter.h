@@ -63,12 +63,14 @@ class ProtobufWriter {
       grow(count);
   }
   void grow(std::size_t count);
-  void putTag(std::uint32_t field, std::uint32_t wireType) { putVarint(std::uint64_t{field} << 3 | wireType); }
-  void putVarint(std::uint64_t value) {
-    if (value < 0x80) {
+  [[gnu::always_inline]] void putTag(std::uint32_t field, std::uint32_t wireType) { putVarint(std::uint64_t{field} << 3 | wireType); }
+  [[gnu::always_inline]] void putVarint(std::uint64_t value) {
+    if (value < 0x80)
       *--_next = static_cast<std::uint8_t>(value);
-      return;
-    }
+    else
+      putLongVarint(value);
+  }
+  void putLongVarint(std::uint64_t value) {
     _next -= (static_cast<std::size_t>(std::bit_width(value)) + 6) / 7;
     std::uint8_t* to = _next;
     for (; value >= 0x80; value >>= 7) *to++ = static_cast<std::uint8_t>(value | 0x80);
