@@ -60,7 +60,10 @@ void RemoteHost::openUserActivity(const std::shared_ptr<const UserActivity>& act
                        {"application", application ? json(application->identifier()) : json()},
                        {"requireUnlockPrompt", requireUnlockPrompt}};
   _connection.call("openUserActivity", params,
-                   [completion = std::move(completion)](const json& result, const auto& failure) {
+                   [this, completion = std::move(completion)](const json& result, const auto& failure) {
+                     // Such as when there are too many incidents to hand over: the tap would seem to do nothing.
+                     if (failure)
+                       _connection.notify("notice", {{"message", "Cannot open it: " + failure->message + "."}});
                      if (completion) completion(!failure && isOpened(result), hostError(result, failure));
                    });
 }

@@ -39,6 +39,12 @@ TEST(PlainText, IsWhatARiderReads) {
   for (const auto& [what, raw, plain] : cases) EXPECT_EQ(plainText(raw), plain) << what;
 }
 
+TEST(PlainText, EndsInAnEllipsisWhereItIsTooLong) {
+  EXPECT_EQ(plainText("<b>Straße</b> ", 6), "Straße");
+  EXPECT_EQ(plainText("<b>Straßen</b>", 6), "Straß…");
+  EXPECT_EQ(plainText("<p>A<p>é", 2), "A…");
+}
+
 TEST(PlainText, TakesLinearTimeForHostileMarkup) {
   for (const char* unit : {"<a ", "<a =\"", "<!--", "&#", "<style>", "<p", "\u200D"}) {
     std::string text;

@@ -8,6 +8,7 @@ namespace nimbo {
 namespace {
 
 using nlohmann::json;
+using testing::Contains;
 using testing::ElementsAre;
 using testing::SizeIs;
 
@@ -166,6 +167,25 @@ TEST(WidgetProcess, AnswersTwoUpdatesWithOneLookupAndOpensWhatIsTapped) {
   EXPECT_EQ(opened["activityType"], "org.nimbo.Map.Transit.Incident");
   EXPECT_EQ(opened["application"], "org.example.Host");
   EXPECT_TRUE(opened["userInfo"].contains("bs"));
+}
+
+TEST(WidgetProcess, ShowsIncidentsThatAreTooManyToHandOver) {
+  std::vector<AlertsBuilder::Alert> alerts;
+  for (int i = 0; i < 600; ++i) {
+    const std::string id = std::to_string(i);
+    alerts.push_back({id, {"m1", "m2"}, "Title " + id, std::string(8000, 'x')});
+  }
+  Programs programs;
+  programs.setUpCity({"m1", "m2"}, alerts);
+  const auto lines =
+      programs.play(appearing() + kUpdateAndLook +
+                    std::vector<json>{request("selectRow", {{"section", 0}, {"row", 0}}), request("snapshot")});
+  EXPECT_THAT(lines,
+              Contains(json{{"jsonrpc", "2.0"},
+                            {"method", "notice"},
+                            {"params", {{"message", "Cannot open it: the request is longer than 4194304 bytes."}}}}));
+  EXPECT_THAT(snapshots(lines), SizeIs(2));
+  for (const json& seen : snapshots(lines)) EXPECT_THAT(titles(seen), ElementsAre("600 Advisories"));
 }
 
 TEST(WidgetProcess, OutlivesEveryMessage) {
