@@ -18,6 +18,9 @@ namespace {
 /// Setting: whether the user last had a row for each incident.
 constexpr std::string_view kExpandedKey = "Nimbo.Window.expanded";
 
+/// Pixels of the sign that the widget is waited for.
+constexpr int kWaitingSize = 32;
+
 Gtk::Widget* makePlace(const char* icon, const std::string& name) {
   auto* row = Gtk::make_managed<Gtk::ListBoxRow>();
   auto* box = Gtk::make_managed<Gtk::Box>(Gtk::Orientation::HORIZONTAL, 12);
@@ -81,7 +84,12 @@ void WidgetPage::buildCard() {
   });
   _view.signalPressed().connect([this](std::size_t row, bool pressed) { _process.highlightRow(row, pressed); });
 
-  _waiting.set_size_request(-1, static_cast<int>(WidgetPresentation::kDefaultRowHeight));
+  // As high as a row in all; itself of a size that icon themes have as pixels, since their SVG files bring a library.
+  _waiting.set_size_request(kWaitingSize, kWaitingSize);
+  _waiting.set_halign(Gtk::Align::CENTER);
+  const auto margin = (static_cast<int>(WidgetPresentation::kDefaultRowHeight) - kWaitingSize) / 2;
+  _waiting.set_margin_top(margin);
+  _waiting.set_margin_bottom(margin);
   _waiting.start();
 
   _failure.add_css_class("notice");

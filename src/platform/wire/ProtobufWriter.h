@@ -63,7 +63,9 @@ class ProtobufWriter {
       grow(count);
   }
   void grow(std::size_t count);
-  [[gnu::always_inline]] void putTag(std::uint32_t field, std::uint32_t wireType) { putVarint(std::uint64_t{field} << 3 | wireType); }
+  [[gnu::always_inline]] void putTag(std::uint32_t field, std::uint32_t wireType) {
+    putVarint(std::uint64_t{field} << 3 | wireType);
+  }
   [[gnu::always_inline]] void putVarint(std::uint64_t value) {
     if (value < 0x80)
       *--_next = static_cast<std::uint8_t>(value);
