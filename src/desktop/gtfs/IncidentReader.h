@@ -42,8 +42,9 @@ struct IncidentReading {
 /// Turns alerts into the incidents of the lines asked for; other alerts are only looked at. Alerts of one content
 /// (texts, address, cause, effect) are one incident, with one number, on the lines of all of them: each line has it in
 /// the periods of the alerts that name the line. The number is made from the least of their identifiers, those of
-/// other lines among them, so that it does not depend on what is asked for. Of alerts that say the same in the chosen
-/// language alone, those of other lines do not count: nobody has read their texts.
+/// other lines among them, so that it does not depend on what is asked for, and stays when a text changes. Of alerts
+/// that say the same in the chosen language alone, those of other lines do not count: reading the texts of them all
+/// would take twice the time.
 IncidentReading readIncidents(const AlertsFeed& alerts, const StaticFeed& feed, const IncidentQuery& query);
 
 }  // namespace nimbo
