@@ -149,6 +149,34 @@ TEST(Wire, ASecondMessageReplacesTheFirstAndPlacesAreAppended) {
   EXPECT_EQ(read.searchPlacesAtIndex(1)->name(), "2");
 }
 
+TEST(Wire, MergingAndCopyingFollowTheGeneratedCode) {
+  proto::NimboActivity plan, empty;
+  plan.mutable_directionsplan()->set_originstring("from");
+  plan.add_searchplaces()->set_name("1");
+  const proto::NimboActivity messages[] = {filled(Fill::smallest), filled(Fill::largest), plan, empty};
+  for (const proto::NimboActivity& first : messages)
+    for (const proto::NimboActivity& second : messages) {
+      proto::NimboActivity merged = first;
+      merged.MergeFrom(second);
+      NimboActivity mine, theirs;
+      ASSERT_TRUE(readInto(mine, first.SerializeAsString()) && readInto(theirs, second.SerializeAsString()));
+      // A copy over a record has what the other has, places in place of its own.
+      const auto copy = mine.copyWithZone();
+      theirs.copyTo(*copy);
+      EXPECT_EQ(copy->directionsPlan() == theirs.directionsPlan(),
+                second.has_directionsplan() || !first.has_directionsplan());
+      EXPECT_EQ(copy->searchPlacesCount(), (theirs.searchPlaces() ? theirs : mine).searchPlacesCount());
+
+      mine.mergeFrom(theirs);
+      EXPECT_EQ(asText(theirs.data()), second.SerializeAsString()) << "what is merged stays as it is";
+      EXPECT_EQ(mine.lineItem() == theirs.lineItem(), !first.has_lineitem()) << "shared where there was none";
+      // Inside a line item a list is a value of its own, which is replaced.
+      mine.setLineItem(nullptr);
+      merged.clear_lineitem();
+      EXPECT_EQ(asText(mine.data()), merged.SerializeAsString());
+    }
+}
+
 TEST(Wire, UnknownFieldsOfEveryKindAreSkippedAndDropped) {
   proto::NimboActivity theirs = filled(Fill::largest);
   const std::string known = theirs.SerializeAsString();
