@@ -148,6 +148,8 @@ Failure failureOf(CURLcode result, const Transfer& transfer) {
     case CURLE_SEND_ERROR:
     case CURLE_HTTP2_STREAM:
       return {Code::unreachable, "the connection broke before everything had come. Try again later."};
+    case CURLE_OUT_OF_MEMORY:  // which is also what libcurl calls a header of more than 100 KB
+      return {Code::serverFailure, "its server sends a header that is too long. Check the address."};
     case CURLE_FILESIZE_EXCEEDED:
       return {Code::tooLarge, "it is larger than " + limit + ". Check the address."};
     case CURLE_ABORTED_BY_CALLBACK:
