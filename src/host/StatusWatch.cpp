@@ -12,11 +12,10 @@ StatusWatch::StatusWatch(const CommandContext& context, WidgetPresentation prese
 }
 
 StatusWatch::~StatusWatch() {
-  for (auto* timer : {&_restart, &_update, &_patience}) cancel(*timer);
-  if (!_client) return;
+  for (auto* timer : {&_restart, &_update}) cancel(*timer);
+  if (!_widget) return;
   // The process does what it was asked before it finds its input closed.
-  for (const char* step : {"viewWillDisappear", "viewDidDisappear"})
-    _client->connection().call(step, json::object(), [](const json&, const auto&) {});
+  for (const char* step : {"viewWillDisappear", "viewDidDisappear"}) _widget->ask(step);
 }
 
 void StatusWatch::cancel(std::shared_ptr<Timer>& timer) {
@@ -24,31 +23,28 @@ void StatusWatch::cancel(std::shared_ptr<Timer>& timer) {
 }
 
 void StatusWatch::start() {
-  _client.reset();
-  _unanswered = 0;
   try {
-    _client = std::make_unique<WidgetClient>(_context.runLoop, _context.widgetArguments);
+    _widget = std::make_unique<WatchedWidget>(
+        _context.runLoop, _context.widgetArguments, WidgetClient::kPatience,
+        [this](const std::string& reason) { restartAfter("The widget process failed: " + reason + "."); });
   } catch (const WidgetClientFailure& failure) {
-    return fail(failure.what());
+    return restartAfter(failure.what());
   }
-  JSONRPCConnection& connection = _client->connection();
-  connection.setClosedHandler([this] { fail("The widget process ended."); });
-  connection.setMalformedHandler(
-      [this](const std::string& problem) { fail("The widget process speaks nonsense: " + problem + "."); });
-  connection.setHandler("frame", [this](const json&, const JSONRPCResponder&) { look(); });
-  _client->setNoticeHandler(_context.tell);
-  ask("initialize", initializationOf(_presentation));
-  for (const char* step : {"loadView", "viewWillAppear", "viewDidAppear"}) ask(step);
+  WidgetClient& client = _widget->client();
+  client.connection().setHandler("frame", [this](const json&, const JSONRPCResponder&) { look(); });
+  client.setNoticeHandler(_context.tell);
+  _widget->ask("initialize", initializationOf(_presentation));
+  for (const char* step : {"loadView", "viewWillAppear", "viewDidAppear"}) _widget->ask(step);
   update();
   look();
 }
 
 void StatusWatch::update() {
-  ask("performUpdate", json::object(), [this](const json&) { look(); });
+  _widget->ask("performUpdate", json::object(), [this](const json&) { look(); });
 }
 
 void StatusWatch::look() {
-  ask("snapshot", json::object(), [this](const json& snapshot) { showSnapshot(snapshot); });
+  _widget->ask("snapshot", json::object(), [this](const json& snapshot) { showSnapshot(snapshot); });
 }
 
 void StatusWatch::showSnapshot(const json& snapshot) {
@@ -74,42 +70,14 @@ void StatusWatch::showLine(const std::string& line) {
   _show(line);
 }
 
-void StatusWatch::ask(std::string_view method, const json& params, Completion completion) {
-  if (_restart) return;
-  if (++_unanswered == 1) waitForAnswer();
-  _client->connection().call(
-      method, params,
-      [this, name = std::string(method), completion = std::move(completion)](const json& result, const auto& error) {
-        if (_restart || (error && error->code == JSONRPCError::kConnectionClosed)) return;
-        cancel(_patience);
-        if (--_unanswered > 0) waitForAnswer();
-        if (error) return fail("The widget process refuses \"" + name + "\": " + error->message + ".");
-        if (!completion) return;
-        try {
-          completion(result);
-        } catch (const json::exception& malformed) {
-          fail("The widget process answers \"" + name + "\" with nonsense: " + malformed.what() + ".");
-        }
-      });
-}
-
-void StatusWatch::waitForAnswer() {
-  _patience = _context.runLoop.scheduleTimer(WidgetClient::kPatience, false, [this](Timer&) {
-    _patience = nullptr;
-    fail("The widget process does not answer.");
-  });
-}
-
-void StatusWatch::fail(const std::string& reason) {
-  if (_restart) return;
-  if (_client) _client->kill();
+void StatusWatch::restartAfter(const std::string& failure) {
+  _widget.reset();
   cancel(_update);
-  cancel(_patience);
   _restart = _context.runLoop.scheduleTimer(_restarts.next(), false, [this](Timer&) {
     _restart = nullptr;
     start();
   });
-  showLine(statusBarErrorLine(reason + " It is started again."));
+  showLine(statusBarErrorLine(failure + " It is started again."));
 }
 
 }  // namespace nimbo

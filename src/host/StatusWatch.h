@@ -2,20 +2,17 @@
 
 #include <functional>
 #include <memory>
-#include <nlohmann/json.hpp>
 #include <string>
-#include <string_view>
 
 #include "host/Backoff.h"
 #include "host/OnScreenWidget.h"
-#include "host/WidgetClient.h"
+#include "host/WatchedWidget.h"
 
 namespace nimbo {
 
 /// Follows a widget on screen for a status bar: tells a line of `statusBarLine` whenever it is another one than the
 /// line before. The widget keeps its own schedule; what it leaves to its host is done here: a failed update is tried
-/// again, and a process that ends, hangs or speaks nonsense is replaced, both after waiting times that grow. Main
-/// thread only.
+/// again, and a process that fails is replaced, both after waiting times that grow. Main thread only.
 class StatusWatch {
  public:
   using Show = std::function<void(const std::string& line)>;
@@ -32,18 +29,13 @@ class StatusWatch {
   static constexpr TimeInterval kFirstUpdate = 60, kLongestUpdate = 1800;
 
  private:
-  using Completion = std::function<void(const nlohmann::json& result)>;
-
   void start();
   void update();
   void look();
   void showSnapshot(const nlohmann::json& snapshot);
   void showLine(const std::string& line);
-  void ask(std::string_view method, const nlohmann::json& params = nlohmann::json::object(),
-           Completion completion = nullptr);
-  void waitForAnswer();
-  /// Gives this process up. Another one follows later.
-  void fail(const std::string& reason);
+  /// Another process follows later.
+  void restartAfter(const std::string& failure);
   void cancel(std::shared_ptr<Timer>& timer);
 
   const CommandContext& _context;
@@ -52,11 +44,9 @@ class StatusWatch {
   std::string _lastLine;
   Backoff _restarts{kFirstRestart, kLongestRestart};
   Backoff _updates{kFirstUpdate, kLongestUpdate};
-  std::shared_ptr<Timer> _restart;   // until then the process is not heard any more
-  std::shared_ptr<Timer> _update;    // the next attempt after a failed one
-  std::shared_ptr<Timer> _patience;  // with the answer that is waited for
-  std::unique_ptr<WidgetClient> _client;
-  std::size_t _unanswered = 0;
+  std::shared_ptr<Timer> _restart;
+  std::shared_ptr<Timer> _update;          // the next attempt after a failed one
+  std::unique_ptr<WatchedWidget> _widget;  // null until it is started again
 };
 
 }  // namespace nimbo

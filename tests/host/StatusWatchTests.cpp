@@ -4,6 +4,7 @@
 
 #include <csignal>
 #include <cstdlib>
+#include <filesystem>
 
 #include "host/Programs.h"
 #include "host/StatusWatch.h"
@@ -38,8 +39,11 @@ TEST(StatusWatch, TriesAgainWhatFails) {
     time.advance(StatusWatch::kFirstUpdate);
     waitFor("good");
   }
-  for (const char* program : {"/bin/false", "/nonexistent"}) {
-    setenv("NIMBO_TRANSIT_WIDGET", program, 1);
+  const std::string talker =
+      programs.folder.write("talker", "#!/bin/sh\nexec yes '{\"jsonrpc\":\"2.0\",\"method\":\"log\",\"params\":{}}'\n");
+  std::filesystem::permissions(talker, std::filesystem::perms::owner_all);
+  for (const std::string& program : {std::string("/bin/false"), std::string("/nonexistent"), talker}) {
+    setenv("NIMBO_TRANSIT_WIDGET", program.c_str(), 1);
     const StatusWatch watch(context, {}, show);
     waitFor("error");
     setenv("NIMBO_TRANSIT_WIDGET", NIMBO_TRANSIT_WIDGET, 1);

@@ -13,9 +13,6 @@ namespace {
 
 constexpr LogFacility kLog{kDefaultLogSubsystem, "WidgetHostProcess"};
 
-/// More than a widget has to say.
-constexpr std::size_t kLinesPerSecond = 1000;
-
 SharedPicture::Layout layoutOf(const json& answer) {
   return {answer.at("width"), answer.at("height"), answer.at("stride"), answer.at("scale")};
 }
@@ -36,11 +33,11 @@ void WidgetHostProcess::setVisible(bool visible) {
   _visible = visible;
   if (_hiddenTimer) std::exchange(_hiddenTimer, nullptr)->invalidate();
   if (visible) {
-    if (_client)
+    if (_widget)
       appear();
     else if (!_gaveUp)
       start();
-  } else if (_client) {
+  } else if (_widget) {
     disappear();
     _hiddenTimer = _runLoop.scheduleTimer(kHiddenPatience, false, [this](Timer&) {
       _hiddenTimer = nullptr;
@@ -56,7 +53,7 @@ void WidgetHostProcess::setPresentation(const WidgetPresentation& presentation) 
 }
 
 void WidgetHostProcess::tellPresentation() {
-  if (!_client || _told == _presentation) return;
+  if (!_widget || _told == _presentation) return;
   if (_told.locale != _presentation.locale) {
     stop();
     setUpdating(false);
@@ -72,101 +69,79 @@ void WidgetHostProcess::tellPresentation() {
   }
   const WidgetPresentation old = std::exchange(_told, next);
   if (displayModesOf(old) != displayModesOf(next))
-    ask("transitionToSize", {{"size", {next.width, _contentHeight}}, {"displayModes", displayModesOf(next)}});
-  if (old.scale != next.scale) ask("setScale", {{"scale", next.scale}});
-  if (old.appearance != next.appearance) ask("setAppearance", {{"appearance", next.appearance}});
-  if (old.textSize != next.textSize) ask("setTextSize", {{"category", next.textSize}});
+    _widget->ask("transitionToSize", {{"size", {next.width, _contentHeight}}, {"displayModes", displayModesOf(next)}});
+  if (old.scale != next.scale) _widget->ask("setScale", {{"scale", next.scale}});
+  if (old.appearance != next.appearance) _widget->ask("setAppearance", {{"appearance", next.appearance}});
+  if (old.textSize != next.textSize) _widget->ask("setTextSize", {{"category", next.textSize}});
 }
 
 void WidgetHostProcess::setExpanded(bool expanded) {
   _wantsExpanded = expanded;
-  if (_client) setExpandedMode(expanded);
+  if (_widget) setExpandedMode(expanded);
 }
 
 void WidgetHostProcess::setExpandedMode(bool expanded) {
   if (expanded == _isExpanded) return;
   _isExpanded = expanded;
-  ask("setActiveDisplayMode", {{"mode", expanded ? "expanded" : "compact"}});
+  _widget->ask("setActiveDisplayMode", {{"mode", expanded ? "expanded" : "compact"}});
   askForContent();
 }
 
 void WidgetHostProcess::start() {
   try {
-    _client = std::make_unique<WidgetClient>(_runLoop, _arguments);
+    _widget = std::make_unique<WatchedWidget>(_runLoop, _arguments, kAnswerPatience,
+                                              [this](const std::string& reason) { replace(reason); });
   } catch (const WidgetClientFailure& failure) {
     return giveUp(failure.what());
   }
-  ++_generation;
   _told = _presentation;
   _contentHeight = 0;
   _isExpanded = _wantsExpanded;
   _awaitsContent = _contentIsStale = false;
-  _heardSince = _clock.now();
-  _heardLines = 0;
   setUpConnection();
   json initialization = initializationOf(_told);
   if (_isExpanded) initialization["activeDisplayMode"] = "expanded";
-  ask("initialize", initialization);
-  ask("loadView");
+  _widget->ask("initialize", initialization);
+  _widget->ask("loadView");
   appear();
 }
 
 void WidgetHostProcess::setUpConnection() {
-  JSONRPCConnection& connection = _client->connection();
-  connection.setLineObserver([this](std::string_view) { countLine(); });
-  connection.setMalformedHandler([this](const std::string& problem) { failSoon("it speaks nonsense: " + problem); });
-  connection.setClosedHandler([this] { failSoon("it ended"); });
-  connection.setHandler("frame", [this](const json&, const JSONRPCResponder&) { askForContent(); });
-  _client->setNoticeHandler([this](const std::string& message) { _delegate.widgetTells(message); });
-  _client->setOpenHandler([this](std::string_view method, const json& params) {
+  WidgetClient& client = _widget->client();
+  client.connection().setHandler("frame", [this](const json&, const JSONRPCResponder&) { askForContent(); });
+  client.setNoticeHandler([this](const std::string& message) { _delegate.widgetTells(message); });
+  client.setOpenHandler([this](std::string_view method, const json& params) {
     try {
       return _delegate.widgetOpens(method, params);
     } catch (const json::exception& malformed) {
-      failSoon(std::string("it speaks nonsense: ") + malformed.what());
+      _widget->fail(std::string("it speaks nonsense: ") + malformed.what());
       return false;
     }
   });
 }
 
-void WidgetHostProcess::countLine() {
-  const Date now = _clock.now();
-  if (intervalBetween(_heardSince, now) >= 1) {
-    _heardSince = now;
-    _heardLines = 0;
-  }
-  if (++_heardLines == kLinesPerSecond) failSoon("it does not stop talking");
-}
-
 void WidgetHostProcess::appear() {
   _appeared = true;
-  ask("viewWillAppear");
-  ask("viewDidAppear");
+  _widget->ask("viewWillAppear");
+  _widget->ask("viewDidAppear");
   askForContent();
 }
 
 void WidgetHostProcess::disappear() {
   _appeared = false;
-  ask("viewWillDisappear");
-  ask("viewDidDisappear");
+  _widget->ask("viewWillDisappear");
+  _widget->ask("viewDidDisappear");
 }
 
 void WidgetHostProcess::stop() {
-  if (!_client) return;
+  if (!_widget) return;
   if (_appeared) disappear();
-  for (const auto& timer : std::exchange(_patience, {})) timer->invalidate();
   // What was asked is still done: the process reads it before the end of its input.
-  _client.reset();
+  _widget.reset();
 }
 
-void WidgetHostProcess::failSoon(const std::string& reason) {
-  _runLoop.dispatchAsync([this, reason, generation = _generation] {
-    if (_client && generation == _generation) fail(reason);
-  });
-}
-
-void WidgetHostProcess::fail(const std::string& reason) {
+void WidgetHostProcess::replace(const std::string& reason) {
   writeLog(kLog, LogLevel::error, "The widget process is ended: %@", {reason});
-  _client->kill();
   _appeared = false;
   stop();
   setUpdating(false);
@@ -189,42 +164,13 @@ void WidgetHostProcess::giveUp(const std::string& reason) {
 void WidgetHostProcess::restart() {
   _gaveUp = false;
   _crashes.clear();
-  if (_visible && !_client) start();
-}
-
-void WidgetHostProcess::ask(std::string_view method, const json& params, Completion completion) {
-  call(method, params, [this, name = std::string(method), completion](const json& result, const auto& error) {
-    if (error && error->code == JSONRPCError::kConnectionClosed) return;
-    if (error) return failSoon(name + ": " + error->message);
-    if (!completion) return;
-    try {
-      completion(result);
-    } catch (const json::exception& malformed) {
-      failSoon("it answers \"" + name + "\" with nonsense: " + malformed.what());
-    }
-  });
+  if (_visible && !_widget) start();
 }
 
 void WidgetHostProcess::askOfRow(std::string_view method, std::size_t row, json params) {
-  if (!_client) return;
+  if (!_widget) return;
   params.update({{"section", 0}, {"row", row}});
-  call(method, params, [](const json&, const auto&) {});
-}
-
-void WidgetHostProcess::call(std::string_view method, const json& params, JSONRPCConnection::Completion completion) {
-  // A fetch takes as long as its feeds; all else is answered at once.
-  std::shared_ptr<Timer> patience;
-  if (method != "performUpdate") {
-    patience = _runLoop.scheduleTimer(kAnswerPatience, false, [this, name = std::string(method)](Timer&) {
-      failSoon("it does not answer \"" + name + "\"");
-    });
-    _patience.push_back(patience);
-  }
-  _client->connection().call(method, params, [this, patience, completion](const json& result, const auto& error) {
-    if (patience) patience->invalidate();
-    std::erase_if(_patience, [](const auto& timer) { return !timer->isValid(); });
-    completion(result, error);
-  });
+  _widget->call(method, params, [](const json&, const auto&) {});
 }
 
 void WidgetHostProcess::askForContent() {
@@ -237,14 +183,14 @@ void WidgetHostProcess::askForContent() {
   try {
     picture = std::make_shared<SharedPicture>();
   } catch (const std::system_error& failure) {
-    return failSoon(failure.what());
+    return _widget->fail(failure.what());
   }
   _awaitsContent = true;
   _contentIsStale = false;
-  ask("render", {{"surface", picture->path()}}, [this, picture](const json& answer) {
-    if (!picture->map(layoutOf(answer))) failSoon("it has not drawn what it says");
+  _widget->ask("render", {{"surface", picture->path()}}, [this, picture](const json& answer) {
+    if (!picture->map(layoutOf(answer))) _widget->fail("it has not drawn what it says");
   });
-  ask("snapshot", json::object(), [this, picture](const json& snapshot) {
+  _widget->ask("snapshot", json::object(), [this, picture](const json& snapshot) {
     _awaitsContent = false;
     if (_contentIsStale) askForContent();
     if (!picture->pixels().empty()) show(picture, snapshot);
@@ -262,9 +208,9 @@ void WidgetHostProcess::show(const std::shared_ptr<SharedPicture>& picture, cons
 }
 
 void WidgetHostProcess::update() {
-  if (!_client || _isUpdating) return;
+  if (!_widget || _isUpdating) return;
   setUpdating(true);
-  ask("performUpdate", json::object(), [this](const json&) { setUpdating(false); });
+  _widget->ask("performUpdate", json::object(), [this](const json&) { setUpdating(false); });
 }
 
 void WidgetHostProcess::setUpdating(bool updating) {

@@ -7,7 +7,7 @@
 #include <vector>
 
 #include "host/OnScreenWidget.h"
-#include "host/WidgetClient.h"
+#include "host/WatchedWidget.h"
 #include "host/window/WidgetContent.h"
 #include "platform/Clock.h"
 
@@ -52,7 +52,7 @@ class WidgetHostProcess {
   /// Starts anew after `widgetDidFail`.
   void restart();
 
-  bool isRunning() const { return _client != nullptr; }
+  bool isRunning() const { return _widget != nullptr; }
 
   /// Seconds for which a hidden widget's process is kept.
   static constexpr TimeInterval kHiddenPatience = 60;
@@ -63,25 +63,16 @@ class WidgetHostProcess {
   static constexpr TimeInterval kCrashWindow = 60;
 
  private:
-  using Completion = std::function<void(const nlohmann::json& result)>;
-
   void start();
   void appear();
   void disappear();
   void stop();
-  /// Ends the process for a fault of its own and starts another one, or gives up.
-  void fail(const std::string& reason);
-  /// Does `fail` when nothing of the process is on the stack any more.
-  void failSoon(const std::string& reason);
+  /// Starts another process after one that failed, or gives up.
+  void replace(const std::string& reason);
   void giveUp(const std::string& reason);
   void setUpConnection();
-  void countLine();
-  /// A request that a sound process answers with a result.
-  void ask(std::string_view method, const nlohmann::json& params = nlohmann::json::object(),
-           Completion completion = nullptr);
   /// A request about a row, which may be gone by now.
   void askOfRow(std::string_view method, std::size_t row, nlohmann::json params = nlohmann::json::object());
-  void call(std::string_view method, const nlohmann::json& params, JSONRPCConnection::Completion completion);
   /// Tells the process what it does not know of the presentation.
   void tellPresentation();
   void askForContent();
@@ -102,8 +93,7 @@ class WidgetHostProcess {
   std::shared_ptr<Timer> _hiddenTimer;
 
   // Of the process that runs.
-  std::unique_ptr<WidgetClient> _client;
-  std::uint64_t _generation = 0;  // tells this process from those before it
+  std::unique_ptr<WatchedWidget> _widget;
   bool _appeared = false;
   bool _isExpanded = false;  // as last told
   bool _awaitsContent = false;
@@ -111,9 +101,6 @@ class WidgetHostProcess {
   bool _isUpdating = false;
   WidgetPresentation _told;   // what the process knows of _presentation
   double _contentHeight = 0;  // points; 0 until it has drawn
-  std::vector<std::shared_ptr<Timer>> _patience;
-  Date _heardSince;
-  std::size_t _heardLines = 0;
 };
 
 }  // namespace nimbo
