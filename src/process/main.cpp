@@ -8,6 +8,7 @@
 #include <cstdio>
 
 #include "desktop/drawing/PangoTextSystem.h"
+#include "desktop/system/SmallHeap.h"
 #include "process/Sandbox.h"
 #include "process/WidgetProcess.h"
 
@@ -23,6 +24,7 @@ int takeStandardOutput() {
 }  // namespace
 
 int main(int argc, char** argv) {
+  nimbo::keepHeapSmall();
   CLI::App app{"The transit widget, driven over JSON-RPC 2.0 on standard input and output, one message a line."};
   std::optional<std::filesystem::path> config, state;
   std::string virtualTime;

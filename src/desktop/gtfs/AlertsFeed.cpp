@@ -112,23 +112,22 @@ void AlertsFeed::readEntity(std::string_view body) {
 }
 
 void AlertsFeed::joinLanguages() {
-  struct First {
-    std::size_t place;
+  /// The first alert of an identifier that has come again.
+  struct Repeated {
     std::optional<Languages> languages;  // absent: it takes no others
-    bool isLookedInto = false;
     std::string* joined = nullptr;
   };
-  std::unordered_map<std::string_view, First> firsts;  // by identifier
-  std::vector<AlertEntity> alerts;
-  alerts.reserve(_alerts.size());
-  firsts.reserve(_alerts.size());
-  for (AlertEntity& alert : _alerts) {
-    const auto [found, isNew] = firsts.try_emplace(alert.id, First{alerts.size(), {}});
+  std::unordered_map<std::string_view, std::size_t> places;  // of the first alert of each identifier
+  std::unordered_map<std::size_t, Repeated> repeated;        // by that place
+  places.reserve(_alerts.size());
+  std::size_t count = 0;
+  for (AlertEntity alert : _alerts) {  // a copy: those that stay move up in place
+    const auto [place, isNew] = places.try_emplace(alert.id, count);
     if (!isNew) {
-      First& first = found->second;
-      AlertEntity& other = alerts[first.place];
-      if (!first.isLookedInto) first.languages = languagesOf(other.body);
-      first.isLookedInto = true;
+      AlertEntity& other = _alerts[place->second];
+      const auto [found, isSecond] = repeated.try_emplace(place->second);
+      Repeated& first = found->second;
+      if (isSecond) first.languages = languagesOf(other.body);
       if (auto languages = first.languages ? languagesOf(alert.body) : std::nullopt;
           languages && areApart(*first.languages, *languages)) {
         // Messages one after the other are one message with the fields of both.
@@ -139,9 +138,9 @@ void AlertsFeed::joinLanguages() {
       }
       alert.isRepeated = true;
     }
-    alerts.push_back(alert);
+    _alerts[count++] = alert;
   }
-  _alerts = std::move(alerts);
+  _alerts.resize(count);
 }
 
 Outcome<AlertsFeed> AlertsFeed::read(std::string bytes, const std::string& place) {

@@ -78,7 +78,7 @@ class IncidentBuilder {
   IncidentBuilder(const AlertsFeed& alerts, const StaticFeed& feed, const IncidentQuery& query)
       : _alerts(alerts), _query(query), _matcher(feed, indicesOf(query), query.trips) {
     _reading.incidents.resize(query.lines.size());
-    _contents.reserve(alerts.alerts().size());
+    _sizes.reserve(alerts.alerts().size());
   }
 
   IncidentReading build() {
@@ -111,7 +111,7 @@ class IncidentBuilder {
   void take(const AlertEntity& alert) {
     _lines.clear();
     const AlertView view = readAlertView(alert.body, [&](const EntitySelector& selector) { takeSelector(selector); });
-    _contents.emplace_back(&alert, view.content);
+    _sizes.emplace_back(&alert, view.content.sizeHash());
     if (_lines.empty()) return;
     if (view.isMinor() && !_query.minorAlerts) {
       _reading.skipped.add("alert without effect on the service, or about accessibility", alert.id);
@@ -170,9 +170,9 @@ class IncidentBuilder {
   /// Alerts of the same content that concern other lines, or are over, are the same incident: their identifiers count
   /// for its number too.
   void takeLeastKeys() {
-    for (const auto& [alert, content] : _contents) {
-      if (!_sizesOfContents.contains(content.sizeHash())) continue;
-      const auto found = _incidentOfContent.find(content);
+    for (const auto& [alert, size] : _sizes) {
+      if (!_sizesOfContents.contains(size)) continue;
+      const auto found = _incidentOfContent.find(readAlertView(alert->body, [](const EntitySelector&) {}).content);
       if (found == _incidentOfContent.end()) continue;
       std::string& key = _incidents[found->second].key;
       key = std::min(key, keyOf(*alert));
@@ -209,7 +209,7 @@ class IncidentBuilder {
   SelectorMatcher _matcher;
   IncidentReading _reading;
   std::map<std::size_t, bool> _lines;  // of the alert at hand: place in the query, whether it is about the whole line
-  std::vector<std::pair<const AlertEntity*, AlertContent>> _contents;  // of all alerts
+  std::vector<std::pair<const AlertEntity*, std::size_t>> _sizes;  // `sizeHash` of all alerts
   std::vector<Incident> _incidents;
   std::map<TextsKey, std::size_t> _incidentOfTexts;
   std::unordered_map<AlertContent, std::size_t, ContentHash> _incidentOfContent;

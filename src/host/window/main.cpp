@@ -1,13 +1,13 @@
 // nimbo-transit-desktop: the widget in a window, and the places that its rows open into.
 
 #include <gtk/gtk.h>
-#include <malloc.h>
 
 #include <CLI/CLI.hpp>
 #include <csignal>
 #include <cstdio>
 #include <cstdlib>
 
+#include "desktop/system/SmallHeap.h"
 #include "host/window/WindowApplication.h"
 
 namespace {
@@ -22,7 +22,7 @@ void drawWithoutDriver() {
 }  // namespace
 
 int main(int argc, char** argv) {
-  mallopt(M_ARENA_MAX, 1);  // the toolkit's threads need little of it each, and take 0.8 MiB with heaps of their own
+  nimbo::keepHeapSmall();
   CLI::App app{"How your transit lines run, in a window."};
   std::optional<std::filesystem::path> config, state;
   std::vector<std::string> urls;
