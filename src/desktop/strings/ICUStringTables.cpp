@@ -74,7 +74,7 @@ ICUStringTables::ICUStringTables(std::string_view locale)
   const std::string tag = tagOfLocale(locale);
   std::optional<Table> table;
   for (std::string_view name = tag; !table && !name.empty();) {
-    table = tableNamed(name);
+    table = name == kFallbackLanguage ? Table() : tableNamed(name);  // English is behind every table
     const std::size_t dash = name.rfind('-');
     name = name.substr(0, dash == std::string_view::npos ? 0 : dash);
   }
