@@ -3,7 +3,8 @@
     table.py BUILD [--pairs N] [--rows WORD]
 
 A pair is one run of each side, one right after the other, the sides changing places from pair to pair. A row's figure
-is the median of its pairs' ratios; the spread is the middle half of them. Rows without a peer are in their own unit.
+is the median of its pairs' ratios; the spread is the middle half of them. One pair before them, which warms the caches, does
+not count. Rows without a peer are in their own unit.
 Functions are measured in processor time, which other programs disturb less; processes on the clock.
 """
 
@@ -31,6 +32,8 @@ class Row:
 
     def figures(self, pairs):
         figures, ours, theirs = [], [], []
+        for measure in filter(None, (self.measure, self.measure_peer)):
+            measure()
         for number in range(pairs):
             if not self.measure_peer:
                 figures.append(self.measure())
