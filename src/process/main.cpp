@@ -8,7 +8,7 @@
 #include <cstdio>
 
 #include "desktop/drawing/PangoTextSystem.h"
-#include "desktop/system/SmallHeap.h"
+#include "desktop/system/SmallMemory.h"
 #include "process/Sandbox.h"
 #include "process/WidgetProcess.h"
 

@@ -1,5 +1,6 @@
 #include "host/window/WindowApplication.h"
 
+#include "desktop/system/SmallMemory.h"
 #include "platform/Localization.h"
 
 namespace nimbo {
@@ -68,6 +69,7 @@ void WindowApplication::changeLocale() {
 
 void WindowApplication::on_activate() {
   if (!_window) makeWindow();
+  giveBackStack();
   _window->present();
 }
 

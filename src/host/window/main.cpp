@@ -7,7 +7,7 @@
 #include <cstdio>
 #include <cstdlib>
 
-#include "desktop/system/SmallHeap.h"
+#include "desktop/system/SmallMemory.h"
 #include "host/window/WindowApplication.h"
 
 namespace {

@@ -1,0 +1,34 @@
+#include "desktop/system/SmallMemory.h"
+
+#include <malloc.h>
+#include <pthread.h>
+#include <sys/mman.h>
+#include <unistd.h>
+
+#include <cstddef>
+#include <cstdint>
+
+namespace nimbo {
+
+void keepHeapSmall() {
+  constexpr int kMapped = 128 * 1024;  // bytes; the default, which no longer grows once it is set
+  mallopt(M_ARENA_MAX, 1);
+  mallopt(M_MMAP_THRESHOLD, kMapped);
+}
+
+void giveBackStack() {
+  pthread_attr_t attributes;
+  if (pthread_getattr_np(pthread_self(), &attributes) != 0) return;
+  void* lowest = nullptr;
+  std::size_t size = 0;
+  pthread_attr_getstack(&attributes, &lowest, &size);
+  pthread_attr_destroy(&attributes);
+  // The stack grows downwards; a page below this frame is kept for what is called from here.
+  const auto page = static_cast<std::uintptr_t>(sysconf(_SC_PAGESIZE));
+  const std::uintptr_t used = reinterpret_cast<std::uintptr_t>(__builtin_frame_address(0)) / page * page - page;
+  const auto begin = reinterpret_cast<std::uintptr_t>(lowest);
+  // Of the main thread's stack the lower part is not mapped yet: that is answered as an error and does no harm.
+  if (begin < used) (void)madvise(lowest, used - begin, MADV_DONTNEED);
+}
+
+}  // namespace nimbo
