@@ -19,7 +19,7 @@ set(CPACK_DEBIAN_PACKAGE_RECOMMENDS ca-certificates)
 # Libraries that are opened with their first use are not in the programs' headers, where dpkg-shlibdeps looks.
 find_program(DPKG_QUERY dpkg-query)
 if(DPKG_QUERY)
-  foreach(variable NIMBO_CURL_LIBRARY NIMBO_ZIP_LIBRARY)
+  foreach(variable NIMBO_CURL_LIBRARY NIMBO_ICU_LIBRARY NIMBO_ZIP_LIBRARY)
     get_directory_property(name DIRECTORY ${PROJECT_SOURCE_DIR}/src/desktop DEFINITION ${variable})
     execute_process(COMMAND ${DPKG_QUERY} --search "*/${name}" OUTPUT_VARIABLE found COMMAND_ERROR_IS_FATAL ANY)
     if(NOT found MATCHES "^([^:,\n]+)")

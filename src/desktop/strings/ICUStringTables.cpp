@@ -1,12 +1,8 @@
 #include "desktop/strings/ICUStringTables.h"
 
-#include <unicode/locid.h>
-#include <unicode/msgfmt.h>
-
 #include <algorithm>
 #include <nlohmann/json.hpp>
 #include <stdexcept>
-#include <unordered_map>
 
 #include "desktop/resources/Resources.h"
 #include "platform/foundation/Log.h"
@@ -30,34 +26,7 @@ std::string tagOfLocale(std::string_view locale) {
   return tag;
 }
 
-/// Puts texts into a pattern of texts and "{0}" alone; absent when the pattern asks for more.
-std::optional<std::string> fillTexts(std::string_view pattern, std::span<const FormatArgument> arguments) {
-  std::string filled;
-  for (std::size_t i = 0; i < pattern.size(); ++i) {
-    if (pattern[i] == '\'' || pattern[i] == '}') return std::nullopt;
-    if (pattern[i] != '{') {
-      filled += pattern[i];
-      continue;
-    }
-    if (i + 2 >= pattern.size() || pattern[i + 2] != '}') return std::nullopt;
-    const auto index = static_cast<std::size_t>(pattern[i + 1] - '0');
-    const std::string* text = index < arguments.size() ? std::get_if<std::string>(&arguments[index]) : nullptr;
-    if (!text) return std::nullopt;
-    filled += *text;
-    i += 2;
-  }
-  return filled;
-}
-
 }  // namespace
-
-/// What ICU made of the patterns so far. It is not asked for anything before there is one that needs it: that saves 0.8
-/// MiB where there is none.
-struct ICUStringTables::Formats {
-  std::string tag;
-  std::optional<icu::Locale> locale;
-  std::unordered_map<std::string, std::unique_ptr<icu::MessageFormat>> byPattern;
-};
 
 std::optional<ICUStringTables::Table> ICUStringTables::tableNamed(std::string_view name) {
   const auto bytes = resourceNamed("strings/" + std::string(name) + ".json");
@@ -69,8 +38,7 @@ std::optional<ICUStringTables::Table> ICUStringTables::tableNamed(std::string_vi
   }
 }
 
-ICUStringTables::ICUStringTables(std::string_view locale)
-    : _english(tableNamed(kFallbackLanguage).value_or(Table())), _formats(std::make_unique<Formats>()) {
+ICUStringTables::ICUStringTables(std::string_view locale) : _english(tableNamed(kFallbackLanguage).value_or(Table())) {
   const std::string tag = tagOfLocale(locale);
   std::optional<Table> table;
   for (std::string_view name = tag; !table && !name.empty();) {
@@ -78,12 +46,10 @@ ICUStringTables::ICUStringTables(std::string_view locale)
     const std::size_t dash = name.rfind('-');
     name = name.substr(0, dash == std::string_view::npos ? 0 : dash);
   }
-  _formats->tag = table ? tag : std::string(kFallbackLanguage);
+  _format.emplace(table ? tag : std::string(kFallbackLanguage));
   if (table) _table = std::move(*table);
   _isRightToLeft = stringForKey("TransitWidget_Text_Direction") == "rtl";
 }
-
-ICUStringTables::~ICUStringTables() = default;
 
 std::optional<std::string> ICUStringTables::stringForKey(std::string_view key) const {
   for (const Table* table : {&_table, &_english})
@@ -92,35 +58,13 @@ std::optional<std::string> ICUStringTables::stringForKey(std::string_view key) c
 }
 
 std::string ICUStringTables::format(const std::string& pattern, std::span<const FormatArgument> arguments) const {
-  if (auto filled = fillTexts(pattern, arguments)) return *filled;
-  return formatWithICU(pattern, arguments);
-}
-
-std::string ICUStringTables::formatWithICU(const std::string& pattern,
-                                           std::span<const FormatArgument> arguments) const {
-  UErrorCode status = U_ZERO_ERROR;
-  if (!_formats->locale) _formats->locale = icu::Locale::forLanguageTag(_formats->tag, status);
-  std::unique_ptr<icu::MessageFormat>& format = _formats->byPattern[pattern];
-  if (!format)
-    format = std::make_unique<icu::MessageFormat>(icu::UnicodeString::fromUTF8(pattern), *_formats->locale, status);
-  std::vector<icu::Formattable> values;
-  for (const FormatArgument& argument : arguments) {
-    if (const auto* text = std::get_if<std::string>(&argument))
-      values.emplace_back(icu::UnicodeString::fromUTF8(*text));
-    else
-      values.emplace_back(icu::StringPiece(std::to_string(std::get<std::uint64_t>(argument))), status);
-  }
-  icu::UnicodeString filled;
-  icu::FieldPosition position;
-  format->format(values.data(), static_cast<std::int32_t>(values.size()), filled, position, status);
-  if (U_FAILURE(status)) {
-    _formats->byPattern.erase(pattern);
+  try {
+    return _format->fill(pattern, arguments);
+  } catch (const std::runtime_error& failure) {
     writeLog({kDefaultLogSubsystem, "StringTables"}, LogLevel::error, "Unable to fill the pattern %@: %@",
-             {pattern, u_errorName(status)});
+             {pattern, failure.what()});
     return pattern;
   }
-  std::string text;
-  return filled.toUTF8String(text);
 }
 
 std::string ICUStringTables::commaDelimitedList(const std::vector<std::string>& texts) const {

@@ -1,24 +1,21 @@
 #pragma once
 
 #include <map>
-#include <memory>
+#include <optional>
 
-#include "platform/Localization.h"
+#include "desktop/strings/MessageFormat.h"
 
 namespace nimbo {
 
-/// The string tables inside the program ("strings/<language>.json"), filled by ICU MessageFormat, which is opened for
-/// the first pattern that needs more than its texts put in.
-/// Source of the patterns' form: https://unicode-org.github.io/icu/userguide/format_parse/messages/
+/// The string tables inside the program ("strings/<language>.json"), whose patterns are ICU's.
 class ICUStringTables final : public StringTables {
  public:
   /// `locale` is a BCP 47 tag ("de-AT") or a POSIX name ("de_AT.UTF-8"). The table of the tag is used, else that of the
   /// tag with its last subtags left out, else the English one with English rules.
   explicit ICUStringTables(std::string_view locale);
-  ~ICUStringTables() override;
 
   std::optional<std::string> stringForKey(std::string_view key) const override;
-  /// A pattern that ICU does not understand is logged and answered as it stands.
+  /// A pattern that cannot be filled is logged and answered as it stands.
   std::string format(const std::string& pattern, std::span<const FormatArgument> arguments) const override;
   /// From right to left each text is kept together by bidirectional isolates.
   std::string commaDelimitedList(const std::vector<std::string>& texts) const override;
@@ -26,16 +23,14 @@ class ICUStringTables final : public StringTables {
 
  private:
   using Table = std::map<std::string, std::string, std::less<>>;
-  struct Formats;
 
   /// Null where the program has no table of that name. Throws std::logic_error for a table that is broken.
   static std::optional<Table> tableNamed(std::string_view name);
-  std::string formatWithICU(const std::string& pattern, std::span<const FormatArgument> arguments) const;
 
   Table _table;
   Table _english;
   bool _isRightToLeft;
-  std::unique_ptr<Formats> _formats;
+  std::optional<MessageFormat> _format;  ///< there is one from the constructor on
 };
 
 }  // namespace nimbo

@@ -1,11 +1,9 @@
 #pragma once
 
-#include <unicode/datefmt.h>
-
-#include <memory>
 #include <optional>
 #include <string>
 
+#include "desktop/raii/ICUHandles.h"
 #include "platform/foundation/Date.h"
 
 namespace nimbo {
@@ -15,6 +13,7 @@ namespace nimbo {
 class DateText {
  public:
   /// A BCP 47 tag or POSIX name; empty: the environment's.
+  /// Without a format for it, dates are told in ISO form.
   explicit DateText(const std::string& locale);
 
   std::string textOf(Date date) const;
@@ -22,7 +21,7 @@ class DateText {
   std::string textOfPeriod(std::optional<Date> start, std::optional<Date> end, Date now) const;
 
  private:
-  std::unique_ptr<icu::DateFormat> _format;  // null where the locale has none
+  ICUDateFormat _format;  // null without one
 };
 
 }  // namespace nimbo
