@@ -46,18 +46,18 @@ class MessageFormat::Filling {
       : _format(format), _rest(pattern), _arguments(arguments) {}
 
   std::string whole() {
-    std::string text = message(nullptr);
+    std::string text;
+    appendMessage(text, nullptr);
     if (!_rest.empty()) throw std::runtime_error("a brace is closed that is not open");
     return text;
   }
 
  private:
   /// Up to a "}" that belongs to whoever asks, or the end. `count` is what "#" stands for, if anything.
-  std::string message(const std::uint64_t* count) {
-    std::string text;
+  void appendMessage(std::string& text, const std::uint64_t* count) {
     while (!_rest.empty() && _rest.front() != '}') {
       if (take("{"))
-        text += argument();
+        appendArgument(text);
       else if (count && take("#"))
         text += _format.counting().textOf(*count);
       else if (_rest.front() == '\'')
@@ -65,18 +65,20 @@ class MessageFormat::Filling {
       else
         text += takeCharacter();
     }
-    return text;
   }
 
   /// What stands in braces, of which the first is taken.
-  std::string argument() {
+  void appendArgument(std::string& text) {
     const auto index = static_cast<std::size_t>(takeCharacter() - '0');
     if (index >= _arguments.size()) throw std::runtime_error("an argument is missing");
     const auto* count = std::get_if<std::uint64_t>(&_arguments[index]);
-    if (take("}")) return count ? _format.counting().textOf(*count) : std::get<std::string>(_arguments[index]);
-    if (!take(", plural,")) throw std::runtime_error("neither an argument nor plural forms");
-    if (!count) throw std::runtime_error("the plural of a text");
-    return pluralForm(*count);
+    const bool isPlural = !take("}");
+    if (isPlural && !take(", plural,")) throw std::runtime_error("neither an argument nor plural forms");
+    if (isPlural && !count) throw std::runtime_error("the plural of a text");
+    if (!count)
+      text += std::get<std::string>(_arguments[index]);
+    else
+      text += isPlural ? pluralForm(*count) : _format.counting().textOf(*count);
   }
 
   std::string pluralForm(std::uint64_t count) {
@@ -87,7 +89,8 @@ class MessageFormat::Filling {
       _rest.remove_prefix(selector.size());
       skipBlanks();
       if (!take("{")) throw std::runtime_error("a plural form has no text");
-      std::string text = message(&count);
+      std::string text;
+      appendMessage(text, &count);
       if (!take("}")) throw std::runtime_error("a brace is not closed");
       if (selector == exactly)
         exact = std::move(text);
