@@ -3,7 +3,6 @@
 #include <functional>
 #include <memory>
 #include <mutex>
-#include <typeindex>
 #include <unordered_map>
 
 #include "platform/AnalyticsPipeline.h"
@@ -90,16 +89,20 @@ class Platform final {
   template <class T>
   std::shared_ptr<T> singleton(const std::function<std::shared_ptr<T>()>& make) {
     const std::lock_guard guard(_singletonsLock);
-    std::shared_ptr<void>& slot = _singletons[std::type_index(typeid(T))];
+    std::shared_ptr<void>& slot = _singletons[&kClassKey<T>];
     if (!slot) slot = make();
     return std::static_pointer_cast<T>(slot);
   }
 
  private:
+  template <class T>
+  static inline char kClassKey = 0;
+
   PlatformServices _services;
   Platform* _previous;
   std::mutex _singletonsLock;
-  std::unordered_map<std::type_index, std::shared_ptr<void>> _singletons;
+  /// By the address of the class's key: rows and views ask often, and a type_index would hash its whole name each time.
+  std::unordered_map<const void*, std::shared_ptr<void>> _singletons;
 };
 
 }  // namespace nimbo
