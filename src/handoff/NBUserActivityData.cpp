@@ -39,7 +39,7 @@ bool NBUserActivityData::isEqualToUserActivityData(const NBUserActivityData& oth
 }
 
 bool NBUserActivityData::isEqual(const Object* other) const {
-  const auto* data = dynamic_cast<const NBUserActivityData*>(other);
+  const auto* data = instanceOf<NBUserActivityData>(other);
   return data && isEqualToUserActivityData(*data);
 }
 

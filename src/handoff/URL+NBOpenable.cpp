@@ -18,7 +18,7 @@ void NBURLOpenable::openInContext_completionHandler(Object* context, Completion 
 }
 
 bool NBURLOpenable::isEqual(const Object* other) const {
-  const auto* openable = dynamic_cast<const NBURLOpenable*>(other);
+  const auto* openable = instanceOf<NBURLOpenable>(other);
   return openable && openable->_url == _url;
 }
 

@@ -19,8 +19,7 @@ bool NBTransitListItem::isEqualToListItem(const NBTransitListItem& other) const 
   const NBTransitItems& others = other.expandedItemsOrEmpty();
   return absentOrEqual(_summaryItem, other._summaryItem) &&
          _expandedItems.has_value() == other._expandedItems.has_value() &&
-         std::equal(mine.begin(), mine.end(), others.begin(), others.end(),
-                    [](const auto& a, const auto& b) { return absentOrEqual(a, b); });
+         std::ranges::equal(mine, others, absentOrEqual);
 }
 
 bool NBTransitListItem::isEqual(const Object* other) const {

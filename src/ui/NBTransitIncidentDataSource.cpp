@@ -23,10 +23,7 @@ constexpr double kDefaultArtworkViewWidth = 73.0;
 /// What the texts of a row keep of the available width.
 constexpr double kWidthBesideArtwork = 214.0;
 
-bool itemsEqual(const NBTransitItems& a, const NBTransitItems& b) {
-  return std::equal(a.begin(), a.end(), b.begin(), b.end(),
-                    [](const auto& x, const auto& y) { return absentOrEqual(x, y); });
-}
+bool itemsEqual(const NBTransitItems& a, const NBTransitItems& b) { return std::ranges::equal(a, b, absentOrEqual); }
 
 /// The same row with a smaller shield.
 std::shared_ptr<const NBTransitItem> itemWithArtwork(const NBTransitItem& item,

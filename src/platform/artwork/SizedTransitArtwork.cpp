@@ -15,7 +15,7 @@ ImageRef SizedTransitArtwork::imageToDisplayWithScreenScale_nightMode(double scr
 
 bool SizedTransitArtwork::isEqual(const Object* other) const {
   if (this == other) return true;
-  const auto* sized = dynamic_cast<const SizedTransitArtwork*>(other);
+  const auto* sized = instanceOf<SizedTransitArtwork>(other);
   return sized && sized->_shieldSize == _shieldSize && artworksAreEquivalent(sized->_artwork.get(), _artwork.get());
 }
 

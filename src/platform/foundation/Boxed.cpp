@@ -34,14 +34,14 @@ bool numbersEqual(const BoxedNumber::Value& a, const BoxedNumber::Value& b) {
 }  // namespace
 
 bool BoxedString::isEqual(const Object* other) const {
-  const auto* string = dynamic_cast<const BoxedString*>(other);
+  const auto* string = instanceOf<BoxedString>(other);
   return string && string->_value == _value;
 }
 
 std::uint64_t BoxedString::hash() const { return hashOfBytes(_value); }
 
 bool BoxedNumber::isEqual(const Object* other) const {
-  const auto* number = dynamic_cast<const BoxedNumber*>(other);
+  const auto* number = instanceOf<BoxedNumber>(other);
   return number && numbersEqual(_value, number->_value);
 }
 
@@ -60,7 +60,7 @@ std::string BoxedNumber::description() const {
 }
 
 bool BoxedData::isEqual(const Object* other) const {
-  const auto* data = dynamic_cast<const BoxedData*>(other);
+  const auto* data = instanceOf<BoxedData>(other);
   return data && data->_value == _value;
 }
 
@@ -78,7 +78,7 @@ std::string BoxedData::description() const {
 }
 
 bool BoxedDate::isEqual(const Object* other) const {
-  const auto* date = dynamic_cast<const BoxedDate*>(other);
+  const auto* date = instanceOf<BoxedDate>(other);
   return date && date->_value == _value;
 }
 
@@ -88,7 +88,7 @@ std::uint64_t BoxedDate::hash() const {
 
 bool BoxedArray::isEqual(const Object* other) const {
   if (this == other) return true;
-  const auto* array = dynamic_cast<const BoxedArray*>(other);
+  const auto* array = instanceOf<BoxedArray>(other);
   if (!array || array->_elements.size() != _elements.size()) return false;
   for (std::size_t i = 0; i < _elements.size(); ++i)
     if (!absentOrEqual(_elements[i], array->_elements[i])) return false;
@@ -111,7 +111,7 @@ ObjectRef BoxedDictionary::objectForKey(std::string_view key) const {
 
 bool BoxedDictionary::isEqual(const Object* other) const {
   if (this == other) return true;
-  const auto* dictionary = dynamic_cast<const BoxedDictionary*>(other);
+  const auto* dictionary = instanceOf<BoxedDictionary>(other);
   if (!dictionary || dictionary->_entries.size() != _entries.size()) return false;
   auto theirs = dictionary->_entries.begin();
   for (const auto& [key, object] : _entries) {

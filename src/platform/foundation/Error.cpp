@@ -27,7 +27,7 @@ std::string Error::reason() const {
 
 bool Error::isEqual(const Object* other) const {
   if (this == other) return true;
-  const auto* error = dynamic_cast<const Error*>(other);
+  const auto* error = instanceOf<Error>(other);
   return error && error->_domain == _domain && error->_code == _code && error->_userInfo->isEqual(_userInfo.get());
 }
 

@@ -21,11 +21,6 @@ bool Object::respondsToOperation(std::string_view) const { return false; }
 
 void Object::performOperation(std::string_view) {}
 
-bool absentOrEqual(const ObjectRef& a, const ObjectRef& b) {
-  if (a == b) return true;
-  return a && b && a->isEqual(b.get());
-}
-
 std::string descriptionOf(const ObjectRef& object) { return object ? object->description() : "(null)"; }
 
 }  // namespace nimbo

@@ -33,7 +33,7 @@ class MapItemIdentifier final : public Object {
 
   std::string_view className() const override { return "MapItemIdentifier"; }
   bool isEqual(const Object* other) const override {
-    const auto* identifier = dynamic_cast<const MapItemIdentifier*>(other);
+    const auto* identifier = instanceOf<MapItemIdentifier>(other);
     return identifier && identifier->_muid == _muid;
   }
   std::uint64_t hash() const override { return _muid; }

@@ -52,7 +52,7 @@ bool artworksAreEquivalent(const TransitArtwork* a, const TransitArtwork* b) {
 }
 
 bool TransitArtwork::isEqual(const Object* other) const {
-  const auto* artwork = dynamic_cast<const TransitArtwork*>(other);
+  const auto* artwork = instanceOf<TransitArtwork>(other);
   return artwork && artworksAreEquivalent(this, artwork);
 }
 

@@ -15,7 +15,7 @@ Font::Font(FontDescriptor descriptor, double scaling)
     : _descriptor(descriptor), _scaling(scaling), _metrics(Platform::current().text().metrics(descriptor)) {}
 
 bool Font::isEqual(const Object* other) const {
-  const auto* font = dynamic_cast<const Font*>(other);
+  const auto* font = instanceOf<Font>(other);
   return font && font->_descriptor == _descriptor && font->_scaling == _scaling;
 }
 
