@@ -7,7 +7,7 @@
 #include "incidents/SharedSettingsStore+Nimbo.h"
 #include "incidents/_NBTransitIncidentFetcherRequest.h"
 #include "platform/Platform.h"
-#include "util/NBTransitWidgetLog.h"
+#include "platform/foundation/Log.h"
 #include "util/NimboMap.h"
 
 namespace nimbo {

@@ -1,7 +1,7 @@
 #include "incidents/NBTransitIncidentUpdater.h"
 
 #include "platform/Platform.h"
-#include "util/NBTransitWidgetLog.h"
+#include "platform/foundation/Log.h"
 
 namespace nimbo {
 

@@ -7,9 +7,9 @@
 #include "items/NBTransitSummaryItem.h"
 #include "platform/artwork/SizedTransitArtwork.h"
 #include "platform/foundation/Boxed.h"
+#include "platform/foundation/Log.h"
 #include "ui/NBTransitItemFixedHeightCell.h"
 #include "ui/NBTransitSummaryCell.h"
-#include "util/NBTransitWidgetLog.h"
 
 namespace nimbo {
 

@@ -3,9 +3,9 @@
 #include "incidents/NBTransitIncidentFetcher.h"
 #include "platform/HostApplication.h"
 #include "platform/Platform.h"
+#include "platform/foundation/Log.h"
 #include "platform/ui/Environment.h"
 #include "ui/ArtworkCache+Nimbo.h"
-#include "util/NBTransitWidgetLog.h"
 
 namespace nimbo {
 

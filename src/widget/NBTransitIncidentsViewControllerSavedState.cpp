@@ -2,7 +2,7 @@
 
 #include "incidents/SharedSettingsStore+Nimbo.h"
 #include "platform/Platform.h"
-#include "util/NBTransitWidgetLog.h"
+#include "platform/foundation/Log.h"
 #include "widget/NBTransitIncidentsViewController.h"
 
 namespace nimbo {

@@ -4,7 +4,7 @@
 
 #include <system_error>
 
-#include "util/NBTransitWidgetLog.h"
+#include "platform/foundation/Log.h"
 
 namespace nimbo {
 

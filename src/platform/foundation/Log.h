@@ -23,6 +23,9 @@ struct LogFacility {
 /// Logging subsystem of the widget's own lines.
 inline constexpr std::string_view kDefaultLogSubsystem = "org.nimbo.TransitWidget";
 
+/// Where the widget's own log lines belong.
+inline constexpr LogFacility NBTransitWidgetLogFacility{kDefaultLogSubsystem, "TransitWidget"};
+
 /// One argument of a log line: a text, a number or an object, whose description is made only for a line that is kept.
 class LogArgument {
  public:
