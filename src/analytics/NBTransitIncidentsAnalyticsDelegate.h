@@ -5,9 +5,9 @@
 #include <unordered_map>
 
 #include "platform/AnalyticsPipeline.h"
-#include "platform/WidgetHost.h"
 #include "platform/transit/TransitLineItem.h"
 #include "platform/ui/IndexPath.h"
+#include "platform/ui/WidgetHost.h"
 
 namespace nimbo {
 

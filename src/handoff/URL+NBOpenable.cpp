@@ -1,8 +1,8 @@
 #include "handoff/URL+NBOpenable.h"
 #include "platform/UserSession.h"
-#include "platform/WidgetHost.h"
 #include "platform/foundation/Hash.h"
 #include "platform/ui/ViewController.h"
+#include "platform/ui/WidgetHost.h"
 
 namespace nimbo {
 

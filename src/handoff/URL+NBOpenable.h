@@ -1,7 +1,7 @@
 #pragma once
 
 #include "handoff/NBOpenable.h"
-#include "platform/URL.h"
+#include "platform/foundation/URL.h"
 
 namespace nimbo {
 

@@ -11,7 +11,7 @@
 #include "host/OnScreenWidget.h"
 #include "host/ScriptPlayer.h"
 #include "host/TerminalRows.h"
-#include "platform/ui/Geometry.h"
+#include "platform/foundation/Geometry.h"
 
 namespace nimbo {
 

@@ -12,8 +12,8 @@
 #include "items/NBTransitItemDataSourceBuilder.h"
 #include "items/NBTransitSummaryItem.h"
 #include "items/NumberList.h"
-#include "platform/URL.h"
 #include "platform/artwork/ArtworkCache.h"
+#include "platform/foundation/URL.h"
 #include "platform/transit/TransitLineItem.h"
 
 namespace nimbo {

@@ -1,6 +1,6 @@
 #pragma once
 
-#include "platform/URL.h"
+#include "platform/foundation/URL.h"
 
 namespace nimbo {
 

@@ -5,6 +5,10 @@
 #include <cstdlib>
 #include <stdexcept>
 
+#include "platform/ui/Environment.h"
+
+// What the layers below ask of the services in force is declared there and defined here, so that none of them knows of
+// this one.
 namespace nimbo {
 
 namespace {
@@ -28,6 +32,23 @@ Platform& Platform::current() {
 Date currentDate() { return Platform::current().clock().now(); }
 
 TimeInterval intervalFromNow(Date date) { return intervalBetween(currentDate(), date); }
+
+void writeLog(const LogFacility& facility, LogLevel level, std::string_view format,
+              std::initializer_list<LogArgument> arguments) {
+  Log& log = Platform::current().log();
+  if (!log.isEnabled(level)) return;
+  log.write(facility, level, format, std::span(arguments.begin(), arguments.size()));
+}
+
+Environment& Environment::current() {
+  return *Platform::current().singleton<Environment>([] { return std::make_shared<Environment>(); });
+}
+
+bool Environment::isRightToLeft() const { return Platform::current().strings().isRightToLeft(); }
+
+TextSystem& TextSystem::current() { return Platform::current().text(); }
+
+ImageResources& ImageResources::current() { return Platform::current().images(); }
 
 void assertMainQueue() {
   if (Platform::current().mainRunLoop().isCurrent()) return;

@@ -3,8 +3,8 @@
 #include <memory>
 #include <string>
 
-#include "platform/URL.h"
 #include "platform/foundation/Boxed.h"
+#include "platform/foundation/URL.h"
 
 namespace nimbo {
 

@@ -7,10 +7,10 @@
 #include <string_view>
 
 #include "desktop/rpc/JSONRPC.h"
-#include "platform/WidgetHost.h"
+#include "platform/foundation/Geometry.h"
 #include "platform/ui/Environment.h"
-#include "platform/ui/Geometry.h"
 #include "platform/ui/IndexPath.h"
+#include "platform/ui/WidgetHost.h"
 
 namespace nimbo {
 

@@ -5,7 +5,7 @@
 
 #include "desktop/rpc/JSONRPCConnection.h"
 #include "platform/UserActivity.h"
-#include "platform/WidgetHost.h"
+#include "platform/ui/WidgetHost.h"
 
 namespace nimbo {
 

@@ -10,10 +10,10 @@
 #include "incidents/NBTransitIncidentUpdater.h"
 #include "incidents/Result.h"
 #include "platform/MemoryPressure.h"
-#include "platform/WidgetHost.h"
 #include "platform/artwork/ArtworkCache.h"
 #include "platform/ui/TableView.h"
 #include "platform/ui/ViewController.h"
+#include "platform/ui/WidgetHost.h"
 #include "ui/NBTransitIncidentDataSource.h"
 #include "widget/NBTransitIncidentViewControllerState.h"
 

@@ -1,7 +1,7 @@
 #pragma once
 
 #include "items/NBTransitListItem.h"
-#include "platform/WidgetHost.h"
+#include "platform/ui/WidgetHost.h"
 
 namespace nimbo {
 

@@ -2,7 +2,7 @@
 
 #include <vector>
 
-#include "platform/WidgetHost.h"
+#include "platform/ui/WidgetHost.h"
 
 namespace nimbo {
 

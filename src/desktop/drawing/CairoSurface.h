@@ -8,7 +8,7 @@
 
 #include "desktop/raii/CairoHandles.h"
 #include "platform/foundation/Error.h"
-#include "platform/ui/Geometry.h"
+#include "platform/foundation/Geometry.h"
 
 namespace nimbo {
 

@@ -8,8 +8,8 @@
 #include <string_view>
 #include <vector>
 
+#include "platform/foundation/Geometry.h"
 #include "platform/ui/Color.h"
-#include "platform/ui/Geometry.h"
 
 typedef struct _cairo cairo_t;
 

@@ -1,7 +1,7 @@
 #pragma once
 
+#include "platform/foundation/Geometry.h"
 #include "platform/foundation/Object.h"
-#include "platform/ui/Geometry.h"
 
 namespace nimbo {
 

@@ -1,6 +1,5 @@
 #include "platform/artwork/NamedImage.h"
 
-#include "platform/Platform.h"
 #include "platform/foundation/Hash.h"
 
 namespace nimbo {
@@ -10,7 +9,7 @@ std::shared_ptr<const NamedImage> NamedImage::imageNamed(std::string name) {
 }
 
 ImageRef NamedImage::imageToDisplayWithScreenScale_nightMode(double screenScale, bool nightMode) const {
-  return Platform::current().images().image(_name, screenScale, nightMode);
+  return ImageResources::current().image(_name, screenScale, nightMode);
 }
 
 const ArchivableClass& NamedImage::archivedClass() {

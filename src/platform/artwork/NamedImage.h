@@ -12,6 +12,8 @@ namespace nimbo {
 class ImageResources {
  public:
   virtual ~ImageResources() = default;
+  /// Those of the platform in force.
+  static ImageResources& current();
   /// The image of this name; null, and a log line, when there is none.
   virtual ImageRef image(std::string_view name, double screenScale, bool nightMode) = 0;
 };

@@ -2,8 +2,6 @@
 
 #include <cstdio>
 
-#include "platform/Platform.h"
-
 namespace nimbo {
 
 namespace {
@@ -63,13 +61,6 @@ std::string formatLogLine(std::string_view format, std::span<const LogArgument> 
     i += (isPrivate ? kPrivate.size() : 0) + end + 1;
   }
   return line;
-}
-
-void writeLog(const LogFacility& facility, LogLevel level, std::string_view format,
-              std::initializer_list<LogArgument> arguments) {
-  Log& log = Platform::current().log();
-  if (!log.isEnabled(level)) return;
-  log.write(facility, level, format, std::span(arguments.begin(), arguments.size()));
 }
 
 }  // namespace nimbo

@@ -4,8 +4,6 @@
 #include <array>
 #include <stdexcept>
 
-#include "platform/Platform.h"
-
 namespace nimbo {
 
 namespace {
@@ -33,10 +31,6 @@ std::optional<ContentSizeCategory> contentSizeCategoryFromName(std::string_view 
 
 std::string_view nameOfContentSizeCategory(ContentSizeCategory category) {
   return kCategoryNames.at(static_cast<std::size_t>(category));
-}
-
-Environment& Environment::current() {
-  return *Platform::current().singleton<Environment>([] { return std::make_shared<Environment>(); });
 }
 
 void Environment::setContentSizeCategory(ContentSizeCategory category) {

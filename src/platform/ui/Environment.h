@@ -6,29 +6,13 @@
 #include <string_view>
 #include <vector>
 
-namespace nimbo {
+#include "platform/foundation/Presentation.h"
 
-/// The user's preferred text size. `large` is the size at which lengths are given.
-enum class ContentSizeCategory {
-  extraSmall,
-  small,
-  medium,
-  large,
-  extraLarge,
-  extraExtraLarge,
-  extraExtraExtraLarge,
-  accessibilityMedium,
-  accessibilityLarge,
-  accessibilityExtraLarge,
-  accessibilityExtraExtraLarge,
-  accessibilityExtraExtraExtraLarge,
-};
+namespace nimbo {
 
 /// "extraSmall" to "accessibilityExtraExtraExtraLarge"; absent for anything else.
 std::optional<ContentSizeCategory> contentSizeCategoryFromName(std::string_view name);
 std::string_view nameOfContentSizeCategory(ContentSizeCategory category);
-
-enum class Appearance { light, dark };
 
 /// The screen and the user's preferences as views see them. One for each platform in force; main thread only.
 class Environment {
@@ -45,6 +29,9 @@ class Environment {
 
   Appearance appearance() const { return _appearance; }
   void setAppearance(Appearance appearance) { _appearance = appearance; }
+
+  /// Whether the script of the user's language runs from right to left.
+  bool isRightToLeft() const;
 
   /// Calls `operation` after each change of the text size, for as long as `observer` lives and is not removed.
   void observeContentSizeCategory(const std::shared_ptr<const void>& observer, std::function<void()> operation);

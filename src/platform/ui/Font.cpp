@@ -1,6 +1,5 @@
 #include "platform/ui/Font.h"
 
-#include "platform/Platform.h"
 #include "platform/foundation/Hash.h"
 
 namespace nimbo {
@@ -12,7 +11,7 @@ std::shared_ptr<const Font> Font::preferredFont(TextStyle style, FontTraits trai
 }
 
 Font::Font(FontDescriptor descriptor, double scaling)
-    : _descriptor(descriptor), _scaling(scaling), _metrics(Platform::current().text().metrics(descriptor)) {}
+    : _descriptor(descriptor), _scaling(scaling), _metrics(TextSystem::current().metrics(descriptor)) {}
 
 bool Font::isEqual(const Object* other) const {
   const auto* font = instanceOf<Font>(other);

@@ -1,8 +1,8 @@
 #pragma once
 
 #include "platform/artwork/Image.h"
+#include "platform/foundation/Geometry.h"
 #include "platform/ui/Color.h"
-#include "platform/ui/Geometry.h"
 #include "platform/ui/TextSystem.h"
 
 namespace nimbo {

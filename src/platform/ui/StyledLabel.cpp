@@ -3,7 +3,6 @@
 #include <algorithm>
 #include <cmath>
 
-#include "platform/Platform.h"
 #include "platform/ui/DrawingContext.h"
 #include "platform/ui/Painter.h"
 
@@ -46,9 +45,9 @@ void StyledLabel::invalidateText() {
 const TextLayoutRef& StyledLabel::layOut(Measured& measured, double width, std::size_t lines) {
   const bool rightToLeft = isRightToLeft();
   if (!measured.layout || measured.width != width || measured.lines != lines || measured.rightToLeft != rightToLeft) {
-    measured = {Platform::current().text().layOut(*_text, _font->descriptor(), width, lines, TextAlignment::natural,
-                                                  rightToLeft),
-                width, lines, rightToLeft};
+    measured = {
+        TextSystem::current().layOut(*_text, _font->descriptor(), width, lines, TextAlignment::natural, rightToLeft),
+        width, lines, rightToLeft};
   }
   return measured.layout;
 }

@@ -4,8 +4,8 @@
 #include <memory>
 #include <string>
 
+#include "platform/foundation/Geometry.h"
 #include "platform/foundation/Object.h"
-#include "platform/ui/Geometry.h"
 
 namespace nimbo {
 
@@ -48,6 +48,8 @@ enum class TextAlignment { natural, center };
 class TextSystem {
  public:
   virtual ~TextSystem() = default;
+  /// That of the platform in force.
+  static TextSystem& current();
   virtual FontMetrics metrics(const FontDescriptor& font) = 0;
   /// Breaks `text` (UTF-8; bad bytes are replaced) at `maxWidth` points into at most `maxLines` lines (0: any number),
   /// with an ellipsis where it is cut. Lines run in the direction of their script; `rightToLeft` is the direction of

@@ -3,7 +3,6 @@
 #include <algorithm>
 #include <cmath>
 
-#include "platform/Platform.h"
 #include "platform/ui/DrawingContext.h"
 #include "platform/ui/Painter.h"
 #include "platform/ui/RoundToViewScale.h"
@@ -119,9 +118,9 @@ void TransitInfoLabelView::fillRow(Row& row, const std::vector<std::pair<std::si
         row.text = _truncationTextGenerator(shields.size() - shown);
         row.textX = ends[shown] + (shown > 0 ? _spaceBetweenShields : 0);
         // Alone it is cut off if need be; after shields it has to fit.
-        row.textLayout = Platform::current().text().layOut(row.text, _font->descriptor(),
-                                                           shown > 0 ? kUnboundedTextWidth : *_maxWidth, 1,
-                                                           TextAlignment::natural, row.rightToLeft);
+        row.textLayout =
+            TextSystem::current().layOut(row.text, _font->descriptor(), shown > 0 ? kUnboundedTextWidth : *_maxWidth, 1,
+                                         TextAlignment::natural, row.rightToLeft);
         if (shown == 0 || row.textX + row.textLayout->size().width <= room) break;
       }
     }

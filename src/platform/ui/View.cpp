@@ -5,7 +5,6 @@
 #include <stdexcept>
 #include <utility>
 
-#include "platform/Platform.h"
 #include "platform/ui/DrawingContext.h"
 #include "platform/ui/Environment.h"
 #include "platform/ui/Painter.h"
@@ -117,7 +116,7 @@ double View::screenScale() const {
 
 bool View::isRightToLeft() const {
   if (_rightToLeft) return *_rightToLeft;
-  return _superview ? _superview->isRightToLeft() : Platform::current().strings().isRightToLeft();
+  return _superview ? _superview->isRightToLeft() : Environment::current().isRightToLeft();
 }
 
 void View::setRightToLeft(std::optional<bool> rightToLeft) {

@@ -4,8 +4,8 @@
 #include <optional>
 #include <vector>
 
+#include "platform/foundation/Geometry.h"
 #include "platform/ui/ContentSize.h"
-#include "platform/ui/Geometry.h"
 #include "platform/ui/layout/LayoutConstraint.h"
 #include "platform/ui/layout/LayoutGuide.h"
 

@@ -3,9 +3,9 @@
 #include <memory>
 #include <string>
 
-#include "platform/WidgetHost.h"
 #include "platform/foundation/Object.h"
 #include "platform/ui/View.h"
+#include "platform/ui/WidgetHost.h"
 
 namespace nimbo {
 

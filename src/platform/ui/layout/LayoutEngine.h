@@ -8,7 +8,7 @@
 #include <utility>
 #include <vector>
 
-#include "platform/ui/Geometry.h"
+#include "platform/foundation/Geometry.h"
 #include "platform/ui/layout/ConstraintInstaller.h"
 
 namespace nimbo {

@@ -1,6 +1,6 @@
 #pragma once
 
-#include "platform/ui/Geometry.h"
+#include "platform/foundation/Geometry.h"
 #include "platform/ui/layout/LayoutItem.h"
 
 namespace nimbo {

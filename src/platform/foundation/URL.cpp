@@ -1,4 +1,4 @@
-#include "platform/URL.h"
+#include "platform/foundation/URL.h"
 
 #include <cstdio>
 

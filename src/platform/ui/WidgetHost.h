@@ -3,14 +3,11 @@
 #include <functional>
 #include <limits>
 
-#include "platform/URL.h"
-#include "platform/ui/Geometry.h"
+#include "platform/foundation/Geometry.h"
+#include "platform/foundation/Presentation.h"
+#include "platform/foundation/URL.h"
 
 namespace nimbo {
-
-enum class WidgetDisplayMode { Compact = 0, Expanded = 1 };
-
-enum class WidgetUpdateResult { NewData = 0, NoData = 1, Failed = 2 };
 
 class VisualEffect;
 
