@@ -4,14 +4,17 @@
 
 #include "Fuzz.h"
 #include "desktop/archive/CBORKeyedArchive.h"
-#include "desktop/archive/HandoffDecoder.h"
 #include "platform/wire/StoredTransitIncident.h"
 #include "platform/wire/StoredTransitLineItem.h"
+#include "process/HandoffDecoder.h"
+#include "protocol/Coding.h"
 #include "widget/NBTransitIncidentViewControllerState.h"
 
 namespace nimbo {
 
 namespace {
+
+constexpr auto kReplace = nlohmann::json::error_handler_t::replace;
 
 /// The root as an object, of whatever class it is.
 ObjectRef rootOf(std::span<const std::uint8_t> bytes, DecodingFailurePolicy policy) {
@@ -35,9 +38,14 @@ ObjectRef rootOf(std::span<const std::uint8_t> bytes, DecodingFailurePolicy poli
 }  // namespace
 
 extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size) {
-  const auto shown = decodeHandoff({data, size});
-  require(shown.json.has_value() == (shown.error == nullptr), "what cannot be shown has a reason");
-  require(!shown.json || nlohmann::json::accept(*shown.json), "what is shown is JSON");
+  if (const auto decoded = decodeHandoff({data, size})) {
+    require(nlohmann::json::accept(decoded->text), "what is shown is JSON");
+    // As a line, where what is not UTF-8 is replaced.
+    const auto line = nlohmann::json::parse(protocol::write(*decoded).dump(-1, ' ', false, kReplace));
+    require(protocol::write(protocol::read<protocol::Handoff>(line)) == line, "what is answered can be read");
+  } else {
+    require(!decoded.error()->reason().empty(), "what cannot be shown has a reason");
+  }
 
   const ObjectRef root = rootOf({data, size}, DecodingFailurePolicy::setErrorAndReturn);
   try {

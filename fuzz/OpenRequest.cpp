@@ -15,8 +15,9 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size
   const auto request = openRequestOfURL(textOf(data, size));
   if (!request) {
     require(!request.error()->reason().empty(), "what cannot be opened has a reason");
-  } else if (const auto* line = std::get_if<ShowLine>(&*request)) {
-    require(line->line != nullptr, "a line to be shown is there");
+  } else {
+    require(!std::holds_alternative<ShowLine>(*request) && !std::holds_alternative<ShowIncidents>(*request),
+            "what others hand over goes through the widget process");
   }
   return 0;
 }

@@ -14,9 +14,6 @@ namespace nimbo {
 
 namespace {
 
-/// User-info key of the compressed `NimboActivity`.
-constexpr std::string_view kActivityRecordKey = "bs";
-
 /// The payloads of objects that are alive. A line has a row for each of its incidents, and all rows are made anew
 /// whenever an incident starts or ends; compressing takes a hundred times what the rest of a row takes.
 class PayloadCache {
@@ -58,14 +55,15 @@ NBUserActivityDataRef activityData(const std::string& activityType, std::string_
 }  // namespace
 
 NBUserActivityDataRef activityDataForLineItem(const TransitLineItemRef& lineItem) {
-  return activityData(kNimboTransitWidgetIncidentActivityType, kActivityRecordKey, {lineItem}, [&] {
-    NimboActivity activity;
-    activity.setLineItem(StoredTransitLineItem::initWithLineItem(lineItem));
-    const auto displayOptions = std::make_shared<MapDisplayOptions>();
-    displayOptions->setMapType(kMapTypeTransit);
-    activity.setDisplayOptions(displayOptions);
-    return bzip2CompressedData(activity.data());
-  });
+  return activityData(kNimboTransitWidgetIncidentActivityType, kNimboTransitWidgetIncidentActivityUserInfoKey,
+                      {lineItem}, [&] {
+                        NimboActivity activity;
+                        activity.setLineItem(StoredTransitLineItem::initWithLineItem(lineItem));
+                        const auto displayOptions = std::make_shared<MapDisplayOptions>();
+                        displayOptions->setMapType(kMapTypeTransit);
+                        activity.setDisplayOptions(displayOptions);
+                        return bzip2CompressedData(activity.data());
+                      });
 }
 
 NBUserActivityDataRef activityDataForIncidents(const TransitIncidents& incidents) {

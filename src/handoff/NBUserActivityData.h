@@ -9,17 +9,6 @@
 
 namespace nimbo {
 
-/// Activity that opens the map application at one line. User info: "bs", a bzip2 stream of a `NimboActivity`.
-inline const std::string kNimboTransitWidgetIncidentActivityType =
-    std::string(kHostApplicationIdentifier) + ".Transit.Incident";
-
-/// Activity that opens the map application at a list of incidents.
-inline const std::string kNimboTransitWidgetIncidentSummaryActivityType =
-    std::string(kHostApplicationIdentifier) + ".Transit.IncidentList";
-
-/// User-info key of the list's incidents: a keyed archive of an array of `StoredTransitIncident`.
-inline constexpr std::string_view kNimboTransitWidgetIncidentSummaryActivityUserInfoKey = "incidentListKey";
-
 /// Domain of an activity that the system does not create.
 inline constexpr std::string_view kNBUserActivityErrorDomain = "NBUserActivityErrorDomain";
 

@@ -6,10 +6,12 @@
 #include <iostream>
 #include <iterator>
 
-#include "desktop/archive/HandoffDecoder.h"
 #include "desktop/rpc/Base64.h"
 #include "host/HostPlatform.h"
 #include "host/TerminalText.h"
+#include "host/WidgetClient.h"
+#include "protocol/Coding.h"
+#include "protocol/Methods.h"
 
 namespace nimbo {
 
@@ -91,7 +93,7 @@ int runAnalytics(const CommandContext& context, bool json) {
   return kExitSuccess;
 }
 
-int runDecode(const std::string& file) {
+int runDecode(const CommandContext& context, const std::string& file) {
   std::ifstream opened;
   if (file != "-") {
     opened.open(file, std::ios::binary);
@@ -100,9 +102,13 @@ int runDecode(const std::string& file) {
   std::istream& input = file == "-" ? std::cin : opened;
   const Bytes bytes{std::istreambuf_iterator<char>(input), std::istreambuf_iterator<char>()};
   if (input.bad()) throw CommandFailure("cannot read " + file + ": " + std::strerror(errno));
-  const DecodedHandoff decoded = decodeHandoff(bytes);
-  if (decoded.error) throw CommandFailure(file + ": " + decoded.error->reason());
-  std::cout << *decoded.json << "\n";
+  WidgetClient client(context.runLoop, context.widgetArguments);
+  try {
+    const auto answer = client.call(protocol::kDecode.name, protocol::write(protocol::DecodeParams{base64(bytes)}));
+    std::cout << protocol::read<protocol::Handoff>(answer).text << "\n";
+  } catch (const WidgetRefusal& refusal) {
+    throw CommandFailure(file + ": " + refusal.error.message);
+  }
   return kExitSuccess;
 }
 

@@ -15,8 +15,8 @@ int runSettingsUnset(const CommandContext& context, const std::string& key);
 /// Prints the analytics that are kept, the oldest first.
 int runAnalytics(const CommandContext& context, bool json);
 
-/// Reads a hand-off payload or a saved state and prints it as JSON; "-" is the standard input. Fails with what is wrong
-/// and where.
-int runDecode(const std::string& file);
+/// Has the widget process read a hand-off payload or a saved state, and prints it as JSON; "-" is the standard input.
+/// Fails with what is wrong and where.
+int runDecode(const CommandContext& context, const std::string& file);
 
 }  // namespace nimbo

@@ -121,7 +121,7 @@ json WidgetClient::call(std::string_view method, const json& params) {
     failure = error;
   });
   waitUntil([&] { return answer.has_value(); });
-  if (failure && _running) throw WidgetClientFailure(std::string(method) + ": " + failure->message);
+  if (failure && _running) throw WidgetRefusal(method, *failure);
   if (failure) waitUntil([] { return false; });  // says how the process ended
   return *answer;
 }

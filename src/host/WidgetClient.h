@@ -23,6 +23,13 @@ struct WidgetClientFailure : std::runtime_error {
   using std::runtime_error::runtime_error;
 };
 
+/// An error answer of the widget process.
+struct WidgetRefusal : WidgetClientFailure {
+  WidgetRefusal(std::string_view method, const JSONRPCError& answer)
+      : WidgetClientFailure(std::string(method) + ": " + answer.message), error(answer) {}
+  JSONRPCError error;
+};
+
 /// A widget process of one's own: starts it, speaks its protocol, ends it. Main thread only.
 class WidgetClient {
  public:
@@ -46,7 +53,8 @@ class WidgetClient {
   /// Ends a process that is not to be trusted to end by itself.
   void kill();
 
-  /// Asks and waits for the answer, serving the widget's own requests meanwhile. Throws WidgetClientFailure.
+  /// Asks and waits for the answer, serving the widget's own requests meanwhile. Throws WidgetClientFailure, for an
+  /// error answer WidgetRefusal.
   nlohmann::json call(std::string_view method, const nlohmann::json& params = nlohmann::json::object());
   /// Runs the loop until `done` answers true. Throws WidgetClientFailure when the process ends first, or after
   /// `kPatience` seconds without a word from it.

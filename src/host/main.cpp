@@ -157,7 +157,7 @@ void CommandLine::addStateCommands() {
                             [this](const CommandContext& context) { return runAnalytics(context, _json); });
   analytics->add_flag("--json", _json, "One JSON object a line");
   CLI::App* decode = add(_app, "decode", "Print a hand-off payload or a saved state as JSON",
-                         [this](const CommandContext&) { return runDecode(_file); });
+                         [this](const CommandContext& context) { return runDecode(context, _file); });
   decode->add_option("FILE", _file, "File with the bytes; - for the standard input")->required();
 }
 

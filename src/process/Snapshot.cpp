@@ -32,6 +32,7 @@ json shieldJSON(const TransitArtwork* artwork) {
   const auto& shield = artwork->shieldDataSource();
   return {{"text", shield ? optionalText(shield->shieldText) : json()},
           {"color", shield ? optionalText(shield->shieldColorString) : json()},
+          {"textColor", shield ? optionalText(shield->shieldTextColorString) : json()},
           {"type", shield ? shield->shieldType : 0},
           {"icon", artwork->iconDataSource() ? iconJSON(*artwork->iconDataSource()) : json()},
           {"accessibilityText", optionalText(artwork->accessibilityText())}};

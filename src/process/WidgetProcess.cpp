@@ -6,10 +6,14 @@
 
 #include "desktop/drawing/Rendering.h"
 #include "desktop/gtfs/LineNames.h"
+#include "desktop/rpc/Base64.h"
 #include "platform/ui/SystemColors.h"
+#include "process/HandoffDecoder.h"
 #include "process/HostLogSink.h"
 #include "process/SharedSurface.h"
 #include "process/Snapshot.h"
+#include "protocol/Coding.h"
+#include "protocol/Methods.h"
 
 namespace nimbo {
 
@@ -73,6 +77,9 @@ WidgetProcess::WidgetProcess(Options options, int input, int output)
   addViewMethod("render", &WidgetProcess::render);
   addViewMethod("setAppearance", &WidgetProcess::setAppearance);
   addViewMethod("setScale", &WidgetProcess::setScale);
+  _connection.setHandler(protocol::kDecode.name, [](const json& params, const JSONRPCResponder& responder) {
+    responder.answer(decode(params));
+  });
   if (_virtualTime) addMethod("advanceTime", &WidgetProcess::advanceTime);
   _connection.setHandler("performUpdate",
                          [this](const json&, const JSONRPCResponder& responder) { performUpdate(responder); });
@@ -309,6 +316,20 @@ json WidgetProcess::advanceTime(const Parameters& params) {
   if (!_platform) throw JSONRPCFailure(JSONRPCError::kInvalidState, "advanceTime needs \"initialize\" first");
   _virtualTime->advance(params.number("seconds", 0, kLongestAdvance));
   return {{"now", isoTextOfDate(_virtualTime->now())}};
+}
+
+json WidgetProcess::decode(const json& params) {
+  const auto bytes = [&] {
+    try {
+      return bytesFromBase64(protocol::read<protocol::DecodeParams>(params).bytes);
+    } catch (const protocol::Malformed& malformed) {
+      throw JSONRPCFailure(JSONRPCError::kInvalidParams, std::string("parameter ") + malformed.what());
+    }
+  }();
+  if (!bytes) throw JSONRPCFailure(JSONRPCError::kInvalidParams, "parameter \"bytes\" must be Base64");
+  const Outcome<protocol::Handoff> handoff = decodeHandoff(*bytes);
+  if (!handoff) throw JSONRPCFailure(JSONRPCError::kBrokenPayload, handoff.error()->reason());
+  return protocol::write(*handoff);
 }
 
 json WidgetProcess::shutdown(const Parameters&) {

@@ -58,6 +58,7 @@ class WidgetProcess {
   nlohmann::json setAppearance(const Parameters& params);
   nlohmann::json setScale(const Parameters& params);
   nlohmann::json advanceTime(const Parameters& params);
+  static nlohmann::json decode(const nlohmann::json& params);
   nlohmann::json shutdown(const Parameters& params);
   void performUpdate(const JSONRPCResponder& responder);
 

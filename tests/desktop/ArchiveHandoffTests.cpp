@@ -6,9 +6,9 @@
 
 #include "desktop/archive/Bzip2.h"
 #include "desktop/archive/CBORKeyedArchive.h"
-#include "desktop/archive/HandoffDecoder.h"
 #include "handoff/NBUserActivityData+Payloads.h"
 #include "handoff/NimboActivity.h"
+#include "process/HandoffDecoder.h"
 #include "support/TestPlatform.h"
 #include "support/TransitFixtures.h"
 #include "widget/NBTransitIncidentViewControllerState.h"
@@ -33,9 +33,9 @@ TEST_F(HandoffPayload, OfEachKindIsShownWithItsContent) {
   const Date date = *dateFromISOText("2026-01-05T12:00:00.5Z");
   const TransitLineItemRef line = lineItem(7, "Line 7", {incident(UINT64_MAX, date)});
   const auto shown = [](const Bytes& bytes) {
-    const auto [text, error] = decodeHandoff(bytes);
-    EXPECT_FALSE(error) << error->reason();
-    return text ? json::parse(*text) : json();
+    const auto handoff = decodeHandoff(bytes);
+    EXPECT_TRUE(handoff) << handoff.error()->reason();
+    return handoff ? json::parse(handoff->text) : json();
   };
   const json lineJSON = shown(payload(activityDataForLineItem(line), "bs"))["NimboActivity"];
   EXPECT_EQ(lineJSON["displayOptions"], json({{"mapType", 3}}));
@@ -89,13 +89,14 @@ TEST_F(HandoffPayload, ThatIsBrokenIsToldWithItsPlace) {
       {text("\xa2\x68"), "the archive is broken: byte 3: "},
   };
   for (const auto& test : cases) {
-    const auto [shown, error] = decodeHandoff(test.bytes);
-    EXPECT_FALSE(shown) << *shown;
-    ASSERT_TRUE(error) << test.reason;
-    EXPECT_NE(error->reason().find(test.reason), std::string::npos) << error->reason() << "\nnot: " << test.reason;
+    const auto shown = decodeHandoff(test.bytes);
+    ASSERT_FALSE(shown) << shown->text;
+    EXPECT_NE(shown.error()->reason().find(test.reason), std::string::npos)
+        << shown.error()->reason() << "\nnot: " << test.reason;
   }
   for (std::size_t length = 4; length < whole.size(); ++length)
-    EXPECT_NE(decodeHandoff(std::span(whole).first(length)).error->reason().find("bzip2"), std::string::npos) << length;
+    EXPECT_NE(decodeHandoff(std::span(whole).first(length)).error()->reason().find("bzip2"), std::string::npos)
+        << length;
 }
 
 TEST_F(HandoffPayload, OfALineIsMadeOnceWhileTheLineLives) {

@@ -7,9 +7,9 @@
 #include <string_view>
 #include <vector>
 
-#include "desktop/gtfs/Outcome.h"
 #include "desktop/gtfs/SkipReport.h"
 #include "platform/foundation/Date.h"
+#include "platform/foundation/Outcome.h"
 
 namespace nimbo {
 

@@ -4,7 +4,7 @@
 #include <string>
 #include <string_view>
 
-#include "desktop/gtfs/Outcome.h"
+#include "platform/foundation/Outcome.h"
 
 namespace nimbo {
 

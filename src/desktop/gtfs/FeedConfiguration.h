@@ -6,7 +6,7 @@
 #include <vector>
 
 #include "desktop/gtfs/Feed.h"
-#include "desktop/gtfs/Outcome.h"
+#include "platform/foundation/Outcome.h"
 
 namespace nimbo {
 

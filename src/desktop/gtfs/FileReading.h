@@ -4,7 +4,7 @@
 #include <filesystem>
 #include <string>
 
-#include "desktop/gtfs/Outcome.h"
+#include "platform/foundation/Outcome.h"
 
 namespace nimbo {
 

@@ -8,7 +8,7 @@
 #include <string_view>
 
 #include "desktop/gtfs/FeedAddress.h"
-#include "desktop/gtfs/Outcome.h"
+#include "platform/foundation/Outcome.h"
 
 namespace nimbo {
 

@@ -5,7 +5,7 @@
 #include <memory>
 #include <string_view>
 
-#include "desktop/gtfs/Outcome.h"
+#include "platform/foundation/Outcome.h"
 
 namespace nimbo {
 

@@ -22,6 +22,8 @@ struct JSONRPCError {
   static constexpr int kInvalidState = -32001;
   /// Drawing failed.
   static constexpr int kDrawingFailed = -32002;
+  /// Bytes that are to be decoded are neither a hand-off nor a saved state, or broken.
+  static constexpr int kBrokenPayload = -32003;
   /// Never sent: no answer comes because the connection is closed.
   static constexpr int kConnectionClosed = -1;
 };

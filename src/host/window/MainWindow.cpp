@@ -125,6 +125,14 @@ void MainWindow::open(const OpenRequest& request) {
     void operator()(const ShowIncidents& show) {
       window.push(std::make_unique<IncidentListPage>(window._context, show.incidents));
     }
+    void operator()(const ShowHandoff& show) {
+      window._widgetPage->decode(show.payload, [&window = window, show](const Outcome<protocol::Handoff>& decoded) {
+        if (const auto request = openRequestOfHandoff(show, decoded))
+          window.open(*request);
+        else
+          window.tell(request.error()->reason());
+      });
+    }
   };
   std::visit(Opener{*this}, request);
 }

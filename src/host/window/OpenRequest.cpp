@@ -2,13 +2,11 @@
 
 #include <glib.h>
 
-#include "desktop/archive/HandoffDecoder.h"
 #include "desktop/rpc/Base64.h"
-#include "handoff/NBUserActivityData.h"
-#include "handoff/NimboActivity.h"
 #include "platform/HostApplication.h"
 #include "platform/Localization.h"
-#include "platform/wire/StoredTransitIncident.h"
+#include "platform/transit/BasicTransitIncident.h"
+#include "platform/transit/BasicTransitLineItem.h"
 
 namespace nimbo {
 
@@ -16,7 +14,6 @@ namespace {
 
 constexpr std::string_view kOpenErrorDomain = "org.nimbo.Open";
 constexpr std::string_view kActivityHost = "activity";
-constexpr std::string_view kIncidentKey = "bs";
 
 ErrorRef refusal(std::string_view key, const std::string& detail) {
   return Error::errorWithDomain_code_reason(std::string(kOpenErrorDomain), 0,
@@ -62,6 +59,55 @@ Outcome<OpenRequest> requestOfActivityURL(const URLParts& parts) {
   return openRequestOfActivity(type, userInfo);
 }
 
+std::string_view payloadKey(bool isLine) {
+  return isLine ? kNimboTransitWidgetIncidentActivityUserInfoKey
+                : kNimboTransitWidgetIncidentSummaryActivityUserInfoKey;
+}
+
+TransitArtworkRef artworkOf(const std::optional<protocol::Shield>& shield) {
+  if (!shield) return nullptr;
+  TransitArtwork::Fields fields;
+  const bool isIcon = shield->icon && !shield->text;
+  fields.artworkSourceType = static_cast<std::int64_t>(isIcon ? ArtworkSourceType::icon : ArtworkSourceType::shield);
+  if (!isIcon) fields.shieldDataSource = TransitShield{shield->type, shield->text, shield->color, shield->textColor};
+  if (const auto& icon = shield->icon)
+    fields.iconDataSource = TransitIcon{icon->iconType, icon->cartoID, icon->defaultTransitType, icon->iconAttributeKey,
+                                        icon->iconAttributeValue};
+  fields.accessibilityText = shield->accessibilityText;
+  return std::make_shared<const TransitArtwork>(std::move(fields));
+}
+
+TransitIncidents incidentsOf(const std::vector<protocol::Incident>& incidents) {
+  TransitIncidents result;
+  for (const protocol::Incident& incident : incidents) {
+    BasicTransitIncident::Fields fields{.muid = incident.muid,
+                                        .title = incident.title,
+                                        .summary = incident.summary,
+                                        .fullDescription = incident.fullDescription,
+                                        .startDate = incident.startDate,
+                                        .endDate = incident.endDate,
+                                        .lastUpdated = incident.lastUpdated,
+                                        .isBlockingIncident = incident.isBlocking,
+                                        .linkURL = incident.linkURL};
+    for (const std::uint64_t line : incident.affectedLines)
+      fields.affectedEntities.push_back(std::make_shared<const BasicAffectedEntity>(line));
+    result.push_back(std::make_shared<const BasicTransitIncident>(std::move(fields)));
+  }
+  return result;
+}
+
+TransitLineItemRef lineItemOf(const protocol::Line& line) {
+  BasicTransitLineItem::Fields fields;
+  fields.identifier = std::make_shared<const MapItemIdentifier>(line.muid);
+  fields.name = line.name;
+  if (line.system)
+    fields.system = std::make_shared<const TransitSystem>(0, line.system->name, artworkOf(line.system->artwork));
+  fields.artwork = artworkOf(line.artwork);
+  fields.alternateArtwork = artworkOf(line.alternateArtwork);
+  fields.incidents = incidentsOf(line.incidents);
+  return std::make_shared<const BasicTransitLineItem>(std::move(fields));
+}
+
 }  // namespace
 
 Outcome<OpenRequest> openRequestOfURL(std::string_view text) {
@@ -80,20 +126,16 @@ Outcome<OpenRequest> openRequestOfActivity(std::string_view activityType,
   const bool isLine = activityType == kNimboTransitWidgetIncidentActivityType;
   if (!isLine && activityType != kNimboTransitWidgetIncidentSummaryActivityType)
     return badPayload("\"" + std::string(activityType) + "\"");
-  const std::string_view key = isLine ? kIncidentKey : kNimboTransitWidgetIncidentSummaryActivityUserInfoKey;
-  const auto payload = userInfo.find(key);
-  if (payload == userInfo.end()) return badPayload("\"" + std::string(key) + "\"");
-  const auto [content, error] = readHandoff(payload->second);
-  if (error) return badPayload(error->reason());
-  if (const auto* activity = dynamic_cast<const NimboActivity*>(content.get());
-      isLine && activity && activity->hasLineItem())
-    return OpenRequest(ShowLine{activity->lineItem()});
-  if (const auto* incidents = dynamic_cast<const BoxedArray*>(content.get()); !isLine && incidents) {
-    TransitIncidents list;
-    for (const auto& incident : incidents->elementsOfClass<StoredTransitIncident>()) list.push_back(incident);
-    return OpenRequest(ShowIncidents{std::move(list)});
-  }
-  return badPayload("\"" + std::string(key) + "\"");
+  const auto payload = userInfo.find(payloadKey(isLine));
+  if (payload == userInfo.end()) return badPayload("\"" + std::string(payloadKey(isLine)) + "\"");
+  return OpenRequest(ShowHandoff{isLine, payload->second});
+}
+
+Outcome<OpenRequest> openRequestOfHandoff(const ShowHandoff& handoff, const Outcome<protocol::Handoff>& decoded) {
+  if (!decoded) return badPayload(decoded.error()->reason());
+  if (handoff.isLine && decoded->line) return OpenRequest(ShowLine{lineItemOf(*decoded->line)});
+  if (!handoff.isLine && decoded->incidents) return OpenRequest(ShowIncidents{incidentsOf(*decoded->incidents)});
+  return badPayload("\"" + std::string(payloadKey(handoff.isLine)) + "\"");
 }
 
 }  // namespace nimbo

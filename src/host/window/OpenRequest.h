@@ -6,9 +6,10 @@
 #include <string_view>
 #include <variant>
 
-#include "desktop/gtfs/Outcome.h"
 #include "platform/foundation/Boxed.h"
+#include "platform/foundation/Outcome.h"
 #include "platform/transit/TransitLineItem.h"
+#include "protocol/Handoff.h"
 
 namespace nimbo {
 
@@ -27,8 +28,14 @@ struct ShowIncidents {
   TransitIncidents incidents;
 };
 
+/// What a hand-off holds, which the widget process has to read first.
+struct ShowHandoff {
+  bool isLine = false;  ///< a line is expected, else a list of incidents
+  Bytes payload;
+};
+
 /// A place in the application that somebody asks for: a row of the widget, another program, or a user.
-using OpenRequest = std::variant<ShowWidget, ShowFavorites, ShowFeeds, ShowLine, ShowIncidents>;
+using OpenRequest = std::variant<ShowWidget, ShowFavorites, ShowFeeds, ShowLine, ShowIncidents, ShowHandoff>;
 
 /// What a URL of the application's scheme asks for: "nimbo://?favorites=2&t=r" and "nimbo://?t=r" for the favourites,
 /// "nimbo://" for the widget screen, or a hand-off as "nimbo://activity?type=TYPE&KEY=BASE64", percent-encoded. Errors
@@ -38,5 +45,8 @@ Outcome<OpenRequest> openRequestOfURL(std::string_view url);
 /// What a hand-off activity asks for, from its payload alone.
 Outcome<OpenRequest> openRequestOfActivity(std::string_view activityType,
                                            const std::map<std::string, Bytes, std::less<>>& userInfo);
+
+/// The line or the incidents that a hand-off turned out to hold; `decoded` is the answer to "decode".
+Outcome<OpenRequest> openRequestOfHandoff(const ShowHandoff& handoff, const Outcome<protocol::Handoff>& decoded);
 
 }  // namespace nimbo

@@ -3,13 +3,19 @@
 #include <algorithm>
 #include <system_error>
 
+#include "desktop/rpc/Base64.h"
 #include "platform/foundation/Log.h"
+#include "protocol/Coding.h"
+#include "protocol/Methods.h"
 
 namespace nimbo {
 
 using nlohmann::json;
 
 namespace {
+
+/// Domain of the errors of a process that is asked and does not answer as it should.
+constexpr std::string_view kProcessErrorDomain = "org.nimbo.WidgetHostProcess";
 
 constexpr LogFacility kLog{kDefaultLogSubsystem, "WidgetHostProcess"};
 
@@ -39,12 +45,17 @@ void WidgetHostProcess::setVisible(bool visible) {
       start();
   } else if (_widget) {
     disappear();
-    _hiddenTimer = _runLoop.scheduleTimer(kHiddenPatience, false, [this](Timer&) {
-      _hiddenTimer = nullptr;
-      stop();
-      setUpdating(false);
-    });
+    stopLater();
   }
+}
+
+void WidgetHostProcess::stopLater() {
+  if (_hiddenTimer) _hiddenTimer->invalidate();
+  _hiddenTimer = _runLoop.scheduleTimer(kHiddenPatience, false, [this](Timer&) {
+    _hiddenTimer = nullptr;
+    stop();
+    setUpdating(false);
+  });
 }
 
 void WidgetHostProcess::setPresentation(const WidgetPresentation& presentation) {
@@ -103,7 +114,10 @@ void WidgetHostProcess::start() {
   if (_isExpanded) initialization["activeDisplayMode"] = "expanded";
   _widget->ask("initialize", initialization);
   _widget->ask("loadView");
-  appear();
+  if (_visible)
+    appear();
+  else
+    stopLater();
 }
 
 void WidgetHostProcess::setUpConnection() {
@@ -222,5 +236,23 @@ void WidgetHostProcess::highlightRow(std::size_t row, bool highlighted) {
 }
 
 void WidgetHostProcess::selectRow(std::size_t row) { askOfRow("selectRow", row); }
+
+void WidgetHostProcess::decode(const Bytes& handoff,
+                               std::function<void(const Outcome<protocol::Handoff>&)> completion) {
+  const auto failure = [](std::string reason) {
+    return Error::errorWithDomain_code_reason(std::string(kProcessErrorDomain), 0, std::move(reason));
+  };
+  if (!_widget && !_gaveUp) start();
+  if (!_widget) return completion(failure("the widget process does not run"));
+  _widget->call(protocol::kDecode.name, protocol::write(protocol::DecodeParams{base64(handoff)}),
+                [this, failure, completion = std::move(completion)](const json& result, const auto& error) {
+                  if (error) return completion(failure(error->message));
+                  try {
+                    completion(protocol::read<protocol::Handoff>(result));
+                  } catch (const protocol::Malformed& malformed) {
+                    _widget->fail(std::string("it answers \"decode\" with nonsense: ") + malformed.what());
+                  }
+                });
+}
 
 }  // namespace nimbo

@@ -10,6 +10,8 @@
 #include "host/WatchedWidget.h"
 #include "host/window/WidgetContent.h"
 #include "platform/Clock.h"
+#include "platform/foundation/Outcome.h"
+#include "protocol/Handoff.h"
 
 namespace nimbo {
 
@@ -49,6 +51,9 @@ class WidgetHostProcess {
   void update();
   void highlightRow(std::size_t row, bool highlighted);
   void selectRow(std::size_t row);
+  /// Has the process read a hand-off; one that is not running is started for it, and ends as when it is hidden.
+  /// `completion` hears once, unless the process is ended before; errors say what is wrong with the bytes.
+  void decode(const Bytes& handoff, std::function<void(const Outcome<protocol::Handoff>&)> completion);
   /// Starts anew after `widgetDidFail`.
   void restart();
 
@@ -67,6 +72,8 @@ class WidgetHostProcess {
   void appear();
   void disappear();
   void stop();
+  /// Stops a hidden process when it stays so.
+  void stopLater();
   /// Starts another process after one that failed, or gives up.
   void replace(const std::string& reason);
   void giveUp(const std::string& reason);

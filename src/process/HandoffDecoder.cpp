@@ -1,4 +1,4 @@
-#include "desktop/archive/HandoffDecoder.h"
+#include "process/HandoffDecoder.h"
 
 #include <cstdio>
 #include <nlohmann/json.hpp>
@@ -9,6 +9,7 @@
 #include "handoff/NBUserActivityData.h"
 #include "handoff/NimboActivity.h"
 #include "platform/wire/StoredTransitIncident.h"
+#include "platform/wire/StoredTransitLineItem.h"
 #include "widget/NBTransitIncidentViewControllerState.h"
 
 namespace nimbo {
@@ -65,11 +66,63 @@ json jsonOf(const ObjectRef& object) {
   return descriptionOf(object);
 }
 
-HandoffContent failure(std::string reason) {
-  return {nullptr, Error::errorWithDomain_code_reason(std::string(kHandoffErrorDomain), 0, std::move(reason))};
+protocol::Shield shieldOf(const TransitArtwork& artwork) {
+  protocol::Shield result;
+  if (const auto& shield = artwork.shieldDataSource()) {
+    result.text = shield->shieldText;
+    result.color = shield->shieldColorString;
+    result.textColor = shield->shieldTextColorString;
+    result.type = shield->shieldType;
+  }
+  if (const auto& icon = artwork.iconDataSource())
+    result.icon = protocol::Icon{icon->iconType, icon->cartoID, icon->defaultTransitType, icon->iconAttributeKey,
+                                 icon->iconAttributeValue};
+  result.accessibilityText = artwork.accessibilityText();
+  return result;
 }
 
-HandoffContent readRecord(std::span<const std::uint8_t> bytes) {
+std::optional<protocol::Shield> shieldOf(const TransitArtworkRef& artwork) {
+  return artwork ? std::optional(shieldOf(*artwork)) : std::nullopt;
+}
+
+/// A date that can be written; a payload may hold any.
+std::optional<Date> writableDate(std::optional<Date> date) {
+  return date && dateFromISOText(isoTextOfDate(*date)) ? date : std::nullopt;
+}
+
+protocol::Incident incidentOf(const TransitIncident& incident) {
+  protocol::Incident result{.muid = incident.muid(),
+                            .title = incident.title(),
+                            .summary = incident.summary(),
+                            .fullDescription = incident.fullDescription(),
+                            .startDate = writableDate(incident.startDate()),
+                            .endDate = writableDate(incident.endDate()),
+                            .lastUpdated = writableDate(incident.lastUpdated()),
+                            .isBlocking = incident.isBlockingIncident(),
+                            .affectedLines = {},
+                            .linkURL = incident.linkURL()};
+  for (const auto& entity : incident.affectedEntities()) result.affectedLines.push_back(entity->muid());
+  return result;
+}
+
+protocol::Line lineOf(const TransitLineItem& line) {
+  protocol::Line result{.muid = line.muid(),
+                        .name = line.name(),
+                        .system = {},
+                        .artwork = shieldOf(line.artwork()),
+                        .alternateArtwork = shieldOf(line.alternateArtwork()),
+                        .incidents = {}};
+  if (const auto& system = line.system()) result.system = protocol::System{system->name(), shieldOf(system->artwork())};
+  for (const TransitIncidentRef& incident : line.incidents()) result.incidents.push_back(incidentOf(*incident));
+  return result;
+}
+
+ErrorRef failure(std::string reason) {
+  return Error::errorWithDomain_code_reason(std::string(kHandoffErrorDomain), 0, std::move(reason));
+}
+
+/// A NimboActivity.
+Outcome<ObjectRef> readRecord(std::span<const std::uint8_t> bytes) {
   if (bytes.size() > kMaximumRecordSize)
     return failure("the activity record has more than " + std::to_string(kMaximumRecordSize) + " bytes");
   ProtobufReader reader(bytes);
@@ -82,20 +135,21 @@ HandoffContent readRecord(std::span<const std::uint8_t> bytes) {
     return failure(
         "the bytes hold no field of an activity record, and are neither a bzip2 stream nor an archive; "
         "pass the value under \"bs\" or \"incidentListKey\" of a hand-off, or a saved state");
-  return {activity, nullptr};
+  return ObjectRef(activity);
 }
 
-HandoffContent readArchive(std::span<const std::uint8_t> bytes) {
+/// A list of StoredTransitIncident, or an NBTransitIncidentViewControllerState.
+Outcome<ObjectRef> readArchive(std::span<const std::uint8_t> bytes) {
   const CBORKeyedArchive::Opened opened = CBORKeyedArchive::openData(bytes);
-  if (!opened.unarchiver) return {nullptr, opened.error};
+  if (!opened.unarchiver) return opened.error;
   const ArchivableClass& stateClass = NBTransitIncidentViewControllerState::archivedClass();
   opened.unarchiver->setClass_forClassName(stateClass, kEarlierStateClassName);
   opened.unarchiver->setDecodingFailurePolicy(DecodingFailurePolicy::setErrorAndReturn);
   const auto [root, error] = opened.unarchiver->decodeTopLevelObjectOfClasses_forKey(
       {&kArrayClass, &StoredTransitIncident::archivedClass(), &stateClass}, kKeyedArchiveRootObjectKey);
-  if (error) return {nullptr, error};
+  if (error) return error;
   if (!root) return failure("the archive's root holds neither a list of incidents nor a state with a result");
-  return {root, nullptr};
+  return root;
 }
 
 bool isBzip2Stream(std::span<const std::uint8_t> bytes) {
@@ -109,24 +163,32 @@ bool isMap(std::span<const std::uint8_t> bytes) {
   return bytes.front() >> 5 == kMajorTypeMap;
 }
 
-}  // namespace
-
-HandoffContent readHandoff(std::span<const std::uint8_t> bytes) {
+Outcome<ObjectRef> readHandoff(std::span<const std::uint8_t> bytes) {
   if (bytes.empty()) return failure("there are no bytes");
   if (isMap(bytes)) return readArchive(bytes);
   if (!isBzip2Stream(bytes)) return readRecord(bytes);
   const Bzip2Decompressed record = bzip2DecompressedData(bytes, kMaximumRecordSize);
-  return record.bytes ? readRecord(*record.bytes) : HandoffContent{nullptr, record.error};
+  return record.bytes ? readRecord(*record.bytes) : record.error;
 }
 
-DecodedHandoff decodeHandoff(std::span<const std::uint8_t> bytes) {
-  const auto [content, error] = readHandoff(bytes);
-  if (error) return {std::nullopt, error};
-  const bool isList = dynamic_cast<const BoxedArray*>(content.get()) != nullptr;
-  const std::string name(isList ? kNimboTransitWidgetIncidentSummaryActivityUserInfoKey : content->className());
-  const json named{{name, jsonOf(content)}};
+}  // namespace
+
+Outcome<protocol::Handoff> decodeHandoff(std::span<const std::uint8_t> bytes) {
+  const Outcome<ObjectRef> content = readHandoff(bytes);
+  if (!content) return content.error();
+  protocol::Handoff handoff;
+  std::string name((*content)->className());
+  if (const auto* activity = dynamic_cast<const NimboActivity*>(content->get())) {
+    if (activity->hasLineItem()) handoff.line = lineOf(*activity->lineItem());
+  } else if (const auto* list = dynamic_cast<const BoxedArray*>(content->get())) {
+    name = kNimboTransitWidgetIncidentSummaryActivityUserInfoKey;
+    handoff.incidents.emplace();
+    for (const auto& incident : list->elementsOfClass<StoredTransitIncident>())
+      handoff.incidents->push_back(incidentOf(*incident));
+  }
   // Records keep texts as they were sent: what is not UTF-8 is shown as U+FFFD.
-  return {named.dump(2, ' ', false, json::error_handler_t::replace), nullptr};
+  handoff.text = json{{name, jsonOf(*content)}}.dump(2, ' ', false, json::error_handler_t::replace);
+  return handoff;
 }
 
 }  // namespace nimbo
