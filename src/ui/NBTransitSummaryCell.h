@@ -5,34 +5,27 @@
 #include <vector>
 
 #include "items/NBTransitSummaryItem.h"
-#include "platform/ui/StackView.h"
-#include "platform/ui/StyledLabel.h"
-#include "platform/ui/StyledTableCell.h"
 #include "platform/ui/TransitInfoLabelView.h"
-#include "ui/VisualEffectWrappingView.h"
+#include "ui/NBTransitRowCell.h"
 
 namespace nimbo {
 
 /// The compact row of several incidents: a text over one line of shields, which ends with the count of those that do
 /// not fit.
-class NBTransitSummaryCell final : public StyledTableCell {
+class NBTransitSummaryCell final : public NBTransitRowCell {
  public:
   static std::shared_ptr<NBTransitSummaryCell> initWithStyle_reuseIdentifier(TableCellStyle style,
                                                                              const std::string& reuseIdentifier);
-  using StyledTableCell::StyledTableCell;
+  using NBTransitRowCell::NBTransitRowCell;
 
   const NBTransitSummaryItemRef& item() const { return _item; }
   /// Null empties the row; an equal item changes nothing.
   void setItem(NBTransitSummaryItemRef item);
 
-  /// Points; 110 until set.
-  double rowHeight() const { return _rowHeightConstraint->constant(); }
-  void setRowHeight(double height) { _rowHeightConstraint->setConstant(height); }
   /// Draws the shields.
   const std::shared_ptr<ArtworkCache>& artworkCache() const { return _artworksLabel->artworkCache(); }
   void setArtworkCache(std::shared_ptr<ArtworkCache> cache) { _artworksLabel->setArtworkCache(std::move(cache)); }
 
-  const std::shared_ptr<StyledLabel>& primaryLabel() const { return _primaryLabel; }
   const std::shared_ptr<TransitInfoLabelView>& artworksLabel() const { return _artworksLabel; }
 
   void layoutSubviews() override;
@@ -40,23 +33,14 @@ class NBTransitSummaryCell final : public StyledTableCell {
   Size systemLayoutSizeFittingSize_withHorizontalFittingPriority_verticalFittingPriority(
       Size size, LayoutPriority horizontalFittingPriority, LayoutPriority verticalFittingPriority) override;
 
-  bool respondsToOperation(std::string_view name) const override;
-  void performOperation(std::string_view name) override;
   std::string_view className() const override { return "NBTransitSummaryCell"; }
 
  private:
   static FontRef _primaryFont();
   void _createSubviews();
   std::vector<LayoutConstraintRef> _initialConstraints();
-  void _updatePrimaryLabelToContentGuideConstaint();
   void _updateLayout();
 
-  std::shared_ptr<StackView> _stackView;
-  std::shared_ptr<LayoutGuide> _contentGuide;
-  std::shared_ptr<VisualEffectWrappingView> _vibrancyViewForPrimaryLabel;
-  LayoutConstraintRef _rowHeightConstraint;
-  LayoutConstraintRef _primaryLabelToContentGuideConstraint;
-  std::shared_ptr<StyledLabel> _primaryLabel;
   std::shared_ptr<TransitInfoLabelView> _artworksLabel;
   NBTransitSummaryItemRef _item;
 };

@@ -12,6 +12,8 @@
 
 namespace nimbo {
 
+inline constexpr Color kBlack{0, 0, 0, 1}, kWhite{1, 1, 1, 1};
+
 /// Device pixels; right and bottom are outside.
 struct PixelBox {
   int left = 0, top = 0, right = 0, bottom = 0;

@@ -13,7 +13,7 @@
 namespace nimbo {
 namespace {
 
-constexpr Color kBlack{0, 0, 0, 1}, kWhite{1, 1, 1, 1}, kRed{1, 0, 0, 1}, kNone{0, 0, 0, 0};
+constexpr Color kRed{1, 0, 0, 1}, kNone{0, 0, 0, 0};
 
 TEST(Picture, RefusesSizesThatNoMemoryHolds) {
   constexpr double kInfinity = std::numeric_limits<double>::infinity();

@@ -18,7 +18,6 @@ namespace {
 
 constexpr FontDescriptor kBody{17, false};
 constexpr double kUnlimited = std::numeric_limits<double>::infinity();
-constexpr Color kBlack{0, 0, 0, 1}, kWhite{1, 1, 1, 1};
 
 class PangoText : public testing::Test {
  protected:
