@@ -22,7 +22,7 @@ case $purpose in
   package) packages+=(dpkg-dev file) ;;
   *) echo "usage: tools/setup.sh run|test|lint|bench|fuzz" >&2; exit 2 ;;
 esac
-[ "$purpose" != lint ] || packages+=(clang-format clang-tidy git)
+[ "$purpose" != lint ] || packages+=(clang-format clang-tidy git libbenchmark-dev python3-dev libxdamage-dev)
 
 missing=()
 # Fails, and says so, for each package that it has never heard of: those are missing.

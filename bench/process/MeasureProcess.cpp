@@ -26,8 +26,6 @@
 #include <string>
 #include <vector>
 
-extern char** environ;
-
 namespace {
 
 constexpr int kPatience = 120;          // seconds
@@ -116,6 +114,7 @@ int main(int argc, char** argv) {
   posix_spawn_file_actions_adddup2(&actions, toProgram[0], STDIN_FILENO);
   posix_spawn_file_actions_adddup2(&actions, fromProgram[1], STDOUT_FILENO);
   std::vector<char*> arguments;
+  arguments.reserve(words.size() + 1);
   for (std::string& word : words) arguments.push_back(word.data());
   arguments.push_back(nullptr);
 

@@ -9,6 +9,7 @@
 
 #include "desktop/system/GLibRunLoop.h"
 #include "desktop/system/Paths.h"
+#include "platform/foundation/Error.h"
 
 namespace nimbo {
 
@@ -29,6 +30,11 @@ struct CommandContext {
 struct CommandFailure : std::runtime_error {
   using std::runtime_error::runtime_error;
 };
+
+/// Throws the failure that an error tells of; nothing happens for null.
+inline void require(const ErrorRef& error) {
+  if (error) throw CommandFailure(error->reason());
+}
 
 /// Exit statuses of the programs.
 inline constexpr int kExitSuccess = 0;

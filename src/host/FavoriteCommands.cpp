@@ -13,10 +13,6 @@ namespace nimbo {
 
 namespace {
 
-void require(const ErrorRef& error) {
-  if (error) throw CommandFailure(error->reason());
-}
-
 /// Says which lines are gone, and which feeds cannot tell.
 void tellGoneLines(const CommandContext& context, const std::vector<TransitLineRef>& lines) {
   std::vector<MapItemIdentifierRef> identifiers;

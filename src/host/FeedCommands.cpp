@@ -21,10 +21,6 @@ T require(Outcome<T> outcome) {
   return std::move(*outcome);
 }
 
-void require(const ErrorRef& error) {
-  if (error) throw CommandFailure(error->reason());
-}
-
 void printCount(const char* what, std::size_t count) { std::cout << "  " << what << ": " << count << "\n"; }
 
 void printReport(const char* what, const SkipReport& report) {

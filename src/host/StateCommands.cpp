@@ -29,10 +29,6 @@ SharedSettingsStore::Value settingOfText(const std::string& text) {
   return text;
 }
 
-void require(const ErrorRef& error) {
-  if (error) throw CommandFailure(error->reason());
-}
-
 std::string textOfAction(const AnalyticsUserAction& action) {
   std::string text = "action " + std::to_string(action.action) + ", target " + std::to_string(action.target);
   return action.value ? text + ", value " + printableText(*action.value) : text;

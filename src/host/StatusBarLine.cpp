@@ -9,7 +9,7 @@ using nlohmann::json;
 
 namespace {
 
-constexpr const char* kErrorClass = "error";
+constexpr const char* kErrorWord = "error";
 
 std::string escaped(const std::string& text) {
   std::string result;
@@ -37,7 +37,7 @@ std::string escaped(const std::string& text) {
   return result;
 }
 
-std::string textOf(const json& object, const char* key) {
+std::string memberText(const json& object, const char* key) {
   const json text = object.value(key, json());
   return text.is_string() ? text.get<std::string>() : std::string();
 }
@@ -57,11 +57,11 @@ bool isFetched(const json& snapshot) { return snapshot.at("result").is_string();
 /// Tells the rows apart by what they open: incidents an activity, good service and no favourites a URL, an error
 /// nothing.
 std::string classOf(const json& snapshot) {
-  if (snapshot.at("result") == "error") return kErrorClass;
+  if (snapshot.at("result") == "error") return kErrorWord;
   const json& row = snapshot.at("listItem").at("summaryItem");
   if (row.contains("artworks")) return "advisories";
   const json& openable = row.at("openable");
-  if (!openable.is_object()) return isFetched(snapshot) ? "advisories" : kErrorClass;
+  if (!openable.is_object()) return isFetched(snapshot) ? "advisories" : kErrorWord;
   if (!openable.contains("url")) return "advisories";
   return row.at("artwork").is_object() ? "good" : "none";
 }
@@ -71,7 +71,7 @@ std::string shieldOf(const json& row) {
   const json artwork = row.value("artwork", json());
   if (!artwork.is_object()) return {};
   const json shield = artwork.value("shield", json());
-  const std::string text = shield.is_object() ? textOf(shield, "text") : std::string();
+  const std::string text = shield.is_object() ? memberText(shield, "text") : std::string();
   return text.empty() ? text : "[" + text + "] ";
 }
 
@@ -82,10 +82,11 @@ std::string tooltipOf(const json& snapshot) {
   std::string tooltip;
   const auto addLine = [&](const std::string& markup) { tooltip += (tooltip.empty() ? "" : "\n") + markup; };
   for (const json& row : rows) {
-    addLine("<b>" + escaped(shieldOf(row) + textOf(row, "primaryText")) + "</b>");
-    if (const std::string text = textOf(row, "secondaryText"); !text.empty()) addLine(escaped(text));
+    addLine("<b>" + escaped(shieldOf(row) + memberText(row, "primaryText")) + "</b>");
+    if (const std::string text = memberText(row, "secondaryText"); !text.empty()) addLine(escaped(text));
   }
-  if (const json error = snapshot.value("error", json()); error.is_object()) addLine(escaped(textOf(error, "reason")));
+  if (const json error = snapshot.value("error", json()); error.is_object())
+    addLine(escaped(memberText(error, "reason")));
   for (const json& line : snapshot.at("goneLines")) addLine("<i>" + escaped(goneLineText(line)) + "</i>");
   return tooltip;
 }
@@ -96,11 +97,11 @@ std::optional<std::string> statusBarLine(const json& snapshot) {
   const std::string word = classOf(snapshot);
   if (!isFetched(snapshot) && word != "good" && word != "advisories") return std::nullopt;
   const json& row = snapshot.at("listItem").at("summaryItem");
-  return lineOf(escaped(shieldOf(row) + textOf(row, "primaryText")), word, tooltipOf(snapshot));
+  return lineOf(escaped(shieldOf(row) + memberText(row, "primaryText")), word, tooltipOf(snapshot));
 }
 
 std::string statusBarErrorLine(const std::string& reason) {
-  return lineOf("⚠", kErrorClass, "<b>Nimbo Transit</b>\n" + escaped(reason));
+  return lineOf("⚠", kErrorWord, "<b>Nimbo Transit</b>\n" + escaped(reason));
 }
 
 }  // namespace nimbo

@@ -28,7 +28,7 @@ FeedRow::FeedRow(const PageContext& context, const Feed& feed, std::function<voi
   _checkButton.set_label(LocalizedString("Window_Feed_Check"));
   _checkButton.signal_clicked().connect([this] { check(); });
   auto* removeButton = Gtk::make_managed<Gtk::Button>(LocalizedString("Window_Feed_Remove"));
-  removeButton->signal_clicked().connect(std::move(remove));
+  removeButton->signal_clicked().connect(remove);
   buttons->append(_checkButton);
   buttons->append(*removeButton);
   box->append(*buttons);

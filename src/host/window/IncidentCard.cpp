@@ -19,7 +19,7 @@ namespace {
 
 /// More lines than that are a wall.
 constexpr std::size_t kLineLimit = 8;
-constexpr std::int64_t kShieldSize = 3;
+constexpr std::int64_t kCardShieldSize = 3;
 
 /// The publisher's host of a web address; empty for any other address, which is not offered.
 std::string hostOfLink(const std::string& url) {
@@ -122,7 +122,7 @@ void IncidentCard::showAffectedLines(const LinesByNumber& lines) {
       addText(_affectedLines, LocalizedString(_hasLine ? "Window_Incident_AlsoAffects" : "Window_Incident_Affects"),
               "item-caption");
     auto* row = Gtk::make_managed<Gtk::Box>(Gtk::Orientation::HORIZONTAL, 8);
-    row->append(*Gtk::make_managed<ShieldImage>(_context.preferences, artworkOfLine(*line->second), kShieldSize));
+    row->append(*Gtk::make_managed<ShieldImage>(_context.preferences, artworkOfLine(*line->second), kCardShieldSize));
     addText(*row, nameBesideShield(*line->second), "item-text");
     _affectedLines.append(*row);
   }

@@ -12,7 +12,7 @@ namespace nimbo {
 
 namespace {
 
-constexpr std::int64_t kShieldSize = 5;
+constexpr std::int64_t kRowShieldSize = 5;
 /// Shields stand in a column of this width, so that names begin below each other.
 constexpr int kShieldColumn = 56;
 
@@ -25,7 +25,7 @@ LineRow::LineRow(const PageContext& context, TransitLineRef line, bool isFavorit
   _box.add_css_class("item");
   auto* shield = Gtk::make_managed<Gtk::Box>();
   shield->set_size_request(kShieldColumn, -1);
-  shield->append(*Gtk::make_managed<ShieldImage>(context.preferences, artworkOfLine(*_line), kShieldSize));
+  shield->append(*Gtk::make_managed<ShieldImage>(context.preferences, artworkOfLine(*_line), kRowShieldSize));
   _box.append(*shield);
 
   _texts.set_hexpand();
@@ -38,7 +38,7 @@ LineRow::LineRow(const PageContext& context, TransitLineRef line, bool isFavorit
   if (!system.empty()) _said.push_back(system);
   setAccessibleLabel(*this, CommaDelimitedList(_said));
 
-  _star.signal_clicked().connect(std::move(toggle));
+  _star.signal_clicked().connect(toggle);
   _box.append(_star);
   setFavorite(isFavorite);
 }

@@ -14,8 +14,8 @@ namespace {
 std::string textOf(const json& object, std::initializer_list<const char*> keys) {
   if (!object.is_object()) return {};
   for (const char* key : keys)
-    if (const auto found = object.find(key); found != object.end() && found->is_string() && *found != "")
-      return found->get<std::string>();
+    if (const auto found = object.find(key); found != object.end() && found->is_string())
+      if (auto text = found->get<std::string>(); !text.empty()) return text;
   return {};
 }
 
