@@ -13,7 +13,7 @@
 #include "platform/wire/StoredTransitLineItem.h"
 #include "support/TestPlatform.h"
 #include "support/TransitFixtures.h"
-#include "widget/NBTransitIncidentViewControllerState.h"
+#include "widget/NBTransitIncidentsViewController.h"
 
 namespace nimbo {
 namespace {
@@ -252,12 +252,16 @@ TEST_F(Archive, BrokenStatesEndInNothingAndOnlyUndecodableOnesInAnError) {
       {json::to_cbor({{"$archive", 1}}), ""},
       {state({{"expanded", true}}), ""},
       {state({{"lineItemResultSuccess", line}}), ""},
+      {archiveOf(1), ""},
+      {archiveOf(json::array()), ""},
+      {archiveOf({{"$class", "Foreign"}}), ""},
       // Archives that hold what may not stand there.
-      {archiveOf(1), "root: a number is not allowed here"},
-      {archiveOf({{"$class", "Foreign"}}), "root: the class \"Foreign\" is not allowed here"},
+      {archiveOf(nullptr), "root: null stands where an object is needed"},
+      {archiveOf(json::object()), "root: the object has no class name"},
       {state({{"lineItemResultSuccess", {line, {{"$class", "Foreign"}}}}}),
        "root.lineItemResultSuccess[1]: the class \"Foreign\" is not allowed here"},
-      {state({{"lineItemResultSuccess", "text"}}), "root.lineItemResultSuccess: a text is not allowed here"},
+      {state({{"lineItemResultSuccess", "text"}}),
+       "root.lineItemResultSuccess: the class \"String\" is not allowed here"},
       {state({{"lineItemResultSuccess", {{{"$class", "StoredTransitLineItem"}, {"record", 1}}}}}),
        "root.lineItemResultSuccess[0].record: not a byte string but of the kind \"number\""},
       {state({{"lineItemResultSuccess", {{{"$class", "StoredTransitLineItem"}, {"record", json::binary({0x12, 9})}}}}}),
@@ -284,6 +288,60 @@ TEST_F(Archive, BrokenStatesEndInNothingAndOnlyUndecodableOnesInAnError) {
       Result::resultWithValue(BoxedArray::of<TransitLineItem>({wholeLineItem()})), true));
   for (std::size_t length = 0; length < whole.size(); ++length)
     EXPECT_FALSE(archive.unarchiverForReadingFromData(std::span(whole).first(length))) << length;
+}
+
+TEST_F(Archive, SavedRowsThatDoNotDecodeAreRemovedAndOthersKept) {
+  constexpr const char* kKey = "Nimbo.TransitWidget.savedUIData";
+  constexpr const char* kStateClass = "NBTransitIncidentViewControllerState";
+  const auto store = platform.settings.groupStore();
+  const auto load = [] {
+    const auto controller = NBTransitIncidentsViewController::initWithNibName_bundle("", "", nullptr);
+    controller->view();
+    return controller;
+  };
+  const auto restored = [](const NBTransitIncidentsViewController& controller) {
+    return !controller.dataSource()->transitLineItemResult()->isSuccess();
+  };
+  const auto unsaved = Error::errorWithDomain_code_userInfo("D", 1, {{"x", NamedImage::imageNamed("i")}});
+  const Bytes saved = archived(State::initWithLineItemsResult_expanded(
+      Result::resultWithError(Error::errorWithDomain_code_reason("D", 1, "saved")), false));
+  const struct {
+    const char* name;
+    Bytes record;
+    bool isRestored, isKept;
+    const char* line;
+  } cases[] = {
+      {"a state", saved, true, true, "View model loaded"},
+      {"no archive", {1, 2, 3}, false, true, "View model loaded"},
+      {"no result", archiveOf({{"$class", kStateClass}, {"expanded", true}}), false, true, "View model loaded"},
+      {"a root of another class", archiveOf({{"$class", "Foreign"}}), false, true, "View model loaded"},
+      {"another class deeper down",
+       archiveOf({{"$class", kStateClass}, {"lineItemResultSuccess", {{{"$class", "Foreign"}}}}}), false, false,
+       "Error parsing ViewModel data"},
+  };
+  EXPECT_FALSE(restored(*load()));
+  EXPECT_TRUE(platform.log.contains("No view model found"));
+  for (const auto& c : cases) {
+    platform.log.clear();
+    store->setValue_forKey(c.record, kKey);
+    EXPECT_EQ(restored(*load()), c.isRestored) << c.name;
+    EXPECT_EQ(store->dataForKey(kKey), c.isKept ? std::optional(c.record) : std::nullopt) << c.name;
+    EXPECT_TRUE(platform.log.contains(c.line)) << c.name;
+  }
+
+  store->setValue_forKey(saved, kKey);
+  const auto controller = load();
+  controller->viewWillAppear(false);
+  platform.settings.writesFail = true;
+  controller->dataSource()->updateTransitLineItemResult_captureAnalytics(
+      Result::resultWithValue(BoxedArray::of<TransitLineItem>({})), nullptr);
+  controller->viewWillDisappear(false);
+  EXPECT_TRUE(platform.log.contains("The view model was not saved: the disk is full"));
+  platform.settings.writesFail = false;
+  controller->dataSource()->updateTransitLineItemResult_captureAnalytics(Result::resultWithError(unsaved), nullptr);
+  controller->viewWillDisappear(false);
+  EXPECT_TRUE(platform.log.contains("couldnt be converted to Blob"));
+  EXPECT_EQ(store->dataForKey(kKey), saved);
 }
 
 TEST_F(Archive, TheEarlierClassNameIsReadAsAState) {

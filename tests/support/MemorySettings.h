@@ -12,6 +12,8 @@ class MemorySettings final : public SharedSettings {
  public:
   std::shared_ptr<SharedSettingsStore> groupStore() override { return std::make_shared<Store>(*this); }
 
+  bool writesFail = false;
+
  private:
   class Store final : public SharedSettingsStore {
    public:
@@ -23,6 +25,7 @@ class MemorySettings final : public SharedSettings {
       return found == _settings._values.end() ? std::nullopt : std::optional(found->second);
     }
     ErrorRef setValue_forKey(const Value& value, std::string_view key) override {
+      if (_settings.writesFail) return Error::errorWithDomain_code_reason("MemorySettings", 1, "the disk is full");
       const std::lock_guard guard(_settings._lock);
       _settings._values.insert_or_assign(std::string(key), value);
       return nullptr;

@@ -25,6 +25,8 @@ KeyedUnarchiver::Decoded CBORKeyedUnarchiver::decodeTopLevelObjectOfClasses_forK
   const auto value = _content.find(key);
   if (value == _content.end()) return {};
   _failure.clear();
+  const std::string_view className = classNameOf(*value);
+  if (!className.empty() && !allowedClass(classes, className)) return {};
   const ArchivePath::Scope scope(_path, std::string(key));
   ObjectRef object = objectOf(*value, classes);
   if (!hasFailed()) return {std::move(object), nullptr};
@@ -39,36 +41,61 @@ void CBORKeyedUnarchiver::fail(const std::string& reason) {
   if (_policy == DecodingFailurePolicy::raiseException) throw std::runtime_error(_failure);
 }
 
-bool CBORKeyedUnarchiver::isAllowed(const AllowedClasses& classes, const ArchivableClass& archivableClass,
-                                    std::string_view kind) {
-  const bool allowed = std::ranges::any_of(
-      classes, [&](const ArchivableClass* candidate) { return candidate->name == archivableClass.name; });
-  if (!allowed) fail(std::string(kind) + " is not allowed here");
-  return allowed;
+std::string_view CBORKeyedUnarchiver::classNameOf(const json& value) const {
+  switch (value.type()) {
+    case json::value_t::boolean:
+    case json::value_t::number_integer:
+    case json::value_t::number_unsigned:
+    case json::value_t::number_float:
+      return kNumberClass.name;
+    case json::value_t::string:
+      return kStringClass.name;
+    case json::value_t::binary:
+      return kDataClass.name;
+    case json::value_t::array:
+      return kArrayClass.name;
+    default:
+      break;
+  }
+  const auto written = value.find(kArchiveClassKey);
+  if (written == value.end() || !written->is_string()) return {};
+  const std::string& name = written->get_ref<const std::string&>();
+  const auto substitute = _substitutes.find(name);
+  return substitute == _substitutes.end() ? name : substitute->second.name;
+}
+
+const ArchivableClass* CBORKeyedUnarchiver::allowedClass(const AllowedClasses& classes, std::string_view name) {
+  const auto allowed = std::ranges::find(classes, name, &ArchivableClass::name);
+  return allowed == classes.end() ? nullptr : *allowed;
 }
 
 ObjectRef CBORKeyedUnarchiver::objectOf(const json& value, const AllowedClasses& classes) {
   if (hasFailed()) return nullptr;
+  const std::string_view name = classNameOf(value);
+  const ArchivableClass* const allowed = allowedClass(classes, name);
+  if (!allowed) {
+    fail(name.empty()
+             ? std::string(value.is_null() ? "null stands where an object is needed" : "the object has no class name")
+             : "the class \"" + std::string(name) + "\" is not allowed here");
+    return nullptr;
+  }
   switch (value.type()) {
     case json::value_t::boolean:
-      return isAllowed(classes, kNumberClass, "a boolean") ? box(value.get<bool>()) : nullptr;
+      return box(value.get<bool>());
     case json::value_t::number_integer:
-      return isAllowed(classes, kNumberClass, "a number") ? box(value.get<std::int64_t>()) : nullptr;
+      return box(value.get<std::int64_t>());
     case json::value_t::number_unsigned:
-      return isAllowed(classes, kNumberClass, "a number") ? box(value.get<std::uint64_t>()) : nullptr;
+      return box(value.get<std::uint64_t>());
     case json::value_t::number_float:
-      return isAllowed(classes, kNumberClass, "a number") ? box(value.get<double>()) : nullptr;
+      return box(value.get<double>());
     case json::value_t::string:
-      return isAllowed(classes, kStringClass, "a text") ? box(value.get_ref<const std::string&>()) : nullptr;
+      return box(value.get_ref<const std::string&>());
     case json::value_t::binary:
-      return isAllowed(classes, kDataClass, "a byte string") ? box(Bytes(value.get_binary())) : nullptr;
+      return box(Bytes(value.get_binary()));
     case json::value_t::array:
-      return isAllowed(classes, kArrayClass, "an array") ? arrayOf(value, classes) : nullptr;
-    case json::value_t::object:
-      return classedObjectOf(value, classes);
+      return arrayOf(value, classes);
     default:
-      fail("null stands where an object is needed");
-      return nullptr;
+      return classedObjectOf(value, *allowed, classes);
   }
 }
 
@@ -82,30 +109,18 @@ ObjectRef CBORKeyedUnarchiver::arrayOf(const json& value, const AllowedClasses& 
   return std::make_shared<const BoxedArray>(std::move(elements));
 }
 
-ObjectRef CBORKeyedUnarchiver::classedObjectOf(const json& value, const AllowedClasses& classes) {
-  const auto className = value.find(kArchiveClassKey);
-  if (className == value.end() || !className->is_string()) {
-    fail("the object has no class name");
-    return nullptr;
-  }
-  const std::string& name = className->get_ref<const std::string&>();
-  const auto substitute = _substitutes.find(name);
-  const std::string_view decodedName = substitute == _substitutes.end() ? name : substitute->second.name;
-  const auto allowed = std::ranges::find(classes, decodedName, &ArchivableClass::name);
-  if (allowed == classes.end()) {
-    fail("the class \"" + name + "\" is not allowed here");
-    return nullptr;
-  }
-  if (decodedName == kDateClass.name) return dateOf(value);
-  if (decodedName == kErrorClass.name) return errorOf(value);
-  if (decodedName == kDictionaryClass.name)
+ObjectRef CBORKeyedUnarchiver::classedObjectOf(const json& value, const ArchivableClass& archivableClass,
+                                               const AllowedClasses& classes) {
+  if (archivableClass.name == kDateClass.name) return dateOf(value);
+  if (archivableClass.name == kErrorClass.name) return errorOf(value);
+  if (archivableClass.name == kDictionaryClass.name)
     return std::make_shared<const BoxedDictionary>(entriesOf(value, kDictionaryEntriesKey, classes));
-  if (!(*allowed)->initWithCoder) {
-    fail("\"" + name + "\" is no class of objects");
+  if (!archivableClass.initWithCoder) {
+    fail("\"" + std::string(archivableClass.name) + "\" is no class of objects");
     return nullptr;
   }
   CBORKeyedDecoder decoder(value, *this);
-  ObjectRef object = (*allowed)->initWithCoder(decoder);
+  ObjectRef object = archivableClass.initWithCoder(decoder);
   return hasFailed() ? nullptr : object;
 }
 

@@ -29,9 +29,14 @@ class CBORKeyedUnarchiver final : public KeyedUnarchiver {
   ArchivePath& path() { return _path; }
 
  private:
-  bool isAllowed(const AllowedClasses& classes, const ArchivableClass& archivableClass, std::string_view kind);
+  /// Of the class as which a value is decoded; empty for what is no object. It points into the value or the
+  /// substitutes.
+  std::string_view classNameOf(const nlohmann::json& value) const;
+  /// Null when it is not one of them.
+  static const ArchivableClass* allowedClass(const AllowedClasses& classes, std::string_view name);
   ObjectRef arrayOf(const nlohmann::json& value, const AllowedClasses& classes);
-  ObjectRef classedObjectOf(const nlohmann::json& value, const AllowedClasses& classes);
+  ObjectRef classedObjectOf(const nlohmann::json& value, const ArchivableClass& archivableClass,
+                            const AllowedClasses& classes);
   ObjectRef dateOf(const nlohmann::json& value);
   ObjectRef errorOf(const nlohmann::json& value);
   BoxedDictionary::Entries entriesOf(const nlohmann::json& object, std::string_view key, const AllowedClasses& classes);

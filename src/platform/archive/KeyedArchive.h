@@ -25,7 +25,7 @@ enum class DecodingFailurePolicy {
 class KeyedUnarchiver {
  public:
   struct Decoded {
-    ObjectRef object;  ///< null when absent, unusable or failed
+    ObjectRef object;  ///< null when absent, unusable, failed, or of a class that was not asked for
     ErrorRef error;    ///< null unless decoding failed
   };
 
