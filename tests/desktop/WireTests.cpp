@@ -175,6 +175,10 @@ TEST(Wire, MergingAndCopyingFollowTheGeneratedCode) {
       merged.clear_lineitem();
       EXPECT_EQ(asText(mine.data()), merged.SerializeAsString());
     }
+  NimboActivity without, emptied;
+  emptied.setSearchPlaces(std::make_shared<NimboActivity::SearchPlaces>());
+  without.mergeFrom(emptied);
+  EXPECT_FALSE(without.searchPlaces()) << "no element is appended, and no list";
 }
 
 TEST(Wire, UnknownFieldsOfEveryKindAreSkippedAndDropped) {
@@ -205,9 +209,15 @@ TEST(Wire, ACutAnywhereIsJudgedAsTheGeneratedCodeJudgesIt) {
     const std::string cut = whole.substr(0, length);
     NimboActivity ours;
     ProtobufReader reader(asBytes(cut));
-    EXPECT_EQ(ours.readFrom(reader), proto::NimboActivity().ParsePartialFromString(cut)) << "at " << length;
+    proto::NimboActivity read;
+    EXPECT_EQ(ours.readFrom(reader), read.ParsePartialFromString(cut)) << "at " << length;
     EXPECT_EQ(reader.failureText().empty(), !reader.hasError());
+    EXPECT_EQ(static_cast<int>(ours.searchPlacesCount()), read.searchplaces_size()) << "at " << length;
   }
+  NimboActivity broken;
+  EXPECT_FALSE(readInto(broken, "\x22\x04\x08\x07\x12\x09"));
+  ASSERT_EQ(broken.searchPlacesCount(), 1u);
+  EXPECT_EQ(broken.searchPlacesAtIndex(0)->muid(), 7u) << "a place that breaks off keeps what was read of it";
 }
 
 TEST(Wire, ReadingFollowsItsRulesAtTheEdges) {

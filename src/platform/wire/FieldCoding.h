@@ -155,7 +155,8 @@ bool readMember(ProtobufReader& reader, T& member) {
     return readMember(reader, *member);
   } else if constexpr (VectorField<T>) {
     if (readValue(reader, member.emplace_back())) return true;
-    member.pop_back();
+    // A record that breaks off stays, with what was read of it.
+    if constexpr (!SharedRecordField<ContentOfT<T>>) member.pop_back();
     return false;
   } else if constexpr (OptionalField<T>) {
     if constexpr (std::is_same_v<T, std::optional<std::string>>) {

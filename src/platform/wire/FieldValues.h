@@ -133,6 +133,7 @@ void mergeMember(T& mine, const T& theirs) {
     const T added = theirs;  // NOLINT(performance-unnecessary-copy-initialization): it may be `mine`
     mine.insert(mine.end(), added.begin(), added.end());
   } else if constexpr (SharedVectorField<T>) {
+    if (theirs->empty()) return;
     if (!mine) mine = std::make_shared<typename T::element_type>();
     mergeMember(*mine, *theirs);
   } else if constexpr (SharedRecordField<T>) {
