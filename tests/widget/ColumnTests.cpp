@@ -93,6 +93,21 @@ TEST_F(Column, ReplacesTheRowOfAShrunkShieldAndNoOther) {
   EXPECT_EQ(fit(rows, {73, 185, {}}), rows);
 }
 
+TEST_F(Column, DrawsAShieldOnceInEachColorOfItsText) {
+  for (const auto shieldOf :
+       {&TransitArtwork::Fields::shieldDataSource, &TransitArtwork::Fields::iconFallbackShieldDataSource}) {
+    const auto draw = [&](std::optional<std::string> textColor) {
+      TransitArtwork::Fields fields = shieldArtwork("90")->fields();
+      fields.*shieldOf = TransitShield{0, "90", "#336699", std::move(textColor)};
+      return cache->imageForArtwork(std::make_shared<const TransitArtwork>(fields), 7, 1, false);
+    };
+    const ImageRef white = draw("#ffffff"), yellow = draw("#ffff00"), automatic = draw({});
+    EXPECT_NE(white, yellow);
+    EXPECT_NE(white, automatic);
+    EXPECT_EQ(draw("#ffffff"), white);
+  }
+}
+
 TEST_F(Column, AnswersTheSameQuestionFromMemory) {
   const auto question = [this](const std::string& shieldWidth) { return NBTransitItems{item(shield(shieldWidth))}; };
   const ArtworkWidthCalculatorSizeParameter parameter{73, 186, {1, 2, 3, 4}};

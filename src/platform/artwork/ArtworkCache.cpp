@@ -8,6 +8,16 @@ namespace nimbo {
 
 namespace {
 
+bool textColorsMatch(const std::optional<TransitShield>& a, const std::optional<TransitShield>& b) {
+  return !a || !b || a->shieldTextColorString == b->shieldTextColorString;
+}
+
+/// Equivalent artworks may differ in the colour of their texts.
+bool looksMatch(const TransitArtwork& a, const TransitArtwork& b) {
+  return &a == &b || (artworksAreEquivalent(&a, &b) && textColorsMatch(a.shieldDataSource(), b.shieldDataSource()) &&
+                      textColorsMatch(a.iconFallbackShieldDataSource(), b.iconFallbackShieldDataSource()));
+}
+
 struct Key {
   TransitArtworkRef artwork;
   std::int64_t shieldSize;
@@ -15,7 +25,7 @@ struct Key {
   bool nightMode;
   bool operator==(const Key& other) const {
     return shieldSize == other.shieldSize && screenScale == other.screenScale && nightMode == other.nightMode &&
-           artworksAreEquivalent(artwork.get(), other.artwork.get());
+           looksMatch(*artwork, *other.artwork);
   }
 };
 

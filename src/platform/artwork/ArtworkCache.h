@@ -41,7 +41,8 @@ class ArtworkCache final {
   explicit ArtworkCache(std::shared_ptr<TransitArtworkManager> manager);
   ~ArtworkCache();
 
-  /// Drawn on first use for each artwork, size, scale and appearance. Null when there is nothing to draw.
+  /// Drawn on first use for each artwork, its colours included, size, scale and appearance. Null when there is nothing
+  /// to draw.
   ImageRef imageForArtwork(const TransitArtworkRef& artwork, std::int64_t shieldSize, double screenScale,
                            bool nightMode);
 
