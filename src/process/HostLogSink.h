@@ -23,7 +23,7 @@ class HostLogSink final : public LogSink {
     _next->send(entry);
     if (entry.level != LogLevel::error || !entry.signpost.empty()) return;
     _runLoop.dispatchAsync([tell = _tell, category = std::string(entry.facility.category),
-                            text = std::string(entry.text)] { tell(category, text); });
+                            text = std::string(entry.redacted)] { tell(category, text); });
   }
 
  private:

@@ -10,7 +10,8 @@ namespace nimbo {
 struct LogEntry {
   LogFacility facility;
   LogLevel level;
-  std::string_view text;
+  std::string_view redacted;  ///< private parts left out
+  std::string_view text;      ///< private parts shown where the log's options say so
   std::string_view signpost;  ///< name of the point event; empty for a line of the log
 };
 

@@ -20,14 +20,16 @@ void SystemLog::write(const LogFacility& facility, LogLevel level, std::string_v
                       std::span<const LogArgument> arguments) {
   if (!isEnabled(level)) return;
   try {
-    _sink->send({facility, level, formatLogLine(format, arguments, !_options.showsPrivate), {}});
+    const std::string redacted = formatLogLine(format, arguments, true);
+    const std::string shown = _options.showsPrivate ? formatLogLine(format, arguments, false) : std::string();
+    _sink->send({facility, level, redacted, _options.showsPrivate ? shown : redacted, {}});
   } catch (...) {  // the line is lost; whoever wrote it has more important things to do than to handle that
   }
 }
 
 void SystemLog::event(const LogFacility& facility, std::string_view name, std::string_view message) {
   if (!_options.toJournal && !isEnabled(LogLevel::debug)) return;
-  _sink->send({facility, LogLevel::debug, message, name});
+  _sink->send({facility, LogLevel::debug, message, message, name});
 }
 
 std::unique_ptr<LogSink> makeLogSink(const LogOptions& options) {
