@@ -76,7 +76,10 @@ json itemJSON(const Object* object) {
   return nullptr;
 }
 
-json rectJSON(const Rect& rect) { return {rect.x, rect.y, rect.width, rect.height}; }
+json rectJSON(const Rect& rect) {
+  const auto unsignedZero = [](double length) { return length + 0.0; };
+  return {unsignedZero(rect.x), unsignedZero(rect.y), unsignedZero(rect.width), unsignedZero(rect.height)};
+}
 
 /// The views of a cell with their frames in the cell, depth first.
 json viewsJSON(const View& view) {
@@ -157,7 +160,7 @@ json snapshotJSON(NBTransitIncidentsViewController& controller) {
       {"rowHeight", dataSource.rowHeight()},
       {"maxNumberOfRows", limited ? json(dataSource.maxNumberOfRows()) : json()},
       {"artworkColumnWidth", dataSource.artworkColumnWidth()},
-      {"preferredContentSize", {preferred.width, preferred.height}},
+      {"preferredContentSize", host ? json{preferred.width, preferred.height} : json()},
       {"largestAvailableDisplayMode",
        nameOfDisplayMode(host ? host->largestAvailableDisplayMode() : WidgetDisplayMode::Compact)},
       {"rows", rows},

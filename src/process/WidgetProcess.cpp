@@ -57,6 +57,7 @@ std::optional<MaximumSizes> maximumSizes(const Parameters& params) {
 WidgetProcess::WidgetProcess(Options options, int input, int output)
     : _options(std::move(options)),
       _virtualTime(_options.virtualTime ? std::make_unique<VirtualTime>(*_options.virtualTime) : nullptr),
+      _sentTo(_options.virtualTime.value_or(Date())),
       _runLoop(_virtualTime.get()),
       _connection(_runLoop, input, output),
       _host(_connection) {
@@ -148,6 +149,7 @@ json WidgetProcess::initialize(const Parameters& params) {
   environment.setContentSizeCategory(textSize);
   environment.setScreenScale(scale);
   environment.setAppearance(appearance);
+  _hostChoseMode = params.has("activeDisplayMode");
   _host.setActiveDisplayMode(mode);
   _host.setBundleRecord(record);
   if (sizes)
@@ -161,12 +163,14 @@ json WidgetProcess::loadView(const Parameters&) {
   requireStage({Stage::created}, "loadView");
   _controller->view()->setLayoutMargins(kLayoutMargins);
   if (_controller->widgetHost()) {
-    // The rows of the last time may have been left in the other mode.
-    const WidgetDisplayMode mode = _host.activeDisplayMode();
-    const Size maximumSize = _host.maximumSizeForDisplayMode(mode);
-    _controller->widgetActiveDisplayModeDidChange_withMaximumSize(mode, maximumSize);
     const NBTransitIncidentDataSource& rows = *_controller->dataSource();
-    resizeView(rows.preferredContentSizeForExpanded_maxSize(rows.isExpanded(), maximumSize));
+    // The rows of the last time may have been left in the other mode.
+    if (_hostChoseMode)
+      takeDisplayMode(_host.activeDisplayMode());
+    else
+      _host.setActiveDisplayMode(rows.isExpanded() ? WidgetDisplayMode::Expanded : WidgetDisplayMode::Compact);
+    _controller->setPreferredContentSize(rows.preferredContentSizeForExpanded_maxSize(
+        rows.isExpanded(), _host.maximumSizeForDisplayMode(_host.activeDisplayMode())));
   }
   _stage = Stage::hidden;
   return json::object();
@@ -219,9 +223,16 @@ void WidgetProcess::performUpdate(const JSONRPCResponder& responder) {
 json WidgetProcess::setActiveDisplayMode(const Parameters& params) {
   const WidgetDisplayMode mode = params.displayMode("mode");
   if (params.has("maximumSize")) _host.setMaximumSize(mode, params.size("maximumSize"));
-  _host.setActiveDisplayMode(mode);
-  _controller->widgetActiveDisplayModeDidChange_withMaximumSize(mode, _host.maximumSizeForDisplayMode(mode));
+  takeDisplayMode(mode);
   return json::object();
+}
+
+void WidgetProcess::takeDisplayMode(WidgetDisplayMode mode) {
+  const bool isKnown = mode == _host.activeDisplayMode() &&
+                       _controller->dataSource()->isExpanded() == (mode == WidgetDisplayMode::Expanded);
+  _host.setActiveDisplayMode(mode);
+  if (!isKnown)
+    _controller->widgetActiveDisplayModeDidChange_withMaximumSize(mode, _host.maximumSizeForDisplayMode(mode));
 }
 
 json WidgetProcess::transitionToSize(const Parameters& params) {
@@ -268,6 +279,8 @@ json WidgetProcess::snapshot(const Parameters&) {
   json snapshot = snapshotJSON(*_controller);
   json& gone = snapshot["goneLines"] = json::array();
   for (const auto& identifier : _platform->transitLines().goneLines()) gone.push_back(writtenNameOfLine(*identifier));
+  json& asOf = snapshot["asOf"] = json::object();
+  for (const auto& [feed, date] : _platform->transitLines().asOf()) asOf[feed] = isoTextOfDate(date);
   return snapshot;
 }
 
@@ -314,8 +327,10 @@ void WidgetProcess::announceFrame() {
 
 json WidgetProcess::advanceTime(const Parameters& params) {
   if (!_platform) throw JSONRPCFailure(JSONRPCError::kInvalidState, "advanceTime needs \"initialize\" first");
-  _virtualTime->advance(params.number("seconds", 0, kLongestAdvance));
-  return {{"now", isoTextOfDate(_virtualTime->now())}};
+  const double seconds = params.number("seconds", 0, kLongestAdvance);
+  _virtualTime->advance(seconds);
+  _sentTo = dateByAdding(_sentTo, seconds);
+  return {{"now", isoTextOfDate(_sentTo)}};
 }
 
 json WidgetProcess::decode(const json& params) {

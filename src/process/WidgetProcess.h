@@ -63,6 +63,8 @@ class WidgetProcess {
   void performUpdate(const JSONRPCResponder& responder);
 
   IndexPath existingRow(const Parameters& params) const;
+  /// Tells the controller of the host's mode, unless it knows.
+  void takeDisplayMode(WidgetDisplayMode mode);
   void resizeView(Size size);
   /// Sends the host what its user must hear. Any thread.
   void tellNotice(const ErrorRef& notice);
@@ -71,12 +73,14 @@ class WidgetProcess {
 
   Options _options;
   std::unique_ptr<VirtualTime> _virtualTime;
+  Date _sentTo;  // of virtual time, whose timers fire microseconds after their dates
   GLibRunLoop _runLoop;
   JSONRPCConnection _connection;
   RemoteHost _host;
   std::unique_ptr<DesktopPlatform> _platform;  // null until initialized
   std::shared_ptr<NBTransitIncidentsViewController> _controller;
   Stage _stage = Stage::created;
+  bool _hostChoseMode = false;
   bool _frameAnnounced = false;
 };
 

@@ -106,13 +106,19 @@ TEST(WidgetProcess, ChangesItsRowsOnTheSecondAndFetchesEveryHalfHour) {
   programs.setUpCity({"m1"}, {{"a", {"m1"}, "Works", "Slow.", now + 60, now + 120}});
   const auto wait = [](double seconds) { return request("advanceTime", {{"seconds", seconds}}); };
   const json look = request("snapshot");
-  const auto seen =
-      snapshots(programs.play(appearing() + kUpdateAndLook +
-                              std::vector<json>{wait(59.5), look, wait(0.5), look, wait(59.5), look, wait(0.5), look}));
+  const auto lines =
+      programs.play(appearing() + kUpdateAndLook +
+                    std::vector<json>{wait(59.5), look, wait(0.5), look, wait(59.5), look, wait(0.5), look});
+  const auto seen = snapshots(lines);
   std::vector<std::string> firstRows;
   for (const json& snapshot : seen) firstRows.push_back(titles(snapshot).at(0));
   EXPECT_THAT(firstRows, ElementsAre("Good Service", "Good Service", "Works", "Works", "Good Service"));
   EXPECT_EQ(seen[0]["updateDates"], (json{"2026-01-05T12:01:00Z", "2026-01-05T12:02:00Z"}));
+  std::vector<std::string> dates;
+  for (const json& line : lines)
+    if (line.contains("result") && line["result"].contains("now")) dates.push_back(line["result"]["now"]);
+  EXPECT_THAT(dates, ElementsAre("2026-01-05T12:00:59.500000Z", "2026-01-05T12:01:00Z", "2026-01-05T12:01:59.500000Z",
+                                 "2026-01-05T12:02:00Z"));
 
   // A publisher that withdraws the alert is heard after half an hour.
   Programs other;
@@ -144,6 +150,84 @@ TEST(WidgetProcess, ShowsItsLastRowsBeforeAnyFetch) {
   const auto later =
       std::vector<json>{start[0], request("advanceTime", {{"seconds", 31}}), request("loadView"), request("snapshot")};
   EXPECT_EQ(titles(snapshots(programs.play(later)).at(0)), (std::vector<std::string>{"Works", "Good Service"}));
+}
+
+TEST(WidgetProcess, StartsInTheModeOfTheHostOrElseOfItsLastRows) {
+  for (const char* saved : {"compact", "expanded"}) {
+    Programs programs;
+    programs.setUpCity({"m1", "m2"}, {{"a", {"m1"}, "Works", "Slow."}});
+    programs.play(appearing() + kUpdateAndLook +
+                  std::vector<json>{request("setActiveDisplayMode", {{"mode", saved}}), request("viewWillDisappear")});
+    for (const char* told : {"", "compact", "expanded"}) {
+      json initialize = appearing()[0];
+      if (*told) initialize["params"]["activeDisplayMode"] = told;
+      const auto lines = programs.play({initialize, request("loadView"), request("snapshot"),
+                                        request("render", {{"path", programs.folder.path() / "widget.png"}})});
+      const std::string mode = *told ? told : saved;
+      const json size = {359.0, mode == "expanded" ? 220.0 : 110.0};
+      const json seen = snapshots(lines).at(0);
+      EXPECT_EQ(seen["displayMode"], mode) << saved << told;
+      EXPECT_EQ(seen["expanded"], mode == "expanded") << saved << told;
+      EXPECT_EQ(seen["preferredContentSize"], size) << saved << told;
+      EXPECT_EQ(lines.back()["result"]["height"], size[1]) << saved << told;
+      EXPECT_THAT(
+          lines,
+          Contains(json{{"jsonrpc", "2.0"}, {"method", "preferredContentSizeDidChange"}, {"params", {{"size", size}}}}))
+          << saved << told;
+    }
+  }
+}
+
+TEST(WidgetProcess, HearsOfAModeOnlyWhereItIsNotInForce) {
+  Programs programs;
+  programs.setUpCity({"m1", "m2"}, {{"a", {"m1"}, "Works", "Slow."}});
+  const json compact = request("setActiveDisplayMode", {{"mode", "compact"}}), look = request("snapshot");
+  const auto seen = snapshots(programs.play(appearing() + std::vector<json>{compact, kExpand, look} + kUpdateAndLook +
+                                            std::vector<json>{kExpand, look, kExpand, compact, compact}));
+  EXPECT_EQ(seen.at(0)["expanded"], false) << "without rows for it";
+  EXPECT_EQ(seen.at(0)["displayMode"], "expanded");
+  EXPECT_EQ(seen.at(2)["expanded"], true) << "the same mode again";
+  std::istringstream recorded(programs.run({"analytics", "--json"}).output);
+  std::vector<int> actions;
+  for (std::string line; std::getline(recorded, line);)
+    if (const json entry = json::parse(line); entry.contains("action")) actions.push_back(entry["action"]);
+  EXPECT_THAT(actions, ElementsAre(10, 10, 11));
+}
+
+TEST(WidgetProcess, ShowsNothingNewWhereOnlyTheFeedsDateIs) {
+  Programs programs;
+  const std::vector<AlertsBuilder::Alert> alerts = {{"a", {"m1"}, "Works", "Slow."}, {"b", {"m2"}, "Storm", "Wind."}};
+  programs.setUpCity({"m1", "m2"}, alerts);
+  const auto before = programs.play(appearing() + kUpdateAndLook + std::vector<json>{request("viewWillDisappear")});
+  EXPECT_EQ(snapshots(before).at(0)["asOf"], (json{{"city", "2026-01-05T12:00:00Z"}}));
+
+  programs.publishBytes(AlertsBuilder::feed(dateByAdding(Programs::now(), -60), alerts));
+  const auto lines = programs.play(
+      {appearing()[0], request("loadView"), request("snapshot"), request("performUpdate"), request("snapshot")});
+  EXPECT_EQ(snapshots(lines).at(0)["asOf"], json::object());
+  EXPECT_EQ(snapshots(lines).at(1)["asOf"], (json{{"city", "2026-01-05T11:59:00Z"}}));
+  EXPECT_EQ(snapshots(lines).at(0)["rows"], snapshots(lines).at(1)["rows"]);
+  const auto answer = std::find_if(lines.begin(), lines.end(), [](const json& line) {
+    return line.contains("result") && line["result"].contains("rows");
+  });
+  for (auto line = answer; line != lines.end(); ++line) EXPECT_NE(line->value("method", ""), "frame");
+}
+
+TEST(WidgetProcess, KeepsPrivatePartsFromItsHost) {
+  Programs programs;
+  programs.setUpCity({"m1", "b10"}, {});
+  programs.folder.write("feed/routes.txt",
+                        "route_id,agency_id,route_short_name,route_long_name,route_type\nm1,M,1,Harbour,1\n");
+  ::setenv("NIMBO_LOG_PRIVATE", "1", 1);
+  const auto lines = programs.play(appearing() + kUpdateAndLook);
+  ::unsetenv("NIMBO_LOG_PRIVATE");
+  EXPECT_THAT(programs.folder.read("stderr"), testing::HasSubstr("The line city:b10 is gone"));
+  EXPECT_THAT(lines, Contains(json{{"jsonrpc", "2.0"},
+                                   {"method", "log"},
+                                   {"params",
+                                    {{"level", "error"},
+                                     {"category", "TransitLineService"},
+                                     {"message", "The line <private> is gone from its feed"}}}}));
 }
 
 TEST(WidgetProcess, AnswersTwoUpdatesWithOneLookupAndOpensWhatIsTapped) {
@@ -227,6 +311,8 @@ TEST(WidgetProcess, OutlivesEveryMessage) {
   const auto seen = snapshots(lines);
   ASSERT_THAT(seen, SizeIs(2));
   EXPECT_EQ(seen[0], seen[1]) << "bad messages change nothing";
+  for (const json& line : programs.play(appearing(0) + kUpdateAndLook))
+    EXPECT_THAT(line.dump(), testing::Not(testing::HasSubstr("-0.0"))) << "rows without a height";
 }
 
 }  // namespace

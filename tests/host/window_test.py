@@ -5,6 +5,7 @@ import os
 import re
 import signal
 import socket
+import sqlite3
 import stat
 import subprocess
 import sys
@@ -227,7 +228,20 @@ def faults(session, folder):
             press(*events)
             wait(f"{method} after {events}", lambda: method in file.read())
     window.comes_to_front()
+    window.click("Show More")
+    window.see("Show Less")
     window.quit()
+    with sqlite3.connect(path + ".state/state.sqlite") as state:  # as before the first rows
+        state.execute("DELETE FROM settings WHERE key = 'Nimbo.TransitWidget.savedUIData'")
+    window = Window(session, desktop, "--state", path + ".state", NIMBO_TRANSIT_WIDGET=path)
+    with open(gate, "w") as file:
+        file.write("\n")
+    window.see("Show Less")
+    window.comes_to_front()
+    window.quit()
+    with open(told) as file:
+        modes = [line["params"]["mode"] for line in map(json.loads, file) if line.get("method") == "setActiveDisplayMode"]
+    assert modes == ["expanded"], modes
 
     blind = subprocess.run([desktop], env=session.environment | {"DISPLAY": ""}, capture_output=True, text=True)
     assert blind.returncode == 1 and re.search("no display.*nimbo-transit in the terminal", blind.stderr), blind

@@ -46,16 +46,17 @@ std::vector<std::optional<std::uint32_t>> findLines(const StaticFeed& feed, cons
   return lines;
 }
 
-Outcome<TransitLineItems> lookUpInFeed(const FeedSource& source, std::span<const MapItemIdentifierRef> identifiers,
-                                       std::string_view language, const std::stop_token& stop) {
+Outcome<FeedAnswer> lookUpInFeed(const FeedSource& source, std::span<const MapItemIdentifierRef> identifiers,
+                                 std::string_view language, const std::stop_token& stop) {
   const auto loaded = source.staticFeed(stop);
   if (!loaded) return loaded.error();
   const StaticFeed& feed = loaded->feed;
   const auto lines = findLines(feed, source.name(), identifiers);
-  TransitLineItems items(identifiers.size());
-  if (std::none_of(lines.begin(), lines.end(), [](const auto& line) { return line.has_value(); })) return items;
+  FeedAnswer answer{TransitLineItems(identifiers.size()), std::nullopt};
+  if (std::none_of(lines.begin(), lines.end(), [](const auto& line) { return line.has_value(); })) return answer;
   const auto alerts = source.alerts(stop);
   if (!alerts) return alerts.error();
+  answer.asOf = alerts->timestamp();
 
   IncidentQuery query;
   query.feed = source.name();
@@ -75,8 +76,8 @@ Outcome<TransitLineItems> lookUpInFeed(const FeedSource& source, std::span<const
   LineItems makeItems(source.name(), feed);
   for (std::size_t i = 0; i < lines.size(); ++i)
     if (lines[i])
-      items[i] = makeItems.item(*lines[i], identifiers[i]->muid(), reading.incidents[placeOfLine.at(*lines[i])]);
-  return items;
+      answer.items[i] = makeItems.item(*lines[i], identifiers[i]->muid(), reading.incidents[placeOfLine.at(*lines[i])]);
+  return answer;
 }
 
 }  // namespace nimbo

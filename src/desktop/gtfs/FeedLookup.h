@@ -16,10 +16,15 @@ namespace nimbo {
 std::vector<std::optional<std::uint32_t>> findLines(const StaticFeed& feed, const std::string& feedName,
                                                     std::span<const MapItemIdentifierRef> identifiers);
 
+/// What one feed says of lines.
+struct FeedAnswer {
+  TransitLineItems items;    ///< one for each identifier, null for one whose line `findLines` does not find
+  std::optional<Date> asOf;  ///< when the publisher made the alerts; absent when he does not say, or none were needed
+};
+
 /// Looks lines up in one feed: their static data and their incidents by the alerts as they are now, texts in `language`
-/// (a BCP 47 tag). Answers an item for each identifier, null for one whose line `findLines` does not find. Blocks its
-/// thread.
-Outcome<TransitLineItems> lookUpInFeed(const FeedSource& source, std::span<const MapItemIdentifierRef> identifiers,
-                                       std::string_view language, const std::stop_token& stop);
+/// (a BCP 47 tag). Blocks its thread.
+Outcome<FeedAnswer> lookUpInFeed(const FeedSource& source, std::span<const MapItemIdentifierRef> identifiers,
+                                 std::string_view language, const std::stop_token& stop);
 
 }  // namespace nimbo

@@ -19,6 +19,7 @@ struct GTFSTransitLineService::Shared {
   std::mutex lock;
   std::string language = "en";
   std::vector<MapItemIdentifierRef> goneLines;
+  std::map<std::string, Date> asOf;
 };
 
 namespace {
@@ -52,7 +53,7 @@ Outcome<std::vector<FeedPart>> partsOf(const std::vector<MapItemIdentifierRef>& 
   return parts;
 }
 
-Outcome<TransitLineItems> lookUpPart(const FeedPart& part, const std::string& language, const std::stop_token& stop) {
+Outcome<FeedAnswer> lookUpPart(const FeedPart& part, const std::string& language, const std::stop_token& stop) {
   try {
     return lookUpInFeed(*part.source, part.identifiers, language, stop);
   } catch (const std::exception& exception) {
@@ -62,25 +63,31 @@ Outcome<TransitLineItems> lookUpPart(const FeedPart& part, const std::string& la
   }
 }
 
-/// An item for each identifier, null for lines that are gone.
-Outcome<TransitLineItems> lookUpAll(const std::vector<MapItemIdentifierRef>& identifiers, const FeedLibrary& library,
-                                    const std::string& language, const std::stop_token& stop) {
+struct Answer {
+  TransitLineItems items;  ///< one for each identifier, null for lines that are gone
+  std::map<std::string, Date> asOf;
+};
+
+Outcome<Answer> lookUpAll(const std::vector<MapItemIdentifierRef>& identifiers, const FeedLibrary& library,
+                          const std::string& language, const std::stop_token& stop) {
   const auto parts = partsOf(identifiers, library);
   if (!parts) return parts.error();
-  std::vector<std::future<Outcome<TransitLineItems>>> others;
+  std::vector<std::future<Outcome<FeedAnswer>>> others;
   for (std::size_t i = 1; i < parts->size(); ++i)
     others.push_back(std::async(std::launch::async, [&, i] { return lookUpPart((*parts)[i], language, stop); }));
-  std::vector<Outcome<TransitLineItems>> answers;
+  std::vector<Outcome<FeedAnswer>> answers;
   if (!parts->empty()) answers.push_back(lookUpPart(parts->front(), language, stop));
   for (auto& other : others) answers.push_back(other.get());
 
-  TransitLineItems items(identifiers.size());
+  Answer all{TransitLineItems(identifiers.size()), {}};
   for (std::size_t i = 0; i < answers.size(); ++i) {
     if (!answers[i]) return answers[i].error();
-    for (std::size_t k = 0; k < answers[i]->size(); ++k)
-      if (TransitLineItemRef& item = items[(*parts)[i].places[k]]; !item) item = (*answers[i])[k];
+    const FeedPart& part = (*parts)[i];
+    for (std::size_t k = 0; k < answers[i]->items.size(); ++k)
+      if (TransitLineItemRef& item = all.items[part.places[k]]; !item) item = answers[i]->items[k];
+    if (answers[i]->asOf) all.asOf.emplace(part.source->name(), *answers[i]->asOf);
   }
-  return items;
+  return all;
 }
 
 /// The lines that are left out, taken out of `items`.
@@ -121,6 +128,11 @@ std::vector<MapItemIdentifierRef> GTFSTransitLineService::goneLines() const {
   return _shared->goneLines;
 }
 
+std::map<std::string, Date> GTFSTransitLineService::asOf() const {
+  const std::lock_guard guard(_shared->lock);
+  return _shared->asOf;
+}
+
 void GTFSTransitLineService::lookup(const std::vector<MapItemIdentifierRef>& identifiers, Handler handler) {
   const auto work = [shared = _shared, stop = _stop.get_token(), identifiers, handler = std::move(handler)] {
     std::string language;
@@ -134,11 +146,12 @@ void GTFSTransitLineService::lookup(const std::vector<MapItemIdentifierRef>& ide
       auto outcome = lookUpAll(identifiers, shared->library, language, stop);
       error = outcome.error();
       if (outcome) {
-        items = std::move(*outcome);
+        items = std::move(outcome->items);
         const auto gone = takeGone(items, identifiers);
         if (items.empty() && !gone.empty()) error = allGone(gone);
         const std::lock_guard guard(shared->lock);
         shared->goneLines = gone;
+        shared->asOf = std::move(outcome->asOf);
       }
     } catch (const std::exception& exception) {
       error = transitLineServiceError(TransitLineServiceError::internal,

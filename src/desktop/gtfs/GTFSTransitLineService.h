@@ -1,5 +1,6 @@
 #pragma once
 
+#include <map>
 #include <memory>
 #include <mutex>
 #include <stop_token>
@@ -30,6 +31,10 @@ class GTFSTransitLineService final : public TransitLineService {
 
   /// The lines that the last lookup which succeeded left out, since their feeds do not know them any more. Any thread.
   std::vector<MapItemIdentifierRef> goneLines() const;
+
+  /// When the publishers made the alerts that the last lookup which succeeded went by, by the names of their feeds;
+  /// without those that do not say. Any thread.
+  std::map<std::string, Date> asOf() const;
 
  private:
   struct Shared;

@@ -186,7 +186,6 @@ class IncidentBuilder {
     fields.summary = incident.texts.summary;
     fields.fullDescription = incident.texts.description;
     fields.messageForRoutePlanning = fields.messageForRouteStepping = fields.messageForNonRoutable = fields.title;
-    fields.lastUpdated = _alerts.timestamp();
     fields.iconType = static_cast<std::int32_t>(incident.effect);
     fields.linkURL = incident.texts.linkURL;
     for (const auto& [place, onLine] : incident.lines)

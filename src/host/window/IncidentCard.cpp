@@ -36,12 +36,12 @@ std::string hostOfLink(const std::string& url) {
 
 IncidentCard::IncidentCard(const PageContext& context, const TransitIncidents& periods,
                            std::optional<std::uint64_t> line)
-    : _context(context), _hasLine(line.has_value()) {
+    : _context(context), _incident(periods.front()), _hasLine(line.has_value()) {
   add_css_class("card");
   add_css_class("notice");
   set_activatable(false);
   set_child(_box);
-  const TransitIncident& incident = *periods.front();
+  const TransitIncident& incident = *_incident;
   for (const auto& entity : incident.affectedEntities())
     if (entity->muid() != line && std::find(_affected.begin(), _affected.end(), entity->muid()) == _affected.end())
       _affected.push_back(entity->muid());
@@ -54,11 +54,7 @@ IncidentCard::IncidentCard(const PageContext& context, const TransitIncidents& p
   _box.append(_affectedLines);
   showAffectedLines({});
   if (incident.linkURL()) addLink(*incident.linkURL());
-  if (incident.lastUpdated())
-    addText(_box,
-            LocalizedFormat(LocalizedString("Window_Incident_Updated"),
-                            {DateText(_context.preferences.locale()).textOf(*incident.lastUpdated())}),
-            "item-caption");
+  _box.append(_asOf);
   setAccessibleLabel(*this, title);
   setAccessibleDescription(*this, _said);
 }
@@ -110,6 +106,19 @@ void IncidentCard::addLink(const std::string& url) {
   link->set_halign(Gtk::Align::START);
   link->add_css_class("link-text");
   _box.append(*link);
+}
+
+void IncidentCard::showAsOf(const LinesByNumber& lines) {
+  for (const auto& entity : _incident->affectedEntities()) {
+    const auto line = lines.find(entity->muid());
+    if (line == lines.end() || !line->second->identifier()->locator()) continue;
+    const auto date = _context.asOf.find(line->second->identifier()->locator()->feed);
+    if (date == _context.asOf.end()) continue;
+    return addText(_asOf,
+                   LocalizedFormat(LocalizedString("Window_Incident_Updated"),
+                                   {DateText(_context.preferences.locale()).textOf(date->second)}),
+                   "item-caption");
+  }
 }
 
 void IncidentCard::showAffectedLines(const LinesByNumber& lines) {

@@ -22,6 +22,8 @@ class IncidentCard final : public Gtk::ListBoxRow {
 
   /// Names the lines that it affects, but for the one that is known. Until it is told their names it counts them.
   void showAffectedLines(const LinesByNumber& lines);
+  /// Says when the publisher of its lines made his alerts, where he does.
+  void showAsOf(const LinesByNumber& lines);
 
  private:
   static void addText(Gtk::Box& box, const std::string& text, const char* style);
@@ -32,11 +34,13 @@ class IncidentCard final : public Gtk::ListBoxRow {
   void addLink(const std::string& url);
 
   const PageContext& _context;
+  TransitIncidentRef _incident;
   bool _hasLine;
   std::vector<std::uint64_t> _affected;
   std::string _said;
   Gtk::Box _box{Gtk::Orientation::VERTICAL, 6};
   Gtk::Box _affectedLines{Gtk::Orientation::VERTICAL, 4};
+  Gtk::Box _asOf;
 };
 
 }  // namespace nimbo

@@ -57,7 +57,10 @@ void IncidentCards::lookUpLines(const PageContext& context, const TransitInciden
       if (!found) return;  // the cards go on counting what they cannot name
       LinesByNumber lines;
       for (const TransitLineRef& line : found->lines) lines.emplace(line->muid(), line);
-      for (IncidentCard* card : _cards) card->showAffectedLines(lines);
+      for (IncidentCard* card : _cards) {
+        card->showAffectedLines(lines);
+        card->showAsOf(lines);
+      }
     };
   });
 }

@@ -18,7 +18,7 @@ namespace nimbo {
 MainWindow::MainWindow(const CommandContext& command, HostPlatform& platform, DesktopPreferences& preferences)
     : _library(command.paths),
       _workers(command.runLoop),
-      _context{command, platform, _library, preferences, _workers, *this},
+      _context{command, platform, _library, preferences, _workers, *this, _asOf},
       _widgetPage(new WidgetPage(_context)),
       _pages(std::unique_ptr<Page>(_widgetPage)) {
   constexpr int kWidth = 420, kHeight = 680;

@@ -31,6 +31,7 @@ class MainWindow final : public Gtk::ApplicationWindow, public Navigator {
 
   FeedLibrary _library;
   Workers _workers;
+  std::map<std::string, Date> _asOf;
   PageContext _context;
   Gtk::HeaderBar _header;
   Gtk::Button _back;

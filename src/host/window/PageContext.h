@@ -1,11 +1,15 @@
 #pragma once
 
+#include <map>
+#include <string>
+
 #include "desktop/gtfs/FeedLibrary.h"
 #include "host/Command.h"
 #include "host/HostPlatform.h"
 #include "host/window/DesktopPreferences.h"
 #include "host/window/Navigator.h"
 #include "host/window/Workers.h"
+#include "platform/foundation/Date.h"
 
 namespace nimbo {
 
@@ -17,6 +21,8 @@ struct PageContext {
   DesktopPreferences& preferences;
   Workers& workers;
   Navigator& navigator;
+  /// When publishers made their alerts, by the names of the feeds, as the widget said last.
+  std::map<std::string, Date>& asOf;
 };
 
 }  // namespace nimbo

@@ -49,6 +49,8 @@ WidgetContent WidgetContent::ofSnapshot(const json& snapshot) {
   for (const json& row : snapshot.at("rows")) content.rows.push_back(rowOf(row));
   content.canExpand = snapshot.at("largestAvailableDisplayMode") == "expanded";
   content.isExpanded = snapshot.at("expanded");
+  for (const auto& [feed, text] : snapshot.at("asOf").items())
+    if (const auto date = dateFromISOText(text.get<std::string>())) content.asOf.emplace(feed, *date);
   return content;
 }
 

@@ -1,11 +1,13 @@
 #pragma once
 
+#include <map>
 #include <memory>
 #include <nlohmann/json.hpp>
 #include <string>
 #include <vector>
 
 #include "host/window/SharedPicture.h"
+#include "platform/foundation/Date.h"
 
 namespace nimbo {
 
@@ -22,6 +24,7 @@ struct WidgetContent {
   std::vector<WidgetRow> rows;
   bool canExpand = false;
   bool isExpanded = false;
+  std::map<std::string, Date> asOf;  ///< when the publishers made their alerts, by the names of the feeds
 
   /// Takes rows and modes from a snapshot of docs/protocol.md. Throws nlohmann::json::exception for anything else.
   static WidgetContent ofSnapshot(const nlohmann::json& snapshot);

@@ -206,8 +206,8 @@ void WidgetHostProcess::askForContent() {
   });
   _widget->ask("snapshot", json::object(), [this, picture](const json& snapshot) {
     _awaitsContent = false;
-    if (_contentIsStale) askForContent();
     if (!picture->pixels().empty()) show(picture, snapshot);
+    if (_contentIsStale) askForContent();
   });
 }
 
@@ -216,6 +216,8 @@ void WidgetHostProcess::show(const std::shared_ptr<SharedPicture>& picture, cons
   content->picture = picture;
   _contentHeight = picture->layout().height / picture->layout().scale;
   tellPresentation();
+  // Rows that could not expand are compact, whatever was told.
+  if (!_contentIsStale && !content->canExpand && !content->isExpanded) _isExpanded = false;
   // The expanded mode ends with the rows that need it, and comes back with them.
   setExpandedMode(_wantsExpanded && content->canExpand);
   _delegate.widgetDidChange(content);

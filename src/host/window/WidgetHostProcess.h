@@ -49,6 +49,8 @@ class WidgetHostProcess {
 
   /// Fetches now.
   void update();
+  /// Has the delegate hear what the widget shows now, changed or not, while it appears.
+  void askForContent();
   void highlightRow(std::size_t row, bool highlighted);
   void selectRow(std::size_t row);
   /// Has the process read a hand-off; one that is not running is started for it, and ends as when it is hidden.
@@ -82,7 +84,6 @@ class WidgetHostProcess {
   void askOfRow(std::string_view method, std::size_t row, nlohmann::json params = nlohmann::json::object());
   /// Tells the process what it does not know of the presentation.
   void tellPresentation();
-  void askForContent();
   void show(const std::shared_ptr<SharedPicture>& picture, const nlohmann::json& snapshot);
   void setExpandedMode(bool expanded);
   void setUpdating(bool updating);
