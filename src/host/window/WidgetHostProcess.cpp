@@ -216,10 +216,12 @@ void WidgetHostProcess::show(const std::shared_ptr<SharedPicture>& picture, cons
   content->picture = picture;
   _contentHeight = picture->layout().height / picture->layout().scale;
   tellPresentation();
-  // Rows that could not expand are compact, whatever was told.
-  if (!_contentIsStale && !content->canExpand && !content->isExpanded) _isExpanded = false;
-  // The expanded mode ends with the rows that need it, and comes back with them.
-  setExpandedMode(_wantsExpanded && content->canExpand);
+  // The expanded mode ends with the rows that need it, and comes back with them; rows that could not take it are
+  // compact without being told. What was asked for before the last mode was told decides nothing.
+  if (!_contentIsStale) {
+    _isExpanded = content->isExpanded;
+    setExpandedMode(_wantsExpanded && content->canExpand);
+  }
   _delegate.widgetDidChange(content);
 }
 

@@ -103,7 +103,7 @@ class WidgetHostProcess {
   // Of the process that runs.
   std::unique_ptr<WatchedWidget> _widget;
   bool _appeared = false;
-  bool _isExpanded = false;  // as last told
+  bool _isExpanded = false;  // as last told or shown
   bool _awaitsContent = false;
   bool _contentIsStale = false;
   bool _isUpdating = false;
