@@ -17,9 +17,9 @@ struct LineRow {
   std::uint64_t muid;
 };
 
-ErrorRef refusal(FavoritesError code, std::string reason) {
+ErrorRef refusal(FavoritesError code, std::string reason, std::string subject = {}) {
   return Error::errorWithDomain_code_reason(std::string(kFavoritesErrorDomain), static_cast<std::int64_t>(code),
-                                            std::move(reason));
+                                            std::move(reason), std::move(subject));
 }
 
 ErrorRef unknownLine(std::uint64_t muid) {
@@ -31,10 +31,11 @@ ErrorRef lossOf(SQLiteConnection& connection) {
   SQLiteStatement query = connection.prepare("SELECT value FROM settings WHERE key = ?");
   query.bind(1, kFavoritesLostKey);
   if (!query.step()) return nullptr;
-  return refusal(FavoritesError::lost, "Not all favorites could be read in a damaged database, which is kept as " +
-                                           query.text(0) + ": " +
-                                           std::to_string(connection.integer("SELECT count(*) FROM favorites")) +
-                                           " of them are left. Add those that you miss; that ends this message.");
+  return refusal(FavoritesError::lost,
+                 "Not all favorites could be read in a damaged database, which is kept as " + query.text(0) + ": " +
+                     std::to_string(connection.integer("SELECT count(*) FROM favorites")) +
+                     " of them are left. Add those that you miss; that ends this message.",
+                 query.text(0));
 }
 
 bool wereSet(SQLiteConnection& connection) {
