@@ -138,7 +138,7 @@ TEST(StringTables, CountByTheRulesOfTheLanguage) {
   const std::map<std::string, std::vector<std::string>> texts{
       // for                 0             1                2            3            11           100
       {"en", {"0 Advisories", "1 Advisory", "2 Advisories", "3 Advisories", "11 Advisories", "100 Advisories"}},
-      {"de", {"0 Meldungen", "1 Meldung", "2 Meldungen", "3 Meldungen", "11 Meldungen", "100 Meldungen"}},
+      {"de", {"0 Hinweise", "1 Hinweis", "2 Hinweise", "3 Hinweise", "11 Hinweise", "100 Hinweise"}},
       {"fr", {"0 alerte", "1 alerte", "2 alertes", "3 alertes", "11 alertes", "100 alertes"}},
       {"es", {"0 avisos", "1 aviso", "2 avisos", "3 avisos", "11 avisos", "100 avisos"}},
       {"ja", {"運行情報0件", "運行情報1件", "運行情報2件", "運行情報3件", "運行情報11件", "運行情報100件"}},
