@@ -59,6 +59,7 @@ void FeedCheckView::check(const Feed& feed, Done done) {
     done(nullptr);
   });
   line->append(*stop);
+  wrapTexts(*line);
   append(*line);
   set_visible();
   stop->grab_focus();
