@@ -184,7 +184,7 @@ class Bench:
             Row("layout of six rows after a changed constant", 16.7, self.timed("layOut", 1e3), unit="ms"),
             Row("decode of the hand-off record", 0.4, *self.pair("decode"), peer="libprotobuf, fresh message"),
             Row("encode of the hand-off record", 1.0, *self.pair("encode"), peer="libprotobuf, built message"),
-            Row("alerts feed of 5 MB and 5000 alerts to the incidents of 20 favourites", 0.25,
+            Row("alerts feed of 5 MB and 5000 alerts to the incidents of 20 favorites", 0.25,
                 self.function("alerts/manual_time"), self.function("alertsPeer"),
                 peer="libprotobuf lite, parse alone"),
             Row("static feed of 5000 routes, from cache", 0.05, *self.pair("staticFeedFromCache"),

@@ -2,6 +2,7 @@
 
 #include <algorithm>
 #include <cstdlib>
+#include <sstream>
 
 #include "desktop/drawing/CairoShieldRenderer.h"
 #include "desktop/gtfs/FeedConfiguration.h"
@@ -27,6 +28,15 @@ std::vector<TransitLineRef> firstFavorites(const std::filesystem::path& configFo
   return feeds && feeds->empty() ? SampleCity::favorites() : std::vector<TransitLineRef>();
 }
 
+/// The locale without a language.
+constexpr const char* kPlainLocale = "C";
+
+/// "de_AT.UTF-8@euro" as "de_AT", "POSIX" as "C".
+std::string plainNameOfLocale(std::string_view locale) {
+  const std::string name(locale.substr(0, locale.find_first_of(".@")));
+  return name == "POSIX" ? kPlainLocale : name;
+}
+
 /// "de_AT" as "de-AT".
 std::string languageTag(std::string locale) {
   std::replace(locale.begin(), locale.end(), '_', '-');
@@ -36,14 +46,23 @@ std::string languageTag(std::string locale) {
 }  // namespace
 
 std::string DesktopPlatform::localeOfEnvironment() {
-  for (const char* variable : {"LC_ALL", "LC_MESSAGES", "LANG"}) {
-    const char* value = std::getenv(variable);
-    if (!value || !*value) continue;
-    const std::string_view locale(value);
-    const std::string_view name = locale.substr(0, locale.find_first_of(".@"));
-    return name == "C" || name == "POSIX" ? "en" : std::string(name);
+  std::string locale = kPlainLocale;
+  for (const char* variable : {"LC_ALL", "LC_MESSAGES", "LANG"})
+    if (const char* value = std::getenv(variable); value && *value) {
+      locale = plainNameOfLocale(value);
+      break;
+    }
+  const char* languages = std::getenv("LANGUAGE");
+  if (!languages || locale == kPlainLocale) return locale == kPlainLocale ? "en" : locale;
+  std::optional<std::string> first;
+  std::istringstream list{std::string(languages)};
+  for (std::string language; std::getline(list, language, ':');) {
+    if (language.empty()) continue;
+    if (language = plainNameOfLocale(language); language == kPlainLocale) language = "en";
+    if (ICUStringTables::speak(language)) return language;
+    if (!first) first = language;
   }
-  return "en";
+  return first.value_or(locale);
 }
 
 DesktopPlatform::DesktopPlatform(Options options)

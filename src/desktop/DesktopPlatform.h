@@ -54,7 +54,9 @@ class DesktopPlatform {
   SQLiteAnalyticsPipeline& analytics() { return _analytics; }
   GTFSTransitLineService& transitLines() { return _transitLines; }
 
-  /// The locale of LC_ALL, LC_MESSAGES or LANG, in this order; "en" when none is set or it is "C" or "POSIX".
+  /// The first language of LANGUAGE ("de_AT:fr") that has texts here, else its first; without it the locale of LC_ALL,
+  /// LC_MESSAGES or LANG, in this order. "en" where none of these is set or it is "C" or "POSIX", whatever LANGUAGE
+  /// says. Source: the manual of GNU gettext, "The LANGUAGE variable".
   static std::string localeOfEnvironment();
 
  private:

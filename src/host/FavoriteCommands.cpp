@@ -39,7 +39,7 @@ std::vector<TransitLineRef> favoriteLines(HostPlatform& platform) {
 std::uint64_t muidOfFavorite(HostPlatform& platform, const std::string& name) {
   for (const TransitLineRef& line : favoriteLines(platform))
     if (writtenNameOfLine(*line->identifier()) == name) return line->muid();
-  throw CommandFailure("\"" + name + "\" is not among the favourites. \"favorite list\" shows them.");
+  throw CommandFailure("\"" + name + "\" is not among the favorites. \"favorite list\" shows them.");
 }
 
 }  // namespace
@@ -77,7 +77,7 @@ int runFavoriteList(const CommandContext& context) {
   HostPlatform platform(context);
   const auto lines = favoriteLines(platform);
   printLines(lines);
-  if (lines.empty()) std::cout << "No favourite lines. Add some with \"favorite add FEED:ROUTE_ID\".\n";
+  if (lines.empty()) std::cout << "No favorite lines. Add some with \"favorite add FEED:ROUTE_ID\".\n";
   std::cout << std::flush;
   tellGoneLines(context, lines);
   return kExitSuccess;

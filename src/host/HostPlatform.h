@@ -9,13 +9,17 @@ namespace nimbo {
 /// it lives. A command line opens no activities.
 class HostPlatform final : private ActivityLauncher {
  public:
-  /// `locale` is a BCP 47 tag or POSIX name; empty: the environment's.
-  explicit HostPlatform(const CommandContext& context, std::string locale = {})
-      : _platform({.paths = context.paths,
-                   .locale = std::move(locale),
-                   .runLoop = context.runLoop,
-                   .activityLauncher = *this,
-                   .notice = [tell = context.tell](const ErrorRef& notice) { tell(notice->reason()); }}) {}
+  /// `locale` is a BCP 47 tag or POSIX name; empty: the environment's. `notice` is told on any thread that a damaged
+  /// state database was set aside; null: the context's `tell` is.
+  explicit HostPlatform(const CommandContext& context, std::string locale = {}, StateDatabase::Notice notice = {})
+      : _platform(
+            {.paths = context.paths,
+             .locale = std::move(locale),
+             .runLoop = context.runLoop,
+             .activityLauncher = *this,
+             .notice = notice ? std::move(notice) : StateDatabase::Notice([tell = context.tell](const ErrorRef& error) {
+               tell(error->reason());
+             })}) {}
 
   DesktopPlatform* operator->() { return &_platform; }
 

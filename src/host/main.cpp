@@ -30,7 +30,7 @@ class CommandLine {
   void addFavoriteCommands();
   void addStateCommands();
 
-  CLI::App _app{"How your transit lines run: shows their incidents, and sets up feeds and favourite lines."};
+  CLI::App _app{"How your transit lines run: shows their incidents, and sets up feeds and favorite lines."};
   std::optional<std::filesystem::path> _config, _state;
   Action _chosen;
 
@@ -54,7 +54,7 @@ CommandLine::CommandLine() {
   _app.require_subcommand(1);
   _app.set_version_flag("--version", NIMBO_VERSION);
   _app.add_option("--config", _config, "Folder of feeds.json (default: $XDG_CONFIG_HOME/nimbo-transit)");
-  _app.add_option("--state", _state, "Folder of favourites and last rows (default: $XDG_STATE_HOME/nimbo-transit)");
+  _app.add_option("--state", _state, "Folder of favorites and last rows (default: $XDG_STATE_HOME/nimbo-transit)");
   _app.fallthrough();
   addWidgetCommands();
   addFeedCommands();
@@ -69,7 +69,7 @@ CLI::App* CommandLine::add(CLI::App& parent, const std::string& name, const std:
 }
 
 void CommandLine::addWidgetCommands() {
-  CLI::App* status = add(_app, "status", "Show how the favourite lines run", [this](const CommandContext& context) {
+  CLI::App* status = add(_app, "status", "Show how the favorite lines run", [this](const CommandContext& context) {
     if (_watch) return runStatusWatch(context);
     return _waybar ? runStatusBar(context, _status.now) : runStatus(context, _status);
   });
@@ -127,7 +127,7 @@ void CommandLine::addFeedCommands() {
 }
 
 void CommandLine::addFavoriteCommands() {
-  CLI::App* favorite = _app.add_subcommand("favorite", "Your favourite lines")->require_subcommand(1);
+  CLI::App* favorite = _app.add_subcommand("favorite", "Your favorite lines")->require_subcommand(1);
   CLI::App* addLines = add(*favorite, "add", "Add lines",
                            [this](const CommandContext& context) { return runFavoriteAdd(context, _lines); });
   addLines->add_option("FEED:ROUTE_ID", _lines, "Lines as \"lines\" prints them")->required();
@@ -138,7 +138,7 @@ void CommandLine::addFavoriteCommands() {
                        [this](const CommandContext& context) { return runFavoriteMove(context, _text, _position); });
   move->add_option("FEED:ROUTE_ID", _text, "A line as \"favorite list\" prints it")->required();
   move->add_option("POSITION", _position, "1 is the first")->required();
-  add(*favorite, "list", "List the favourite lines in their order",
+  add(*favorite, "list", "List the favorite lines in their order",
       [](const CommandContext& context) { return runFavoriteList(context); });
 }
 

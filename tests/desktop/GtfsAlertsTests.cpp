@@ -222,6 +222,7 @@ TEST(AlertsFeed, IsRefusedWithWhatItIsInstead) {
     ASSERT_FALSE(feed) << what;
     EXPECT_NE(feed.error()->reason().find(what), std::string::npos) << feed.error()->reason();
     EXPECT_NE(feed.error()->reason().find("https://example.org/alerts"), std::string::npos);
+    EXPECT_EQ(feed.error()->subject(), "https://example.org/alerts");
     EXPECT_EQ(feed.error()->code(), static_cast<std::int64_t>(TransitLineServiceError::badAlerts));
   }
   EXPECT_TRUE(AlertsFeed::read(feedBytes(""), "a feed without alerts"));

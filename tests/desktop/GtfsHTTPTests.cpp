@@ -40,7 +40,7 @@ TEST(HTTPFetcher, SaysWhatWentWrong) {
     Code code;
     const char* reason;
   } cases[] = {
-      {"key", {LoopbackServer::answer("403 Forbidden", "")}, Code::serverFailure, "key from the publisher"},
+      {"key", {LoopbackServer::answer("403 Forbidden", "")}, Code::keyNeeded, "key from the publisher"},
       {"server error", {LoopbackServer::answer("503 Busy", "")}, Code::serverFailure, "status 503. Try again later"},
       {"unchanged what is not held", {LoopbackServer::answer("304 Not Modified", "")}, Code::serverFailure, "304"},
       {"redirect loop", {LoopbackServer::answer("302 Found\r\nLocation: /", "")}, Code::serverFailure, "redirects"},
@@ -69,6 +69,7 @@ TEST(HTTPFetcher, SaysWhatWentWrong) {
     EXPECT_EQ(outcome.error()->code(), static_cast<std::int64_t>(code)) << what << outcome.error()->reason();
     EXPECT_NE(outcome.error()->reason().find(reason), std::string::npos) << what << outcome.error()->reason();
     EXPECT_NE(outcome.error()->reason().find(server.address("/?...")), std::string::npos) << what;
+    EXPECT_EQ(outcome.error()->subject(), server.address("/?...")) << what;
   }
 }
 

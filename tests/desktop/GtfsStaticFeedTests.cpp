@@ -89,6 +89,7 @@ TEST(StaticFeed, IsRefusedWithWhatIsWrong) {
     const auto parsed = readStaticFeed(files, "city");
     ASSERT_FALSE(parsed) << what;
     EXPECT_NE(parsed.error()->reason().find(what), std::string::npos) << parsed.error()->reason();
+    EXPECT_EQ(parsed.error()->subject(), files.place());
   }
 }
 
@@ -131,7 +132,10 @@ class StaticFeedStoreTest : public testing::Test {
     return {"city", *FeedAddress::parse(path.native()), *FeedAddress::parse("alerts.pb")};
   }
   std::string names(const Outcome<LoadedStaticFeed>& loaded) {
-    if (!loaded) return loaded.error()->reason();
+    if (!loaded) {
+      EXPECT_FALSE(loaded.error()->subject().empty()) << loaded.error()->reason();
+      return loaded.error()->reason();
+    }
     std::string text;
     for (std::size_t i = 0; i < loaded->feed.lineCount(); ++i) text += loaded->feed.line(i).shortName;
     return text;
@@ -233,12 +237,18 @@ TEST_F(FeedConfigurationTest, KeepsFeedsInOrderAndEverythingElse) {
 TEST_F(FeedConfigurationTest, RefusesWhatItCannotKeepAndChangesNothing) {
   ASSERT_FALSE(configuration.add(feed("metro")));
   const std::string before = *readFile(configuration.file(), 1 << 20);
-  for (const char* name : {"metro", "", "a:b", "a b", "../x", "-x", "sample", "a\n"}) {
+  for (const std::string name : {"metro", "", "a:b", "a b", "../x", "-x", "sample", "a\n"}) {
     const ErrorRef error = configuration.add(feed(name));
     ASSERT_TRUE(error) << name;
-    EXPECT_EQ(error->code(), static_cast<std::int64_t>(TransitLineServiceError::badFeedName)) << name;
+    const bool isTaken = name == "metro" || name == "sample";
+    EXPECT_EQ(error->code(), static_cast<std::int64_t>(isTaken ? TransitLineServiceError::feedNameTaken
+                                                               : TransitLineServiceError::badFeedName))
+        << name;
+    EXPECT_EQ(error->subject(), isTaken ? name : "");
   }
-  EXPECT_NE(configuration.remove("tram")->reason().find("Feeds set up: metro."), std::string::npos);
+  const ErrorRef unknown = configuration.remove("tram");
+  EXPECT_NE(unknown->reason().find("Feeds set up: metro."), std::string::npos);
+  EXPECT_EQ(unknown->subject(), "tram");
   EXPECT_EQ(*readFile(configuration.file(), 1 << 20), before);
 }
 
@@ -260,6 +270,7 @@ TEST_F(FeedConfigurationTest, SaysWhatIsWrongWithTheFile) {
       ASSERT_TRUE(error) << text;
       EXPECT_NE(error->reason().find(what), std::string::npos) << error->reason();
       EXPECT_NE(error->reason().find("feeds.json"), std::string::npos);
+      EXPECT_EQ(error->subject(), configuration.file().native());
     }
     EXPECT_EQ(*readFile(configuration.file(), 1 << 20), text);
   }

@@ -79,7 +79,8 @@ TEST_F(StateDatabaseTest, KeepsWhatCanBeReadOfADamagedFileInEveryProcess) {
   ASSERT_NE(error, nullptr);
   EXPECT_THAT(notices, ElementsAre(error->reason()));
   EXPECT_THAT(error->reason(),
-              testing::AllOf(HasSubstr(setAside().native()), HasSubstr("0 favourites and 2 settings")));
+              testing::AllOf(HasSubstr(setAside().native()), HasSubstr("0 favorites and 2 settings")));
+  EXPECT_EQ(error->subject(), setAside().native());
   EXPECT_EQ(analytics.list(entries), nullptr);
   // Those that had the damaged file open go over to the new one.
   EXPECT_EQ(host->setValue_forKey("since", "second"), nullptr);
@@ -109,6 +110,7 @@ TEST_F(StateDatabaseTest, LeavesDatabasesOfOthersAsTheyAre) {
     const ErrorRef error = makeSettings()->setValue_forKey(true, "key");
     ASSERT_NE(error, nullptr);
     EXPECT_THAT(error->reason(), HasSubstr(file().native()));
+    EXPECT_EQ(error->subject(), file().native());
     EXPECT_EQ(makeSettings()->valueForKey("key"), std::nullopt);
     EXPECT_TRUE(platform.log.contains(error->reason()));
     EXPECT_EQ(contentOf(file()), before);

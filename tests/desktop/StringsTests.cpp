@@ -1,11 +1,16 @@
 #include <gmock/gmock.h>
 #include <unicode/locid.h>
+#include <unicode/messagepattern.h>
 #include <unicode/msgfmt.h>
+#include <unicode/plurrule.h>
 
+#include <filesystem>
+#include <fstream>
 #include <nlohmann/json.hpp>
 #include <regex>
 #include <set>
 
+#include "desktop/DesktopPlatform.h"
 #include "desktop/resources/Resources.h"
 #include "desktop/strings/ICUStringTables.h"
 #include "support/TestPlatform.h"
@@ -27,6 +32,51 @@ std::set<std::string> argumentsOf(const std::string& pattern) {
   for (std::sregex_iterator match(pattern.begin(), pattern.end(), argument), end; match != end; ++match)
     numbers.insert((*match)[1]);
   return numbers;
+}
+
+/// The keys that the program's sources name.
+std::set<std::string> keysInSources() {
+  static const std::regex key("\"((?:TransitWidget|Transit_|Window_)\\w+)\"");
+  std::set<std::string> keys;
+  for (const auto& entry : std::filesystem::recursive_directory_iterator(NIMBO_SOURCES)) {
+    if (entry.path().extension() != ".cpp" && entry.path().extension() != ".h") continue;
+    std::ifstream file(entry.path());
+    const std::string text(std::istreambuf_iterator<char>(file), {});
+    for (std::sregex_iterator match(text.begin(), text.end(), key), end; match != end; ++match)
+      keys.insert((*match)[1]);
+  }
+  return keys;
+}
+
+std::string utf8(const icu::UnicodeString& string) {
+  std::string text;
+  return string.toUTF8String(text);
+}
+
+/// The categories ("one", "other") that whole numbers have in a language.
+std::set<std::string> categoriesOf(const std::string& language) {
+  UErrorCode status = U_ZERO_ERROR;
+  const std::unique_ptr<icu::PluralRules> rules(icu::PluralRules::forLocale(icu::Locale(language.c_str()), status));
+  std::set<std::string> categories;
+  for (int count = 0; count < 1000; ++count) categories.insert(utf8(rules->select(count)));
+  return categories;
+}
+
+/// The categories of each plural in a pattern; null where ICU cannot parse it.
+std::optional<std::vector<std::set<std::string>>> pluralsIn(const std::string& text) {
+  UErrorCode status = U_ZERO_ERROR;
+  const icu::MessagePattern pattern(icu::UnicodeString::fromUTF8(text), nullptr, status);
+  if (U_FAILURE(status)) return std::nullopt;
+  std::vector<std::set<std::string>> plurals;
+  for (int i = 0; i < pattern.countParts(); ++i) {
+    const icu::MessagePattern::Part& part = pattern.getPart(i);
+    if (part.getType() == UMSGPAT_PART_TYPE_ARG_START && part.getArgType() == UMSGPAT_ARG_TYPE_PLURAL)
+      plurals.emplace_back();
+    if (part.getType() != UMSGPAT_PART_TYPE_ARG_SELECTOR) continue;
+    if (const std::string selector = utf8(pattern.getSubstring(part)); !selector.starts_with('='))
+      plurals.back().insert(selector);
+  }
+  return plurals;
 }
 
 std::string fill(const ICUStringTables& tables, std::string_view key, std::initializer_list<FormatArgument> arguments) {
@@ -70,11 +120,25 @@ TEST(StringTables, SayTheSameInEveryLanguage) {
   }
 }
 
+TEST(StringTables, HaveTheKeysOfTheProgramAndTheirLanguagesPlurals) {
+  const std::set<std::string> keys = keysInSources();
+  for (const std::string language : kLanguages) {
+    std::set<std::string> present;
+    for (const auto& [key, pattern] : tableOf(language)) {
+      present.insert(key);
+      const auto plurals = pluralsIn(pattern);
+      ASSERT_TRUE(plurals) << language << " " << key;
+      for (const auto& categories : *plurals) EXPECT_EQ(categories, categoriesOf(language)) << language << " " << key;
+    }
+    EXPECT_EQ(present, keys) << language;
+  }
+}
+
 TEST(StringTables, CountByTheRulesOfTheLanguage) {
   const std::map<std::string, std::vector<std::string>> texts{
       // for                 0             1                2            3            11           100
       {"en", {"0 Advisories", "1 Advisory", "2 Advisories", "3 Advisories", "11 Advisories", "100 Advisories"}},
-      {"de", {"0 Meldungen", "1 Meldung", "2 Meldungen", "3 Meldungen", "11 Meldungen", "100 Meldungen"}},
+      {"de", {"0 Hinweise", "1 Hinweis", "2 Hinweise", "3 Hinweise", "11 Hinweise", "100 Hinweise"}},
       {"fr", {"0 alerte", "1 alerte", "2 alertes", "3 alertes", "11 alertes", "100 alertes"}},
       {"es", {"0 avisos", "1 aviso", "2 avisos", "3 avisos", "11 avisos", "100 avisos"}},
       {"ja", {"運行情報0件", "運行情報1件", "運行情報2件", "運行情報3件", "運行情報11件", "運行情報100件"}},
@@ -119,6 +183,7 @@ TEST(StringTables, JoinNamesByTheLanguagesComma) {
       {"en", "A, B, C, and D: {0} 'x'"},
       {"de", "A, B, C und D: {0} 'x'"},
       {"fr", "A, B, C et D\u00a0: {0} 'x'"},
+      {"es", "A, B, C y D: {0} 'x'"},
       {"ja", "A、B、C、D：{0} 'x'"},
       {"ar", "\u2068A\u2069، \u2068B\u2069، \u2068C\u2069 و\u2068D\u2069: \u2068{0} 'x'\u2069"},
   };
@@ -129,6 +194,26 @@ TEST(StringTables, JoinNamesByTheLanguagesComma) {
     EXPECT_EQ(tables.commaDelimitedList({}), "");
     EXPECT_EQ(tables.isRightToLeft(), language == "ar");
   }
+}
+
+TEST(StringTables, SayTheSpanishAndByTheSoundAfterIt) {
+  const ICUStringTables spanish("es");
+  for (const auto& [name, both] : std::map<std::string, std::string>{{"Interurbano", "Línea 2 e Interurbano"},
+                                                                     {"iris", "Línea 2 e iris"},
+                                                                     {"Íñigo", "Línea 2 e Íñigo"},
+                                                                     {"hilo", "Línea 2 e hilo"},
+                                                                     {"I", "Línea 2 e I"},
+                                                                     {"Hierro", "Línea 2 y Hierro"},
+                                                                     {"Ionia", "Línea 2 y Ionia"},
+                                                                     {"Yo", "Línea 2 y Yo"},
+                                                                     {"Hotel", "Línea 2 y Hotel"},
+                                                                     {"3", "Línea 2 y 3"},
+                                                                     {"", "Línea 2 y "}})
+    for (const std::string kind : {"2_Lines", "N_Lines_Names"})
+      EXPECT_EQ(fill(spanish, "TransitWidget_" + kind + "_Concatenated", {"Línea 2", name}), both);
+  EXPECT_EQ(fill(spanish, "TransitWidget_2_Lines_Prepended_Incident_Text", {"A", "Iris", "B y Iris"}),
+            "A e Iris: B y Iris");
+  EXPECT_EQ(fill(spanish, "Window_Incident_OtherLines", {std::uint64_t{1}}), "y 1 más");
 }
 
 TEST(StringTables, FallBackToTheLanguageAndThenToEnglish) {
@@ -146,6 +231,37 @@ TEST(StringTables, FallBackToTheLanguageAndThenToEnglish) {
   EXPECT_EQ(fill(hebrew, "TransitWidget_Summary_advisory_count", {std::uint64_t{2}}), "2 Advisories");
   EXPECT_FALSE(hebrew.isRightToLeft());
   EXPECT_EQ(hebrew.stringForKey("no such key"), std::nullopt);
+}
+
+TEST(Locale, IsTheFirstOfLanguageThatHasTextsUnlessTheLocaleIsPlain) {
+  const struct {
+    const char *all, *messages, *lang, *language, *locale;
+  } cases[] = {
+      {"", "", "", "", "en"},
+      {"", "", "de_AT.UTF-8", "", "de_AT"},
+      {"", "fr_FR", "de_DE", "", "fr_FR"},
+      {"es_ES@euro", "fr_FR", "de_DE", "", "es_ES"},
+      {"es_ES", "fr_FR", "de_DE", "ja", "ja"},
+      {"", "", "de_DE", "pl:fr_CA.UTF-8:es", "fr_CA"},
+      {"", "", "de_DE", ":fr", "fr"},
+      {"", "", "de_DE", "pl:C:fr", "en"},
+      {"", "", "de_DE", "pl:cs", "pl"},
+      {"", "", "de_DE", ":", "de_DE"},
+      {"", "", "", "fr", "en"},
+      {"C.UTF-8", "", "de_DE", "fr", "en"},
+      {"", "POSIX", "de_DE", "fr", "en"},
+  };
+  std::map<const char*, std::optional<std::string>> before;
+  for (const char* name : {"LC_ALL", "LC_MESSAGES", "LANG", "LANGUAGE"})
+    before[name] = std::getenv(name) ? std::optional<std::string>(std::getenv(name)) : std::nullopt;
+  for (const auto& c : cases) {
+    setenv("LC_ALL", c.all, 1);
+    setenv("LC_MESSAGES", c.messages, 1);
+    setenv("LANG", c.lang, 1);
+    setenv("LANGUAGE", c.language, 1);
+    EXPECT_EQ(DesktopPlatform::localeOfEnvironment(), c.locale) << c.lang << " " << c.language;
+  }
+  for (const auto& [name, value] : before) value ? setenv(name, value->c_str(), 1) : unsetenv(name);
 }
 
 }  // namespace nimbo

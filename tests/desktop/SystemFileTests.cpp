@@ -74,6 +74,7 @@ TEST(AtomicFile, SaysWhatStandsInTheWay) {
     ASSERT_NE(error, nullptr) << test.path;
     EXPECT_EQ(error->code(), test.code) << test.path;
     EXPECT_EQ(error->reason().rfind(test.start, 0), 0u) << error->reason();
+    EXPECT_FALSE(error->subject().empty());
   }
   EXPECT_EQ(entriesIn(folder.path()), 2u);
 }

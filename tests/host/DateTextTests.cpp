@@ -55,5 +55,18 @@ TEST(DateText, TellsTheHoursAroundAChangeOfDaylightSavingTime) {
   }
 }
 
+TEST(DateText, WritesTodayInCapitalsWhereItBeginsThePeriod) {
+  TestPlatform platform;
+  const Date now = std::chrono::floor<Date::duration>(std::chrono::system_clock::now());
+  platform.strings.texts = {{"Window_Period_FromUntil", "{0} bis {1}"}, {"Window_Period_Until", "Bis {0}"}};
+  const DateText dates("de");
+  // "heute", or "gestern" since a moment ago.
+  EXPECT_THAT(dates.textOfPeriod(now, now, now), testing::MatchesRegex(".*\\([HG]e.*, [hg]e.*\\)"));
+  EXPECT_THAT(dates.textOfPeriod({}, now, now), testing::MatchesRegex(".*\\([hg]e.*\\)"));
+  EXPECT_THAT(dates.textOf(now), testing::MatchesRegex("[hg]e.*"));
+  // The phrases are English ones for lack of Polish texts.
+  EXPECT_THAT(DateText("pl_PL").textOf(now), testing::MatchesRegex("(today|yesterday).*"));
+}
+
 }  // namespace
 }  // namespace nimbo

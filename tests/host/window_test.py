@@ -203,6 +203,20 @@ def faults(session, folder):
         window.see_page("Feeds")
         window.quit()
 
+    window = Window(session, desktop, "--state", folder + "/german", LANG="en_US.UTF-8", LANGUAGE="pl:de")
+    window.comes_to_front()
+    window.click("Feed einrichten")
+    window.click("Hinzufügen")
+    window.see("Gib einen Namen")
+    for entry, text, problem in (("Name", "town", "Diese Adresse"), ("Linien", "/none", "Diese Adresse"),
+                                 ("Störungen", "/nothing", "^/nothing lässt sich nicht lesen")):
+        window.click(entry, "text")
+        press("type", text)
+        press("key", "Return")
+        window.see(problem)
+    window.see("^/none lässt sich nicht lesen")
+    window.quit()
+
     told, gate = os.path.join(folder, "told"), os.path.join(folder, "gate")
     os.mkfifo(gate)
     path = os.path.join(folder, "listening")

@@ -18,7 +18,7 @@ constexpr std::size_t kMostEntities = 100'000;  // no network comes near; each c
 
 ErrorRef badAlerts(const std::string& place, const std::string& what) {
   return transitLineServiceError(TransitLineServiceError::badAlerts,
-                                 "The alerts feed " + place + " cannot be used: " + what);
+                                 "The alerts feed " + place + " cannot be used: " + what, place);
 }
 
 /// Why bytes that are no feed are none.
@@ -159,7 +159,8 @@ Outcome<AlertsFeed> AlertsFeed::read(std::string bytes, const std::string& place
           if (++entities > kMostEntities)
             return transitLineServiceError(TransitLineServiceError::tooLarge,
                                            "The alerts feed " + place + " holds more than " +
-                                               std::to_string(kMostEntities) + " entities. Check the address.");
+                                               std::to_string(kMostEntities) + " entities. Check the address.",
+                                           place);
           try {
             feed.readEntity(body);
           } catch (const protozero::exception&) {

@@ -48,7 +48,8 @@ ErrorRef AlertsStore::staleness(const Feed& feed, const AlertsFeed& alerts) {
   return transitLineServiceError(TransitLineServiceError::staleAlerts,
                                  "The alerts feed " + feed.alerts.publicText() + what +
                                      "; where that is its habit, set \"maximumAlertsAgeMinutes\" of feed \"" +
-                                     feed.name + "\" in feeds.json.");
+                                     feed.name + "\" in feeds.json.",
+                                 feed.alerts.publicText());
 }
 
 Outcome<AlertsFeed> AlertsStore::fetch(const Feed& feed, const std::stop_token& stop) const {
@@ -73,7 +74,8 @@ Outcome<AlertsFeed> AlertsStore::fetch(const Feed& feed, const std::stop_token& 
     const auto held = AlertsFeed::read(std::move(kept->body), place);
     if (held && canStandIn(feed, *kept, *held) && alerts->timestamp() < held->timestamp())
       return transitLineServiceError(TransitLineServiceError::staleAlerts,
-                                     "The alerts feed " + place + " went back to an older state. Try again later.");
+                                     "The alerts feed " + place + " went back to an older state. Try again later.",
+                                     place);
   }
   keep({feed.alerts.text(), answer->validators, currentDate(), std::move(body)}, path);
   return alerts;

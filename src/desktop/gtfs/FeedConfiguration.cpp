@@ -22,7 +22,8 @@ struct Fault {
   const std::filesystem::path& file;
   ErrorRef operator()(const std::string& what) const {
     return transitLineServiceError(TransitLineServiceError::configuration,
-                                   "The feed configuration " + file.native() + " cannot be used: " + what);
+                                   "The feed configuration " + file.native() + " cannot be used: " + what,
+                                   file.native());
   }
 };
 
@@ -90,7 +91,7 @@ ErrorRef unknownFeed(std::string_view name, const std::vector<Feed>& present) {
   std::string names = present.empty() ? "No feed is set up" : "Feeds set up:";
   for (const Feed& feed : present) names += " " + feed.name;
   return transitLineServiceError(TransitLineServiceError::unknownFeed,
-                                 "No feed is named \"" + std::string(name) + "\". " + names + ".");
+                                 "No feed is named \"" + std::string(name) + "\". " + names + ".", std::string(name));
 }
 
 ErrorRef writeDocument(const std::filesystem::path& file, const JSON& document) {
@@ -111,8 +112,8 @@ ErrorRef FeedConfiguration::checkName(std::string_view name) {
                                        "\". Use one to 64 letters, digits, \".\", \"_\" and \"-\", beginning with a "
                                        "letter or digit.");
   if (name == kSampleFeedName)
-    return transitLineServiceError(TransitLineServiceError::badFeedName,
-                                   "\"sample\" is the made-up city. Choose another name.");
+    return transitLineServiceError(TransitLineServiceError::feedNameTaken,
+                                   "\"sample\" is the made-up city. Choose another name.", std::string(name));
   return nullptr;
 }
 
@@ -140,8 +141,9 @@ ErrorRef FeedConfiguration::add(const Feed& feed) {
   if (!present) return present.error();
   if (std::any_of(present->begin(), present->end(), [&](const Feed& other) { return other.name == feed.name; }))
     return transitLineServiceError(
-        TransitLineServiceError::badFeedName,
-        "A feed named \"" + feed.name + "\" is set up already. Choose another name, or remove that one first.");
+        TransitLineServiceError::feedNameTaken,
+        "A feed named \"" + feed.name + "\" is set up already. Choose another name, or remove that one first.",
+        feed.name);
   JSON entry{{"name", feed.name}, {"static", feed.staticFeed.text()}, {"alerts", feed.alerts.text()}};
   if (feed.minorAlerts) entry["minorAlerts"] = true;
   if (feed.maximumAlertsAge != kDefaultMaximumAlertsAge)

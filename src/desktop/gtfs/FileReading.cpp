@@ -14,7 +14,8 @@ namespace nimbo {
 namespace {
 
 ErrorRef unreadable(const std::filesystem::path& path, const std::string& why) {
-  return transitLineServiceError(TransitLineServiceError::unreadableFile, "Cannot read " + path.native() + ": " + why);
+  return transitLineServiceError(TransitLineServiceError::unreadableFile, "Cannot read " + path.native() + ": " + why,
+                                 path.native());
 }
 
 ErrorRef unreadable(const std::filesystem::path& path, int errnoValue) {
@@ -36,7 +37,8 @@ Outcome<std::string> readFile(const std::filesystem::path& path, std::uint64_t l
   const auto tooLarge = [&] {
     return transitLineServiceError(TransitLineServiceError::tooLarge,
                                    path.native() + " is larger than the " + std::to_string(limit >> 20) +
-                                       " MiB that such a file may have. Check that it is the right one.");
+                                       " MiB that such a file may have. Check that it is the right one.",
+                                   path.native());
   };
   if (static_cast<std::uint64_t>(status.st_size) > limit) return tooLarge();
   std::string bytes;

@@ -16,7 +16,8 @@ Outcome<bool> FolderFeedFiles::read(std::string_view name, std::uint64_t limit, 
   const auto unreadable = [&] {
     return transitLineServiceError(
         TransitLineServiceError::unreadableFile,
-        "Cannot read " + path.native() + ": " + std::generic_category().message(errno) + ". Check the static feed.");
+        "Cannot read " + path.native() + ": " + std::generic_category().message(errno) + ". Check the static feed.",
+        path.native());
   };
   const FileDescriptor file(::open(path.c_str(), O_RDONLY | O_CLOEXEC | O_NONBLOCK));
   if (!file) {
@@ -33,7 +34,8 @@ Outcome<bool> FolderFeedFiles::read(std::string_view name, std::uint64_t limit, 
     if (total > limit)
       return transitLineServiceError(TransitLineServiceError::tooLarge,
                                      path.native() + " is larger than the " + std::to_string(limit >> 20) +
-                                         " MiB that such a file may have. Check the static feed.");
+                                         " MiB that such a file may have. Check the static feed.",
+                                     path.native());
     if (!sink({buffer.data(), static_cast<std::size_t>(count)})) return true;
   }
 }

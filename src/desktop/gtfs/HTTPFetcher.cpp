@@ -122,7 +122,7 @@ struct Failure {
 Failure failureOf(CURLcode result, const Transfer& transfer) {
   const std::string limit = std::to_string(transfer.request.limit >> 20) + " MiB";
   if (transfer.isTooLarge) return {Code::tooLarge, "it sends more than " + limit + ". Check the address."};
-  if (transfer.isUnkept) return {Code::internal, "what it sends cannot be kept. Free some space on the disk."};
+  if (transfer.isUnkept) return {Code::notKept, "what it sends cannot be kept. Free some space on the disk."};
   switch (result) {
     case CURLE_COULDNT_RESOLVE_HOST:
     case CURLE_COULDNT_RESOLVE_PROXY:
@@ -163,7 +163,7 @@ Failure failureOf(CURLcode result, const Transfer& transfer) {
 Failure failureOfStatus(long status) {
   const std::string answered = "its server answers with status " + std::to_string(status) + ". ";
   if (status == 401 || status == 403)
-    return {Code::serverFailure, answered + "The address may need a key from the publisher."};
+    return {Code::keyNeeded, answered + "The address may need a key from the publisher."};
   if (status == 404 || status == 410) return {Code::serverFailure, answered + "Check the address."};
   return {Code::serverFailure, answered + "Try again later."};
 }
@@ -177,7 +177,8 @@ Outcome<HTTPAnswer> HTTPFetcher::fetch(const HTTPRequest& request, const std::st
   Transfer transfer{request, stop, sink, handle.get(), {}};
   setOptions(handle.get(), transfer, headers);
   const auto failed = [&](const Failure& failure) {
-    return transitLineServiceError(failure.code, "Cannot fetch " + request.address.publicText() + ": " + failure.what);
+    return transitLineServiceError(failure.code, "Cannot fetch " + request.address.publicText() + ": " + failure.what,
+                                   request.address.publicText());
   };
   if (const CURLcode result = Curl::library().easy_perform(handle.get()); result != CURLE_OK)
     return failed(failureOf(result, transfer));

@@ -19,13 +19,15 @@ using Values = std::span<const std::string_view>;
 
 ErrorRef badFeed(const StaticFeedFiles& files, const std::string& what) {
   return transitLineServiceError(TransitLineServiceError::badStaticFeed,
-                                 "The static feed " + std::string(files.place()) + " cannot be used: " + what);
+                                 "The static feed " + std::string(files.place()) + " cannot be used: " + what,
+                                 std::string(files.place()));
 }
 
 ErrorRef moreThanFit(const StaticFeedFiles& files, const std::string& what) {
   return transitLineServiceError(TransitLineServiceError::tooLarge,
                                  "The static feed " + std::string(files.place()) + " has more than " +
-                                     std::to_string(kMostLines) + " " + what + ". Check that it is the right one.");
+                                     std::to_string(kMostLines) + " " + what + ". Check that it is the right one.",
+                                 std::string(files.place()));
 }
 
 /// Reads a table of the feed. False when the feed has none.

@@ -56,7 +56,8 @@ Outcome<std::unique_ptr<StaticFeedFiles>> openLocal(const std::filesystem::path&
   const auto unreadable = [&](const std::string& why) {
     return transitLineServiceError(
         TransitLineServiceError::unreadableFile,
-        "Cannot read the static feed " + path.native() + ": " + why + ". Check the path, or set the feed up anew.");
+        "Cannot read the static feed " + path.native() + ": " + why + ". Check the path, or set the feed up anew.",
+        path.native());
   };
   FileDescriptor file(::open(path.c_str(), O_RDONLY | O_CLOEXEC | O_NONBLOCK));
   if (!file) return unreadable(std::generic_category().message(errno));

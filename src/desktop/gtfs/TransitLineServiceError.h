@@ -13,7 +13,7 @@ inline constexpr std::string_view kTransitLineServiceErrorDomain = "TransitLineS
 /// Codes of that domain. Every error also carries a reason: what went wrong, where, and what to do.
 enum class TransitLineServiceError : std::int64_t {
   configuration = 1,     ///< feeds.json cannot be used
-  badFeedName = 2,       ///< a feed cannot have this name, or another one has it
+  badFeedName = 2,       ///< a feed cannot have this name
   unknownFeed = 3,       ///< no feed of this name is set up
   badAddress = 4,        ///< neither a path nor an http or https address
   unreadableFile = 5,    ///< a file or folder is missing or cannot be read
@@ -27,12 +27,15 @@ enum class TransitLineServiceError : std::int64_t {
   tooLarge = 13,         ///< more bytes than any feed has
   unknownLine = 14,      ///< a feed has no such line, or none of those asked for
   internal = 15,         ///< a failure of the program itself
+  feedNameTaken = 16,    ///< another feed has this name
+  keyNeeded = 17,        ///< the server lets nobody in without a key
+  notKept = 18,          ///< no room for what the server sends
 };
 
-/// An error of `kTransitLineServiceErrorDomain`.
-inline ErrorRef transitLineServiceError(TransitLineServiceError code, std::string reason) {
+/// An error of `kTransitLineServiceErrorDomain`. The subject is the feed's name, or its place without secrets.
+inline ErrorRef transitLineServiceError(TransitLineServiceError code, std::string reason, std::string subject = {}) {
   return Error::errorWithDomain_code_reason(std::string(kTransitLineServiceErrorDomain),
-                                            static_cast<std::int64_t>(code), std::move(reason));
+                                            static_cast<std::int64_t>(code), std::move(reason), std::move(subject));
 }
 
 }  // namespace nimbo

@@ -45,7 +45,8 @@ Outcome<std::unique_ptr<ZipFeedFiles>> ZipFeedFiles::open(const FileDescriptor& 
     zip.error_fini(&error);
     return transitLineServiceError(TransitLineServiceError::badStaticFeed,
                                    "The static feed " + place + " cannot be opened as a zip file: " + why +
-                                       ". Give a folder or a zip file with agency.txt and routes.txt.");
+                                       ". Give a folder or a zip file with agency.txt and routes.txt.",
+                                   place);
   }
   std::string folder = folderOfFeed(archive.get());
   return std::unique_ptr<ZipFeedFiles>(new ZipFeedFiles(std::move(archive), std::move(folder), std::move(place)));
@@ -59,7 +60,7 @@ Outcome<bool> ZipFeedFiles::read(std::string_view name, std::uint64_t limit, con
   const auto broken = [&](const char* why) {
     return transitLineServiceError(
         TransitLineServiceError::badStaticFeed,
-        path + " in the static feed " + _place + " cannot be read: " + why + ". Fetch the static feed anew.");
+        path + " in the static feed " + _place + " cannot be read: " + why + ". Fetch the static feed anew.", _place);
   };
   const ZipFile file(zip.fopen_index(_archive.get(), static_cast<zip_uint64_t>(index), 0));
   if (!file) return broken(zip.strerror(_archive.get()));
@@ -73,7 +74,8 @@ Outcome<bool> ZipFeedFiles::read(std::string_view name, std::uint64_t limit, con
       return transitLineServiceError(TransitLineServiceError::tooLarge,
                                      path + " in the static feed " + _place + " is larger than the " +
                                          std::to_string(limit >> 20) +
-                                         " MiB that such a file may have. Check the static feed.");
+                                         " MiB that such a file may have. Check the static feed.",
+                                     _place);
     if (!sink({buffer.data(), static_cast<std::size_t>(count)})) return true;
   }
 }

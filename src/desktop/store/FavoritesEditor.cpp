@@ -17,13 +17,13 @@ struct LineRow {
   std::uint64_t muid;
 };
 
-ErrorRef refusal(FavoritesError code, std::string reason) {
+ErrorRef refusal(FavoritesError code, std::string reason, std::string subject = {}) {
   return Error::errorWithDomain_code_reason(std::string(kFavoritesErrorDomain), static_cast<std::int64_t>(code),
-                                            std::move(reason));
+                                            std::move(reason), std::move(subject));
 }
 
 ErrorRef unknownLine(std::uint64_t muid) {
-  return refusal(FavoritesError::unknown, "The line " + std::to_string(muid) + " is no favourite.");
+  return refusal(FavoritesError::unknown, "The line " + std::to_string(muid) + " is no favorite.");
 }
 
 /// An error while favourites are missing that a damaged database had.
@@ -31,10 +31,11 @@ ErrorRef lossOf(SQLiteConnection& connection) {
   SQLiteStatement query = connection.prepare("SELECT value FROM settings WHERE key = ?");
   query.bind(1, kFavoritesLostKey);
   if (!query.step()) return nullptr;
-  return refusal(FavoritesError::lost, "Not all favourites could be read in a damaged database, which is kept as " +
-                                           query.text(0) + ": " +
-                                           std::to_string(connection.integer("SELECT count(*) FROM favorites")) +
-                                           " of them are left. Add those that you miss; that ends this message.");
+  return refusal(FavoritesError::lost,
+                 "Not all favorites could be read in a damaged database, which is kept as " + query.text(0) + ": " +
+                     std::to_string(connection.integer("SELECT count(*) FROM favorites")) +
+                     " of them are left. Add those that you miss; that ends this message.",
+                 query.text(0));
 }
 
 bool wereSet(SQLiteConnection& connection) {
@@ -96,7 +97,7 @@ Favorites storedFavorites(SQLiteConnection& connection) {
 
 FavoritesEditor::FavoritesEditor(std::shared_ptr<StateDatabase> database, FirstFavorites firstFavorites)
     : _database(std::move(database)), _firstFavorites(std::move(firstFavorites)) {
-  if (!_database) throw std::invalid_argument("favourites need a database");
+  if (!_database) throw std::invalid_argument("favorites need a database");
   if (!_firstFavorites) _firstFavorites = [] { return std::vector<TransitLineRef>(); };
 }
 
@@ -129,13 +130,13 @@ ErrorRef FavoritesEditor::change(const StateDatabase::Work& work) {
 
 ErrorRef FavoritesEditor::add(const std::vector<TransitLineRef>& lines) {
   if (std::find(lines.begin(), lines.end(), nullptr) != lines.end())
-    throw std::invalid_argument("a favourite line is not null");
+    throw std::invalid_argument("a favorite line is not null");
   return change([&](SQLiteConnection& connection) -> ErrorRef {
     std::vector<LineRow> rows = lineRows(connection);
     for (const TransitLineRef& line : lines) {
       if (findLine(rows, line->muid()) != rows.end())
         return refusal(FavoritesError::duplicate,
-                       line->name().value_or("The line " + std::to_string(line->muid())) + " is a favourite already.");
+                       line->name().value_or("The line " + std::to_string(line->muid())) + " is a favorite already.");
       append(connection, *line);
       rows.push_back({0, 0, line->muid()});
     }
@@ -167,7 +168,7 @@ ErrorRef FavoritesEditor::move(std::uint64_t muid, std::size_t position) {
     if (row == rows.end()) return unknownLine(muid);
     if (position >= rows.size())
       return refusal(FavoritesError::position, "There is no position " + std::to_string(position + 1) +
-                                                   ": the favourite lines are " + std::to_string(rows.size()) + ".");
+                                                   ": the favorite lines are " + std::to_string(rows.size()) + ".");
     const auto target = rows.begin() + static_cast<std::ptrdiff_t>(position);
     if (row < target)
       std::rotate(row, row + 1, target + 1);

@@ -63,7 +63,7 @@ std::string textOfCounts(const SalvagedCounts& counts) {
   const auto count = [](std::size_t n, const std::string& noun) {
     return std::to_string(n) + " " + noun + (n == 1 ? "" : "s");
   };
-  return count(counts.favorites, "favourite") + " and " + count(counts.settings, "setting");
+  return count(counts.favorites, "favorite") + " and " + count(counts.settings, "setting");
 }
 
 }  // namespace
@@ -71,16 +71,17 @@ std::string textOfCounts(const SalvagedCounts& counts) {
 StateDatabaseFile::StateDatabaseFile(fs::path folder, const Clock& clock)
     : _folder(std::move(folder)), _path(_folder / "state.sqlite"), _clock(clock) {}
 
-ErrorRef StateDatabaseFile::error(StateDatabaseError code, std::string reason) const {
+ErrorRef StateDatabaseFile::error(StateDatabaseError code, std::string reason, const fs::path& subject) const {
   return Error::errorWithDomain_code_reason(std::string(kStateDatabaseErrorDomain), static_cast<std::int64_t>(code),
-                                            std::move(reason));
+                                            std::move(reason), subject.native());
 }
 
 ErrorRef StateDatabaseFile::errorOfFailure(const SQLiteFailure& failure, Purpose purpose) const {
   const bool reading = purpose == Purpose::reading;
   return error(reading ? StateDatabaseError::cannotRead : StateDatabaseError::cannotWrite,
                (reading ? "Cannot read " : "Cannot write ") + _path.native() + ": " + failure.what() + ". " +
-                   std::string(adviceFor(failure.code())));
+                   std::string(adviceFor(failure.code())),
+               _path);
 }
 
 StateDatabaseFile::Opened StateDatabaseFile::open(Purpose purpose) {
@@ -108,12 +109,14 @@ StateDatabaseFile::Opened StateDatabaseFile::openLocked(Purpose purpose) {
   if (version > kStateSchemaVersion)
     return failed(error(StateDatabaseError::newerVersion,
                         _path.native() + " was written by a newer version of this program. Install that version, or "
-                                         "choose another state folder."));
+                                         "choose another state folder.",
+                        _path));
   if (version == kStateSchemaVersion) return opened;
   if (version < 0 || opened.connection->integer("SELECT count(*) FROM sqlite_schema") != 0)
     return failed(error(StateDatabaseError::foreign,
                         _path.native() + " is a database of another program. Move it away, or choose another state "
-                                         "folder."));
+                                         "folder.",
+                        _path));
   createStateSchema(*opened.connection);
   return opened;
 }
@@ -191,7 +194,8 @@ StateDatabaseFile::Opened StateDatabaseFile::replaceLocked() {
   opened.notice = error(StateDatabaseError::setAside,
                         _path.native() + " was damaged and is now kept as " + aside.native() +
                             ". A new one was begun with what could be read of it: " + textOfCounts(counts) +
-                            ". Check your favourites, and the disk.");
+                            ". Check your favorites, and the disk.",
+                        aside);
   return opened;
 }
 

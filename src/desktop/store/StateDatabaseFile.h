@@ -60,7 +60,7 @@ class StateDatabaseFile final {
   /// comes.
   void putNewInPlace(const std::filesystem::path& aside) const;
 
-  ErrorRef error(StateDatabaseError code, std::string reason) const;
+  ErrorRef error(StateDatabaseError code, std::string reason, const std::filesystem::path& subject) const;
   /// Where a new file is made while the damaged one is still there.
   std::filesystem::path pathOfNew() const;
   /// A name for a damaged file that nothing has yet: "state.sqlite.broken-2026-01-05T12-00-00".

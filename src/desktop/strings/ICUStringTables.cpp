@@ -5,6 +5,7 @@
 #include <stdexcept>
 
 #include "desktop/resources/Resources.h"
+#include "desktop/strings/SpanishAnd.h"
 #include "platform/foundation/Log.h"
 
 namespace nimbo {
@@ -26,10 +27,23 @@ std::string tagOfLocale(std::string_view locale) {
   return tag;
 }
 
+std::string fileOfTable(std::string_view name) { return "strings/" + std::string(name) + ".json"; }
+
+/// The table of a tag, or of the tag with its last subtags left out; empty where there is none.
+std::string_view nameOfTable(std::string_view tag) {
+  while (!tag.empty() && !resourceNamed(fileOfTable(tag))) {
+    const std::size_t dash = tag.rfind('-');
+    tag = tag.substr(0, dash == std::string_view::npos ? 0 : dash);
+  }
+  return tag;
+}
+
 }  // namespace
 
+bool ICUStringTables::speak(std::string_view locale) { return !nameOfTable(tagOfLocale(locale)).empty(); }
+
 std::optional<ICUStringTables::Table> ICUStringTables::tableNamed(std::string_view name) {
-  const auto bytes = resourceNamed("strings/" + std::string(name) + ".json");
+  const auto bytes = resourceNamed(fileOfTable(name));
   if (!bytes) return std::nullopt;
   try {
     return nlohmann::json::parse(*bytes).get<Table>();
@@ -40,14 +54,10 @@ std::optional<ICUStringTables::Table> ICUStringTables::tableNamed(std::string_vi
 
 ICUStringTables::ICUStringTables(std::string_view locale) : _english(tableNamed(kFallbackLanguage).value_or(Table())) {
   const std::string tag = tagOfLocale(locale);
-  std::optional<Table> table;
-  for (std::string_view name = tag; !table && !name.empty();) {
-    table = name == kFallbackLanguage ? Table() : tableNamed(name);  // English is behind every table
-    const std::size_t dash = name.rfind('-');
-    name = name.substr(0, dash == std::string_view::npos ? 0 : dash);
-  }
-  _format.emplace(table ? tag : std::string(kFallbackLanguage));
-  if (table) _table = std::move(*table);
+  const std::string_view name = nameOfTable(tag);
+  if (!name.empty() && name != kFallbackLanguage) _table = *tableNamed(name);  // English is behind every table
+  _format.emplace(name.empty() ? std::string(kFallbackLanguage) : tag);
+  _isSpanish = name == "es";
   _isRightToLeft = stringForKey("TransitWidget_Text_Direction") == "rtl";
 }
 
@@ -59,7 +69,7 @@ std::optional<std::string> ICUStringTables::stringForKey(std::string_view key) c
 
 std::string ICUStringTables::format(const std::string& pattern, std::span<const FormatArgument> arguments) const {
   try {
-    return _format->fill(pattern, arguments);
+    return _format->fill(_isSpanish ? withSpanishAnd(pattern, arguments) : pattern, arguments);
   } catch (const std::runtime_error& failure) {
     writeLog({kDefaultLogSubsystem, "StringTables"}, LogLevel::error, "Unable to fill the pattern %@: %@",
              {pattern, failure.what()});

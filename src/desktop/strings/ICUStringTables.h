@@ -13,6 +13,8 @@ class ICUStringTables final : public StringTables {
   /// `locale` is a BCP 47 tag ("de-AT") or a POSIX name ("de_AT.UTF-8"). The table of the tag is used, else that of the
   /// tag with its last subtags left out, else the English one with English rules.
   explicit ICUStringTables(std::string_view locale);
+  /// Whether there is a table for a locale without falling back to English.
+  static bool speak(std::string_view locale);
 
   std::optional<std::string> stringForKey(std::string_view key) const override;
   /// A pattern that cannot be filled is logged and answered as it stands.
@@ -29,6 +31,7 @@ class ICUStringTables final : public StringTables {
 
   Table _table;
   Table _english;
+  bool _isSpanish;
   bool _isRightToLeft;
   std::optional<MessageFormat> _format;  ///< there is one from the constructor on
 };

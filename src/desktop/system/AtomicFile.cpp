@@ -55,7 +55,8 @@ ErrorRef fileError(std::string_view action, const std::filesystem::path& path, i
   std::string reason = "Cannot ";
   reason.append(action).append(" ").append(path.native()).append(": ");
   reason.append(std::generic_category().message(errnoValue)).append(". ").append(adviceFor(errnoValue));
-  return Error::errorWithDomain_code_reason(std::string(kFileErrorDomain), errnoValue, std::move(reason));
+  return Error::errorWithDomain_code_reason(std::string(kFileErrorDomain), errnoValue, std::move(reason),
+                                            path.native());
 }
 
 ErrorRef makeFolders(const std::filesystem::path& folder) {

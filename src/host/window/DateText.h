@@ -12,11 +12,14 @@ namespace nimbo {
 /// at 14:00". Main thread only.
 class DateText {
  public:
-  /// A BCP 47 tag or POSIX name; empty: the environment's.
-  /// Without a format for it, dates are told in ISO form.
+  /// A BCP 47 tag or POSIX name; empty: the environment's. English where there are no texts in its language; without a
+  /// format for it, dates are told in ISO form.
   explicit DateText(const std::string& locale);
 
-  std::string textOf(Date date) const;
+  /// Where in a sentence a date stands.
+  enum class Place { beginning, middle };
+
+  std::string textOf(Date date, Place place = Place::middle) const;
   /// From when until when something lasts, as one phrase; empty when neither is known.
   std::string textOfPeriod(std::optional<Date> start, std::optional<Date> end, Date now) const;
 

@@ -4,6 +4,7 @@
 
 #include "desktop/store/FavoritesEditor.h"
 #include "host/window/Accessible.h"
+#include "host/window/ErrorTexts.h"
 #include "platform/Localization.h"
 
 namespace nimbo {
@@ -35,11 +36,9 @@ FavoritesPage::FavoritesPage(const PageContext& context)
   content().append(_query);
   addSection(_favoritesTitle, "Window_Favorites_Yours", _favoritesList);
   _noFavorites.set_text(LocalizedString("TransitWidget_NoFavoriteTransitLines_SecondaryText"));
-  _noFavorites.set_wrap();
   _noFavorites.set_xalign(0);
   content().append(_noFavorites);
   addSection(_linesTitle, "Window_Favorites_Lines", _linesList);
-  _notice.set_wrap();
   _notice.set_xalign(0);
   _notice.add_css_class("item-caption");
   content().append(_searching);
@@ -67,7 +66,7 @@ bool FavoritesPage::isFavorite(const TransitLine& line) const {
 void FavoritesPage::readFavorites() {
   Favorites all;
   if (const ErrorRef failure = _context.platform->favoritesEditor().list(all))
-    return _context.navigator.tell(failure->reason());
+    return _context.navigator.tell(textOfError(*failure));
   _favorites.clear();
   for (const FavoriteRef& favorite : all)
     if (const auto* line = dynamic_cast<const FavoriteTransitLine*>(favorite.get()); line && line->transitLine())
@@ -137,7 +136,7 @@ void FavoritesPage::showFound() {
     addNotice(
         LocalizedFormat(LocalizedString("Window_Favorites_More"), {std::uint64_t{_found.lines.size() - kLineLimit}}));
   if (_found.lines.empty() && _found.errors.empty()) addNotice(LocalizedString("Window_Favorites_NothingFound"));
-  for (const ErrorRef& error : _found.errors) addNotice(error->reason());
+  for (const ErrorRef& error : _found.errors) addNotice(textOfError(*error));
   _notice.set_text(notice);
   _notice.set_visible(!notice.empty());
 }
@@ -157,7 +156,7 @@ void FavoritesPage::finish(const ErrorRef& failure) {
   showFavorites();
   for (int i = 0; auto* row = dynamic_cast<LineRow*>(_linesList.get_row_at_index(i)); ++i)
     row->setFavorite(isFavorite(*row->line()));
-  if (failure) _context.navigator.tell(failure->reason());
+  if (failure) _context.navigator.tell(textOfError(*failure));
 }
 
 }  // namespace nimbo

@@ -5,6 +5,8 @@
 #include <gtkmm/label.h>
 
 #include "host/window/DateText.h"
+#include "host/window/ErrorTexts.h"
+#include "host/window/Wrapping.h"
 #include "platform/Localization.h"
 
 namespace nimbo {
@@ -57,6 +59,7 @@ void FeedCheckView::check(const Feed& feed, Done done) {
     done(nullptr);
   });
   line->append(*stop);
+  wrapTexts(*line);
   append(*line);
   set_visible();
   stop->grab_focus();
@@ -84,32 +87,40 @@ void FeedCheckView::show(const FeedCheckReport& report) {
       addText(LocalizedFormat(LocalizedString("Window_Incident_Updated"),
                               {DateText(_context.preferences.locale()).textOf(*alerts->timestamp)}),
               "item-caption");
-    if (alerts->staleness) addText(alerts->staleness->reason(), "failed");
+    if (alerts->staleness) addText(textOfError(*alerts->staleness), "failed");
   }
   for (const ErrorRef& error : {report.staticError, report.alertsError})
-    if (error) addText(error->reason(), "failed");
-  SkipReport skipped;
-  if (report.staticFeed) skipped.add(report.staticFeed->skipped);
-  if (report.alerts) {
-    skipped.add(report.alerts->skipped);
-    skipped.add(report.alerts->unfit);
-  }
-  addSkipped(skipped);
+    if (error) addText(textOfError(*error), "failed");
+  addSkipped(report);
 }
 
-void FeedCheckView::addSkipped(const SkipReport& report) {
-  std::size_t count = 0;
-  for (const SkipReport::Entry& entry : report.entries()) count += entry.count;
-  if (count == 0) return;
-  auto* expander = Gtk::make_managed<Gtk::Expander>(countText("Window_Feed_Skipped", count));
+void FeedCheckView::addSkipped(const FeedCheckReport& report) {
+  std::vector<std::pair<const char*, const SkipReport*>> parts;
+  if (report.staticFeed) parts.emplace_back("Window_Feed_SkippedLines", &report.staticFeed->skipped);
+  if (report.alerts) {
+    parts.emplace_back("Window_Feed_SkippedIncidents", &report.alerts->skipped);
+    parts.emplace_back("Window_Feed_Unfit", &report.alerts->unfit);
+  }
+  std::size_t all = 0;
+  std::vector<std::string> texts;
+  for (const auto& [key, part] : parts) {
+    std::size_t count = 0;
+    std::vector<std::string> examples;
+    for (const SkipReport::Entry& entry : part->entries()) {
+      count += entry.count;
+      if (!entry.example.empty()) examples.push_back(entry.example);
+    }
+    if (count == 0) continue;
+    all += count;
+    texts.push_back(countText(key, count) + (examples.empty() ? "" : " (" + CommaDelimitedList(examples) + ")"));
+  }
+  if (all == 0) return;
+  auto* expander = Gtk::make_managed<Gtk::Expander>(countText("Window_Feed_Skipped", all));
   _details = Gtk::make_managed<Gtk::Box>(Gtk::Orientation::VERTICAL, 2);
   expander->set_child(*_details);
   append(*expander);
-  for (const SkipReport::Entry& entry : report.entries()) {
-    std::string text = std::to_string(entry.count) + " × " + entry.reason;
-    if (!entry.example.empty()) text += " (" + entry.example + ")";
-    addText(text, "item-caption");
-  }
+  wrapTexts(*expander);
+  for (const std::string& text : texts) addText(text, "item-caption");
 }
 
 }  // namespace nimbo

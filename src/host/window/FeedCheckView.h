@@ -25,7 +25,8 @@ class FeedCheckView final : public Gtk::Box {
 
  private:
   void addText(const std::string& text, const char* style);
-  void addSkipped(const SkipReport& report);
+  /// How much was left out of which part, and an example for each reason, whose words "feed check" has.
+  void addSkipped(const FeedCheckReport& report);
   void clear();
 
   const PageContext& _context;

@@ -3,6 +3,7 @@
 #include <gtkmm/dialog.h>
 
 #include "host/window/Accessible.h"
+#include "host/window/ErrorTexts.h"
 #include "platform/Localization.h"
 
 namespace nimbo {
@@ -19,8 +20,6 @@ FeedForm::FeedForm(const PageContext& context, Added added)
   addEntry(_static, "Window_Feed_Static", "Window_Feed_StaticPrompt");
   addEntry(_alerts, "Window_Feed_Alerts", "Window_Feed_AlertsPrompt");
   _problem.add_css_class("failed");
-  _problem.set_wrap();
-  _problem.set_wrap_mode(Pango::WrapMode::WORD_CHAR);
   _problem.set_xalign(0);
   _problem.hide();
   append(_problem);
@@ -88,7 +87,7 @@ std::optional<Feed> FeedForm::feed() {
   _problem.hide();
   const std::string name = _name.get_text();
   if (const ErrorRef problem = FeedConfiguration::checkName(name)) {
-    showProblem(problem->reason());
+    showProblem(textOfError(*problem));
     _name.grab_focus();
     return std::nullopt;
   }
@@ -97,7 +96,7 @@ std::optional<Feed> FeedForm::feed() {
   for (std::size_t i = 0; i < std::size(entries); ++i) {
     const auto address = FeedAddress::parse(entries[i]->get_text().raw());
     if (!address) {
-      showProblem(address.error()->reason());
+      showProblem(textOfError(*address.error()));
       entries[i]->grab_focus();
       return std::nullopt;
     }
@@ -137,7 +136,7 @@ void FeedForm::check() {
 
 void FeedForm::keep(const Feed& feed, const FeedCheckReport* report) {
   if (const ErrorRef failure = FeedConfiguration(_context.command.paths.config).add(feed))
-    return showProblem(failure->reason());
+    return showProblem(textOfError(*failure));
   for (Gtk::Entry* entry : {&_name, &_static, &_alerts}) entry->set_text("");
   _check.cancel();
   _addAnyway.hide();

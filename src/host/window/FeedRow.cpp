@@ -3,6 +3,7 @@
 #include <gtkmm/label.h>
 
 #include "host/window/Accessible.h"
+#include "host/window/Wrapping.h"
 #include "platform/Localization.h"
 
 namespace nimbo {
@@ -14,8 +15,6 @@ FeedRow::FeedRow(const PageContext& context, const Feed& feed, std::function<voi
   box->add_css_class("item");
   const auto addText = [box](const std::string& text, const char* style) {
     auto* label = Gtk::make_managed<Gtk::Label>(text);
-    label->set_wrap();
-    label->set_wrap_mode(Pango::WrapMode::WORD_CHAR);
     label->set_xalign(0);
     label->add_css_class(style);
     box->append(*label);
@@ -33,6 +32,7 @@ FeedRow::FeedRow(const PageContext& context, const Feed& feed, std::function<voi
   buttons->append(*removeButton);
   box->append(*buttons);
   set_child(*box);
+  wrapTexts(*box);
   setAccessibleLabel(*this, feed.name);
 }
 

@@ -1,5 +1,6 @@
 #include "host/window/FeedsPage.h"
 
+#include "host/window/ErrorTexts.h"
 #include "host/window/FeedRow.h"
 #include "platform/Localization.h"
 
@@ -14,7 +15,6 @@ FeedsPage::FeedsPage(const PageContext& context)
         if (added && report) added->show(*report);
       }) {
   _none.set_text(LocalizedString("Window_Feeds_None"));
-  _none.set_wrap();
   _none.set_xalign(0);
   _list.add_css_class("card");
   _list.set_selection_mode(Gtk::SelectionMode::NONE);
@@ -27,7 +27,7 @@ FeedsPage::FeedsPage(const PageContext& context)
 void FeedsPage::showFeeds() {
   while (Gtk::ListBoxRow* row = _list.get_row_at_index(0)) _list.remove(*row);
   const auto feeds = _context.library.configuration().feeds();
-  if (!feeds) return _context.navigator.tell(feeds.error()->reason());
+  if (!feeds) return _context.navigator.tell(textOfError(*feeds.error()));
   for (const Feed& feed : *feeds)
     _list.append(*Gtk::make_managed<FeedRow>(_context, feed, [this, feed] { confirmRemoval(feed); }));
   _list.set_visible(!feeds->empty());
@@ -54,7 +54,7 @@ void FeedsPage::remove(const std::string& name) {
   const ErrorRef failure = FeedConfiguration(_context.command.paths.config).remove(name);
   if (!failure) _context.library.cache().remove(name);
   showFeeds();
-  if (failure) _context.navigator.tell(failure->reason());
+  if (failure) _context.navigator.tell(textOfError(*failure));
 }
 
 }  // namespace nimbo

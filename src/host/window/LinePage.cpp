@@ -19,7 +19,6 @@ LinePage::LinePage(const PageContext& context, const TransitLineItemRef& line) :
     auto* label = Gtk::make_managed<Gtk::Label>(text);
     label->add_css_class(style);
     label->set_xalign(0);
-    label->set_wrap();
     label->set_visible(!text.empty());
     texts->append(*label);
   }

@@ -5,6 +5,7 @@
 #include "desktop/rpc/Base64.h"
 #include "platform/HostApplication.h"
 #include "platform/Localization.h"
+#include "platform/foundation/Log.h"
 #include "platform/transit/BasicTransitIncident.h"
 #include "platform/transit/BasicTransitLineItem.h"
 
@@ -20,7 +21,10 @@ ErrorRef refusal(std::string_view key, const std::string& detail) {
                                             LocalizedFormat(LocalizedString(key), {detail}));
 }
 
-ErrorRef badPayload(const std::string& why) { return refusal("Window_Open_BadPayload", why); }
+ErrorRef badPayload(const std::string& why) {
+  writeLog({kDefaultLogSubsystem, "Open"}, LogLevel::error, "What was handed over cannot be shown: %{private}@", {why});
+  return refusal("Window_Open_BadPayload", {});
+}
 
 struct URLParts {
   std::string scheme;

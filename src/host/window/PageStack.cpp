@@ -1,6 +1,7 @@
 #include "host/window/PageStack.h"
 
 #include "host/window/Accessible.h"
+#include "host/window/Wrapping.h"
 
 namespace nimbo {
 
@@ -11,6 +12,7 @@ PageStack::PageStack(std::unique_ptr<Page> first) {
 }
 
 void PageStack::push(std::unique_ptr<Page> page) {
+  wrapTexts(*page);
   add(*page);
   _pages.push_back(std::move(page));
   show(Gtk::StackTransitionType::SLIDE_LEFT);

@@ -6,6 +6,7 @@
 
 #include "desktop/rpc/Base64.h"
 #include "host/window/Accessible.h"
+#include "host/window/ErrorTexts.h"
 #include "platform/Localization.h"
 #include "platform/Platform.h"
 
@@ -93,7 +94,6 @@ void WidgetPage::buildCard() {
   _waiting.start();
 
   _failure.add_css_class("notice");
-  _failureReason.set_wrap();
   _failureReason.set_xalign(0);
   auto* tryAgain = Gtk::make_managed<Gtk::Button>(LocalizedString("Window_TryAgain"));
   tryAgain->set_halign(Gtk::Align::START);
@@ -119,7 +119,6 @@ void WidgetPage::buildPlaces() {
   _sampleNotice.add_css_class("card");
   _sampleNotice.add_css_class("notice");
   auto* text = Gtk::make_managed<Gtk::Label>(LocalizedString("Window_Sample_Text"));
-  text->set_wrap();
   text->set_xalign(0);
   auto* button = Gtk::make_managed<Gtk::Button>(LocalizedString("Window_Sample_Button"));
   button->add_css_class("suggested-action");
@@ -181,7 +180,7 @@ void WidgetPage::toggleExpanded() {
   _wantsExpanded = !_wantsExpanded;
   const ErrorRef failure =
       Platform::current().sharedSettings().groupStore()->setValue_forKey(_wantsExpanded, kExpandedKey);
-  if (failure) _context.navigator.tell(failure->reason());
+  if (failure) _context.navigator.tell(textOfError(*failure));
   _process.setExpanded(_wantsExpanded);
   showExpandButton();
 }

@@ -1,6 +1,7 @@
 #include "host/window/WindowApplication.h"
 
 #include "desktop/system/SmallMemory.h"
+#include "host/window/ErrorTexts.h"
 #include "platform/Localization.h"
 
 namespace nimbo {
@@ -13,21 +14,21 @@ WindowApplication::WindowApplication(const CommandContext& context)
     : Gtk::Application(kIdentifier, context.widgetArguments.empty()
                                         ? Gio::Application::Flags::HANDLES_OPEN
                                         : Gio::Application::Flags::HANDLES_OPEN | Gio::Application::Flags::NON_UNIQUE),
-      _context(context) {
-  // On the main thread, and once there is a window.
-  _context.tell = [this](const std::string& message) {
-    _context.runLoop.dispatchAsync([this, message] { tell(message); });
-  };
-}
+      _context(context) {}
 
-void WindowApplication::tell(const std::string& message) {
-  if (_window) _window->tell(message);
+std::unique_ptr<HostPlatform> WindowApplication::makePlatform(const std::string& locale) {
+  // On the main thread, and once there is a window.
+  return std::make_unique<HostPlatform>(_context, locale, [this](const ErrorRef& notice) {
+    _context.runLoop.dispatchAsync([this, notice] {
+      if (_window) _window->tell(textOfError(*notice));
+    });
+  });
 }
 
 void WindowApplication::on_startup() {
   Gtk::Application::on_startup();
   // The choice of a language stands in the settings that the platform reads.
-  _platform = std::make_unique<HostPlatform>(_context);
+  _platform = makePlatform({});
   _preferences = std::make_unique<DesktopPreferences>();
   if (!_preferences->locale().empty()) changeLocale();
   _preferences->signalLocaleChanged().connect([this] {
@@ -58,7 +59,7 @@ void WindowApplication::changeLocale() {
   _window.reset();
   // One platform at a time is in force.
   _platform.reset();
-  _platform = std::make_unique<HostPlatform>(_context, _preferences->locale());
+  _platform = makePlatform(_preferences->locale());
   if (hadWindow) {
     makeWindow();
     _window->set_default_size(width, height);

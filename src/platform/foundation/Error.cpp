@@ -14,15 +14,22 @@ ErrorRef Error::errorWithDomain_code_userInfo(std::string domain, std::int64_t c
   return std::make_shared<const Error>(std::move(domain), code, std::move(userInfo));
 }
 
-ErrorRef Error::errorWithDomain_code_reason(std::string domain, std::int64_t code, std::string reason) {
-  return errorWithDomain_code_userInfo(std::move(domain), code,
-                                       {{std::string(kErrorReasonKey), box(std::move(reason))}});
+ErrorRef Error::errorWithDomain_code_reason(std::string domain, std::int64_t code, std::string reason,
+                                            std::string subject) {
+  BoxedDictionary::Entries userInfo{{std::string(kErrorReasonKey), box(std::move(reason))}};
+  if (!subject.empty()) userInfo.emplace(kErrorSubjectKey, box(std::move(subject)));
+  return errorWithDomain_code_userInfo(std::move(domain), code, std::move(userInfo));
 }
 
 std::string Error::reason() const {
   for (std::string_view key : {kErrorReasonKey, kErrorDebugDescriptionKey})
     if (const ObjectRef text = _userInfo->objectForKey(key)) return text->description();
   return _domain + " " + std::to_string(_code);
+}
+
+std::string Error::subject() const {
+  const ObjectRef text = _userInfo->objectForKey(kErrorSubjectKey);
+  return text ? text->description() : std::string();
 }
 
 bool Error::isEqual(const Object* other) const {

@@ -17,6 +17,10 @@ inline constexpr std::string_view kErrorDebugDescriptionKey = "DebugDescription"
 /// User-info key of one sentence for the user: what failed, where, and what to do about it.
 inline constexpr std::string_view kErrorReasonKey = "Reason";
 
+/// User-info key of what failed, as text of no language: a path, an address, a name. Hosts that tell of an error in the
+/// user's language do so by its domain and code, and put this in.
+inline constexpr std::string_view kErrorSubjectKey = "Subject";
+
 /// A runtime failure as a value: a domain, a code within it, and details by key. Equal when all three are.
 class Error final : public Object {
  public:
@@ -24,8 +28,9 @@ class Error final : public Object {
 
   static ErrorRef errorWithDomain_code_userInfo(std::string domain, std::int64_t code,
                                                 BoxedDictionary::Entries userInfo);
-  /// An error whose only detail is its reason for the user.
-  static ErrorRef errorWithDomain_code_reason(std::string domain, std::int64_t code, std::string reason);
+  /// An error whose details are its reason for the user and its subject, if any.
+  static ErrorRef errorWithDomain_code_reason(std::string domain, std::int64_t code, std::string reason,
+                                              std::string subject = {});
 
   const std::string& domain() const { return _domain; }
   std::int64_t code() const { return _code; }
@@ -34,6 +39,8 @@ class Error final : public Object {
 
   /// The reason for the user, else the text for developers, else domain and code.
   std::string reason() const;
+  /// Empty when there is none.
+  std::string subject() const;
 
   std::string_view className() const override { return "Error"; }
   bool isEqual(const Object* other) const override;
