@@ -39,7 +39,11 @@ constexpr Sample kSamples[] = {
     {ShieldType::roundedBox, "10", nullptr, nullptr},
     {ShieldType::roundedBox, "京王線", "dd0077", "ffffff"},
     {ShieldType::roundedBox, "Red Line", "da291c", "ffffff"},
-    {ShieldType::roundedBox, "Providence/Stoughton Line", "80276c", "ffffff"},
+    {ShieldType::pill, "Green D", "00843d", "ffffff"},
+    {ShieldType::pill, "Hudson-Be…", "0076bb", "ffffff"},
+    {ShieldType::pill, "S-Bahn 41", "aa3c1f", "ffffff"},
+    {ShieldType::roundedBox, "Straße… 12", "fccc0a", nullptr},
+    {ShieldType::roundedBox, "Providence", "80276c", "ffffff"},
 };
 
 TransitArtworkRef artwork(const Sample& sample, bool hasBadge) {
@@ -62,7 +66,7 @@ TransitArtworkRef artwork(TransitMode mode) {
 /// Draws one appearance, from the painter's origin.
 class Panel {
  public:
-  static constexpr Size kSize{640, 520};
+  static constexpr Size kSize{640, 660};
 
   Panel(Painter& painter, PangoTextSystem& text, double scale, bool nightMode)
       : _painter(painter),

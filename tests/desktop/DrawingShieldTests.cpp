@@ -48,19 +48,26 @@ class Shields : public testing::Test {
 };
 
 TEST_F(Shields, ShrinkWithEachSizeAndFitTheirColumn) {
-  const char* texts[] = {"1", "42", "SIR", "京王線", "90А", "Red Line", "Providence/Stoughton Line"};
-  for (const auto type : {ShieldType::roundedBox, ShieldType::circle, ShieldType::pill})
-    for (const char* name : texts) {
-      Size larger{1000, 31};
-      for (std::int64_t size = 7; size >= 0; --size) {
-        const Size now = render(shieldOf(type, name), size)->size();
-        EXPECT_LT(now.height, larger.height) << name << size;
-        EXPECT_LT(now.width, larger.width) << name << size;
-        EXPECT_GE(now.width, now.height) << name << size;
-        larger = now;
+  const char* texts[] = {"1",          "42",         "SIR",
+                         "京王線",     "90А",        "Red Line",
+                         "MetroRide",  "S-Bahn 41",  "東京メトロ銀座線",
+                         "WWWWWWWWWW", "Hudson-Be…", "Providence/Stoughton Line"};
+  constexpr double kNarrowestColumn = 73, kGap = 4;
+  for (const bool hasBadge : {false, true})
+    for (const auto type : {ShieldType::roundedBox, ShieldType::circle, ShieldType::pill})
+      for (const char* name : texts) {
+        Size larger{1000, 31};
+        for (std::int64_t size = 7; size >= 0; --size) {
+          auto fields = fieldsOf(shieldOf(type, name));
+          fields.hasRoutingIncidentBadge = hasBadge;
+          const Size now = render(fields, size)->size();
+          EXPECT_LT(now.height, larger.height) << name << size;
+          EXPECT_LT(now.width, larger.width) << name << size;
+          EXPECT_GE(now.width, now.height) << name << size;
+          EXPECT_LE(now.width, kNarrowestColumn - kGap) << name << size;
+          larger = now;
+        }
       }
-      EXPECT_LE(larger.width, 73) << name;
-    }
   EXPECT_EQ(render(shieldOf(ShieldType::pill, "1"), -3)->size(), render(shieldOf(ShieldType::pill, "1"), 0)->size());
   EXPECT_EQ(render(shieldOf(ShieldType::pill, "1"), 99)->size(), render(shieldOf(ShieldType::pill, "1"), 7)->size());
 }

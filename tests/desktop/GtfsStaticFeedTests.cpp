@@ -3,6 +3,7 @@
 #include "GtfsFixtures.h"
 #include "desktop/gtfs/FeedConfiguration.h"
 #include "desktop/gtfs/FileReading.h"
+#include "desktop/gtfs/LineArtwork.h"
 #include "desktop/gtfs/LineItems.h"
 #include "desktop/gtfs/StaticFeedStore.h"
 #include "desktop/gtfs/TransitLineServiceError.h"
@@ -93,6 +94,36 @@ TEST(StaticFeed, IsRefusedWithWhatIsWrong) {
   }
 }
 
+TEST(LineArtwork, ShortensALongNameToWhatTellsTheLine) {
+  const std::pair<const char*, const char*> names[] = {
+      {"MetroRide", "MetroRide"},
+      {"S-Bahn 41", "S-Bahn 41"},
+      {"Bus Bridge", "Bus Bridge"},
+      {"Green Line D", "Green D"},
+      {"Green Line E", "Green E"},
+      {"Orange Line", "Orange"},
+      {"Metropolitana Linea A", "Metropo… A"},
+      {"Línea Número 12", "Número 12"},
+      {"Linie Linie Linie", "Linie Lin…"},
+      {"Straßenbahn 12", "Straße… 12"},
+      {"Tramway T3a", "Tramw… T3a"},
+      {"Hudson-Bergen Light Rail", "Hudson-Be…"},
+      {"Hudson-Bergen Light Rail 3", "Hudson… 3"},
+      {"Newark Light Rail", "Newark"},
+      {"Red Line Ashmont Shuttle", "Red Ashmo…"},
+      {"Middleborough/Lakeville Line", "Middlebor…"},
+      {"東京メトロ銀座線・丸ノ内線", "東京メトロ銀座線・…"},
+      {"Kilome\u0301te\u0301rique", "Kilome\u0301t…"},
+  };
+  for (const auto& [name, text] : names) {
+    StaticLine line;
+    line.shortName = name;
+    const TransitArtworkRef artwork = lineArtwork(line);
+    EXPECT_EQ(artwork->shieldDataSource()->shieldText, text);
+    EXPECT_EQ(artwork->accessibilityText(), name);
+  }
+}
+
 TEST(LineArtwork, IsAReadableShield) {
   const struct {
     const char* route;  // short name, long name, type, colour, text colour
@@ -105,7 +136,7 @@ TEST(LineArtwork, IsAReadableShield) {
       {"A,Eighth Avenue,1,0039A6,FFFFFF", "A", ShieldType::circle, "#0039a6", "#ffffff", "A, Eighth Avenue"},
       {"SIR,,1,,FFFFFF", "SIR", ShieldType::pill, nullptr, nullptr, "SIR"},
       {",Red Line,1,DA291C,FFFFFF", "Red Line", ShieldType::pill, "#da291c", "#ffffff", "Red Line"},
-      {",Framingham/Worcester Line,2,80276C,", "Framingham/…", ShieldType::pill, "#80276c", "#ffffff",
+      {",Framingham/Worcester Line,2,80276C,", "Framingham", ShieldType::pill, "#80276c", "#ffffff",
        "Framingham/Worcester Line"},
       {",Mattapan Trolley,0,DA291C,AAAAAA", "Mattapan", ShieldType::roundedBox, "#da291c", "#ffffff",
        "Mattapan Trolley"},

@@ -45,6 +45,25 @@ TEST(PlainText, EndsInAnEllipsisWhereItIsTooLong) {
   EXPECT_EQ(plainText("<p>A<p>é", 2), "A…");
 }
 
+TEST(PlainText, IsCutBetweenWhatARiderTakesForCharacters) {
+  const struct {
+    const char* what;
+    std::string text;
+    std::size_t limit;
+    std::string cut;
+  } cases[] = {
+      {"a letter and its marks", "Vie\u0302\u0323t Nam", 5, "Vi…"},
+      {"a mark too many", "Caf\u00e9e\u0301", 5, "Café…"},
+      {"a family", "A\U0001F468\u200D\U0001F469\u200D\U0001F467 B", 4, "A…"},
+      {"flags", "\U0001F1E9\U0001F1EA\U0001F1EB\U0001F1F7\U0001F1EA\U0001F1F8", 4, "\U0001F1E9\U0001F1EA…"},
+      {"a syllable of letters", "\u1112\u1161\u11ab\u1100\u1173\u11af!", 6, "\u1112\u1161\u11ab…"},
+      {"vowel signs", "\u0928\u092e\u0938\u094d\u0924\u0947 !", 4, "\u0928\u092e…"},
+      {"one character, longer than the text may be", "e" + std::string("\u0301\u0301\u0301\u0301"), 3, "e\u0301…"},
+      {"Cyrillic", "Трамвай", 5, "Трам…"},
+  };
+  for (const auto& [what, text, limit, cut] : cases) EXPECT_EQ(plainText(text, limit), cut) << what;
+}
+
 TEST(PlainText, TakesLinearTimeForHostileMarkup) {
   for (const char* unit : {"<a ", "<a =\"", "<!--", "&#", "<style>", "<p", "\u200D"}) {
     std::string text;

@@ -216,6 +216,30 @@ TEST(StringTables, SayTheSpanishAndByTheSoundAfterIt) {
   EXPECT_EQ(fill(spanish, "Window_Incident_OtherLines", {std::uint64_t{1}}), "y 1 más");
 }
 
+TEST(StringTables, KeepNamesFromRightToLeftInOrder) {
+  const auto fillAll = [](const char* locale, const char* key, std::vector<FormatArgument> arguments) {
+    const ICUStringTables tables(locale);
+    return tables.format(tables.stringForKey(key).value(), arguments);
+  };
+  const char* const both = "TransitWidget_2_Lines_Concatenated";
+  const char* const prepended = "TransitWidget_N_Lines_Prepended_Incident_Text";
+  const std::string five = "קו 5", six = "קו 6", isolatedFive = "\u2068קו 5\u2069", isolatedSix = "\u2068קו 6\u2069";
+  EXPECT_EQ(fillAll("en", both, {five, six}), isolatedFive + " and " + isolatedSix);
+  EXPECT_EQ(fillAll("de", both, {"S 5", six}), "S 5 und " + isolatedSix);
+  EXPECT_EQ(fillAll("ar", both, {five, "S 6"}), isolatedFive + " و\u2068S 6\u2069");
+  EXPECT_EQ(fillAll("en", "Window_Favorites_Up", {"خط 1"}), "Move \u2068خط 1\u2069 up");
+  // A list is isolated name by name, in the order of the language.
+  const ICUStringTables english("en");
+  const std::string list = english.commaDelimitedList({five, "Żółta", six});
+  EXPECT_EQ(list, isolatedFive + ", Żółta, " + isolatedSix);
+  EXPECT_EQ(fillAll("en", prepended, {list, "7", "עיכובים"}), list + ", and 7: \u2068עיכובים\u2069");
+  // Of every script that runs from right to left, and of none that does not.
+  for (const std::string text : {"ا", "ܐ", "ނ", "ߊ", "ﬡ", "ﷲ", "ﻻ", "\U00010800", "\U0001E900"})
+    EXPECT_EQ(english.commaDelimitedList({text}), "\u2068" + text + "\u2069");
+  for (const std::string text : {"é", "Ж", "Ա", "अ", "京", "ﬀ", "Ａ", "€", "\U0001F687", "\u061C"})
+    EXPECT_EQ(english.commaDelimitedList({text}), text);
+}
+
 TEST(StringTables, FallBackToTheLanguageAndThenToEnglish) {
   for (const auto& [locale, title] : std::map<std::string, std::string>{{"de-AT", "Keine Favoriten"},
                                                                         {"de_CH.UTF-8", "Keine Favoriten"},

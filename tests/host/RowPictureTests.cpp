@@ -3,6 +3,9 @@
 #include <cairo.h>
 #include <gmock/gmock.h>
 
+#include <array>
+#include <cctype>
+
 #include "desktop/DrawingInk.h"
 #include "host/Programs.h"
 
@@ -77,10 +80,11 @@ class Picture {
 class RowPictures : public testing::Test {
  protected:
   /// A metro and many buses, the first `affected` of them with an incident of their own.
-  void setUpCity(int affected, const Alerts& others = {}) {
+  void setUpCity(int affected, const Alerts& others = {}, const std::array<std::string, 2>& metro = {"1", "2"}) {
     std::string routes =
         "route_id,agency_id,route_short_name,route_long_name,route_type,route_color,route_text_color\n"
-        "m1,M,1,Harbour Line,1,005599,FFFFFF\nm2,M,2,Castle Line,1,CC0000,FFFFFF\n";
+        "m1,M," +
+        metro[0] + ",Harbour Line,1,005599,FFFFFF\nm2,M," + metro[1] + ",Castle Line,1,CC0000,FFFFFF\n";
     std::vector<std::string> favorites = {"m1", "m2", "b0", "b39"};
     Alerts alerts = others;
     for (int i = 0; i < 40; ++i) {
@@ -111,6 +115,8 @@ class RowPictures : public testing::Test {
   Programs programs;
 };
 
+bool isLatin(const std::string& text) { return std::isalpha(static_cast<unsigned char>(text.at(0))); }
+
 void expectOrder(const json& row, const Picture& picture, bool isMirrored) {
   const auto frame = row["frame"].get<std::vector<double>>();
   Parts parts;
@@ -122,7 +128,11 @@ void expectOrder(const json& row, const Picture& picture, bool isMirrored) {
   for (const PixelBox& text : parts.texts) {
     const Ink::Found ink = picture.drawnIn(text);
     EXPECT_GE(picture.contrastIn(text), kReadable);
-    EXPECT_NEAR(begin(ink.right, ink.left), edge, 12) << "texts begin on the leading side";
+    const bool isPrimary = text.top == parts.texts[0].top;
+    if (isMirrored && isLatin(row[isPrimary ? "primaryText" : "secondaryText"]))
+      EXPECT_NEAR(ink.left, text.left, 12) << "a text begins on its own side";
+    else
+      EXPECT_NEAR(begin(ink.right, ink.left), edge, 12) << "texts begin on the leading side";
     EXPECT_GE(ink.top, frame[1] * kScale);
     EXPECT_LE(ink.bottom, (frame[1] + frame[3]) * kScale);
   }
@@ -173,6 +183,26 @@ TEST_F(RowPictures, AreInOrderInEverySizeLanguageAndAppearance) {
       ASSERT_EQ(snapshot["rows"].size(), isExpanded ? 4u : 1u);
       for (const json& row : snapshot["rows"]) expectOrder(row, picture, parameters.value("locale", "") == "ar");
     }
+}
+
+TEST_F(RowPictures, KeepShieldsOffTheTextsHoweverNarrowTheyAre) {
+  // Of equal shields only one would be made smaller: all of them have to be narrow enough.
+  setUpCity(0,
+            {{"x", {"m1"}, "Signal failure at the castle", "Trains run every ten minutes until the evening."},
+             {"y", {"m1"}, "Elevatoroutofservicebeyondthecastle", ""},
+             {"z", {"m2"}, "Marathon", "Streets are closed."}},
+            {"Hudson-Bergen Light Rail", "WWWWWWWWWW"});
+  for (const int width : {240, 300, 348, 359})
+    for (const auto& [textSize, height] : {std::pair("large", 110), {"accessibilityExtraExtraExtraLarge", 343}})
+      for (const char* locale : {"en", "ar"})
+        for (const bool isExpanded : {false, true}) {
+          SCOPED_TRACE(std::to_string(width) + " " + textSize + " " + locale + (isExpanded ? " expanded" : ""));
+          const json sizes = {{"compact", {width, height}}, {"expanded", {width, 4 * height}}};
+          const auto [snapshot, picture] =
+              draw({{"displayModes", sizes}, {"textSize", textSize}, {"locale", locale}}, isExpanded);
+          ASSERT_EQ(snapshot["rows"].size(), isExpanded ? 4u : 1u);
+          for (const json& row : snapshot["rows"]) expectOrder(row, picture, locale == std::string("ar"));
+        }
 }
 
 TEST_F(RowPictures, CountTheShieldsThatDoNotFit) {

@@ -4,7 +4,6 @@
 
 #include <algorithm>
 #include <cmath>
-#include <limits>
 #include <numbers>
 
 #include "desktop/drawing/CairoPainter.h"
@@ -71,6 +70,10 @@ std::string plainText(const ServerFormattedString& string) {
     }
   return trimmed(text);
 }
+
+/// Of a shield's padding what a text keeps that does not fit otherwise, and how far letters can be condensed and still
+/// look like letters.
+constexpr double kTightPadding = 0.5, kMostCondensed = 0.75;
 
 /// The next length at which a right edge is as sharp as the left one.
 double wholePixels(double length, double screenScale) { return std::ceil(length * screenScale - 1e-6) / screenScale; }
@@ -171,27 +174,29 @@ ImageRef CairoShieldRenderer::renderShield(const TransitShield& shield, const Lo
   const ShieldMetrics& metrics = look.metrics;
   const ShieldColors colors = shieldColors(shield, look.nightMode);
   Size size{metrics.height, metrics.height};
-  double radius = metrics.height / 2, padding = metrics.padding, pointSize = 0;
-  TextLayoutRef layout;
+  double radius = metrics.height / 2, padding = metrics.padding;
+  std::optional<FittedText> fitted;
   const auto type = static_cast<ShieldType>(shield.shieldType);
+  const auto inCircle = [&](const ShieldMetrics& of) { return squeezed(text, of, circleTextWidth(of), 1); };
   // A text that would lose its end in the smallest circle makes a pill of every size, so that smaller is narrower.
-  if (type == ShieldType::circle &&
-      !fit(text, shieldMetrics(0), circleTextWidth(shieldMetrics(0)), pointSize)->isTruncated())
-    layout = fit(text, metrics, circleTextWidth(metrics), pointSize);
+  if (type == ShieldType::circle && !inCircle(shieldMetrics(0)).layout->isTruncated())
+    fitted = inCircle(metrics);
   else if (type != ShieldType::pill && type != ShieldType::circle)
     radius = metrics.cornerRadius;
-  if (!layout) {
+  if (!fitted) {
     if (radius == metrics.height / 2) {
       padding *= 1.2;
       size.width *= 1.25;
     }
-    layout = fit(text, metrics, metrics.maximumWidth - 2 * padding, pointSize);
-    size.width = std::max(size.width, layout->size().width + 2 * padding);
+    const double widest = widestWithin(look);
+    fitted = whole(text, metrics, widest - 2 * padding);
+    size.width = fitted ? std::max(size.width, fitted->width() + 2 * padding) : widest;
+    if (!fitted) fitted = squeezed(text, metrics, widest - 2 * kTightPadding * padding, kMostCondensed);
   }
   size.width = wholePixels(size.width, look.screenScale);
   return drawFramed(size.width, look, [&](cairo_t* context) {
     fillShape(context, size, radius, colors);
-    drawCentered(context, *layout, pointSize, size, colors.text);
+    drawCentered(context, *fitted, size, colors.text);
   });
 }
 
@@ -209,11 +214,12 @@ ImageRef CairoShieldRenderer::renderSymbol(std::string_view name, const Look& lo
 
 ImageRef CairoShieldRenderer::renderText(const std::string& text, const Look& look) {
   if (text.empty()) return nullptr;
-  double pointSize = 0;
-  const TextLayoutRef layout = fit(text, look.metrics, look.metrics.maximumWidth, pointSize);
-  const double width = layout->size().width;
+  const double widest = widestWithin(look);
+  std::optional<FittedText> fitted = whole(text, look.metrics, widest);
+  if (!fitted) fitted = squeezed(text, look.metrics, widest, kMostCondensed);
+  const double width = fitted->width();
   return drawFramed(width, look, [&](cairo_t* context) {
-    drawCentered(context, *layout, pointSize, {width, look.metrics.height},
+    drawCentered(context, *fitted, {width, look.metrics.height},
                  colorOf(SystemColor::label, look.nightMode ? Appearance::dark : Appearance::light));
   });
 }
@@ -228,25 +234,41 @@ ImageRef CairoShieldRenderer::drawFramed(double width, const Look& look,
   });
 }
 
-TextLayoutRef CairoShieldRenderer::fit(const std::string& text, const ShieldMetrics& metrics, double width,
-                                       double& pointSize) const {
-  const auto layOut = [&](double maxWidth) {
-    return _text.layOut(text, {pointSize, true}, maxWidth, 1, TextAlignment::natural, false);
-  };
-  pointSize = metrics.textSize;
-  TextLayoutRef whole = layOut(std::numeric_limits<double>::infinity());
-  const double wholeWidth = whole->size().width;
-  if (wholeWidth <= width && !whole->isTruncated()) return whole;
-  pointSize = std::clamp(metrics.textSize * width / wholeWidth, metrics.smallestTextSize, metrics.textSize);
-  // Rounding of the size must not cost the last letter of a text that was shrunk to fit.
-  return layOut(width + 0.01);
+double CairoShieldRenderer::widestWithin(const Look& look) {
+  return look.metrics.maximumWidth - (look.hasBadge ? badgeOverhang(look.metrics.height) : 0);
 }
 
-void CairoShieldRenderer::drawCentered(cairo_t* context, const TextLayout& text, double pointSize, Size box,
-                                       const Color& color) const {
-  const double baseline = (box.height + _text.metrics({pointSize, true}).capHeight) / 2;
-  const double width = text.size().width;
-  CairoPainter(context).drawText(text, {(box.width - width) / 2, baseline - text.firstBaseline()}, width, color);
+TextLayoutRef CairoShieldRenderer::layOut(const std::string& text, double pointSize, double width) const {
+  return _text.layOut(text, {pointSize, true}, width, 1, TextAlignment::natural, false);
+}
+
+std::optional<CairoShieldRenderer::FittedText> CairoShieldRenderer::whole(const std::string& text,
+                                                                          const ShieldMetrics& metrics,
+                                                                          double width) const {
+  FittedText fitted{layOut(text, metrics.textSize, kUnboundedTextWidth), metrics.textSize};
+  if (fitted.width() > width || fitted.layout->isTruncated()) return std::nullopt;
+  return fitted;
+}
+
+CairoShieldRenderer::FittedText CairoShieldRenderer::squeezed(const std::string& text, const ShieldMetrics& metrics,
+                                                              double width, double mostCondensed) const {
+  const TextLayoutRef natural = layOut(text, metrics.textSize, kUnboundedTextWidth);
+  const double naturalWidth = natural->size().width;
+  if (naturalWidth <= width && !natural->isTruncated()) return {natural, metrics.textSize};
+  const double pointSize =
+      std::clamp(metrics.textSize * width / naturalWidth, metrics.smallestTextSize, metrics.textSize);
+  const double condensed = std::clamp(width / (naturalWidth * pointSize / metrics.textSize), mostCondensed, 1.0);
+  // Rounding of the size must not cost the last letter of a text that was shrunk to fit.
+  return {layOut(text, pointSize, (width + 0.01) / condensed), pointSize, condensed};
+}
+
+void CairoShieldRenderer::drawCentered(cairo_t* context, const FittedText& text, Size box, const Color& color) const {
+  const double baseline = (box.height + _text.metrics({text.pointSize, true}).capHeight) / 2;
+  cairo_save(context);
+  cairo_translate(context, (box.width - text.width()) / 2, baseline - text.layout->firstBaseline());
+  cairo_scale(context, text.condensed, 1);
+  CairoPainter(context).drawText(*text.layout, {0, 0}, text.layout->size().width, color);
+  cairo_restore(context);
 }
 
 std::shared_ptr<const VectorImage> CairoShieldRenderer::symbol(std::string_view name) {

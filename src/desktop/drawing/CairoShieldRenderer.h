@@ -37,14 +37,27 @@ class CairoShieldRenderer final : public ShieldIconRenderer {
   ImageRef renderShield(const TransitShield& shield, const Look& look);
   ImageRef renderSymbol(std::string_view name, const Look& look);
   ImageRef renderText(const std::string& text, const Look& look);
+  /// A text on one line.
+  struct FittedText {
+    TextLayoutRef layout;
+    double pointSize;
+    double condensed = 1;  ///< horizontal scale, 1 where it stays as it is
+    double width() const { return layout->size().width * condensed; }
+  };
+
   /// An image as high as the size says and `width` points wide, wider for the badge where there is one.
   ImageRef drawFramed(double width, const Look& look, const std::function<void(cairo_t*)>& draw) const;
-  /// The text on one line of at most `width` points: shrunk first, then without its end.
-  TextLayoutRef fit(const std::string& text, const ShieldMetrics& metrics, double width, double& pointSize) const;
+  /// How wide a shape may be that leaves room for the badge, if it has one.
+  static double widestWithin(const Look& look);
+  TextLayoutRef layOut(const std::string& text, double pointSize, double width) const;
+  /// The text in its full size; absent where that takes more than `width` points.
+  std::optional<FittedText> whole(const std::string& text, const ShieldMetrics& metrics, double width) const;
+  /// The text in `width` points: shrunk first, then condensed down to `mostCondensed`, then without its end.
+  FittedText squeezed(const std::string& text, const ShieldMetrics& metrics, double width, double mostCondensed) const;
   /// How wide a text may be for its corners to stay inside a circle, with a hair of room.
   double circleTextWidth(const ShieldMetrics& metrics) const;
   /// Centres the capital letters in a box at the origin.
-  void drawCentered(cairo_t* context, const TextLayout& text, double pointSize, Size box, const Color& color) const;
+  void drawCentered(cairo_t* context, const FittedText& text, Size box, const Color& color) const;
   std::shared_ptr<const VectorImage> symbol(std::string_view name);
 
   TextSystem& _text;

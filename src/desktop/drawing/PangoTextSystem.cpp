@@ -7,6 +7,7 @@
 #include <cmath>
 #include <stdexcept>
 #include <string_view>
+#include <vector>
 
 #include "desktop/drawing/PangoTextLayout.h"
 #include "platform/foundation/Log.h"
@@ -73,28 +74,42 @@ std::string valid(const std::string& text) {
   return repaired.get();
 }
 
-/// Cuts a text that has more than the characters allowed, before a character that no mark belongs to.
+/// Cuts a text that has more than the characters allowed, between two that a reader takes for one each.
 bool cutToMaximum(std::string& text) {
+  constexpr std::size_t kMaximum = PangoTextSystem::kMaximumCharacters;
   // No character is shorter than a byte.
-  if (text.size() <= PangoTextSystem::kMaximumCharacters) return false;
+  if (text.size() <= kMaximum) return false;
   const char* const begin = text.c_str();
   const char* const end = begin + text.size();
-  const char* cut = begin;
-  for (std::size_t count = 0; cut < end && count < PangoTextSystem::kMaximumCharacters; ++count)
-    cut = g_utf8_next_char(cut);
-  if (cut == end) return false;
-  constexpr int kMarksLookedThrough = 16;
-  const char* beforeMarks = cut;
-  for (int i = 0; i < kMarksLookedThrough && beforeMarks > begin; ++i) {
-    if (!g_unichar_ismark(g_utf8_get_char(beforeMarks))) {
-      cut = beforeMarks;
-      break;
-    }
-    beforeMarks = g_utf8_prev_char(beforeMarks);
-  }
-  text.resize(static_cast<std::size_t>(cut - begin));
+  const char* next = begin;  // behind the first character too many
+  std::size_t count = 0;
+  for (; next < end && count <= kMaximum; ++count) next = g_utf8_next_char(next);
+  if (count <= kMaximum) return false;
+  std::vector<PangoLogAttr> breaks(kMaximum + 2);
+  pango_get_log_attrs(begin, static_cast<int>(next - begin), -1, pango_language_from_string("en"), breaks.data(),
+                      static_cast<int>(breaks.size()));
+  std::size_t characters = kMaximum;
+  while (characters > 0 && !breaks[characters].is_cursor_position) --characters;
+  if (characters == 0) characters = kMaximum;  // all of it is one
+  text.resize(static_cast<std::size_t>(g_utf8_offset_to_pointer(begin, static_cast<glong>(characters)) - begin));
   text += "\u2026";
   return true;
+}
+
+/// The direction of the first letter that is not inside isolates; `otherwise` without such a letter.
+bool runsRightToLeft(const std::string& text, bool otherwise) {
+  constexpr gunichar kFirstIsolate = 0x2066, kLastIsolate = 0x2068, kPopIsolate = 0x2069;
+  int depth = 0;
+  for (const char* at = text.c_str(); *at; at = g_utf8_next_char(at)) {
+    const gunichar character = g_utf8_get_char(at);
+    if (character >= kFirstIsolate && character <= kLastIsolate) ++depth;
+    if (character == kPopIsolate) depth = std::max(depth - 1, 0);
+    const hb_script_t script = hb_unicode_script(hb_unicode_funcs_get_default(), character);
+    const bool hasDirection =
+        script != HB_SCRIPT_COMMON && script != HB_SCRIPT_INHERITED && script != HB_SCRIPT_UNKNOWN;
+    if (depth == 0 && hasDirection) return hb_script_get_horizontal_direction(script) == HB_DIRECTION_RTL;
+  }
+  return otherwise;
 }
 
 /// Line ends become spaces.
@@ -161,6 +176,7 @@ TextLayoutRef PangoTextSystem::layOut(const std::string& text, const FontDescrip
   std::string shown = valid(text);
   const bool wasCut = cutToMaximum(shown);
   if (maxLines > 0) joinLines(shown);
+  rightToLeft = runsRightToLeft(shown, rightToLeft);
   GObjectHandle<PangoLayout> layout(pango_layout_new(context(rightToLeft)));
   pango_layout_set_font_description(layout.get(), describe(font).get());
   pango_layout_set_auto_dir(layout.get(), FALSE);

@@ -8,18 +8,18 @@ namespace nimbo {
 
 namespace {
 
-// Size 7 stands beside a headline, and leaves 8 points above and below in rows down to 46 points. At size 0 the widest
-// shield fits the narrowest column, 73 points.
+// Size 7 stands beside a headline, and leaves 8 points above and below in rows down to 46 points. The widest shield
+// fits the narrowest column, 73 points, and leaves a gap between itself and the texts.
 constexpr ShieldMetrics kMetrics[] = {
     // height, text, smallest text, padding, corner radius, maximum width
-    {16, 9.5, 8.0, 4.0, 3.5, 72},     // 0
-    {18, 10.5, 8.5, 4.5, 4.0, 81},    // 1
-    {20, 11.5, 9.0, 5.0, 4.5, 90},    // 2
-    {22, 12.5, 9.5, 5.5, 5.0, 99},    // 3
-    {24, 13.5, 10.0, 6.0, 5.5, 108},  // 4
-    {26, 14.5, 10.5, 6.5, 6.0, 117},  // 5
-    {28, 15.5, 11.0, 7.0, 6.5, 126},  // 6
-    {30, 16.5, 11.5, 7.5, 7.0, 135},  // 7
+    {16, 9.5, 7.0, 4.0, 3.5, 40},    // 0
+    {18, 10.5, 7.5, 4.5, 4.0, 44},   // 1
+    {20, 11.5, 8.0, 5.0, 4.5, 48},   // 2
+    {22, 12.5, 8.5, 5.5, 5.0, 52},   // 3
+    {24, 13.5, 9.0, 6.0, 5.5, 56},   // 4
+    {26, 14.5, 9.5, 6.5, 6.0, 60},   // 5
+    {28, 15.5, 10.0, 7.0, 6.5, 64},  // 6
+    {30, 16.5, 10.5, 7.5, 7.0, 68},  // 7
 };
 
 constexpr Color kBlack{0, 0, 0, 1};

@@ -11,10 +11,10 @@ namespace nimbo {
 struct ShieldMetrics {
   double height;
   double textSize;          ///< of the bold face
-  double smallestTextSize;  ///< to which a text that is too wide shrinks before it loses its end
-  double padding;           ///< between the edge and the text at each side
+  double smallestTextSize;  ///< to which a text that is too wide shrinks before it is condensed and loses its end
+  double padding;           ///< between the edge and the text at each side, where the text leaves so much
   double cornerRadius;
-  double maximumWidth;  ///< of the whole shape
+  double maximumWidth;  ///< of the whole image, with its badge
 };
 
 /// Of a shield size from 0 to 7; others are taken to the nearest.

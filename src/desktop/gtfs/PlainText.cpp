@@ -6,6 +6,8 @@
 #include "desktop/gtfs/HtmlEntities.h"
 #include "desktop/gtfs/HtmlTag.h"
 #include "desktop/gtfs/Utf8.h"
+#include "desktop/strings/GraphemeClusters.h"
+#include "desktop/strings/Isolation.h"
 
 namespace nimbo {
 
@@ -16,11 +18,6 @@ bool isLineEnd(char32_t c) { return c == '\n' || c == '\r' || c == 0x85 || c == 
 bool isJoiner(char32_t c) { return c == 0x200C || c == 0x200D; }
 
 bool isDirectionMark(char32_t c) { return c == 0x200E || c == 0x200F || c == 0x061C; }
-
-bool isRightToLeftLetter(char32_t c) {
-  return (c >= 0x0590 && c <= 0x08FF && c != 0x061C) || (c >= 0xFB1D && c <= 0xFDFF) || (c >= 0xFE70 && c <= 0xFEFE) ||
-         (c >= 0x10800 && c <= 0x10FFF) || (c >= 0x1E800 && c <= 0x1EFFF);
-}
 
 /// Controls and characters that only ever confuse a line of text.
 bool isUnwanted(char32_t c) {
@@ -54,10 +51,10 @@ class FoldingWriter {
 
   std::string finish() {
     if (isFull()) {
-      _text.resize(firstCharacters(_text, _limit - 1).size());
+      _text.resize(clusterBoundary(_text, firstCharacters(_text, _limit - 1).size()));
       _text += "…";
     }
-    if (_hasRightToLeftLetter || !_hasDirectionMark) return std::move(_text);
+    if (!_hasDirectionMark || hasRightToLeftLetters(_text)) return std::move(_text);
     std::string result;
     for (std::size_t position = 0; position < _text.size();)
       if (const char32_t c = takeCharacter(_text, position); !isDirectionMark(c)) appendCharacter(result, c);
@@ -69,7 +66,6 @@ class FoldingWriter {
     const bool isMark = isDirectionMark(c);
     if (isMark && _text.empty()) return;  // a mark alone is no text
     _hasDirectionMark = _hasDirectionMark || isMark;
-    _hasRightToLeftLetter = _hasRightToLeftLetter || isRightToLeftLetter(c);
     if (isMark) {
       if (_lineEndsPending == 0 && !_spacePending) put(c);
       return;
@@ -100,7 +96,6 @@ class FoldingWriter {
   int _lineEndsPending = 0;
   bool _spacePending = false;
   bool _hasDirectionMark = false;
-  bool _hasRightToLeftLetter = false;
 };
 
 /// Whether line ends in the text are mere spaces because markup makes the lines.

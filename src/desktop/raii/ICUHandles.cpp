@@ -18,7 +18,11 @@ const ICU& ICU::library() {
                library[NIMBO_ICU_NAME(uplrules_close)],     library[NIMBO_ICU_NAME(unum_open)],
                library[NIMBO_ICU_NAME(unum_formatDecimal)], library[NIMBO_ICU_NAME(unum_close)],
                library[NIMBO_ICU_NAME(udat_open)],          library[NIMBO_ICU_NAME(udat_setContext)],
-               library[NIMBO_ICU_NAME(udat_format)],        library[NIMBO_ICU_NAME(udat_close)]};
+               library[NIMBO_ICU_NAME(udat_format)],        library[NIMBO_ICU_NAME(udat_close)],
+               library[NIMBO_ICU_NAME(utext_openUTF8)],     library[NIMBO_ICU_NAME(utext_close)],
+               library[NIMBO_ICU_NAME(ubrk_open)],          library[NIMBO_ICU_NAME(ubrk_setUText)],
+               library[NIMBO_ICU_NAME(ubrk_isBoundary)],    library[NIMBO_ICU_NAME(ubrk_preceding)],
+               library[NIMBO_ICU_NAME(ubrk_close)]};
   }();
   return icu;
 }

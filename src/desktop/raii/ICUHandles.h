@@ -1,10 +1,12 @@
 #pragma once
 
+#include <unicode/ubrk.h>
 #include <unicode/udat.h>
 #include <unicode/uloc.h>
 #include <unicode/unum.h>
 #include <unicode/upluralrules.h>
 #include <unicode/ustring.h>
+#include <unicode/utext.h>
 
 #include <functional>
 #include <memory>
@@ -14,8 +16,8 @@
 
 namespace nimbo {
 
-/// ICU, which is opened with the first count or date to be told. Its interface is the one in C, since one in C++ cannot
-/// be opened late.
+/// ICU, which is opened with the first count or date to be told, or long text to be cut. Its interface is the one in C,
+/// since one in C++ cannot be opened late.
 struct ICU {
   /// Opens ICU with the first call. Throws std::runtime_error where there is none.
   static const ICU& library();
@@ -34,6 +36,13 @@ struct ICU {
   decltype(&::udat_setContext) dat_setContext;
   decltype(&::udat_format) dat_format;
   decltype(&::udat_close) dat_close;
+  decltype(&::utext_openUTF8) text_openUTF8;
+  decltype(&::utext_close) text_close;
+  decltype(&::ubrk_open) brk_open;
+  decltype(&::ubrk_setUText) brk_setUText;
+  decltype(&::ubrk_isBoundary) brk_isBoundary;
+  decltype(&::ubrk_preceding) brk_preceding;
+  decltype(&::ubrk_close) brk_close;
 };
 
 struct ICUPluralRulesCloser {
@@ -50,6 +59,16 @@ struct ICUDateFormatCloser {
   void operator()(UDateFormat* format) const { ICU::library().dat_close(format); }
 };
 using ICUDateFormat = std::unique_ptr<UDateFormat, ICUDateFormatCloser>;
+
+struct ICUTextCloser {
+  void operator()(UText* text) const { ICU::library().text_close(text); }
+};
+using ICUText = std::unique_ptr<UText, ICUTextCloser>;
+
+struct ICUBreakIteratorCloser {
+  void operator()(UBreakIterator* iterator) const { ICU::library().brk_close(iterator); }
+};
+using ICUBreakIterator = std::unique_ptr<UBreakIterator, ICUBreakIteratorCloser>;
 
 /// Throws std::runtime_error with ICU's name of a failure.
 void checkICU(UErrorCode status);

@@ -5,6 +5,7 @@
 #include <stdexcept>
 
 #include "desktop/resources/Resources.h"
+#include "desktop/strings/Isolation.h"
 #include "desktop/strings/SpanishAnd.h"
 #include "platform/foundation/Log.h"
 
@@ -13,8 +14,12 @@ namespace nimbo {
 namespace {
 
 constexpr std::string_view kFallbackLanguage = "en";
-constexpr std::string_view kFirstStrongIsolate = "\u2068";
-constexpr std::string_view kPopDirectionalIsolate = "\u2069";
+
+/// A text that would change the order of a pattern that does not isolate it.
+bool needsIsolation(const FormatArgument& argument) {
+  const auto* text = std::get_if<std::string>(&argument);
+  return text && hasRightToLeftLetters(*text);
+}
 
 /// A POSIX name or a tag as a tag, its language in lower case; empty for "C" and "POSIX".
 std::string tagOfLocale(std::string_view locale) {
@@ -68,6 +73,13 @@ std::optional<std::string> ICUStringTables::stringForKey(std::string_view key) c
 }
 
 std::string ICUStringTables::format(const std::string& pattern, std::span<const FormatArgument> arguments) const {
+  std::vector<FormatArgument> keptApart;
+  if (std::any_of(arguments.begin(), arguments.end(), needsIsolation) && pattern.find("\u2068") == std::string::npos) {
+    keptApart.assign(arguments.begin(), arguments.end());
+    for (FormatArgument& argument : keptApart)
+      if (needsIsolation(argument)) argument = isolated(std::get<std::string>(argument));
+    arguments = keptApart;
+  }
   try {
     return _format->fill(_isSpanish ? withSpanishAnd(pattern, arguments) : pattern, arguments);
   } catch (const std::runtime_error& failure) {
@@ -82,10 +94,7 @@ std::string ICUStringTables::commaDelimitedList(const std::vector<std::string>& 
   std::string list;
   for (const std::string& text : texts) {
     if (&text != texts.data()) list += separator;
-    if (_isRightToLeft)
-      list.append(kFirstStrongIsolate).append(text).append(kPopDirectionalIsolate);
-    else
-      list += text;
+    list += _isRightToLeft || hasRightToLeftLetters(text) ? isolated(text) : text;
   }
   return list;
 }

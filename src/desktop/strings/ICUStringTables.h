@@ -17,9 +17,10 @@ class ICUStringTables final : public StringTables {
   static bool speak(std::string_view locale);
 
   std::optional<std::string> stringForKey(std::string_view key) const override;
-  /// A pattern that cannot be filled is logged and answered as it stands.
+  /// Texts with letters that run from right to left are isolated, also where the pattern does not do so itself. A
+  /// pattern that cannot be filled is logged and answered as it stands.
   std::string format(const std::string& pattern, std::span<const FormatArgument> arguments) const override;
-  /// From right to left each text is kept together by bidirectional isolates.
+  /// Likewise; in a language that runs from right to left, every text is isolated.
   std::string commaDelimitedList(const std::vector<std::string>& texts) const override;
   bool isRightToLeft() const override { return _isRightToLeft; }
 

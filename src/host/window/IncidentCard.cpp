@@ -21,6 +21,13 @@ namespace {
 constexpr std::size_t kLineLimit = 8;
 constexpr std::int64_t kCardShieldSize = 3;
 
+/// The side on which a publisher's text begins is that of its own direction, not of the interface's.
+void alignByDirection(Gtk::Label& label) {
+  PangoLayoutLine* const line = pango_layout_get_line(label.get_layout()->gobj(), 0);
+  const bool isRightToLeft = pango_layout_line_get_resolved_direction(line) == PANGO_DIRECTION_RTL;
+  label.set_xalign(isRightToLeft == (label.get_direction() == Gtk::TextDirection::RTL) ? 0 : 1);
+}
+
 /// The publisher's host of a web address; empty for any other address, which is not offered.
 std::string hostOfLink(const std::string& url) {
   char *scheme = nullptr, *host = nullptr;
@@ -69,7 +76,7 @@ void IncidentCard::addText(Gtk::Box& box, const std::string& text, const char* s
   auto* label = Gtk::make_managed<Gtk::Label>(text);
   label->set_wrap();
   label->set_wrap_mode(Pango::WrapMode::WORD_CHAR);
-  label->set_xalign(0);
+  alignByDirection(*label);
   label->add_css_class(style);
   box.append(*label);
 }

@@ -14,7 +14,7 @@ namespace {
 
 constexpr std::int64_t kRowShieldSize = 5;
 /// Shields stand in a column of this width, so that names begin below each other.
-constexpr int kShieldColumn = 56;
+constexpr int kShieldColumn = 60;
 
 }  // namespace
 

@@ -52,8 +52,9 @@ class TextSystem {
   static TextSystem& current();
   virtual FontMetrics metrics(const FontDescriptor& font) = 0;
   /// Breaks `text` (UTF-8; bad bytes are replaced) at `maxWidth` points into at most `maxLines` lines (0: any number),
-  /// with an ellipsis where it is cut. Lines run in the direction of their script; `rightToLeft` is the direction of
-  /// the paragraph, and so the side on which its lines begin. A width that is not positive gives one column of words.
+  /// with an ellipsis where it is cut. Text runs and its lines begin on the side of its first
+  /// letter that has a direction and is not isolated; `rightToLeft` is the direction of text without one. A width that
+  /// is not positive gives one column of words.
   virtual TextLayoutRef layOut(const std::string& text, const FontDescriptor& font, double maxWidth,
                                std::size_t maxLines, TextAlignment alignment, bool rightToLeft) = 0;
 };
