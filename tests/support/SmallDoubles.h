@@ -1,6 +1,8 @@
 #pragma once
 
 #include <deque>
+#include <memory>
+#include <string>
 #include <vector>
 
 #include "platform/AnalyticsPipeline.h"
@@ -25,23 +27,43 @@ class ScriptedRandomSource final : public RandomSource {
   std::deque<std::uint32_t> numbers;
 };
 
-class SilentSignposts final : public Signposts {
+/// Keeps the events as "subsystem category name message". The test's thread.
+class RecordingSignposts final : public Signposts {
  public:
-  void event(const LogFacility&, std::string_view, std::string_view) override {}
+  void event(const LogFacility& facility, std::string_view name, std::string_view message) override {
+    events.push_back(std::string(facility.subsystem) + " " + std::string(facility.category) + " " + std::string(name) +
+                     " " + std::string(message));
+  }
+  std::vector<std::string> events;
 };
 
-/// Memory is never short.
-class CalmMemoryPressure final : public MemoryPressure {
+/// Memory is never short by itself: the test calls the handlers.
+class MemoryPressureDouble final : public MemoryPressure {
  public:
-  std::unique_ptr<MemoryPressureSource> makeSource(MemoryPressureKind, std::shared_ptr<SerialQueue>,
-                                                   std::function<void()>) override {
-    return std::make_unique<Source>();
+  struct Made {
+    MemoryPressureKind kind;
+    std::string queueLabel;
+    std::function<void()> handler;
+    bool active = false;
+    bool cancelled = false;
+  };
+
+  std::unique_ptr<MemoryPressureSource> makeSource(MemoryPressureKind kind, std::shared_ptr<SerialQueue> queue,
+                                                   std::function<void()> handler) override {
+    made.push_back(std::make_shared<Made>(Made{kind, queue->label(), std::move(handler)}));
+    return std::make_unique<Source>(made.back());
   }
+  std::vector<std::shared_ptr<Made>> made;
 
  private:
   class Source final : public MemoryPressureSource {
-    void activate() override {}
-    void cancel() override {}
+   public:
+    explicit Source(std::shared_ptr<Made> made) : _made(std::move(made)) {}
+    void activate() override { _made->active = true; }
+    void cancel() override { _made->cancelled = true; }
+
+   private:
+    std::shared_ptr<Made> _made;
   };
 };
 

@@ -29,14 +29,14 @@ class TestPlatform final {
   VirtualTime time{startDate()};
   TestRunLoop loop{time};
   RecordingLog log;
-  SilentSignposts signposts;
+  RecordingSignposts signposts;
   ScriptedRandomSource random;
   StringTablesDouble strings;
   MemorySettings settings;
   FavoritesDouble favorites;
   TransitLineServiceDouble transitLines{loop};
   NetworkFailureDiagnosisDouble network;
-  CalmMemoryPressure memoryPressure;
+  MemoryPressureDouble memoryPressure;
   ActivityLauncherDouble activityLauncher{loop};
   RecordingAnalyticsPipeline analytics;
   DeviceLockStateDouble deviceLockState;

@@ -5,6 +5,7 @@
 #include <functional>
 #include <mutex>
 #include <thread>
+#include <vector>
 
 #include "platform/RunLoop.h"
 #include "platform/VirtualTime.h"
@@ -20,8 +21,9 @@ class TestRunLoop final : public RunLoop {
   bool isCurrent() const override { return std::this_thread::get_id() == _thread; }
   void dispatchAsync(std::function<void()> work) override;
   std::shared_ptr<Timer> scheduleTimer(TimeInterval interval, bool repeats, std::function<void(Timer&)> fire) override {
-    return _time.scheduleTimer(interval, repeats, std::move(fire));
+    return std::make_shared<TolerantTimer>(_time.scheduleTimer(interval, repeats, std::move(fire)), tolerances);
   }
+  std::vector<TimeInterval> tolerances;  ///< given to the timers so far
 
   /// Runs the queued work, and what that queues, until none is left.
   void runUntilIdle();
@@ -39,6 +41,20 @@ class TestRunLoop final : public RunLoop {
   void clear();
 
  private:
+  /// Virtual time is never late: only records by how much it might be.
+  class TolerantTimer final : public Timer {
+   public:
+    TolerantTimer(std::shared_ptr<Timer> timer, std::vector<TimeInterval>& tolerances)
+        : _timer(std::move(timer)), _tolerances(tolerances) {}
+    bool isValid() const override { return _timer->isValid(); }
+    void invalidate() override { _timer->invalidate(); }
+    void setTolerance(TimeInterval tolerance) override { _tolerances.push_back(tolerance); }
+
+   private:
+    std::shared_ptr<Timer> _timer;
+    std::vector<TimeInterval>& _tolerances;
+  };
+
   bool runOne();
 
   VirtualTime& _time;

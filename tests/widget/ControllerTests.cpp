@@ -3,6 +3,7 @@
 #include <limits>
 
 #include "platform/ui/Environment.h"
+#include "support/RecordingPainter.h"
 #include "support/TestPlatform.h"
 #include "support/TransitFixtures.h"
 #include "support/WidgetHostDouble.h"
@@ -65,10 +66,16 @@ TEST_F(Controller, AnswersAllThatWaitForOneFetch) {
   EXPECT_THAT(answers, ElementsAre("first:new", "second:new"));
   EXPECT_EQ(platform.transitLines.lookups().size(), 1u);
 
-  controller->widgetPerformUpdateWithCompletionHandler(record("third"));
+  // The handler hears of what the widget shows already; whoever asks meanwhile joins the fetch that ends.
+  controller->widgetPerformUpdateWithCompletionHandler([&](WidgetUpdateResult result) {
+    EXPECT_EQ(title(), "TransitWidgetLoadingError_Title");
+    record("third")(result);
+    controller->widgetPerformUpdateWithCompletionHandler(record("inside"));
+  });
   answer({}, kError);
-  EXPECT_THAT(answers, ElementsAre("first:new", "second:new", "third:failed"));
+  EXPECT_THAT(answers, ElementsAre("first:new", "second:new", "third:failed", "inside:failed"));
   EXPECT_EQ(platform.transitLines.lookups().size(), 2u);
+  EXPECT_EQ(controller->request(), nullptr);
 }
 
 TEST_F(Controller, KeepsAnUpdaterOnlyWhileVisibleWithLineItems) {
@@ -80,19 +87,93 @@ TEST_F(Controller, KeepsAnUpdaterOnlyWhileVisibleWithLineItems) {
   EXPECT_EQ(first->refreshInterval(), 1800.0);
 
   platform.time.advance(1800);
+  answer({lineItem(1, "1")});
+  EXPECT_NE(controller->updater(), first);
+  EXPECT_EQ(platform.time.pendingTimers(), 1u) << "the old one still runs";
+  platform.time.advance(1800);
   answer({}, kError);
   EXPECT_EQ(controller->updater(), nullptr) << "after a failed fetch";
 
   controller->widgetPerformUpdateWithCompletionHandler(nullptr);
-  answer({lineItem(1, "1")});
   disappear();
-  EXPECT_EQ(controller->updater(), nullptr);
+  const TransitLineItems ending{lineItem(1, "1", {incident(1, {}, dateByAdding(currentDate(), 60))})};
+  answer(ending);
+  EXPECT_EQ(controller->updater(), nullptr) << "a fetch that ends while hidden";
+  EXPECT_EQ(title(), "Incident 1");
   platform.time.advance(7200);
+  // The last words of an updater that is gone.
+  controller->transitIncidentUpdater_dateExpired(*first, currentDate());
+  controller->transitIncidentUpdaterNeedsRefresh(*first);
   platform.loop.runUntilIdle();
-  EXPECT_EQ(platform.transitLines.lookups().size(), 3u) << "nothing is fetched while hidden";
+  EXPECT_EQ(title(), "Incident 1");
+  EXPECT_EQ(controller->request(), nullptr) << "nothing is fetched while hidden";
 
   controller->viewWillAppear(false);
   EXPECT_NE(controller->updater(), nullptr) << "made again from the last result";
+  controller = nullptr;
+  EXPECT_EQ(platform.time.pendingTimers(), 0u);
+}
+
+TEST_F(Controller, FetchesBeforeItHasAView) {
+  controller = NBTransitIncidentsViewController::initWithNibName_bundle("", "", &host);
+  controller->widgetPerformUpdateWithCompletionHandler(record("early"));
+  answer({lineItem(1, "1")});
+  EXPECT_THAT(answers, ElementsAre("early:new"));
+  EXPECT_FALSE(controller->isViewLoaded());
+  EXPECT_FALSE(controller->isVisible());
+  EXPECT_EQ(controller->updater(), nullptr);
+  controller->view();
+  appear();
+  EXPECT_NE(controller->updater(), nullptr);
+}
+
+TEST_F(Controller, KeepsItsTableInsideTheMargins) {
+  host.expandedMaximum.width = 300;
+  load(&host);
+  EXPECT_EQ(controller->dataSource()->availableWidth(), 359);
+  controller->view()->setLayoutMargins({8, 16, 4, 20});
+  controller->view()->layoutIfNeeded();
+  EXPECT_EQ(controller->tableView()->superview(), controller->view().get());
+  EXPECT_EQ(controller->tableView()->frame(), (Rect{16, 8, 264, 98}));
+  controller->viewWillTransitionToSize_withTransitionCoordinator({400, 1}, nullptr);
+  EXPECT_EQ(controller->dataSource()->availableWidth(), 400);
+
+  appear();
+  answer({lineItem(1, "1", {incident(1), incident(2)})});
+  host.activeMode = WidgetDisplayMode::Expanded;
+  controller->widgetActiveDisplayModeDidChange_withMaximumSize(WidgetDisplayMode::Expanded, {1, 1});
+  EXPECT_EQ(host.preferredSizes.back(), (Size{300, 220}));
+  EXPECT_EQ(controller->tableView()->numberOfRows(), 2);
+  controller->view()->layoutIfNeeded();
+  RecordingPainter painter;
+  controller->view()->draw(painter);
+  ASSERT_EQ(painter.fills.size(), 1u);
+  EXPECT_EQ(painter.fills[0].color, VisualEffect::widgetTertiaryVibrancyEffect()->color(Appearance::light));
+
+  EXPECT_GT(controller->artworkCache()->count(), 0u);
+  controller->didReceiveMemoryWarning();
+  EXPECT_EQ(controller->artworkCache()->count(), 0u);
+}
+
+TEST_F(Controller, SignpostsEveryKindOfMemoryPressureWhileItLives) {
+  load(nullptr);
+  const auto& made = platform.memoryPressure.made;
+  std::vector<MemoryPressureKind> kinds;
+  for (const auto& source : made) {
+    EXPECT_TRUE(source->active && !source->cancelled);
+    EXPECT_EQ(source->queueLabel, "org.nimbo.Map.TransitWidget.memoryPresure");
+    kinds.push_back(source->kind);
+    source->handler();
+  }
+  using enum MemoryPressureKind;
+  EXPECT_THAT(kinds, ElementsAre(systemWarning, systemCritical, processWarning, processCritical));
+  const std::string log = "org.nimbo.Map.suggestions TransitWidget ", message = "  enableTelemetry=YES ";
+  EXPECT_THAT(
+      platform.signposts.events,
+      ElementsAre(log + "SystemMemoryPressureWarning" + message, log + "SystemMemoryPressureCritical" + message,
+                  log + "ProcessMemoryPressureWarning" + message, log + "ProcessMemoryPressureCritical" + message));
+  controller = nullptr;
+  for (const auto& source : made) EXPECT_TRUE(source->cancelled);
 }
 
 TEST_F(Controller, JudgesItsRowsAnewWhereverTheClockJumps) {
@@ -117,8 +198,9 @@ TEST_F(Controller, TurnsTheHostsSizesIntoRowsAndWidth) {
   const struct {
     double compact, expanded;
     std::uint64_t rows;
-  } cases[] = {{110, 350, 3},      {110, 110, 1},       {110, 329.9, 2},       {110, 50, kNoLimit},
-               {0, 350, kNoLimit}, {-5, 350, kNoLimit}, {110, -350, kNoLimit}, {1e-9, 1e300, kNoLimit}};
+  } cases[] = {{110, 350, 3},         {110, 110, 1},           {110, 329.9, 2},
+               {110, 50, kNoLimit},   {0, 350, kNoLimit},      {-5, 350, kNoLimit},
+               {110, -350, kNoLimit}, {1e-9, 1e300, kNoLimit}, {1, 0x1p64, kNoLimit}};
   for (const auto& c : cases) {
     host.compactMaximum.height = c.compact;
     host.expandedMaximum.height = c.expanded;
@@ -133,17 +215,25 @@ TEST_F(Controller, TurnsTheHostsSizesIntoRowsAndWidth) {
 }
 
 TEST_F(Controller, FollowsModesAndTellsTheHostWhatItNeeds) {
+  using Action = RecordingAnalyticsPipeline::Action;
+  load(&host);
+  host.compactMaximum.height = 100;
   appear();
+  EXPECT_EQ(controller->dataSource()->rowHeight(), 100);
   EXPECT_EQ(host.largestMode, WidgetDisplayMode::Compact) << "no rows to expand yet";
   answer({lineItem(1, "1", {incident(1), incident(2)})});
   EXPECT_EQ(host.largestMode, WidgetDisplayMode::Expanded);
-  EXPECT_EQ(host.preferredSizes.back(), (Size{359, 110}));
+  EXPECT_EQ(host.preferredSizes.back(), (Size{359, 100}));
 
   host.activeMode = WidgetDisplayMode::Expanded;
   // The host's own mode counts, not the one that comes with the call.
   controller->widgetActiveDisplayModeDidChange_withMaximumSize(WidgetDisplayMode::Compact, {1, 1});
   EXPECT_TRUE(controller->dataSource()->isExpanded());
-  EXPECT_EQ(host.preferredSizes.back(), (Size{359, 220}));
+  EXPECT_EQ(host.preferredSizes.back(), (Size{359, 200}));
+  host.activeMode = WidgetDisplayMode::Compact;
+  controller->widgetActiveDisplayModeDidChange_withMaximumSize(WidgetDisplayMode::Expanded, {1, 1});
+  EXPECT_FALSE(controller->dataSource()->isExpanded());
+  EXPECT_THAT(platform.analytics.actions, ElementsAre(Action{11, 706, {}}, Action{10, 706, {}})) << "as passed";
 
   host.compactMaximum.height = 80;
   Environment::current().setContentSizeCategory(ContentSizeCategory::extraLarge);
@@ -154,18 +244,31 @@ TEST_F(Controller, FollowsModesAndTellsTheHostWhatItNeeds) {
   EXPECT_EQ(controller->dataSource()->rowHeight(), 80) << "hidden: does not listen";
 }
 
-TEST_F(Controller, RecordsOnlyOpensThatSucceed) {
-  appear();
+TEST_F(Controller, RecordsASessionFromAppearingToOpeningOrDisappearing) {
+  const auto& sessions = platform.analytics.interactions;
+  load(&host);
+  controller->viewWillAppear(false);
+  platform.time.advance(5);
+  controller->viewDidAppear(false);
   answer({lineItem(1, "1")});
+  platform.time.advance(2);
   host.opens = false;
   controller->tableView()->selectRowAtIndexPath({0, 0});
-  EXPECT_THAT(platform.analytics.actions, IsEmpty());
+  EXPECT_THAT(platform.analytics.actions, IsEmpty()) << "not opened";
   host.opens = true;
   controller->tableView()->selectRowAtIndexPath({0, 0});
-  ASSERT_EQ(platform.analytics.interactions.size(), 1u);
-  EXPECT_EQ(platform.analytics.interactions[0].endState, 1);
+  ASSERT_EQ(sessions.size(), 1u);
+  EXPECT_EQ(sessions[0].endState, 1);
+  EXPECT_EQ(sessions[0].duration, 2);
+  EXPECT_EQ(sessions[0].record.tappedItemIndex, 0);
   disappear();
-  EXPECT_EQ(platform.analytics.interactions.size(), 1u);
+  EXPECT_EQ(sessions.size(), 1u);
+
+  appear();
+  controller->viewWillDisappear(false);
+  EXPECT_EQ(sessions.size(), 1u);
+  controller->viewDidDisappear(false);
+  EXPECT_EQ(sessions.size(), 2u);
 }
 
 TEST_F(Controller, AnswersTheHostAlsoWhenItIsGone) {

@@ -12,6 +12,7 @@ namespace nimbo {
 namespace {
 
 using testing::ElementsAre;
+using testing::StartsWith;
 
 class Fetcher : public testing::Test {
  protected:
@@ -49,10 +50,13 @@ TEST_F(Fetcher, LooksAllLinesUpAtOnceAndTellsEveryHandlerInOrder) {
   platform.favorites.setFavorites(
       Favorites{favorite(30), std::make_shared<const OtherFavorite>("place"), favorite(10), favorite(20)});
   std::vector<std::pair<int, ResultRef>> heard;
-  const auto hear = [&](int who) {
-    return [&heard, who](const ResultRef& result) { heard.emplace_back(who, result); };
-  };
   std::shared_ptr<NBTransitIncidentFetcherRequest> request;
+  const auto hear = [&](int who) {
+    return [&, who](const ResultRef& result) {
+      heard.emplace_back(who, result);
+      EXPECT_EQ(request->result(), result);  // may be asked meanwhile
+    };
+  };
   request = fetch([&](const ResultRef& result) {
     hear(1)(result);
     request->addHandler(hear(2));  // delivered already: called at once
@@ -72,6 +76,9 @@ TEST_F(Fetcher, LooksAllLinesUpAtOnceAndTellsEveryHandlerInOrder) {
   request->addHandler(hear(4));
   using Heard = std::pair<int, ResultRef>;
   EXPECT_THAT(heard, ElementsAre(Heard{1, result}, Heard{2, result}, Heard{3, result}, Heard{4, result}));
+  EXPECT_THAT(platform.log.texts("TransitWidget", LogLevel::debug),
+              ElementsAre("Received 4 favorites from container.",
+                          StartsWith("Issuing favorite lines lookup request for Muids"), "Received 2 line items."));
 }
 
 TEST_F(Fetcher, DeliversTheErrorOfTheServiceAsItCame) {

@@ -8,6 +8,7 @@
 #include "handoff/URL+NBOpenable.h"
 #include "items/NBTransitDataSourceBuilderForResult.h"
 #include "items/NBTransitIncidentsDataSourceBuilder.h"
+#include "items/NumberList.h"
 #include "platform/artwork/NamedImage.h"
 #include "platform/artwork/SizedTransitArtwork.h"
 #include "support/TestPlatform.h"
@@ -185,7 +186,8 @@ TEST_F(ListBuilder, FoldsWhatIsOverTheLimitIntoOneRow) {
       {five, 4, {row(1, "A"), row(2, "A"), row(3, "A"), overflowRow(2, 1)}},
       {five, 1, {overflowRow(5, 2)}},
   };
-  for (const auto& [network, limit, expanded] : cases) expectRows(network, limit, summary(5, "AB"), expanded);
+  for (int i = 0; i < 2; ++i, session = nullptr)  // also where nobody asks whose the incidents are
+    for (const auto& [network, limit, expanded] : cases) expectRows(network, limit, summary(5, "AB"), expanded);
   expectRows("A:1 B:", 1, row(1, "A"), {row(1, "A"), clearRow(1)});  // a single incident is never capped
 }
 
@@ -194,6 +196,7 @@ TEST_F(ListBuilder, ShowsAnIncidentOfSeveralLinesOnceWithTheirNames) {
     return "Incident 1 | " + text + " | " + artwork + " | line A";
   };
   const std::string two = "TransitWidget_2_Lines_Prepended_Incident_Text(A, B, Summary 1)";
+  const std::string three = "TransitWidget_N_Lines_Prepended_Incident_Text(A, B, C, Summary 1)";
   const std::string generic = "WidgetGenericTransit dimmed";
   const struct {
     std::string network, row;
@@ -204,39 +207,61 @@ TEST_F(ListBuilder, ShowsAnIncidentOfSeveralLinesOnceWithTheirNames) {
       {"A/rail:1 B:1", merged(generic, two)},
       {"A:1 B:1", merged(generic, two)},
       {"A:1,1", merged(generic, "TransitWidget_Single_Line_Prepended_Incident_Text(A, Summary 1)")},
-      {"A:1 B:1 A:1 C:1", merged(generic, "TransitWidget_N_Lines_Prepended_Incident_Text(A, B, C, Summary 1)")},
+      {"A:1 B:1 A:1 C:1", merged(generic, three)},
+      {"A:1 B/rail:1 C/rail:1", merged("mode 3", three)},
+      {"A/rail:1 B:1 C/rail:1", merged(generic, three)},
   };
   for (const auto& [network, expected] : cases) expectRows(network, 0, expected, {});
   expectRows("A:1 B:1,2", 0, summary(2, "AB"), {merged(generic, two), row(2, "B")});
-  // Of two rows that look alike, the first one's place is taken.
-  expectRows("A:1,11 B:11 c:2", 0, summary(3, "AB"),
-             {merged(generic, two), row(1, "A"), "Incident 2 | Summary 2 | no shield | line c"});
+  // Of two rows that look alike, the first one's place is taken, and the lines go with it.
+  expectRows("A:1,2,11 C:11 B:2 c:3", 0, summary(4, "ACB"),
+             {merged(generic, "TransitWidget_2_Lines_Prepended_Incident_Text(A, C, Summary 1)"),
+              "Incident 2 | TransitWidget_2_Lines_Prepended_Incident_Text(A, B, Summary 2) | " + generic + " | line A",
+              row(1, "A"), "Incident 3 | Summary 3 | no shield | line c"});
+  // Rows of the same texts on other lines do not look alike.
+  expectRows("Z:1 A:1001 B:1001", 0, summary(2, "ZAB"), {row(1, "Z"), merged(generic, two)});
 }
 
 TEST_F(ListBuilder, JoinsNamesAloneWhereAnIncidentHasNoText) {
+  using Name = std::optional<std::string>;
+  const auto system = [](const Name& name) { return std::make_shared<const TransitSystem>(1, name, nullptr); };
   const struct {
-    std::vector<std::string> names;  // empty: the name of the system stands in
-    std::optional<std::string> text;
+    std::vector<std::pair<Name, TransitSystemRef>> lines;
+    std::string text;
   } cases[] = {
-      {{"W", "W"}, "W"},
-      {{"W", "X"}, "TransitWidget_2_Lines_Concatenated(W, X)"},
-      {{"W", "X", "Y", "Z"}, "TransitWidget_N_Lines_Names_Concatenated(W, X, Y, Z)"},
-      {{"W", "", ""}, "TransitWidget_2_Lines_Concatenated(W, System)"},
+      {{{"W", system("S")}, {"W", nullptr}}, "W"},
+      {{{"W", nullptr}, {"X", nullptr}}, "TransitWidget_2_Lines_Concatenated(W, X)"},
+      {{{"W", nullptr}, {"X", nullptr}, {"Y", nullptr}, {"Z", nullptr}},
+       "TransitWidget_N_Lines_Names_Concatenated(W, X, Y, Z)"},
+      {{{"W", nullptr}, {"", system("S")}, {{}, system("S")}}, "TransitWidget_2_Lines_Concatenated(W, S)"},
+      {{{"", nullptr}, {"W", nullptr}, {{}, system("")}, {"", system({})}}, "W"},
+      {{{"", nullptr}, {{}, nullptr}}, ""},
   };
   BasicTransitIncident::Fields titleOnly;
   titleOnly.title = "Title";
-  const TransitIncidentRef shared = std::make_shared<const BasicTransitIncident>(titleOnly);
-  for (const auto& [names, text] : cases) {
-    Network network("");
-    for (const std::string& name : names)
-      network.lines.push_back(
-          lineItem(network.lines.size(), name, {shared}, std::make_shared<const TransitSystem>(1, "System", nullptr)));
+  Network network("");
+  for (const auto& [lines, text] : cases) {
+    network.lines.clear();
+    for (const auto& [name, itsSystem] : lines) {
+      BasicTransitLineItem::Fields fields;
+      fields.identifier = std::make_shared<const MapItemIdentifier>(network.lines.size());
+      fields.name = name;
+      fields.system = itsSystem;
+      fields.incidents = {std::make_shared<const BasicTransitIncident>(titleOnly)};
+      network.lines.push_back(std::make_shared<const BasicTransitLineItem>(fields));
+    }
     EXPECT_EQ(dynamic_cast<const NBTransitItem&>(*build(network)->summaryItem()).secondaryText(), text);
   }
-  const auto nameless = lineItem(1, "", {shared, shared});
+}
+
+TEST_F(ListBuilder, JudgesEachCopyOfAnIncidentByItself) {
+  BasicTransitIncident::Fields textless;
+  textless.muid = 5;
   Network network("");
-  network.lines = {nameless};
-  EXPECT_EQ(dynamic_cast<const NBTransitItem&>(*build(network)->summaryItem()).secondaryText(), "");
+  network.lines = {lineItem(1, "A", {std::make_shared<const BasicTransitIncident>(textless)}),
+                   lineItem(2, "B", {incident(5)}),
+                   lineItem(3, "C", {incident(5, dateByAdding(TestPlatform::startDate(), 1))})};
+  EXPECT_THAT(network.textsOf(build(network)->expandedItemsOrEmpty()), ElementsAre(row(5, "B"), clearRow(2)));
 }
 
 TEST_F(ListBuilder, HandsEveryShownIncidentToTheSummaryAndTheRestToTheOverflowRow) {
@@ -277,6 +302,24 @@ TEST_F(ListBuilder, AnswersOneListItemAndEqualOnesForEqualLines) {
   EXPECT_EQ(builder->listItem(), list);
   EXPECT_TRUE(list->isEqual(build(Network("A/rail:1,2 B/rail:2 C:")).get()));
   EXPECT_FALSE(list->isEqual(build(Network("A/rail:1,2 B/bus:2 C:")).get()));
+}
+
+TEST(NumberList, FindsTheFirstOfEachNumber) {
+  NumberList list;
+  // Numbers that differ and are the same number folded, too.
+  const auto number = [](std::uint64_t i) { return i % 2 == 0 ? i : (i << 32) ^ (i << 16); };
+  for (std::uint64_t i = 0; i < 384; ++i) list.append(number(i));
+  for (std::uint64_t i = 1; i < 384; ++i) {
+    EXPECT_EQ(list.firstIndexOf(number(i)), i);
+    EXPECT_EQ(list.firstIndexOf(number(i), i), i);
+    EXPECT_EQ(list.firstIndexOf(number(i), i + 1), 384u);
+  }
+  list.append(number(7));
+  EXPECT_EQ(list.firstIndexOf(number(7), 8), 384u);
+  list.replace(7, 1000);
+  EXPECT_EQ(list.firstIndexOf(number(7)), 384u);
+  EXPECT_EQ(list.firstIndexOf(1000), 7u);
+  EXPECT_EQ(list.at(7), 1000u);
 }
 
 }  // namespace

@@ -1,5 +1,8 @@
 #include <gmock/gmock.h>
 
+#include <algorithm>
+
+#include "analytics/NBTransitIncidentsAnalyticsDelegate.h"
 #include "handoff/URL+NBOpenable.h"
 #include "items/NBConfiguredArtwork.h"
 #include "items/NBTransitSummaryItem.h"
@@ -15,6 +18,8 @@ namespace nimbo {
 namespace {
 
 using testing::ElementsAre;
+using testing::IsEmpty;
+using testing::SizeIs;
 
 ResultRef success(const TransitLineItems& items) { return Result::resultWithValue(BoxedArray::of(items)); }
 
@@ -26,20 +31,23 @@ class RecordingDelegate final : public NBTransitIncidentDataSourceDelegate {
                                                     IndexPath indexPath) override {
     opened.push_back(openable);
     openedRow = indexPath.row;
+    EXPECT_EQ(table->highlightedRow(), std::nullopt) << "deselected at once";
   }
   int updates = 0;
   std::vector<std::shared_ptr<const NBOpenable>> opened;
   std::int64_t openedRow = -1;
+  std::shared_ptr<TableView> table;
 };
 
 class TableModel : public testing::Test {
  protected:
-  void make(const ResultRef& result, std::uint64_t limit = 0, double width = 359) {
+  void make(const ResultRef& result, std::uint64_t limit = 0, double width = 359, bool expanded = false) {
     model = NBTransitIncidentDataSource::
-        initWithTransitLineItemsResult_expanded_artworkCache_maxNumberOfRows_availableWidth(
-            result, false, memoryConstrainedImageViewCache(), limit, width);
+        initWithTransitLineItemsResult_expanded_artworkCache_maxNumberOfRows_availableWidth(result, expanded, cache,
+                                                                                            limit, width);
     table = TableView::initWithFrame_style({0, 0, width, 110}, TableViewStyle::plain);
     model->configureTableView(*table);
+    delegate->table = table;
     model->setDelegate(delegate);
   }
   std::vector<std::string> cells() {
@@ -49,64 +57,144 @@ class TableModel : public testing::Test {
       names.emplace_back(table->cellForRowAtIndexPath({0, row})->className());
     return names;
   }
+  int updatesAfter(const std::function<void()>& change) {
+    const int before = delegate->updates;
+    change();
+    return delegate->updates - before;
+  }
+  /// A row that shows a shield with its name.
+  NBTransitItemRef row(const std::string& name, std::int64_t shieldSize = 7, double alpha = 1, bool hidden = false) {
+    return NBTransitItem::initWithPrimaryText_secondaryText_artwork_artworkHidden_openable(
+        "Title of " + name, "Text of " + name,
+        NBConfiguredArtwork::initWithArtworkSource_alpha(
+            SizedTransitArtwork::initWithArtwork_shieldSize_artworkCache(shieldArtwork(name), shieldSize, cache),
+            alpha),
+        hidden, std::make_shared<const NBURLOpenable>(URL("nimbo://" + name)));
+  }
 
   TestPlatform platform;
+  std::shared_ptr<ArtworkCache> cache = memoryConstrainedImageViewCache();
   std::shared_ptr<RecordingDelegate> delegate = std::make_shared<RecordingDelegate>();
   std::shared_ptr<NBTransitIncidentDataSource> model;
   std::shared_ptr<TableView> table;
 };
 
 const TransitLineItems kTwoIncidents = {lineItem(1, "1", {incident(10), incident(11)}), lineItem(2, "2")};
+const std::string kRow = "NBTransitItemFixedHeightCell", kSummary = "NBTransitSummaryCell";
+
+NBTransitListItemRef list(ObjectRef summary, NBTransitItems expanded) {
+  return NBTransitListItem::initWithSummaryItem_expandedItems(std::move(summary), std::move(expanded));
+}
 
 TEST_F(TableModel, ShowsOneCompactRowOrAllExpandedOnes) {
   make(success(kTwoIncidents));
   EXPECT_EQ(model->rowHeight(), 110.0);
-  EXPECT_THAT(cells(), ElementsAre("NBTransitSummaryCell"));
+  EXPECT_EQ(delegate->updates, 0);
+  EXPECT_THAT(table->subviews(), SizeIs(1)) << "an empty footer";
+  EXPECT_THAT(cells(), ElementsAre(kSummary));
   EXPECT_EQ(table->cellForRowAtIndexPath({0, 0})->separatorStyleOverride(), 0);
+  EXPECT_EQ(model->tableView_estimatedHeightForRowAtIndexPath(*table, {0, 0}), 5);
 
   model->setExpanded(true);
-  const std::string row = "NBTransitItemFixedHeightCell";
-  EXPECT_THAT(cells(), ElementsAre(row, row, row));
+  EXPECT_EQ(delegate->updates, 1);
+  EXPECT_THAT(cells(), ElementsAre(kRow, kRow, kRow));
   for (const auto& [index, separator] : {std::pair{0, 1}, {1, 1}, {2, 0}})
     EXPECT_EQ(table->cellForRowAtIndexPath({0, index})->separatorStyleOverride(), separator) << index;
   EXPECT_EQ(model->preferredContentSizeForExpanded_maxSize(true, {320, 110}), (Size{320, 330}));
+  EXPECT_EQ(updatesAfter([&] { model->setExpanded(true); }), 0);
+  EXPECT_EQ(updatesAfter([&] { model->setExpanded(false); }), 1);
+  EXPECT_EQ(model->preferredContentSizeForExpanded_maxSize(false, {320, 110}), (Size{320, 110}));
+}
+
+TEST_F(TableModel, FillsItsCells) {
+  platform.shieldRenderer->width = [](std::int64_t, const std::string&) { return 100.0; };
+  make(success(kTwoIncidents), 0, 359, true);
+  EXPECT_TRUE(model->isExpanded()) << "from the start";
+  model->setRowHeight_maxNumberOfRows(55, 0);
+  EXPECT_THAT(cells(), ElementsAre(kRow, kRow, kRow));
+  for (std::int64_t i = 0; i < 3; ++i) {
+    const auto& cell = dynamic_cast<const NBTransitItemFixedHeightCell&>(*table->cellForRowAtIndexPath({0, i}));
+    EXPECT_EQ(cell.transitItem(), model->shieldAdjustedExpandedItems()->at(static_cast<std::size_t>(i)));
+    EXPECT_EQ(cell.trailingArtworkColumnWidth(), 100);
+    EXPECT_EQ(cell.rowHeight(), 55);
+  }
+  model->setExpanded(false);
+  EXPECT_THAT(cells(), ElementsAre(kSummary));
+  const auto& cell = dynamic_cast<const NBTransitSummaryCell&>(*table->cellForRowAtIndexPath({0, 0}));
+  EXPECT_EQ(cell.item(), model->listItem()->summaryItem());
+  EXPECT_EQ(cell.artworkCache(), cache);
+  EXPECT_EQ(cell.rowHeight(), 55);
 }
 
 TEST_F(TableModel, RefusesToExpandWithoutExpandedRows) {
-  make(nullptr);
+  make(nullptr, 0, 359, true);
+  EXPECT_FALSE(model->isExpanded()) << "from the start";
   model->setExpanded(true);
   EXPECT_FALSE(model->isExpanded());
   EXPECT_EQ(delegate->updates, 1);
-  EXPECT_TRUE(platform.log.contains("ignoring request to expand"));
+  const std::string complaint =
+      "Trying to set expanded state on widget datasource without expanded items to show, ignoring request to expand "
+      "datasource state.\nListItem: " +
+      model->listItem()->description();
+  EXPECT_THAT(platform.log.texts("TransitWidget", LogLevel::error), ElementsAre(complaint, complaint));
   model->setExpanded(false);
   EXPECT_EQ(delegate->updates, 1);
 }
 
-TEST_F(TableModel, TellsItsDelegateOnlyOfWhatShows) {
-  const ResultRef result = success(kTwoIncidents);
-  make(result);
-  const auto analytics = std::shared_ptr<NBTransitIncidentsAnalyticsDelegate>();
-  const auto updatesAfter = [&](const std::function<void()>& change) {
-    const int before = delegate->updates;
-    change();
-    return delegate->updates - before;
+TEST_F(TableModel, ShowsNothingOfRowsThatAreNotThere) {
+  make(success(kTwoIncidents), 0, 359, true);
+  for (const IndexPath path : {IndexPath{0, 3}, {0, -1}, {1, 0}}) {
+    EXPECT_EQ(model->_itemAtIndexPath(path), nullptr);
+    EXPECT_FALSE(model->tableView_shouldHighlightRowAtIndexPath(*table, path));
+    const auto cell = model->tableView_cellForRowAtIndexPath(*table, path);
+    EXPECT_EQ(cell->className(), "StyledTableCell");
+    EXPECT_EQ(cell->reuseIdentifier(), "StyledTableCell");
+    EXPECT_EQ(cell->separatorStyleOverride(), 1);
+  }
+  EXPECT_NE(model->_itemAtIndexPath({0, 2}), nullptr);
+  model->setListItem(list(nullptr, {}));
+  EXPECT_TRUE(model->isExpanded()) << "until the host changes the mode";
+  EXPECT_THAT(cells(), IsEmpty());
+  model->setExpanded(false);
+  EXPECT_THAT(cells(), IsEmpty());
+  EXPECT_EQ(model->preferredContentSizeForExpanded_maxSize(false, {320, 110}), (Size{320, 0}));
+}
+
+TEST_F(TableModel, TellsItsDelegateOnlyOfWhatShowsAndTheSessionOfNewResults) {
+  const auto session = NBTransitIncidentsAnalyticsDelegate::initWithTransitIncidentsViewController({});
+  const ResultRef result = success(kTwoIncidents), oneLess = success({lineItem(1, "1", {incident(10)})});
+  // The same content in new objects.
+  const ResultRef equal = success({lineItem(1, "1", {incident(10), incident(11)}), lineItem(2, "2")});
+  const struct {
+    const char* name;
+    std::function<void()> change;
+    int updates;
+    std::size_t recordedIncidents;
+  } cases[] = {
+      {"same object", [&] { model->updateTransitLineItemResult_captureAnalytics(result, session); }, 0, 0},
+      {"equal result", [&] { model->updateTransitLineItemResult_captureAnalytics(equal, session); }, 0, 2},
+      {"rebuilt", [&] { model->recalculateDataSourceItemsWithAnalytics(session); }, 0, 2},
+      {"other rows", [&] { model->updateTransitLineItemResult_captureAnalytics(oneLess, session); }, 1, 1},
+      {"old rows", [&] { model->updateTransitLineItemResult_captureAnalytics(result, session); }, 1, 2},
+      {"row height", [&] { model->setRowHeight_maxNumberOfRows(55, 0); }, 1, 0},
+      {"same height", [&] { model->setRowHeight_maxNumberOfRows(55, 0); }, 0, 0},
+      {"a limit that changes no row", [&] { model->setRowHeight_maxNumberOfRows(60, 7); }, 0, 0},
+      {"a limit alone that changes rows", [&] { model->setRowHeight_maxNumberOfRows(60, 2); }, 1, 0},
+      {"the same width", [&] { model->setAvailableWidth(359); }, 0, 0},
+      {"a width that changes no shield", [&] { model->setAvailableWidth(400); }, 0, 0},
   };
-  EXPECT_EQ(updatesAfter([&] { model->updateTransitLineItemResult_captureAnalytics(result, analytics); }), 0);
-  EXPECT_EQ(updatesAfter([&] {
-              // The same content in new objects.
-              model->updateTransitLineItemResult_captureAnalytics(
-                  success({lineItem(1, "1", {incident(10), incident(11)}), lineItem(2, "2")}), analytics);
-            }),
-            0);
-  EXPECT_EQ(updatesAfter([&] {
-              model->updateTransitLineItemResult_captureAnalytics(success({lineItem(1, "1", {incident(10)})}),
-                                                                  analytics);
-            }),
-            1);
-  EXPECT_EQ(updatesAfter([&] { model->setRowHeight_maxNumberOfRows(55, 0); }), 1);
-  EXPECT_EQ(updatesAfter([&] { model->setRowHeight_maxNumberOfRows(55, 0); }), 0);
-  EXPECT_EQ(updatesAfter([&] { model->setRowHeight_maxNumberOfRows(60, 7); }), 0) << "a limit that changes no row";
-  EXPECT_EQ(updatesAfter([&] { model->setAvailableWidth(400); }), 0) << "a width that changes no shield";
+  make(result, 0, 359, true);
+  for (const auto& c : cases) {
+    SCOPED_TRACE(c.name);
+    session->startSessionIfNeeded();
+    EXPECT_EQ(updatesAfter(c.change), c.updates);
+    session->recordCloseSessionSwiping();
+    EXPECT_EQ(platform.analytics.interactions.back().record.incidentItems.size(), c.recordedIncidents);
+  }
+  EXPECT_EQ(model->rowHeight(), 60);
+  EXPECT_EQ(model->maxNumberOfRows(), 2u);
+  EXPECT_THAT(cells(), ElementsAre(kRow, kRow));
+  EXPECT_THAT(model->listItem()->expandedItemsOrEmpty(), SizeIs(2));
 }
 
 TEST_F(TableModel, ChangesItsRowsWhenAnIncidentEnds) {
@@ -120,36 +208,94 @@ TEST_F(TableModel, ChangesItsRowsWhenAnIncidentEnds) {
   EXPECT_EQ(delegate->updates, 1);
 }
 
-TEST_F(TableModel, ShrinksShieldsIntoTheColumnOfTheWidth) {
+TEST_F(TableModel, LeavesTheShieldsWhatTheTextsNeedNot) {
   platform.shieldRenderer->width = [](std::int64_t size, const std::string&) {
-    return 40.0 + 20.0 * static_cast<double>(size);
+    return std::vector{72.0, 72.5, 73.0, 73.5, 145.0, 145.5, 186.0, 186.5}[static_cast<std::size_t>(size)];
   };
-  make(success({lineItem(1, "1", {incident(10)}), lineItem(2, "2")}), 0, 359);
-  const auto shieldSize = [&] {
-    const auto& item = dynamic_cast<const NBTransitItem&>(*model->shieldAjustedSummaryItem());
-    return dynamic_cast<const SizedTransitArtwork&>(*item.artwork()->artworkSource()).shieldSize();
+  for (const auto& [width, column] : {std::pair{400, 186}, {359, 145}, {287, 73}, {200, 73}}) {
+    make(success({lineItem(1, "1", {incident(10)})}), 0, width);
+    EXPECT_EQ(model->artworkColumnWidth(), column) << width;
+  }
+}
+
+TEST_F(TableModel, ShrinksShieldsIntoTheColumnAndKeepsTheRestOfTheRow) {
+  platform.shieldRenderer->width = [](std::int64_t size, const std::string& name) {
+    return name == "wide" ? 40.0 + 20.0 * static_cast<double>(size) : 80.0;
   };
-  // 359 - 214 leaves 145 points: size 5 is 140 wide.
-  EXPECT_EQ(shieldSize(), 5);
-  EXPECT_EQ(model->artworkColumnWidth(), 140.0);
-  model->setAvailableWidth(200);
-  EXPECT_EQ(shieldSize(), 1);
-  EXPECT_EQ(model->artworkColumnWidth(), 73.0);
-  EXPECT_EQ(delegate->updates, 1);
+  make(nullptr);
+  // 359 - 214 leaves 145 points: of the wide shield size 5 is 140 wide.
+  const NBTransitItems rows{row("wide", 7, 0.5, true), row("slim")}, shrunk{row("wide", 5, 0.5, true), rows[1]};
+  const auto summary = NBTransitSummaryItem::initWithText_artworks_userActivityData("2", {}, nullptr);
+  const struct {
+    const char* name;
+    ObjectRef summary, shrunkSummary;
+    double column;
+  } cases[] = {{"a summary of several", summary, summary, 140},
+               {"a row of its own", rows[1], rows[1], 80},  // its column holds for all rows
+               {"the first row", rows[0], shrunk[0], 140},
+               {"none", nullptr, nullptr, 140}};
+  for (const auto& c : cases) {
+    SCOPED_TRACE(c.name);
+    model->setListItem(list(c.summary, rows));
+    EXPECT_TRUE(absentOrEqual(model->shieldAjustedSummaryItem(), c.shrunkSummary));
+    EXPECT_TRUE(std::ranges::equal(*model->shieldAdjustedExpandedItems(), shrunk, absentOrEqual));
+    EXPECT_EQ(model->artworkColumnWidth(), c.column);
+  }
+}
+
+TEST_F(TableModel, TellsItsDelegateOfAWidthThatChangesWhatShows) {
+  platform.shieldRenderer->width = [](std::int64_t size, const std::string& name) {
+    return name == "wide" ? 40.0 + 20.0 * static_cast<double>(size) : 50.0;
+  };
+  const NBTransitItems rows{row("wide"), row("slim")};
+  const struct {
+    const char* name;
+    NBTransitListItemRef list;
+    bool expanded;
+    double width;
+    int updates;
+  } cases[] = {
+      {"a wider column", list(row("wide"), {}), false, 400, 1},
+      {"a narrower column", list(row("wide"), {}), false, 200, 1},
+      {"a width between two shield sizes", list(row("wide"), rows), true, 360, 0},
+      {"a smaller shield beside the column of the summary", list(row("slim"), rows), true, 300, 1},
+      {"the same, out of sight", list(row("slim"), rows), false, 300, 0},
+      {"nothing to compare with", list(nullptr, rows), false, 360, 1},
+  };
+  for (const auto& c : cases) {
+    SCOPED_TRACE(c.name);
+    make(nullptr);
+    model->setListItem(c.list);
+    model->setExpanded(c.expanded);
+    EXPECT_EQ(updatesAfter([&] { model->setAvailableWidth(c.width); }), c.updates);
+    EXPECT_EQ(model->availableWidth(), c.width);
+  }
 }
 
 TEST_F(TableModel, OpensOnlyRowsThatHaveSomethingToOpen) {
   make(success({lineItem(1, "1")}));  // the all-clear row opens the favourites
+  EXPECT_FALSE(model->tableView_shouldHighlightRowAtIndexPath(*table, {1, 0}));
   EXPECT_TRUE(table->selectRowAtIndexPath({0, 0}));
   ASSERT_EQ(delegate->opened.size(), 1u);
   EXPECT_NE(dynamic_cast<const NBURLOpenable*>(delegate->opened[0].get()), nullptr);
-  EXPECT_EQ(table->highlightedRow(), std::nullopt) << "deselected at once";
+
+  make(success(kTwoIncidents));
+  EXPECT_TRUE(table->selectRowAtIndexPath({0, 0}));
+  EXPECT_EQ(delegate->opened.back(),
+            dynamic_cast<const NBTransitSummaryItem&>(*model->listItem()->summaryItem()).userActivityData());
+  model->setExpanded(true);
+  table->reloadData();
+  EXPECT_TRUE(table->selectRowAtIndexPath({0, 1}));
+  EXPECT_EQ(delegate->openedRow, 1);
+  EXPECT_EQ(delegate->opened.size(), 3u);
 
   make(Result::resultWithError(Error::errorWithDomain_code_reason("D", 1, "no")));
   EXPECT_FALSE(table->selectRowAtIndexPath({0, 0}));
-  EXPECT_FALSE(model->tableView_shouldHighlightRowAtIndexPath(*table, {0, 5}));
-  EXPECT_FALSE(model->tableView_shouldHighlightRowAtIndexPath(*table, {1, 0}));
-  EXPECT_EQ(delegate->opened.size(), 1u);
+  model->tableView_didSelectRowAtIndexPath(*table, {0, 0});
+  EXPECT_EQ(delegate->opened.size(), 3u);
+  make(success({lineItem(1, "1")}));
+  delegate = nullptr;
+  EXPECT_TRUE(table->selectRowAtIndexPath({0, 0})) << "nobody hears";
 }
 
 }  // namespace

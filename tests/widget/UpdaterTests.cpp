@@ -8,6 +8,7 @@ namespace nimbo {
 namespace {
 
 using testing::ElementsAre;
+using testing::IsEmpty;
 using Minutes = std::optional<int>;  // from the start of the test's clock
 
 Date at(int minutes) { return dateByAdding(TestPlatform::startDate(), 60.0 * minutes); }
@@ -24,11 +25,16 @@ class Observer final : public NBTransitIncidentUpdaterObserver {
  public:
   void transitIncidentUpdater_dateExpired(NBTransitIncidentUpdater& updater, Date date) override {
     expired.push_back(date);
+    updaters.insert(&updater);
     if (invalidates) updater.invalidate();
   }
-  void transitIncidentUpdaterNeedsRefresh(NBTransitIncidentUpdater&) override { ++refreshes; }
+  void transitIncidentUpdaterNeedsRefresh(NBTransitIncidentUpdater& updater) override {
+    refreshes.push_back(currentDate());
+    updaters.insert(&updater);
+  }
   std::vector<Date> expired;
-  int refreshes = 0;
+  std::vector<Date> refreshes;
+  std::set<NBTransitIncidentUpdater*> updaters;
   bool invalidates = false;
 };
 
@@ -57,18 +63,46 @@ TEST_F(Updater, WaitsForTheDatesThatChangeTheRows) {
   for (const auto& [periods, dates] : cases) {
     const auto updater = start({lineItem(2, "B"), lineWith(periods)});
     EXPECT_EQ(updater->updateDates(), dates);
+    const bool waits = !dates.empty() && *dates.begin() > TestPlatform::startDate();
+    EXPECT_EQ(platform.time.pendingTimers(), waits ? 2u : 1u);
     updater->invalidate();
   }
 }
 
-TEST_F(Updater, StopsAtADateThatPassedUnseen) {
-  const auto updater = start({lineWith({{10, 20}, {30, std::nullopt}})});
-  platform.time.setNow(at(25));  // asleep meanwhile
-  platform.time.advance(0);
-  EXPECT_THAT(observer->expired, ElementsAre(at(10)));
-  EXPECT_THAT(updater->updateDates(), ElementsAre(at(20), at(30)));
-  EXPECT_EQ(platform.time.pendingTimers(), 1u);  // the refresh
+TEST_F(Updater, TellsEachDateOnceAndAsksForARefreshAtEachInterval) {
+  const auto updater = start({lineWith({{10, 70}})});
+  EXPECT_EQ(updater->refreshInterval(), 1800);
+  EXPECT_EQ(updater->lineItems().size(), 1u);
+  EXPECT_THAT(platform.loop.tolerances, ElementsAre(180.0));
+  platform.time.advance(600);
+  EXPECT_THAT(updater->updateDates(), ElementsAre(at(70)));
+  platform.time.advance(95 * 60);
+  EXPECT_THAT(observer->expired, ElementsAre(at(10), at(70)));
+  EXPECT_THAT(updater->updateDates(), IsEmpty());
+  ASSERT_EQ(observer->refreshes.size(), 3u);
+  for (int i = 0; i < 3; ++i) EXPECT_NEAR(intervalBetween(at(30 * i + 30), observer->refreshes.at(i)), 0, 0.001);
+  EXPECT_THAT(observer->updaters, ElementsAre(updater.get()));
+  for (const auto& line : platform.log.lines()) {
+    EXPECT_EQ(line.level, LogLevel::debug) << line.text;
+    EXPECT_EQ(line.redacted.find("2026"), std::string::npos) << "not private: " << line.redacted;
+  }
+  observer = nullptr;
+  platform.time.advance(1800);  // nobody listens
   updater->invalidate();
+}
+
+TEST_F(Updater, StopsAtADateThatPassedUnseen) {
+  for (const int wakesUpAt : {20, 25}) {  // asleep meanwhile
+    const auto updater = start({lineWith({{10, 20}, {30, std::nullopt}})});
+    platform.time.setNow(at(wakesUpAt));
+    platform.time.advance(0);
+    EXPECT_THAT(observer->expired, ElementsAre(at(10)));
+    EXPECT_THAT(updater->updateDates(), ElementsAre(at(20), at(30)));
+    EXPECT_EQ(platform.time.pendingTimers(), 1u);  // the refresh
+    updater->invalidate();
+    observer->expired.clear();
+    platform.time.setNow(at(0));
+  }
 }
 
 TEST_F(Updater, LivesAndFiresUntilInvalidated) {
@@ -77,7 +111,7 @@ TEST_F(Updater, LivesAndFiresUntilInvalidated) {
   observer->invalidates = true;
   platform.time.advance(3600);
   EXPECT_THAT(observer->expired, ElementsAre(at(10)));
-  EXPECT_EQ(observer->refreshes, 0);
+  EXPECT_THAT(observer->refreshes, IsEmpty());
   EXPECT_EQ(platform.time.pendingTimers(), 0u);
   EXPECT_TRUE(updater.expired());
 }
