@@ -66,7 +66,7 @@ TransitArtworkRef artwork(TransitMode mode) {
 /// Draws one appearance, from the painter's origin.
 class Panel {
  public:
-  static constexpr Size kSize{640, 660};
+  static constexpr Size kSize{640, 620};
 
   Panel(Painter& painter, PangoTextSystem& text, double scale, bool nightMode)
       : _painter(painter),
