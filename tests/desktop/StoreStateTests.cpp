@@ -78,8 +78,7 @@ TEST_F(StateDatabaseTest, KeepsWhatCanBeReadOfADamagedFileInEveryProcess) {
   const ErrorRef error = analytics.list(entries);
   ASSERT_NE(error, nullptr);
   EXPECT_THAT(notices, ElementsAre(error->reason()));
-  EXPECT_THAT(error->reason(),
-              testing::AllOf(HasSubstr(setAside().native()), HasSubstr("0 favourites and 2 settings")));
+  EXPECT_THAT(error->reason(), testing::AllOf(HasSubstr(setAside().native()), HasSubstr("0 favorites and 2 settings")));
   EXPECT_EQ(analytics.list(entries), nullptr);
   // Those that had the damaged file open go over to the new one.
   EXPECT_EQ(host->setValue_forKey("since", "second"), nullptr);

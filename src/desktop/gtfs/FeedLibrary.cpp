@@ -32,7 +32,7 @@ Outcome<FeedSourceRef> FeedLibrary::sourceNamed(std::string_view name) const {
   }
   return transitLineServiceError(TransitLineServiceError::unknownFeed,
                                  "No feed named \"" + std::string(name) +
-                                     "\" is set up. Set it up again, or take its lines out of the favourites. Feeds "
+                                     "\" is set up. Set it up again, or take its lines out of the favorites. Feeds "
                                      "there are:" +
                                      names + ".");
 }

@@ -101,7 +101,7 @@ ErrorRef allGone(const std::vector<MapItemIdentifierRef>& gone) {
   for (const MapItemIdentifierRef& identifier : gone) names += " " + writtenNameOfLine(*identifier);
   return transitLineServiceError(
       TransitLineServiceError::unknownLine,
-      "No line of the favourites is in its feed any more:" + names + ". Choose the lines anew.");
+      "No line of the favorites is in its feed any more:" + names + ". Choose the lines anew.");
 }
 
 }  // namespace

@@ -23,7 +23,7 @@ ErrorRef refusal(FavoritesError code, std::string reason) {
 }
 
 ErrorRef unknownLine(std::uint64_t muid) {
-  return refusal(FavoritesError::unknown, "The line " + std::to_string(muid) + " is no favourite.");
+  return refusal(FavoritesError::unknown, "The line " + std::to_string(muid) + " is no favorite.");
 }
 
 /// An error while favourites are missing that a damaged database had.
@@ -31,10 +31,11 @@ ErrorRef lossOf(SQLiteConnection& connection) {
   SQLiteStatement query = connection.prepare("SELECT value FROM settings WHERE key = ?");
   query.bind(1, kFavoritesLostKey);
   if (!query.step()) return nullptr;
-  return refusal(FavoritesError::lost, "Not all favourites could be read in a damaged database, which is kept as " +
-                                           query.text(0) + ": " +
-                                           std::to_string(connection.integer("SELECT count(*) FROM favorites")) +
-                                           " of them are left. Add those that you miss; that ends this message.");
+  const std::int64_t left = connection.integer("SELECT count(*) FROM favorites");
+  return refusal(FavoritesError::lost, "Not all favorites could be read in a damaged database, which is kept as " +
+                                           query.text(0) + ": " + std::to_string(left) +
+                                           (left == 1 ? " of them is" : " of them are") +
+                                           " left. Add those that you miss; that ends this message.");
 }
 
 bool wereSet(SQLiteConnection& connection) {
@@ -135,7 +136,7 @@ ErrorRef FavoritesEditor::add(const std::vector<TransitLineRef>& lines) {
     for (const TransitLineRef& line : lines) {
       if (findLine(rows, line->muid()) != rows.end())
         return refusal(FavoritesError::duplicate,
-                       line->name().value_or("The line " + std::to_string(line->muid())) + " is a favourite already.");
+                       line->name().value_or("The line " + std::to_string(line->muid())) + " is a favorite already.");
       append(connection, *line);
       rows.push_back({0, 0, line->muid()});
     }
@@ -166,8 +167,9 @@ ErrorRef FavoritesEditor::move(std::uint64_t muid, std::size_t position) {
     const auto row = findLine(rows, muid);
     if (row == rows.end()) return unknownLine(muid);
     if (position >= rows.size())
-      return refusal(FavoritesError::position, "There is no position " + std::to_string(position + 1) +
-                                                   ": the favourite lines are " + std::to_string(rows.size()) + ".");
+      return refusal(FavoritesError::position, "There is no position " + std::to_string(position + 1) + " among " +
+                                                   std::to_string(rows.size()) +
+                                                   (rows.size() == 1 ? " favorite line." : " favorite lines."));
     const auto target = rows.begin() + static_cast<std::ptrdiff_t>(position);
     if (row < target)
       std::rotate(row, row + 1, target + 1);

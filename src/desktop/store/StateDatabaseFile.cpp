@@ -63,7 +63,7 @@ std::string textOfCounts(const SalvagedCounts& counts) {
   const auto count = [](std::size_t n, const std::string& noun) {
     return std::to_string(n) + " " + noun + (n == 1 ? "" : "s");
   };
-  return count(counts.favorites, "favourite") + " and " + count(counts.settings, "setting");
+  return count(counts.favorites, "favorite") + " and " + count(counts.settings, "setting");
 }
 
 }  // namespace
@@ -191,7 +191,7 @@ StateDatabaseFile::Opened StateDatabaseFile::replaceLocked() {
   opened.notice = error(StateDatabaseError::setAside,
                         _path.native() + " was damaged and is now kept as " + aside.native() +
                             ". A new one was begun with what could be read of it: " + textOfCounts(counts) +
-                            ". Check your favourites, and the disk.");
+                            ". Check your favorites, and the disk.");
   return opened;
 }
 

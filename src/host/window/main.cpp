@@ -27,7 +27,7 @@ int main(int argc, char** argv) {
   std::optional<std::filesystem::path> config, state;
   std::vector<std::string> urls;
   app.add_option("--config", config, "Folder of feeds.json (default: $XDG_CONFIG_HOME/nimbo-transit)");
-  app.add_option("--state", state, "Folder of favourites and last rows (default: $XDG_STATE_HOME/nimbo-transit)");
+  app.add_option("--state", state, "Folder of favorites and last rows (default: $XDG_STATE_HOME/nimbo-transit)");
   app.add_option("URL", urls, "What to show, such as nimbo://?favorites=2&t=r");
   app.set_version_flag("--version", NIMBO_VERSION);
   CLI11_PARSE(app, argc, argv);
