@@ -63,7 +63,9 @@ _nimbo_transit() {
   esac
   if [[ $cur == -* ]]; then
     COMPREPLY=($(compgen -W "$options" -- "$cur"))
-  elif [[ $command == render || $command == script || $command == decode ]]; then
+  elif [[ $command == render ]]; then
+    _filedir png
+  elif [[ $command == script || $command == decode ]]; then
     _filedir
   else
     COMPREPLY=($(compgen -W "$names" -- "$cur"))

@@ -74,7 +74,7 @@ end
 complete -c nimbo-transit -n '__nimbo_transit_at status' -l json -d 'The snapshot as JSON'
 complete -c nimbo-transit -n '__nimbo_transit_at status' -l waybar -d 'A line for a status bar'
 complete -c nimbo-transit -n '__nimbo_transit_at status' -l watch -d 'Go on printing lines'
-complete -c nimbo-transit -n '__nimbo_transit_at render' -F
+complete -c nimbo-transit -n '__nimbo_transit_at render' -a '(__fish_complete_suffix .png)'
 complete -c nimbo-transit -n '__nimbo_transit_at render' -l size -x -d 'Most room, WIDTHxHEIGHT'
 complete -c nimbo-transit -n '__nimbo_transit_at render' -l scale -x -d 'Device pixels for each point'
 complete -c nimbo-transit -n '__nimbo_transit_at render' -l text-size -x -d 'Size of the texts' \

@@ -9,10 +9,6 @@ namespace nimbo {
 namespace {
 
 // The pipeline's codes.
-constexpr int kActionExpand = 10;
-constexpr int kActionCollapse = 11;
-constexpr int kActionOpenItem = 9001;
-constexpr int kTargetTransitWidget = 706;
 constexpr int kWidgetTypeTransit = 2;
 constexpr int kEndStateOpened = 1;
 constexpr int kEndStateSwiped = 2;
@@ -49,7 +45,8 @@ void NBTransitIncidentsAnalyticsDelegate::recordWidgetChangeDisplayMode(WidgetDi
   if (!_sessionStartDate) return;
   if (mode == WidgetDisplayMode::Expanded) _analyticsData->everExpanded = true;
   Platform::current().analytics().captureUserAction(
-      mode == WidgetDisplayMode::Compact ? kActionCollapse : kActionExpand, kTargetTransitWidget, std::nullopt);
+      mode == WidgetDisplayMode::Compact ? kAnalyticsActionCollapse : kAnalyticsActionExpand,
+      kAnalyticsTargetTransitWidget, std::nullopt);
 }
 
 int NBTransitIncidentsAnalyticsDelegate::_messageTypeForIncidentCount(std::size_t count) {
@@ -75,7 +72,8 @@ void NBTransitIncidentsAnalyticsDelegate::recordOpenItemAtIndexPath(IndexPath in
     const std::int64_t firstRow = isExpanded() ? 1 : 0;
     _analyticsData->tappedItemIndex = indexPath.row == 0 ? firstRow : indexPath.row;
   }
-  Platform::current().analytics().captureUserAction(kActionOpenItem, kTargetTransitWidget, std::nullopt);
+  Platform::current().analytics().captureUserAction(kAnalyticsActionOpenItem, kAnalyticsTargetTransitWidget,
+                                                    std::nullopt);
   _closeSessionWithEndState(kEndStateOpened);
 }
 

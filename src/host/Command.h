@@ -1,6 +1,5 @@
 #pragma once
 
-#include <cstdio>
 #include <functional>
 #include <optional>
 #include <stdexcept>
@@ -9,6 +8,7 @@
 
 #include "desktop/system/GLibRunLoop.h"
 #include "desktop/system/Paths.h"
+#include "host/TerminalText.h"
 #include "platform/foundation/Error.h"
 
 namespace nimbo {
@@ -21,9 +21,7 @@ struct CommandContext {
   std::vector<std::string> widgetArguments;
   /// Tells the user, whatever the command goes on to do, something that he must hear, such as that a damaged database
   /// was set aside. Any thread.
-  std::function<void(const std::string& message)> tell = [](const std::string& message) {
-    std::fprintf(stderr, "nimbo-transit: %s\n", message.c_str());
-  };
+  std::function<void(const std::string& message)> tell = printMessage;
 };
 
 /// Ends a command: the message says what failed, where, and what to do.

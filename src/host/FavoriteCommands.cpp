@@ -21,8 +21,8 @@ void tellGoneLines(const CommandContext& context, const std::vector<TransitLineR
   const FeedLibrary library(context.paths);
   const auto gone = FeedCatalog(library).goneLines(identifiers);
   if (!gone) throw CommandFailure(gone.error()->reason());
-  for (const auto& line : gone->lines) std::cerr << "nimbo-transit: " << goneLineText(writtenNameOfLine(*line)) << "\n";
-  for (const ErrorRef& error : gone->errors) std::cerr << "nimbo-transit: " << error->reason() << "\n";
+  for (const auto& line : gone->lines) printMessage(goneLineText(writtenNameOfLine(*line)));
+  for (const ErrorRef& error : gone->errors) printMessage(error->reason());
 }
 
 std::vector<TransitLineRef> favoriteLines(HostPlatform& platform) {
@@ -66,10 +66,9 @@ int runFavoriteRemove(const CommandContext& context, const std::vector<std::stri
   return kExitSuccess;
 }
 
-int runFavoriteMove(const CommandContext& context, const std::string& name, std::size_t position) {
+int runFavoriteMove(const CommandContext& context, const std::string& name, int position) {
   HostPlatform platform(context);
-  if (position == 0) throw CommandFailure("positions count from 1");
-  require(platform->favoritesEditor().move(muidOfFavorite(platform, name), position - 1));
+  require(platform->favoritesEditor().move(muidOfFavorite(platform, name), static_cast<std::size_t>(position - 1)));
   return kExitSuccess;
 }
 
@@ -78,7 +77,6 @@ int runFavoriteList(const CommandContext& context) {
   const auto lines = favoriteLines(platform);
   printLines(lines);
   if (lines.empty()) std::cout << "No favorite lines. Add some with \"favorite add FEED:ROUTE_ID\".\n";
-  std::cout << std::flush;
   tellGoneLines(context, lines);
   return kExitSuccess;
 }

@@ -12,7 +12,7 @@ namespace nimbo {
 int runFavoriteAdd(const CommandContext& context, const std::vector<std::string>& lines);
 int runFavoriteRemove(const CommandContext& context, const std::vector<std::string>& lines);
 /// `position` counts from 1.
-int runFavoriteMove(const CommandContext& context, const std::string& line, std::size_t position);
+int runFavoriteMove(const CommandContext& context, const std::string& line, int position);
 int runFavoriteList(const CommandContext& context);
 
 }  // namespace nimbo

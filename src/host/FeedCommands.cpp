@@ -21,13 +21,12 @@ T require(Outcome<T> outcome) {
   return std::move(*outcome);
 }
 
-void printCount(const char* what, std::size_t count) { std::cout << "  " << what << ": " << count << "\n"; }
+void printLine(const std::string& text) { std::cout << "  " << printableText(text) << "\n"; }
 
 void printReport(const char* what, const SkipReport& report) {
   for (const SkipReport::Entry& entry : report.entries()) {
-    std::cout << "  " << what << ": " << entry.count << " " << printableText(entry.reason);
-    if (!entry.example.empty()) std::cout << " (first: " << printableText(entry.example) << ")";
-    std::cout << "\n";
+    const std::string text = std::string(what) + ": " + std::to_string(entry.count) + " × " + entry.reason;
+    printLine(entry.example.empty() ? text : text + " (first: " + entry.example + ")");
   }
 }
 
@@ -35,27 +34,27 @@ void printReport(const char* what, const SkipReport& report) {
 bool printCheck(const FeedCheckReport& report) {
   std::cout << printableText(report.name) << "\n";
   if (const auto& feed = report.staticFeed) {
-    printCount("agencies", feed->agencies);
-    printCount("lines", feed->lines);
-    if (feed->trips > 0) printCount("trips", feed->trips);
-    if (!feed->language.empty()) std::cout << "  language: " << printableText(feed->language) << "\n";
+    printLine(counted(feed->agencies, "agency", "agencies"));
+    printLine(counted(feed->lines, "line"));
+    if (feed->trips > 0) printLine(counted(feed->trips, "trip"));
+    if (!feed->language.empty()) printLine("language: " + feed->language);
     printReport("skipped in the static feed", feed->skipped);
   }
   if (const auto& alerts = report.alerts) {
-    if (alerts->timestamp) std::cout << "  alerts as of: " << isoTextOfDate(*alerts->timestamp) << "\n";
-    printCount("alerts", alerts->alerts);
+    if (alerts->timestamp) printLine("alerts as of: " + isoTextOfDate(*alerts->timestamp));
+    printLine(counted(alerts->alerts, "alert"));
     if (report.staticFeed) {
-      printCount("periods", alerts->periods);
-      printCount("selectors", alerts->selectors);
-      printCount("incidents in force or to come", alerts->incidents);
-      printCount("lines affected now", alerts->affectedLines);
+      printLine(counted(alerts->periods, "period"));
+      printLine(counted(alerts->selectors, "selector"));
+      printLine(counted(alerts->incidents, "incident") + " in force or to come");
+      printLine(counted(alerts->affectedLines, "line") + " affected now");
     }
     printReport("skipped in the alerts", alerts->skipped);
     printReport("fits nothing", alerts->unfit);
-    if (alerts->staleness) std::cout << "  too old: " << alerts->staleness->reason() << "\n";
+    if (alerts->staleness) printLine("too old: " + alerts->staleness->reason());
   }
   for (const ErrorRef& error : {report.staticError, report.alertsError})
-    if (error) std::cout << "  error: " << error->reason() << "\n";
+    if (error) printLine("error: " + error->reason());
   return !report.staticError && !report.alertsError && !(report.alerts && report.alerts->staleness);
 }
 
@@ -122,8 +121,7 @@ int runFeedCheck(const CommandContext& context, const std::string& name) {
   if (feeds.empty()) throw CommandFailure("no feed is set up to be checked. Set one up with \"feed add\".");
   std::size_t bad = 0;
   for (const Feed& feed : feeds) bad += printCheck(checkFeed(feed, cache)) ? 0 : 1;
-  if (bad > 0)
-    throw CommandFailure(std::to_string(bad) + " of " + std::to_string(feeds.size()) + " feeds cannot be used");
+  if (bad > 0) throw CommandFailure(counted(bad, "feed") + " of " + std::to_string(feeds.size()) + " cannot be used");
   return kExitSuccess;
 }
 
@@ -132,7 +130,7 @@ int runLines(const CommandContext& context, const std::string& text) {
   const FeedLibrary library(context.paths);
   const auto found = require(FeedCatalog(library).linesMatching(text));
   printLines(found.lines);
-  for (const ErrorRef& error : found.errors) std::cerr << "nimbo-transit: " << error->reason() << "\n";
+  for (const ErrorRef& error : found.errors) printMessage(error->reason());
   if (!found.errors.empty()) return kExitFailure;
   if (found.lines.empty()) throw CommandFailure("no line contains \"" + text + "\"");
   return kExitSuccess;

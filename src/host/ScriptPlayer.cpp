@@ -1,10 +1,17 @@
 #include "host/ScriptPlayer.h"
 
+#include "host/TerminalText.h"
+
 namespace nimbo {
 
 using nlohmann::json;
 
 namespace {
+
+/// What the widget reads in a line; discarded where it finds no JSON.
+json messageOf(const std::string& line) {
+  return line.find('\0') == std::string::npos ? json::parse(line, nullptr, false) : json(json::value_t::discarded);
+}
 
 /// A line that is answered: a request, or something that is no message at all.
 bool isAnswered(const json& message) {
@@ -23,7 +30,7 @@ bool hasMethod(const json& message, const char* method) {
 ScriptPlayer::ScriptPlayer(WidgetClient& client, std::ostream& output) : _client(client), _output(output) {
   client.setOpenHandler([](std::string_view, const json&) { return true; });
   client.connection().setLineObserver([this](std::string_view line) {
-    _output << line << "\n" << std::flush;
+    _output << printableJSON(line) << "\n" << std::flush;
     const json message = json::parse(line, nullptr, false);
     const bool isAnswer = message.is_object() && !message.contains("method");
     if (isAnswer && _waitingFor > 0) --_waitingFor;
@@ -39,7 +46,7 @@ void ScriptPlayer::play(std::istream& script) {
   for (std::string line; std::getline(script, line);) {
     const std::size_t begin = line.find_first_not_of(" \t\r");
     if (begin == std::string::npos || line[begin] == '#') continue;
-    const json message = json::parse(line, nullptr, false);
+    const json message = messageOf(line);
     const bool isUpdate = hasMethod(message, "performUpdate");
     if (!(isUpdate && lastWasUpdate)) waitForAnswers();
     if (isAnswered(message)) ++_waitingFor;

@@ -1,5 +1,7 @@
 #include "host/StateCommands.h"
 
+#include <unistd.h>
+
 #include <cerrno>
 #include <cstring>
 #include <fstream>
@@ -19,7 +21,9 @@ namespace {
 
 std::string textOfSetting(const SharedSettingsStore::Value& value) {
   if (const bool* flag = std::get_if<bool>(&value)) return *flag ? "true" : "false";
-  if (const std::string* text = std::get_if<std::string>(&value)) return printableText(*text);
+  // Programs want the text that was stored.
+  if (const std::string* text = std::get_if<std::string>(&value))
+    return isatty(STDOUT_FILENO) ? printableText(*text) : *text;
   return base64(std::get<Bytes>(value));
 }
 
@@ -29,9 +33,41 @@ SharedSettingsStore::Value settingOfText(const std::string& text) {
   return text;
 }
 
+std::string wordsOfAction(int action) {
+  switch (action) {
+    case kAnalyticsActionExpand:
+      return "expand";
+    case kAnalyticsActionCollapse:
+      return "collapse";
+    case kAnalyticsActionOpenItem:
+      return "open a row of";
+    default:
+      return "action " + std::to_string(action) + " on";
+  }
+}
+
 std::string textOfAction(const AnalyticsUserAction& action) {
-  std::string text = "action " + std::to_string(action.action) + ", target " + std::to_string(action.target);
+  const std::string target =
+      action.target == kAnalyticsTargetTransitWidget ? "the transit widget" : "target " + std::to_string(action.target);
+  const std::string text = wordsOfAction(action.action) + " " + target;
   return action.value ? text + ", value " + printableText(*action.value) : text;
+}
+
+std::string wordsOfMessageType(int type) {
+  switch (type) {
+    case 0:
+      return "nothing shown yet";
+    case 1:
+      return "no favorite lines";
+    case 2:
+      return "no incident";
+    case 3:
+      return "one incident";
+    case 4:
+      return "several incidents";
+    default:
+      return "message type " + std::to_string(type);
+  }
 }
 
 std::string textOfInteraction(const AnalyticsWidgetInteraction& interaction) {
@@ -42,7 +78,7 @@ std::string textOfInteraction(const AnalyticsWidgetInteraction& interaction) {
   if (interaction.wasLocked) text += ", locked";
   if (record.everExpanded) text += record.initiallyExpanded ? ", expanded from the start" : ", expanded";
   if (record.tappedItemIndex) text += ", row " + std::to_string(*record.tappedItemIndex);
-  text += ", message type " + std::to_string(record.transitMessageType);
+  text += ", " + wordsOfMessageType(record.transitMessageType);
   for (const auto& item : record.incidentItems)
     text += "\n  line " + item.transitLineMuid + ": " + printableText(item.transitIncidentTitle);
   return text;
@@ -76,7 +112,7 @@ int runAnalytics(const CommandContext& context, bool json) {
   require(platform->analytics().list(entries));
   for (const AnalyticsEntry& entry : entries) {
     if (json) {
-      std::cout << jsonOfAnalyticsEntry(entry) << "\n";
+      std::cout << printableJSON(jsonOfAnalyticsEntry(entry)) << "\n";
       continue;
     }
     std::cout << isoTextOfDate(entry.date) << "  ";
@@ -101,7 +137,7 @@ int runDecode(const CommandContext& context, const std::string& file) {
   WidgetClient client(context.runLoop, context.widgetArguments);
   try {
     const auto answer = client.call(protocol::kDecode.name, protocol::write(protocol::DecodeParams{base64(bytes)}));
-    std::cout << protocol::read<protocol::Handoff>(answer).text << "\n";
+    std::cout << printableJSON(protocol::read<protocol::Handoff>(answer).text) << "\n";
   } catch (const WidgetRefusal& refusal) {
     throw CommandFailure(file + ": " + refusal.error.message);
   }

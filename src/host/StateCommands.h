@@ -6,7 +6,8 @@
 
 namespace nimbo {
 
-/// Prints a setting: "true", "false", the text, or the bytes as base64. Fails when it is not set.
+/// Prints a setting: "true", "false", the text (as it is but to a terminal), or the bytes as base64. Fails when it is
+/// not set.
 int runSettingsGet(const CommandContext& context, const std::string& key);
 /// Stores "true", "YES", "false" or "NO" as a boolean, anything else as a text.
 int runSettingsSet(const CommandContext& context, const std::string& key, const std::string& value);

@@ -11,32 +11,6 @@ namespace {
 
 constexpr const char* kErrorWord = "error";
 
-std::string escaped(const std::string& text) {
-  std::string result;
-  for (const char c : printableText(text)) {
-    switch (c) {
-      case '&':
-        result += "&amp;";
-        break;
-      case '<':
-        result += "&lt;";
-        break;
-      case '>':
-        result += "&gt;";
-        break;
-      case '"':
-        result += "&quot;";
-        break;
-      case '\'':
-        result += "&apos;";
-        break;
-      default:
-        result += c;
-    }
-  }
-  return result;
-}
-
 std::string memberText(const json& object, const char* key) {
   const json text = object.value(key, json());
   return text.is_string() ? text.get<std::string>() : std::string();
@@ -49,7 +23,7 @@ std::string inOneLine(std::string text) {
 }
 
 std::string lineOf(const std::string& text, const std::string& word, const std::string& tooltip) {
-  return json{{"text", inOneLine(text)}, {"alt", word}, {"class", word}, {"tooltip", tooltip}}.dump();
+  return printableJSON(json{{"text", inOneLine(text)}, {"alt", word}, {"class", word}, {"tooltip", tooltip}}.dump());
 }
 
 bool isFetched(const json& snapshot) { return snapshot.at("result").is_string(); }
@@ -82,12 +56,12 @@ std::string tooltipOf(const json& snapshot) {
   std::string tooltip;
   const auto addLine = [&](const std::string& markup) { tooltip += (tooltip.empty() ? "" : "\n") + markup; };
   for (const json& row : rows) {
-    addLine("<b>" + escaped(shieldOf(row) + memberText(row, "primaryText")) + "</b>");
-    if (const std::string text = memberText(row, "secondaryText"); !text.empty()) addLine(escaped(text));
+    addLine("<b>" + markupText(shieldOf(row) + memberText(row, "primaryText")) + "</b>");
+    if (const std::string text = memberText(row, "secondaryText"); !text.empty()) addLine(markupText(text));
   }
   if (const json error = snapshot.value("error", json()); error.is_object())
-    addLine(escaped(memberText(error, "reason")));
-  for (const json& line : snapshot.at("goneLines")) addLine("<i>" + escaped(goneLineText(line)) + "</i>");
+    addLine(markupText(memberText(error, "reason")));
+  for (const json& line : snapshot.at("goneLines")) addLine("<i>" + markupText(goneLineText(line)) + "</i>");
   return tooltip;
 }
 
@@ -97,11 +71,11 @@ std::optional<std::string> statusBarLine(const json& snapshot) {
   const std::string word = classOf(snapshot);
   if (!isFetched(snapshot) && word != "good" && word != "advisories") return std::nullopt;
   const json& row = snapshot.at("listItem").at("summaryItem");
-  return lineOf(escaped(shieldOf(row) + memberText(row, "primaryText")), word, tooltipOf(snapshot));
+  return lineOf(markupText(shieldOf(row) + memberText(row, "primaryText")), word, tooltipOf(snapshot));
 }
 
 std::string statusBarErrorLine(const std::string& reason) {
-  return lineOf("⚠", kErrorWord, "<b>Nimbo Transit</b>\n" + escaped(reason));
+  return lineOf("⚠", kErrorWord, "<b>Nimbo Transit</b>\n" + markupText(reason));
 }
 
 }  // namespace nimbo

@@ -3,6 +3,8 @@
 #include <glib.h>
 
 #include <algorithm>
+#include <cstdio>
+#include <iostream>
 #include <memory>
 #include <utility>
 
@@ -25,19 +27,79 @@ void forEachCharacter(std::string_view text, Visit visit) {
   }
 }
 
+template <class Visit>
+void forEachValidCharacter(std::string_view text, Visit visit) {
+  const std::unique_ptr<char, decltype(&g_free)> valid(g_utf8_make_valid(text.data(), static_cast<gssize>(text.size())),
+                                                       &g_free);
+  forEachCharacter(valid.get(), visit);
+}
+
+bool isControl(gunichar c) { return c != '\n' && g_unichar_iscntrl(c); }
+
+/// Makes what follows run another way whatever it is.
+bool isOverride(gunichar c) { return c >= 0x202A && c <= 0x202E; }
+
+bool isDirection(gunichar c) {
+  return isOverride(c) || (c >= 0x2066 && c <= 0x2069) || c == 0x200E || c == 0x200F || c == 0x061C;
+}
+
 }  // namespace
 
 std::string printableText(std::string_view text) {
-  const std::unique_ptr<char, decltype(&g_free)> valid(g_utf8_make_valid(text.data(), static_cast<gssize>(text.size())),
-                                                       &g_free);
   std::string result;
-  forEachCharacter(valid.get(), [&](gunichar c, std::string_view bytes) {
-    if (c == '\n' || !g_unichar_iscntrl(c))
-      result += bytes;
-    else
+  forEachValidCharacter(text, [&](gunichar c, std::string_view bytes) {
+    if (isDirection(c)) return;
+    if (isControl(c))
       result += ' ';
+    else
+      result += bytes;
   });
   return result;
+}
+
+std::string markupText(std::string_view text) {
+  std::string result;
+  forEachValidCharacter(text, [&](gunichar c, std::string_view bytes) {
+    if (isOverride(c)) return;
+    if (isControl(c))
+      result += ' ';
+    else if (c == '&')
+      result += "&amp;";
+    else if (c == '<')
+      result += "&lt;";
+    else if (c == '>')
+      result += "&gt;";
+    else if (c == '"')
+      result += "&quot;";
+    else if (c == '\'')
+      result += "&apos;";
+    else
+      result += bytes;
+  });
+  return result;
+}
+
+std::string printableJSON(std::string_view json) {
+  std::string result;
+  forEachValidCharacter(json, [&](gunichar c, std::string_view bytes) {
+    if (isControl(c) || isDirection(c)) {
+      char escaped[7];
+      std::snprintf(escaped, sizeof escaped, "\\u%04x", c);
+      result += escaped;
+    } else {
+      result += bytes;
+    }
+  });
+  return result;
+}
+
+std::string counted(std::size_t count, const std::string& noun, const std::string& plural) {
+  return std::to_string(count) + " " + (count == 1 ? noun : plural.empty() ? noun + "s" : plural);
+}
+
+void printMessage(const std::string& message) {
+  std::cout << std::flush;
+  std::cerr << "nimbo-transit: " << printableText(message) << "\n";
 }
 
 int terminalWidth(std::string_view text) {

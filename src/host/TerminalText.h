@@ -6,9 +6,22 @@
 
 namespace nimbo {
 
-/// `text` with every control character (escape sequences of a hostile feed among them) replaced by a blank, line ends
-/// kept. Bad UTF-8 becomes U+FFFD.
+/// `text` for a terminal: every control character (escape sequences of a hostile feed among them) is a blank, line ends
+/// stay, and characters that set a direction go: few terminals know them, and they turn what stands around. Bad UTF-8
+/// becomes U+FFFD.
 std::string printableText(std::string_view text);
+
+/// `text` as Pango markup: as above, but isolates and marks stay, which Pango knows.
+std::string markupText(std::string_view text);
+
+/// JSON of the same meaning for a terminal: such characters are escaped in it.
+std::string printableJSON(std::string_view json);
+
+/// "1 alert", "2 alerts"; the plural is given where it is not made with an s.
+std::string counted(std::size_t count, const std::string& noun, const std::string& plural = {});
+
+/// Prints a message of nimbo-transit on standard error, after what standard output was given before.
+void printMessage(const std::string& message);
 
 /// Columns that a text takes in a terminal: wide characters two, combining marks and escape sequences none.
 int terminalWidth(std::string_view text);

@@ -8,9 +8,10 @@
 #include <sys/wait.h>
 #include <unistd.h>
 
-#include <cstdio>
 #include <cstdlib>
 #include <cstring>
+
+#include "host/TerminalText.h"
 
 namespace nimbo {
 
@@ -85,7 +86,7 @@ WidgetClient::WidgetClient(GLibRunLoop& runLoop, const std::vector<std::string>&
     if (_noticeHandler)
       _noticeHandler(message);
     else
-      std::fprintf(stderr, "%s: %s\n", kProgramName, message.c_str());
+      printMessage(message);
   });
   _connection->start();
 }

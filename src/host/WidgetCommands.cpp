@@ -1,7 +1,6 @@
 #include "host/WidgetCommands.h"
 
 #include <cerrno>
-#include <charconv>
 #include <cstring>
 #include <filesystem>
 #include <fstream>
@@ -11,30 +10,14 @@
 #include "host/OnScreenWidget.h"
 #include "host/ScriptPlayer.h"
 #include "host/TerminalRows.h"
-#include "platform/foundation/Geometry.h"
 
 namespace nimbo {
 
 namespace {
 
-/// Reads "359x110".
-Size sizeOfText(const std::string& text) {
-  // Unlike scanf, from_chars takes "0x110" for no hexadecimal number.
-  Size size;
-  const char* const end = text.data() + text.size();
-  auto read = std::from_chars(text.data(), end, size.width);
-  if (read.ec == std::errc() && read.ptr < end && *read.ptr == 'x')
-    read = std::from_chars(read.ptr + 1, end, size.height);
-  else
-    read.ec = std::errc::invalid_argument;
-  if (read.ec != std::errc() || read.ptr != end)
-    throw CommandFailure("--size: \"" + text + "\" is no size such as 359x110");
-  return size;
-}
-
 void tellGoneLines(const nlohmann::json& snapshot) {
   for (const nlohmann::json& line : snapshot.value("goneLines", nlohmann::json::array()))
-    std::cerr << "nimbo-transit: " << goneLineText(line) << "\n";
+    printMessage(goneLineText(line));
 }
 
 }  // namespace
@@ -47,7 +30,7 @@ int runStatus(const CommandContext& context, const StatusOptions& options) {
   if (options.expanded) widget.expand();
   const nlohmann::json snapshot = widget.snapshot();
   if (options.json)
-    std::cout << snapshot.dump(2) << "\n";
+    std::cout << printableJSON(snapshot.dump(2)) << "\n";
   else
     std::cout << rowsAsText(snapshot, TerminalStyle::ofStandardOutput());
   widget.close();
@@ -70,15 +53,13 @@ int runUpdate(const CommandContext& context) {
 
 int runRender(const CommandContext& context, const RenderOptions& options) {
   WidgetPresentation presentation;
-  // A name that is none is the widget's to refuse.
   if (const auto category = contentSizeCategoryFromName(options.textSize)) {
     presentation.compactHeight = WidgetPresentation::rowHeightForTextSize(*category);
     presentation.expandedHeight = 4 * presentation.compactHeight;
   }
-  if (!options.size.empty()) {
-    const Size size = sizeOfText(options.size);
-    presentation.width = size.width;
-    (options.expanded ? presentation.expandedHeight : presentation.compactHeight) = size.height;
+  if (options.size) {
+    presentation.width = options.size->width;
+    (options.expanded ? presentation.expandedHeight : presentation.compactHeight) = options.size->height;
   }
   presentation.scale = options.scale;
   presentation.textSize = options.textSize;

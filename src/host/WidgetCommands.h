@@ -4,6 +4,7 @@
 #include <string>
 
 #include "host/Command.h"
+#include "platform/foundation/Geometry.h"
 
 namespace nimbo {
 
@@ -22,7 +23,7 @@ int runUpdate(const CommandContext& context);
 
 struct RenderOptions {
   bool expanded = false;
-  std::string size;  ///< "WIDTHxHEIGHT", the most room in points; empty: as `status` has it
+  std::optional<Size> size;  ///< the most room in points; absent: as `status` has it
   double scale = 2;
   std::string textSize = "large";
   bool dark = false;

@@ -1,10 +1,17 @@
 // nimbo-transit: the widget in a terminal, and what it needs set up.
 
+#include <poll.h>
+#include <unistd.h>
+
 #include <CLI/CLI.hpp>
+#include <cerrno>
 #include <csignal>
+#include <cstdio>
+#include <cstring>
 #include <iostream>
 #include <set>
 
+#include "host/Arguments.h"
 #include "host/FavoriteCommands.h"
 #include "host/FeedCommands.h"
 #include "host/StateCommands.h"
@@ -25,6 +32,8 @@ class CommandLine {
   CLI::App* add(CLI::App& parent, const std::string& name, const std::string& description, Action action);
   /// Prints a message on standard error, unless it was printed before.
   void say(const std::string& message);
+  /// The exit status for what was printed, which may not have been written: says so then.
+  int outputStatus();
   void addWidgetCommands();
   void addFeedCommands();
   void addFavoriteCommands();
@@ -40,21 +49,17 @@ class CommandLine {
   std::optional<std::string> _virtualTime;
   std::string _file, _text, _key, _value;
   std::vector<std::string> _lines;
-  std::size_t _position = 1;
   bool _json = false, _waybar = false, _watch = false;
   std::set<std::string> _said;
 };
 
-/// An option's text that must be an ISO date.
-std::string checkDate(const std::string& text) {
-  return dateFromISOText(text) ? "" : "\"" + text + "\" is no ISO date such as 2026-01-05T12:00:00Z";
-}
-
 CommandLine::CommandLine() {
   _app.require_subcommand(1);
   _app.set_version_flag("--version", NIMBO_VERSION);
-  _app.add_option("--config", _config, "Folder of feeds.json (default: $XDG_CONFIG_HOME/nimbo-transit)");
-  _app.add_option("--state", _state, "Folder of favorites and last rows (default: $XDG_STATE_HOME/nimbo-transit)");
+  _app.add_option("--config", _config, "Folder of feeds.json (default: $XDG_CONFIG_HOME/nimbo-transit)")
+      ->check(checkFolder);
+  _app.add_option("--state", _state, "Folder of favorites and last rows (default: $XDG_STATE_HOME/nimbo-transit)")
+      ->check(checkFolder);
   _app.fallthrough();
   addWidgetCommands();
   addFeedCommands();
@@ -85,18 +90,23 @@ void CommandLine::addWidgetCommands() {
   add(_app, "update", "Fetch, and keep the rows for the widget's next start",
       [](const CommandContext& context) { return runUpdate(context); });
 
-  CLI::App* render = add(_app, "render", "Draw the rows into a PNG file",
-                         [this](const CommandContext& context) { return runRender(context, _render); });
+  CLI::App* render = add(_app, "render", "Draw the rows into a PNG file", [this](const CommandContext& context) {
+    _render.size = sizeOfArgument(_text);
+    return runRender(context, _render);
+  });
   render->add_flag("--expanded", _render.expanded, "One row for each incident instead of one for all");
-  render->add_option("--size", _render.size,
-                     "Most room in points, as WIDTHxHEIGHT; grows with the text size until set");
-  render->add_option("--scale", _render.scale, "Device pixels for each point")->capture_default_str();
+  render->add_option("--size", _text, "Most room in points, as WIDTHxHEIGHT; grows with the text size until set")
+      ->check(checkSize);
+  render->add_option("--scale", _render.scale, "Device pixels for each point, 0.25 to 8")
+      ->capture_default_str()
+      ->check(checkScale);
   render->add_option("--text-size", _render.textSize, "extraSmall to accessibilityExtraExtraExtraLarge")
-      ->capture_default_str();
+      ->capture_default_str()
+      ->check(checkTextSize);
   render->add_flag("--dark", _render.dark, "In the dark appearance");
   render->add_option("--locale", _render.locale, "Language of the texts, such as de or ar-EG");
   render->add_option("--now", _render.now, "ISO date by which incidents are judged")->check(checkDate);
-  render->add_option("OUT", _render.output, "PNG file to write")->required();
+  render->add_option("OUT", _render.output, "PNG file to write")->required()->check(checkPicture);
 
   CLI::App* script = add(_app, "script", "Play a file of host events to a widget process and print what comes back",
                          [this](const CommandContext& context) { return runScript(context, _file, _virtualTime); });
@@ -109,10 +119,13 @@ void CommandLine::addFeedCommands() {
   CLI::App* feed = _app.add_subcommand("feed", "The feeds of the agencies")->require_subcommand(1);
   CLI::App* addFeed =
       add(*feed, "add", "Set up a feed", [this](const CommandContext& context) { return runFeedAdd(context, _feed); });
-  addFeed->add_option("NAME", _feed.name, "Name of your choice")->required();
-  addFeed->add_option("--static", _feed.staticFeed, "GTFS: a folder, a zip file, or an http(s) address")->required();
+  addFeed->add_option("NAME", _feed.name, "Name of your choice")->required()->check(checkFeedName);
+  addFeed->add_option("--static", _feed.staticFeed, "GTFS: a folder, a zip file, or an http(s) address")
+      ->required()
+      ->check(checkFeedAddress);
   addFeed->add_option("--alerts", _feed.alerts, "GTFS-Realtime Service Alerts: a file or an http(s) address")
-      ->required();
+      ->required()
+      ->check(checkFeedAddress);
   CLI::App* remove = add(*feed, "remove", "Forget a feed",
                          [this](const CommandContext& context) { return runFeedRemove(context, _feed.name); });
   remove->add_option("NAME", _feed.name, "Name of the feed")->required();
@@ -130,14 +143,15 @@ void CommandLine::addFavoriteCommands() {
   CLI::App* favorite = _app.add_subcommand("favorite", "Your favorite lines")->require_subcommand(1);
   CLI::App* addLines = add(*favorite, "add", "Add lines",
                            [this](const CommandContext& context) { return runFavoriteAdd(context, _lines); });
-  addLines->add_option("FEED:ROUTE_ID", _lines, "Lines as \"lines\" prints them")->required();
+  addLines->add_option("FEED:ROUTE_ID", _lines, "Lines as \"lines\" prints them")->required()->check(checkLineName);
   CLI::App* remove = add(*favorite, "remove", "Remove lines",
                          [this](const CommandContext& context) { return runFavoriteRemove(context, _lines); });
   remove->add_option("FEED:ROUTE_ID", _lines, "Lines as \"favorite list\" prints them")->required();
-  CLI::App* move = add(*favorite, "move", "Move a line to another position",
-                       [this](const CommandContext& context) { return runFavoriteMove(context, _text, _position); });
+  CLI::App* move = add(*favorite, "move", "Move a line to another position", [this](const CommandContext& context) {
+    return runFavoriteMove(context, _text, *positionOfArgument(_value));
+  });
   move->add_option("FEED:ROUTE_ID", _text, "A line as \"favorite list\" prints it")->required();
-  move->add_option("POSITION", _position, "1 is the first")->required();
+  move->add_option("POSITION", _value, "1 is the first")->required()->check(checkPosition);
   add(*favorite, "list", "List the favorite lines in their order",
       [](const CommandContext& context) { return runFavoriteList(context); });
 }
@@ -165,7 +179,12 @@ int CommandLine::run(int argc, char** argv) {
   try {
     _app.parse(argc, argv);
   } catch (const CLI::ParseError& error) {
-    return _app.exit(error) == 0 ? kExitSuccess : kExitUsage;
+    if (error.get_exit_code() != 0) {
+      say(problemOfArguments(_app, error));
+      return kExitUsage;
+    }
+    _app.exit(error);  // prints the help or the version
+    return outputStatus();
   }
   int status = kExitSuccess;
   // A command without notices of its own has failed all the same when there is one.
@@ -183,13 +202,22 @@ int CommandLine::run(int argc, char** argv) {
     say(failure.what());
     status = kExitFailure;
   }
-  return status;
+  return std::max(outputStatus(), status);
 }
 
 void CommandLine::say(const std::string& message) {
-  if (!_said.insert(message).second) return;
-  std::cout << std::flush;
-  std::cerr << "nimbo-transit: " << message << "\n";
+  if (_said.insert(message).second) printMessage(message);
+}
+
+int CommandLine::outputStatus() {
+  errno = 0;
+  if (std::cout.flush() && !std::ferror(stdout)) return kExitSuccess;
+  const int failure = errno;  // 0 where an earlier write has failed
+  // Who closes his end of a pipe has read enough.
+  pollfd output{STDOUT_FILENO, 0, 0};
+  if (poll(&output, 1, 0) == 1 && (output.revents & POLLERR)) return kExitSuccess;
+  say("cannot write to the standard output" + (failure ? std::string(": ") + std::strerror(failure) : ""));
+  return kExitFailure;
 }
 
 }  // namespace

@@ -9,6 +9,12 @@
 
 namespace nimbo {
 
+// The codes of the records.
+inline constexpr int kAnalyticsActionExpand = 10;
+inline constexpr int kAnalyticsActionCollapse = 11;
+inline constexpr int kAnalyticsActionOpenItem = 9001;
+inline constexpr int kAnalyticsTargetTransitWidget = 706;
+
 /// One incident that the widget showed during a session.
 struct TransitIncidentAnalyticsItem {
   std::string transitLineMuid;  ///< decimal identifier of the line it was shown for

@@ -249,10 +249,6 @@ TEST(Alert, TextsComeFromWhatThereIs) {
        "No service.",
        {},
        {}},
-      {"a description that begins with the header",
-       "header_text { translation { text: 'No service' } } "
-       "description_text { translation { text: 'No service: trains rest.' } }",
-       "No service", "trains rest.", "No service: trains rest."},
   };
   for (const auto& [what, text, title, summary, whole] : cases) {
     transit_realtime::Alert message;
@@ -264,6 +260,30 @@ TEST(Alert, TextsComeFromWhatThereIs) {
     EXPECT_EQ(texts->title, title) << what;
     EXPECT_EQ(texts->summary, summary) << what;
     EXPECT_EQ(texts->description, whole) << what;
+  }
+}
+
+TEST(Alert, SummaryLeavesOutATitleThatStandsByItself) {
+  const struct {
+    const char *title, *description, *summary;
+  } cases[] = {
+      {"No service", "No service: trains rest.", "trains rest."},
+      {"No service", "No service : trains rest.", "trains rest."},
+      {"No service!", "No service! Trains rest.", "Trains rest."},
+      {"Why wait?", "Why wait? Walk.", "Walk."},
+      {"Line 1.", "Line\n1\nis closed.", "is closed."},
+      {"Line 1", "Line 1 is closed until Friday.", "Line 1 is closed until Friday."},
+      {"Line 1", "Line 1, 2 and 3 are closed.", "Line 1, 2 and 3 are closed."},
+      {"Line 1", "Line 1.5 km long.", "Line 1.5 km long."},
+      {"Line 1", "Line 12: closed.", "Line 12: closed."},
+  };
+  for (const auto& c : cases) {
+    transit_realtime::Alert message;
+    message.mutable_header_text()->add_translation()->set_text(c.title);
+    message.mutable_description_text()->add_translation()->set_text(c.description);
+    const auto texts = alertTextsIn(message.SerializeAsString(), AlertEffect::unknownEffect, {"en", ""});
+    EXPECT_EQ(texts->summary, c.summary);
+    EXPECT_EQ(texts->description, c.description);
   }
 }
 

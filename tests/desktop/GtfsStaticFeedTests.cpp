@@ -284,9 +284,10 @@ TEST_F(FeedConfigurationTest, RefusesWhatItCannotKeepAndChangesNothing) {
 }
 
 TEST_F(FeedConfigurationTest, SaysWhatIsWrongWithTheFile) {
-  const std::pair<const char*, const char*> cases[] = {
+  const std::pair<std::string, const char*> cases[] = {
       {"", "not JSON"},
       {"{\"feeds\": [", "not JSON at byte"},
+      {"{\"feeds\": []}" + std::string(2, '\0'), "not JSON at byte 14"},
       {"[]", "list \"feeds\""},
       {R"({"feeds": [{"name": "a", "static": "/x"}]})", "feed 1 in it has no text \"alerts\""},
       {R"({"feeds": [{"name": "a:b", "static": "/x", "alerts": "/y"}]})", "cannot be named \"a:b\""},

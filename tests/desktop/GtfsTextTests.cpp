@@ -1,6 +1,10 @@
 #include <gtest/gtest.h>
 
+#include <cstdio>
+#include <memory>
+
 #include "desktop/gtfs/AlertTexts.h"
+#include "desktop/gtfs/HtmlEntities.h"
 #include "desktop/gtfs/PlainText.h"
 #include "desktop/gtfs/Translation.h"
 
@@ -19,7 +23,8 @@ TEST(PlainText, IsWhatARiderReads) {
       {"no-break space, folded", "A&nbsp;&#160;B", "A B"},
       {"entities, decoded once", "Fish &amp; Chips &lt;b&gt; &amp;lt; &#8217;&#x2019; &eacute; &#150;",
        "Fish & Chips <b> &lt; ’’ é –"},
-      {"what is no entity", "AT&T &unknown; &#xZZ; & &;", "AT&T &unknown; &#xZZ; & &;"},
+      {"entities of Greek and Czech, and of two characters", "&Alpha;&theta;&#42; z&ecaron; &fjlig;", "Αθ* zě fj"},
+      {"what is no entity", "AT&T &unknown; &#xZZ; & &; ?a=1&copy=2", "AT&T &unknown; &#xZZ; & &; ?a=1&copy=2"},
       {"what is no tag", "<5 min, the <F> train, a < b, <a or b", "<5 min, the <F> train, a < b, <a or b"},
       {"a tag cut off", "Trains stop. <a href=\"https://exa", "Trains stop."},
       {"a quotation mark that never closes", "<span style=\"x>Shuttle</span> bus", "Shuttle bus"},
@@ -37,6 +42,27 @@ TEST(PlainText, IsWhatARiderReads) {
       {"nothing", "<p> &nbsp;</p>\u200F", ""},
   };
   for (const auto& [what, raw, plain] : cases) EXPECT_EQ(plainText(raw), plain) << what;
+}
+
+TEST(HtmlEntities, AreThoseThatPythonKnows) {
+  constexpr const char* kList =
+      "python3 -c 'from html.entities import html5\n"
+      "for k in html5: print(k, *(\"%x\" % ord(c) for c in (html5[k] + chr(0))[:2]))'";
+  const std::unique_ptr<FILE, decltype(&pclose)> list(popen(kList, "r"), &pclose);
+  char name[64];
+  unsigned first = 0, second = 0;
+  std::size_t found = 0;
+  while (std::fscanf(list.get(), "%63s %x %x", name, &first, &second) == 3) {
+    const std::string reference = "&" + std::string(name);
+    const auto entity = htmlEntityAt(reference + "x;");
+    ASSERT_EQ(entity.has_value(), reference.ends_with(';')) << reference;
+    if (!entity) continue;
+    ++found;
+    EXPECT_EQ(entity->character, first) << reference;
+    EXPECT_EQ(entity->second, second) << reference;
+    EXPECT_EQ(entity->length, reference.size());
+  }
+  EXPECT_EQ(found, 2125u);
 }
 
 TEST(PlainText, EndsInAnEllipsisWhereItIsTooLong) {

@@ -41,7 +41,7 @@ std::string written(const LogOptions& options, const Write& write) {
 
 TEST(SystemLog, WritesOneLineWithLevelAndFacility) {
   const auto write = [](SystemLog& log) {
-    const LogArgument argument("Line 7\nERROR fake\x1b[2J é");
+    const LogArgument argument("Line 7\nERROR fake\x1b[2J é\xC2\x9B\u202E\u2066ق");
     log.write(kFacility, LogLevel::error, "%{private}@", {&argument, 1});
     log.write(kFacility, LogLevel::info, "%@", {&argument, 1});
     log.write(kFacility, LogLevel::debug, "done", {});
@@ -51,8 +51,8 @@ TEST(SystemLog, WritesOneLineWithLevelAndFacility) {
   };
   EXPECT_EQ(written({}, write), "ERROR org.example.Sub Cat: <private>\n");
   EXPECT_EQ(written({LogLevel::debug, true, false, ""}, write),
-            "ERROR org.example.Sub Cat: Line 7\\nERROR fake\\x1b[2J é\n"
-            "INFO org.example.Sub Cat: Line 7\\nERROR fake\\x1b[2J é\n"
+            "ERROR org.example.Sub Cat: Line 7\\nERROR fake\\x1b[2J é\\xc2\\x9b\\xe2\\x80\\xae\\xe2\\x81\\xa6ق\n"
+            "INFO org.example.Sub Cat: Line 7\\nERROR fake\\x1b[2J é\\xc2\\x9b\\xe2\\x80\\xae\\xe2\\x81\\xa6ق\n"
             "DEBUG org.example.Sub Cat: done\n"
             "SIGNPOST org.example.Sub Cat: Pressure:  enable=YES \n");
   EXPECT_EQ(written({LogLevel::error, false, false, "loud"}, [](SystemLog&) {}),

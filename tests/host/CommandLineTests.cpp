@@ -1,10 +1,15 @@
 // The command line as its user types it.
 
+#include <fcntl.h>
 #include <gmock/gmock.h>
+#include <unistd.h>
 
+#include <cstdlib>
 #include <filesystem>
 
+#include "desktop/raii/FileDescriptor.h"
 #include "host/Programs.h"
+#include "host/TerminalText.h"
 
 namespace nimbo {
 namespace {
@@ -34,7 +39,8 @@ TEST(CommandLine, SetsUpFeedsAndFavorites) {
   EXPECT_THAT(programs.run({"feed", "list"}).output, HasSubstr("city"));
   const ProgramRun check = programs.run({"feed", "check"});
   EXPECT_EQ(check.status, 0) << check.errors;
-  EXPECT_THAT(check.output, HasSubstr("gone"))
+  EXPECT_THAT(check.output, AllOf(HasSubstr("  2 alerts\n"), HasSubstr("  1 incident in force")));
+  EXPECT_THAT(check.output, HasSubstr("1 × route that the static feed does not have (first: route gone)"))
       << "a selector that fits no line is how a false good service comes about";
 
   const auto order = [&] { return programs.run({"favorite", "list"}).output; };
@@ -55,15 +61,12 @@ TEST(CommandLine, RefusesWhatItCannotDoAndSaysWhy) {
     std::string says;
   } cases[] = {
       {{"feed", "add", "city", "--static", feed, "--alerts", programs.alertsFile()}, "city"},
-      {{"feed", "add", "a:b", "--static", feed, "--alerts", programs.alertsFile()}, "a:b"},
-      {{"feed", "add", "new", "--static", "ftp://example.org/x.zip", "--alerts", programs.alertsFile()}, "ftp:"},
       {{"feed", "remove", "nowhere"}, "nowhere"},
       {{"feed", "check", "nowhere"}, "nowhere"},
       {{"favorite", "add", "city:none"}, "none"},
-      {{"favorite", "add", "nocolon"}, "nocolon"},
       {{"favorite", "add", "city:m1"}, "1"},
       {{"favorite", "remove", "city:m2"}, "m2"},
-      {{"favorite", "move", "city:m1", "7"}, "7"},
+      {{"favorite", "move", "city:m1", "7"}, "There is no position 7 among 1 favorite line."},
       {{"settings", "get", "no.such.key"}, "no.such.key"},
       {{"decode", programs.alertsFile()}, "alerts.pb"},
       {{"script", "/nonexistent"}, "/nonexistent"},
@@ -75,7 +78,122 @@ TEST(CommandLine, RefusesWhatItCannotDoAndSaysWhy) {
     EXPECT_THAT(result.errors, AllOf(HasSubstr("nimbo-transit: "), HasSubstr(c.says)));
   }
   EXPECT_EQ(programs.run({"favorite", "list"}).output + programs.run({"feed", "list"}).output, before);
-  EXPECT_EQ(programs.run({"stauts"}).status, 2);
+}
+
+TEST(CommandLine, SaysWhatIsWrongWithArguments) {
+  const Programs programs;
+  const struct {
+    std::vector<std::string> arguments;
+    std::string says;
+  } cases[] = {
+      {{"stauts"}, R"(there is no command "stauts". Did you mean "status"?)"},
+      {{"fav"}, R"(Did you mean "favorite"?)"},
+      {{"favorite", "lst"}, R"(there is no command "favorite lst". Did you mean "favorite list"?)"},
+      {{"quit"}, R"(no command "quit". The commands are status, update,)"},
+      {{"feed"}, "a command is missing. The commands are add, remove, list, check."},
+      {{"status", "--expandd"}, R"(no option "--expandd". Did you mean "--expanded"?)"},
+      {{"status", "now"}, R"("now" is more than "status" takes.)"},
+      {{"render"}, "OUT is required"},
+      {{"favorite", "move", "city:m1", "-1"}, R"(POSITION: "-1" is no position: they count from 1)"},
+      {{"status", "-1"}, R"(no option "-1")"},
+      {{"favorite", "move", "city:m1", "0"}, R"("0" is no position)"},
+      {{"favorite", "move", "city:m1", "18446744073709551617"}, "is no position"},
+      {{"favorite", "add", "nocolon"}, R"("nocolon" is no line)"},
+      {{"feed", "add", "a:b", "--static", "/x", "--alerts", "/x"}, R"(cannot be named "a:b")"},
+      {{"feed", "add", "new", "--static", "ftp://example.org/x.zip", "--alerts", "/x"}, "ftp:"},
+      {{"render", "--scale", "0", "x.png"}, R"(--scale: "0" is no number from 0.25 to 8)"},
+      {{"render", "--scale", "nan", "x.png"}, "nan"},
+      {{"render", "--size", "100", "x.png"}, R"(--size: "100" is no size such as 359x110)"},
+      {{"render", "--size", "0x110", "x.png"}, "0x110"},
+      {{"render", "--size", "infx110", "x.png"}, "infx110"},
+      {{"render", "--text-size", "tiny", "x.png"}, R"(--text-size: "tiny" is no text size)"},
+      {{"render", "out.jpg"}, R"(OUT: "out.jpg" is written as PNG alone: let its name end in .png.)"},
+      {{"status", "--now", "today"}, R"(--now: "today" is no ISO date)"},
+      {{"status", "--watch"}, "--watch requires --waybar"},
+      {{"status", "--config", ""}, "--config: the name of the folder is empty"},
+  };
+  for (const auto& c : cases) {
+    const ProgramRun result = programs.run(c.arguments);
+    EXPECT_EQ(result.status, 2) << result.errors;
+    EXPECT_EQ(result.output, "");
+    EXPECT_THAT(result.errors, AllOf(testing::StartsWith("nimbo-transit: "), HasSubstr(c.says), HasSubstr("--help\"")));
+  }
+}
+
+TEST(CommandLine, TellsWhereItsOutputCannotBeWritten) {
+  const Programs programs;
+  programs.setUpCity({"m1"}, {});
+  programs.run({"settings", "set", "a", "b"});
+  programs.run({"status", kNow});
+  const std::string look = request("snapshot").dump();
+  for (const auto& command : std::vector<std::vector<std::string>>{{"--help"},
+                                                                   {"--version"},
+                                                                   {"status", kNow},
+                                                                   {"status", "--json", kNow},
+                                                                   {"status", "--waybar", kNow},
+                                                                   {"status", "--waybar", "--watch"},
+                                                                   {"feed", "list"},
+                                                                   {"feed", "check"},
+                                                                   {"lines"},
+                                                                   {"favorite", "list"},
+                                                                   {"settings", "get", "a"},
+                                                                   {"analytics"},
+                                                                   {"script", "-"}}) {
+    const ProgramRun run = programs.run(command, look, "/dev/full");
+    EXPECT_EQ(run.status, 1) << command.front();
+    EXPECT_THAT(run.errors, testing::StartsWith("nimbo-transit: cannot write to the standard output"));
+  }
+}
+
+TEST(TerminalText, HoldsNothingThatSteersATerminal) {
+  const std::string raw = "a\x1b[2J\xC2\x9B<\u202e\u2068\u05d0\u2069\u200f>\xff\nb";
+  EXPECT_EQ(printableText(raw), "a [2J <\u05d0>\ufffd\nb");
+  EXPECT_EQ(markupText(raw), "a [2J &lt;\u2068\u05d0\u2069\u200f&gt;\ufffd\nb");
+  const std::string escaped = printableJSON(json{"é\xC2\x9B\u202e\u2068\u061c\x7f"}.dump());
+  EXPECT_EQ(escaped, R"(["é\u009b\u202e\u2068\u061c\u007f"])");
+  EXPECT_EQ(counted(1, "alert") + counted(0, "agency", "agencies"), "1 alert0 agencies");
+}
+
+TEST(CommandLine, PrintsNothingThatSteersATerminal) {
+  const Programs programs;
+  const std::string hostile = "\u202e\xC2\x9Bm";
+  programs.folder.write("feed/routes.txt", "route_id,agency_id,route_short_name,route_type\nr" + hostile + ",M," +
+                                               hostile + "1,1\nm2,M,2,1\n");
+  const std::string feed = programs.folder.path() / "feed", setting = "\x1b[2J" + hostile;
+  programs.run({"feed", "add", "c" + hostile, "--static", feed, "--alerts", "/none" + hostile});
+  programs.run({"favorite", "add", "c" + hostile + ":r" + hostile, "c" + hostile + ":m2"});
+  programs.run({"settings", "set", "a", setting});
+  for (const auto& command : std::vector<std::vector<std::string>>{{"feed", "list"},
+                                                                   {"feed", "check"},
+                                                                   {"feed", "check", hostile},
+                                                                   {"lines"},
+                                                                   {"lines", "none" + hostile},
+                                                                   {"favorite", "add", hostile + ":m2"},
+                                                                   {"favorite", "list"},
+                                                                   {"status", kNow},
+                                                                   {"status", "--json", kNow},
+                                                                   {"status", "--waybar", kNow},
+                                                                   {"analytics"},
+                                                                   {"settings", "get", hostile},
+                                                                   {"decode", feed + hostile},
+                                                                   {"script", "-"},
+                                                                   {hostile},
+                                                                   {"--" + hostile}}) {
+    const ProgramRun run = programs.run(command, R"({"jsonrpc":"2.0","id":")" + hostile + R"(","method":"dance"})");
+    const std::string printed = run.output + run.errors;
+    for (const char* steering : {"\x1b", "\u202e", "\xC2\x9B"})
+      EXPECT_THAT(printed, Not(HasSubstr(steering))) << command.front();
+    EXPECT_NE(printed, "") << command.front();
+  }
+
+  // Another program gets the setting as it was stored.
+  EXPECT_EQ(programs.run({"settings", "get", "a"}).output, setting + "\n");
+  const FileDescriptor terminal(posix_openpt(O_RDWR | O_NOCTTY));
+  ASSERT_EQ(grantpt(terminal.get()) | unlockpt(terminal.get()), 0);
+  programs.run({"settings", "get", "a"}, {}, ptsname(terminal.get()));
+  char shown[64] = {};
+  ASSERT_GT(::read(terminal.get(), shown, sizeof shown - 1), 0);
+  EXPECT_STREQ(shown, " [2J m\r\n");
 }
 
 TEST(CommandLine, ShowsTheErrorRowForAFeedThatFails) {
@@ -118,10 +236,13 @@ TEST(CommandLine, NeverTakesABrokenDatabaseForNoFavorites) {
 
 TEST(CommandLine, KeepsAnalyticsAndDecodesWhatIsHandedOver) {
   const Programs programs;
-  programs.setUpCity({"m1"}, {{"a", {"m1"}, "Works", "Slow."}});
+  programs.setUpCity({"m1"}, {{"a", {"m1"}, "Works", "Slow."}, {"b", {"m1"}, "Strike", "Slower."}});
   programs.run({"status", kNow});
-  EXPECT_THAT(programs.run({"analytics"}).output, AllOf(HasSubstr("disappearing"), HasSubstr("Works")));
+  EXPECT_THAT(programs.run({"analytics"}).output,
+              AllOf(HasSubstr("ended by disappearing"), HasSubstr(", several incidents\n"), HasSubstr("Works")));
   EXPECT_EQ(json::parse(programs.run({"analytics", "--json"}).output).is_object(), true);
+  programs.run({"status", "--expanded", kNow});
+  EXPECT_THAT(programs.run({"analytics"}).output, HasSubstr("  expand the transit widget\n"));
 
   EXPECT_EQ(programs.run({"settings", "set", "Nimbo.TransitWidget.internal.injectFakeIncidents", "YES"}).status, 0);
   EXPECT_EQ(programs.run({"settings", "get", "Nimbo.TransitWidget.internal.injectFakeIncidents"}).output, "true\n");

@@ -2,6 +2,7 @@
 #include <unicode/timezone.h>
 
 #include "host/window/DateText.h"
+#include "host/window/LineTexts.h"
 #include "incidents/NBTransitIncidentUpdater.h"
 #include "items/NBTransitIncidentFilter.h"
 #include "support/TestPlatform.h"
@@ -66,6 +67,29 @@ TEST(DateText, WritesTodayInCapitalsWhereItBeginsThePeriod) {
   EXPECT_THAT(dates.textOf(now), testing::MatchesRegex("[hg]e.*"));
   // The phrases are English ones for lack of Polish texts.
   EXPECT_THAT(DateText("pl_PL").textOf(now), testing::MatchesRegex("(today|yesterday).*"));
+}
+
+TEST(IncidentTexts, SayNothingTwice) {
+  const TestPlatform platform;
+  using Texts = std::vector<std::string>;
+  const struct {
+    std::optional<std::string> summary, description;
+    Texts shown;
+  } cases[] = {
+      {"Buses turn.", "Buses turn.\nStop B is closed.", {"Buses turn.\nStop B is closed."}},
+      {"Reason: Strike.", "Works\nReason\n\nStrike. More.", {"Works\nReason\n\nStrike. More."}},
+      {"One train in three", "A strike.", {"One train in three", "A strike."}},
+      {"Works", "Works", {}},
+      {"Buses turn.", {}, {"Buses turn."}},
+      {{}, "A strike.", {"A strike."}},
+  };
+  for (const auto& c : cases) {
+    BasicTransitIncident::Fields fields;
+    fields.title = "Works";
+    fields.summary = c.summary;
+    fields.fullDescription = c.description;
+    EXPECT_EQ(textsBelowTitle(BasicTransitIncident(std::move(fields))), c.shown);
+  }
 }
 
 }  // namespace

@@ -36,14 +36,17 @@ void Programs::setUpCity(const std::vector<std::string>& favorites,
   if (!favorites.empty()) run(add);
 }
 
-ProgramRun Programs::run(std::vector<std::string> arguments, const std::string& input) const {
+ProgramRun Programs::run(std::vector<std::string> arguments, const std::string& input,
+                         const std::string& output) const {
   folder.write("stdin", input);
-  const std::string files[] = {folder.path() / "stdin", folder.path() / "stdout", folder.path() / "stderr"};
+  folder.write("stdout", "");
+  const std::string files[] = {folder.path() / "stdin", output.empty() ? (folder.path() / "stdout").string() : output,
+                               folder.path() / "stderr"};
   posix_spawn_file_actions_t actions;
   posix_spawn_file_actions_init(&actions);
   posix_spawn_file_actions_addopen(&actions, 0, files[0].c_str(), O_RDONLY, 0);
   for (const int fd : {1, 2})
-    posix_spawn_file_actions_addopen(&actions, fd, files[fd].c_str(), O_WRONLY | O_CREAT | O_TRUNC, 0600);
+    posix_spawn_file_actions_addopen(&actions, fd, files[fd].c_str(), O_WRONLY | O_CREAT | O_TRUNC | O_NOCTTY, 0600);
   arguments.insert(arguments.begin(),
                    {NIMBO_TRANSIT, "--config", folder.path() / "config", "--state", folder.path() / "state"});
   std::vector<char*> argv;

@@ -27,8 +27,9 @@ class Programs {
   static Date now() { return *dateFromISOText("2026-01-05T12:00:00Z"); }
   static std::int64_t unixNow() { return now().time_since_epoch().count() / 1000000; }
 
-  /// Runs nimbo-transit with these arguments, folders given.
-  ProgramRun run(std::vector<std::string> arguments, const std::string& input = {}) const;
+  /// Runs nimbo-transit with these arguments, folders given. Where `output` names a device, the output goes there.
+  ProgramRun run(std::vector<std::string> arguments, const std::string& input = {},
+                 const std::string& output = {}) const;
   /// Plays host events with time standing still at `now`, and gives every line that came back.
   std::vector<nlohmann::json> play(const std::vector<nlohmann::json>& events) const;
 

@@ -286,6 +286,7 @@ TEST(WidgetProcess, OutlivesEveryMessage) {
       {"{\"jsonrpc\":\"2.0\",\"id\":1,\"method\":\"snapshot\",\"params\":[1]}", -32600},
       {std::string(5000, '[') + std::string(5000, ']'), -32600},
       {std::string("\"\xff\xfe\""), -32700},
+      {R"({"jsonrpc":"2.0","method":"shutdown"})" + std::string(1, '\0'), -32700},
       {request("dance"), -32601},
       {request("initialize"), -32001},
       {request("loadView"), -32001},

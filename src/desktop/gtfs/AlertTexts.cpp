@@ -33,9 +33,10 @@ std::string onOneLine(std::string_view text) {
 
 std::string_view firstLine(std::string_view text) { return text.substr(0, text.find('\n')); }
 
-/// What a text says after its title, when it begins with it; else all of it.
+/// What a text says after its title, when it begins with it as a heading or sentence of its own; else all of it: "Line
+/// 1" is not repeated in "Line 1 is closed until Friday." or "Line 1.5 km".
 std::string_view afterTitle(std::string_view text, std::string_view title) {
-  constexpr std::string_view kMarks = " .:;,!\n";
+  constexpr std::string_view kMarks = " .:;,!?\n";
   title = title.substr(0, title.find_last_not_of(kMarks) + 1);
   std::size_t position = 0;
   for (const char c : title) {
@@ -48,7 +49,10 @@ std::string_view afterTitle(std::string_view text, std::string_view title) {
   const std::string_view rest = text.substr(position);
   const std::size_t begin = rest.find_first_not_of(kMarks);
   if (begin == std::string_view::npos) return {};
-  return begin == 0 ? text : rest.substr(begin);  // "Delays" is not repeated in "Delayspotting"
+  const std::string_view between = rest.substr(0, begin);
+  const bool endsLine = between.find('\n') != std::string_view::npos;
+  const bool endsSentence = between.find_first_of(".:!?") != std::string_view::npos && between.ends_with(' ');
+  return endsLine || endsSentence ? rest.substr(begin) : text;
 }
 
 /// Whether a sentence ends with the character before `position`.

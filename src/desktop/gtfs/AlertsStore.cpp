@@ -21,6 +21,7 @@ TimeInterval ageOf(Date date) { return -intervalFromNow(date); }
 
 std::string ageText(TimeInterval seconds) {
   const auto minutes = static_cast<long long>(seconds / 60);
+  if (minutes == 1) return "1 minute";
   if (minutes < 120) return std::to_string(minutes) + " minutes";
   if (minutes < 2 * 24 * 60) return std::to_string(minutes / 60) + " hours";
   return std::to_string(minutes / (24 * 60)) + " days";

@@ -33,12 +33,16 @@ Outcome<JSON> readDocument(const std::filesystem::path& file) {
   const auto bytes = readFile(file, kLargestConfiguration);
   if (!bytes) return bytes.error();
   const Fault fault{file};
+  const auto notJSON = [&](std::size_t byte) {
+    return fault("it is not JSON at byte " + std::to_string(byte) + ". Correct it, or move it away to begin anew.");
+  };
+  // The end of the text to the parser.
+  if (const std::size_t zero = bytes->find('\0'); zero != std::string::npos) return notJSON(zero + 1);
   JSON document;
   try {
     document = JSON::parse(*bytes);
   } catch (const JSON::parse_error& error) {
-    return fault("it is not JSON at byte " + std::to_string(error.byte) +
-                 ". Correct it, or move it away to begin anew.");
+    return notJSON(error.byte);
   }
   if (!document.is_object() || !document.contains("feeds") || !document["feeds"].is_array())
     return fault("it is not an object with a list \"feeds\". Correct it, or move it away to begin anew.");

@@ -138,6 +138,7 @@ std::string plainText(std::string_view text, std::size_t limit) {
       if (const auto entity = htmlEntityAt(rest)) {
         position += entity->length;
         writer.write(entity->character);
+        if (entity->second) writer.write(entity->second);
         continue;
       }
     } else if (rest.starts_with("\r\n")) {

@@ -76,7 +76,9 @@ void JSONRPCConnection::handleLine(std::string_view line) {
     return depth <= kMaximumDepth;
   };
   const json message = json::parse(line, bounded, false);
-  if (message.is_discarded()) return refuse(nullptr, JSONRPCError::kParseError, "the line is not JSON");
+  // A NUL byte is the end of the text to the parser.
+  if (message.is_discarded() || line.find('\0') != std::string_view::npos)
+    return refuse(nullptr, JSONRPCError::kParseError, "the line is not JSON");
   if (tooDeep) return refuse(nullptr, JSONRPCError::kInvalidRequest, "the message is nested too deeply");
   handleMessage(message);
 }

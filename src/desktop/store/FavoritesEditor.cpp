@@ -31,10 +31,11 @@ ErrorRef lossOf(SQLiteConnection& connection) {
   SQLiteStatement query = connection.prepare("SELECT value FROM settings WHERE key = ?");
   query.bind(1, kFavoritesLostKey);
   if (!query.step()) return nullptr;
+  const std::int64_t left = connection.integer("SELECT count(*) FROM favorites");
   return refusal(FavoritesError::lost,
                  "Not all favorites could be read in a damaged database, which is kept as " + query.text(0) + ": " +
-                     std::to_string(connection.integer("SELECT count(*) FROM favorites")) +
-                     " of them are left. Add those that you miss; that ends this message.",
+                     std::to_string(left) + (left == 1 ? " of them is" : " of them are") +
+                     " left. Add those that you miss; that ends this message.",
                  query.text(0));
 }
 
@@ -167,8 +168,9 @@ ErrorRef FavoritesEditor::move(std::uint64_t muid, std::size_t position) {
     const auto row = findLine(rows, muid);
     if (row == rows.end()) return unknownLine(muid);
     if (position >= rows.size())
-      return refusal(FavoritesError::position, "There is no position " + std::to_string(position + 1) +
-                                                   ": the favorite lines are " + std::to_string(rows.size()) + ".");
+      return refusal(FavoritesError::position, "There is no position " + std::to_string(position + 1) + " among " +
+                                                   std::to_string(rows.size()) +
+                                                   (rows.size() == 1 ? " favorite line." : " favorite lines."));
     const auto target = rows.begin() + static_cast<std::ptrdiff_t>(position);
     if (row < target)
       std::rotate(row, row + 1, target + 1);

@@ -82,13 +82,7 @@ void IncidentCard::addText(Gtk::Box& box, const std::string& text, const char* s
 }
 
 void IncidentCard::addTexts(const TransitIncident& incident) {
-  const std::string title = IncidentStringProvider::cellTitleForIncident(&incident);
-  std::string said = title;
-  for (const auto* text : {&incident.summary(), &incident.fullDescription()}) {
-    if (!*text || (*text)->empty() || **text == said) continue;
-    said = **text;
-    addSaid(said, "item-text");
-  }
+  for (const std::string& text : textsBelowTitle(incident)) addSaid(text, "item-text");
 }
 
 void IncidentCard::addDates(const TransitIncidents& periods) {

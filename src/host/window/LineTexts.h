@@ -1,7 +1,9 @@
 #pragma once
 
 #include <string>
+#include <vector>
 
+#include "platform/transit/TransitIncident.h"
 #include "platform/transit/TransitLine.h"
 
 namespace nimbo {
@@ -14,5 +16,9 @@ std::string nameBesideShield(const TransitLine& line);
 
 /// Name of the network that a line belongs to; empty where that is not known.
 std::string systemNameOfLine(const TransitLine& line);
+
+/// What a card says of an incident below its title, nothing twice: the description, with the summary before it where
+/// the description does not say that too.
+std::vector<std::string> textsBelowTitle(const TransitIncident& incident);
 
 }  // namespace nimbo
