@@ -72,9 +72,9 @@ int runSettingsUnset(const CommandContext& context, const std::string& key) {
 
 int runAnalytics(const CommandContext& context, bool json) {
   HostPlatform platform(context);
-  std::vector<AnalyticsEntry> entries;
-  require(platform->analytics().list(entries));
-  for (const AnalyticsEntry& entry : entries) {
+  const auto entries = platform->analytics().list();
+  require(entries.error());
+  for (const AnalyticsEntry& entry : *entries) {
     if (json) {
       std::cout << jsonOfAnalyticsEntry(entry) << "\n";
       continue;

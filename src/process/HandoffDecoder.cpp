@@ -140,12 +140,13 @@ Outcome<ObjectRef> readRecord(std::span<const std::uint8_t> bytes) {
 
 /// A list of StoredTransitIncident, or an NBTransitIncidentViewControllerState.
 Outcome<ObjectRef> readArchive(std::span<const std::uint8_t> bytes) {
-  const CBORKeyedArchive::Opened opened = CBORKeyedArchive::openData(bytes);
-  if (!opened.unarchiver) return opened.error;
+  const auto opened = CBORKeyedArchive::openData(bytes);
+  if (!opened) return opened.error();
+  KeyedUnarchiver& unarchiver = **opened;
   const ArchivableClass& stateClass = NBTransitIncidentViewControllerState::archivedClass();
-  opened.unarchiver->setClass_forClassName(stateClass, kEarlierStateClassName);
-  opened.unarchiver->setDecodingFailurePolicy(DecodingFailurePolicy::setErrorAndReturn);
-  const auto [root, error] = opened.unarchiver->decodeTopLevelObjectOfClasses_forKey(
+  unarchiver.setClass_forClassName(stateClass, kEarlierStateClassName);
+  unarchiver.setDecodingFailurePolicy(DecodingFailurePolicy::setErrorAndReturn);
+  const auto [root, error] = unarchiver.decodeTopLevelObjectOfClasses_forKey(
       {&kArrayClass, &StoredTransitIncident::archivedClass(), &stateClass}, kKeyedArchiveRootObjectKey);
   if (error) return error;
   if (!root) return failure("the archive's root holds neither a list of incidents nor a state with a result");
@@ -167,8 +168,8 @@ Outcome<ObjectRef> readHandoff(std::span<const std::uint8_t> bytes) {
   if (bytes.empty()) return failure("there are no bytes");
   if (isMap(bytes)) return readArchive(bytes);
   if (!isBzip2Stream(bytes)) return readRecord(bytes);
-  const Bzip2Decompressed record = bzip2DecompressedData(bytes, kMaximumRecordSize);
-  return record.bytes ? readRecord(*record.bytes) : record.error;
+  const auto record = bzip2DecompressedData(bytes, kMaximumRecordSize);
+  return record ? readRecord(*record) : record.error();
 }
 
 }  // namespace

@@ -279,15 +279,16 @@ json WidgetProcess::render(const Parameters& params) {
   view.layoutIfNeeded();
   const Environment& environment = Environment::current();
   const auto draw = [&view](Painter& painter) { view.draw(painter); };
-  const CairoSurface::Made made = renderToSurface(draw, view.bounds().size(), environment.screenScale(),
-                                                  colorOf(SystemColor::background, environment.appearance()));
-  ErrorRef error = made.error;
-  if (!error) error = toSurface ? writeSharedSurface(*made.surface, path) : writePNG(*made.surface, path);
+  const auto made = renderToSurface(draw, view.bounds().size(), environment.screenScale(),
+                                    colorOf(SystemColor::background, environment.appearance()));
+  ErrorRef error = made.error();
+  if (made) error = toSurface ? writeSharedSurface(**made, path) : writePNG(**made, path);
   if (error) throw JSONRPCFailure(JSONRPCError::kDrawingFailed, error->reason());
-  return {{"width", made.surface->pixelWidth()},
-          {"height", made.surface->pixelHeight()},
-          {"stride", made.surface->stride()},
-          {"scale", made.surface->scale()}};
+  const CairoSurface& surface = **made;
+  return {{"width", surface.pixelWidth()},
+          {"height", surface.pixelHeight()},
+          {"stride", surface.stride()},
+          {"scale", surface.scale()}};
 }
 
 json WidgetProcess::setAppearance(const Parameters& params) {
