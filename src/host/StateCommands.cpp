@@ -10,8 +10,6 @@
 #include "host/HostPlatform.h"
 #include "host/TerminalText.h"
 #include "host/WidgetClient.h"
-#include "protocol/Coding.h"
-#include "protocol/Methods.h"
 
 namespace nimbo {
 
@@ -100,8 +98,7 @@ int runDecode(const CommandContext& context, const std::string& file) {
   if (input.bad()) throw CommandFailure("cannot read " + file + ": " + std::strerror(errno));
   WidgetClient client(context.runLoop, context.widgetArguments);
   try {
-    const auto answer = client.call(protocol::kDecode.name, protocol::write(protocol::DecodeParams{base64(bytes)}));
-    std::cout << protocol::read<protocol::Handoff>(answer).text << "\n";
+    std::cout << client.call(protocol::kDecode, {base64(bytes)}).text << "\n";
   } catch (const WidgetRefusal& refusal) {
     throw CommandFailure(file + ": " + refusal.error.message);
   }

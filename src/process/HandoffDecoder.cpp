@@ -10,6 +10,7 @@
 #include "handoff/NimboActivity.h"
 #include "platform/wire/StoredTransitIncident.h"
 #include "platform/wire/StoredTransitLineItem.h"
+#include "process/Snapshot.h"
 #include "widget/NBTransitIncidentViewControllerState.h"
 
 namespace nimbo {
@@ -66,21 +67,6 @@ json jsonOf(const ObjectRef& object) {
   return descriptionOf(object);
 }
 
-protocol::Shield shieldOf(const TransitArtwork& artwork) {
-  protocol::Shield result;
-  if (const auto& shield = artwork.shieldDataSource()) {
-    result.text = shield->shieldText;
-    result.color = shield->shieldColorString;
-    result.textColor = shield->shieldTextColorString;
-    result.type = shield->shieldType;
-  }
-  if (const auto& icon = artwork.iconDataSource())
-    result.icon = protocol::Icon{icon->iconType, icon->cartoID, icon->defaultTransitType, icon->iconAttributeKey,
-                                 icon->iconAttributeValue};
-  result.accessibilityText = artwork.accessibilityText();
-  return result;
-}
-
 std::optional<protocol::Shield> shieldOf(const TransitArtworkRef& artwork) {
   return artwork ? std::optional(shieldOf(*artwork)) : std::nullopt;
 }
@@ -99,7 +85,6 @@ protocol::Incident incidentOf(const TransitIncident& incident) {
                             .endDate = writableDate(incident.endDate()),
                             .lastUpdated = writableDate(incident.lastUpdated()),
                             .isBlocking = incident.isBlockingIncident(),
-                            .affectedLines = {},
                             .linkURL = incident.linkURL()};
   for (const auto& entity : incident.affectedEntities()) result.affectedLines.push_back(entity->muid());
   return result;
@@ -108,10 +93,8 @@ protocol::Incident incidentOf(const TransitIncident& incident) {
 protocol::Line lineOf(const TransitLineItem& line) {
   protocol::Line result{.muid = line.muid(),
                         .name = line.name(),
-                        .system = {},
                         .artwork = shieldOf(line.artwork()),
-                        .alternateArtwork = shieldOf(line.alternateArtwork()),
-                        .incidents = {}};
+                        .alternateArtwork = shieldOf(line.alternateArtwork())};
   if (const auto& system = line.system()) result.system = protocol::System{system->name(), shieldOf(system->artwork())};
   for (const TransitIncidentRef& incident : line.incidents()) result.incidents.push_back(incidentOf(*incident));
   return result;

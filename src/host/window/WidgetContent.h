@@ -1,11 +1,11 @@
 #pragma once
 
 #include <memory>
-#include <nlohmann/json.hpp>
 #include <string>
 #include <vector>
 
 #include "host/window/SharedPicture.h"
+#include "protocol/Snapshot.h"
 
 namespace nimbo {
 
@@ -23,8 +23,8 @@ struct WidgetContent {
   bool canExpand = false;
   bool isExpanded = false;
 
-  /// Takes rows and modes from a snapshot of docs/protocol.md. Throws nlohmann::json::exception for anything else.
-  static WidgetContent ofSnapshot(const nlohmann::json& snapshot);
+  /// Takes rows and modes from a snapshot.
+  static WidgetContent ofSnapshot(const protocol::Snapshot& snapshot);
 };
 
 using WidgetContentRef = std::shared_ptr<const WidgetContent>;

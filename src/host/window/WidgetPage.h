@@ -38,7 +38,7 @@ class WidgetPage final : public Page, private WidgetHostProcess::Delegate {
   void widgetDidFail(const std::string& reason) override;
   void widgetTells(const std::string& message) override;
   void widgetIsUpdating(bool updating) override;
-  bool widgetOpens(std::string_view method, const nlohmann::json& params) override;
+  bool widgetOpens(const WidgetClient::Opening& opening) override;
 
   const PageContext& _context;
   WidgetHostProcess _process;
