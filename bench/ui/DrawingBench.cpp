@@ -41,7 +41,7 @@ class Rows {
     const auto draw = [this](Painter& painter) { _view->draw(painter); };
     const auto made =
         renderToSurface(draw, _view->bounds().size(), 1, colorOf(SystemColor::background, Appearance::light));
-    benchmark::DoNotOptimize(made.surface->pixels().data());
+    benchmark::DoNotOptimize((*made)->pixels().data());
   }
 
   void layOut(double rowHeight) {

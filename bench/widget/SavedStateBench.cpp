@@ -42,9 +42,9 @@ void saveAndRestore(benchmark::State& state) {
   for (auto _ : state) {
     const auto saved = NBTransitIncidentViewControllerState::initWithLineItemsResult_expanded(result, true);
     const auto archived = Platform::current().archive().archivedDataWithRootObject(saved, true);
-    const auto restored = NBTransitIncidentViewControllerState::unarchiveFromData_error(*archived.bytes, nullptr);
+    const auto restored = NBTransitIncidentViewControllerState::unarchiveFromData_error(*archived, nullptr);
     if (!restored) state.SkipWithError("the state is not restored");
-    size = archived.bytes->size();
+    size = archived->size();
   }
   state.counters["bytes"] = static_cast<double>(size);
 }

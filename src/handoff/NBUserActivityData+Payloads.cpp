@@ -73,7 +73,8 @@ NBUserActivityDataRef activityDataForIncidents(const TransitIncidents& incidents
         const auto stored = NimboMap(incidents, [](const TransitIncidentRef& incident, std::size_t) {
           return StoredTransitIncident::initWithIncident(incident);
         });
-        return Platform::current().archive().archivedDataWithRootObject(BoxedArray::of(stored), true).bytes;
+        auto archived = Platform::current().archive().archivedDataWithRootObject(BoxedArray::of(stored), true);
+        return archived ? std::optional(std::move(*archived)) : std::nullopt;
       });
 }
 

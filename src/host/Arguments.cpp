@@ -9,7 +9,7 @@
 
 #include "desktop/gtfs/FeedConfiguration.h"
 #include "platform/foundation/Date.h"
-#include "platform/ui/TextStyles.h"
+#include "protocol/Names.h"
 
 namespace nimbo {
 
@@ -109,7 +109,7 @@ std::string checkScale(const std::string& text) {
 }
 
 std::string checkTextSize(const std::string& text) {
-  return contentSizeCategoryFromName(text)
+  return protocol::named<ContentSizeCategory>(text)
              ? ""
              : inQuotes(text) + " is no text size from extraSmall to accessibilityExtraExtraExtraLarge";
 }

@@ -26,10 +26,10 @@ void tellGoneLines(const CommandContext& context, const std::vector<TransitLineR
 }
 
 std::vector<TransitLineRef> favoriteLines(HostPlatform& platform) {
-  Favorites favorites;
-  require(platform->favoritesEditor().list(favorites));
+  const auto favorites = platform->favoritesEditor().list();
+  require(favorites.error());
   std::vector<TransitLineRef> lines;
-  for (const FavoriteRef& favorite : favorites)
+  for (const FavoriteRef& favorite : *favorites)
     if (const auto* line = dynamic_cast<const FavoriteTransitLine*>(favorite.get()); line && line->transitLine())
       lines.push_back(line->transitLine());
   return lines;

@@ -7,8 +7,6 @@
 
 namespace nimbo {
 
-using nlohmann::json;
-
 namespace {
 
 std::vector<std::string> arguments(const CommandContext& context, const WidgetPresentation& presentation) {
@@ -23,47 +21,48 @@ double WidgetPresentation::rowHeightForTextSize(ContentSizeCategory category) {
   return kDefaultRowHeight * std::max(textScaleForCategory(category), 1.0);
 }
 
-json displayModesOf(const WidgetPresentation& presentation) {
-  return {{"compact", {presentation.width, presentation.compactHeight}},
-          {"expanded", {presentation.width, presentation.expandedHeight}}};
+protocol::DisplayModes displayModesOf(const WidgetPresentation& presentation) {
+  return {{presentation.width, presentation.compactHeight}, {presentation.width, presentation.expandedHeight}};
 }
 
-json initializationOf(const WidgetPresentation& presentation) {
+protocol::InitializeParams initializationOf(const WidgetPresentation& presentation) {
   const std::string application(kHostApplicationIdentifier);
-  json params = {{"textSize", presentation.textSize},
-                 {"scale", presentation.scale},
-                 {"appearance", presentation.appearance},
-                 {"displayModes", displayModesOf(presentation)},
-                 {"activeDisplayMode", "compact"},
-                 {"bundle",
-                  {{"kind", "extension"},
-                   {"identifier", application + ".TransitWidget"},
-                   {"containing", {{"kind", "application"}, {"identifier", application}}}}}};
-  if (presentation.locale) params["locale"] = *presentation.locale;
-  return params;
+  return {
+      .locale = presentation.locale,
+      .textSize = presentation.textSize,
+      .scale = presentation.scale,
+      .appearance = presentation.appearance,
+      .displayModes = displayModesOf(presentation),
+      .activeDisplayMode = WidgetDisplayMode::Compact,
+      .bundle = protocol::Bundle{.kind = std::string(protocol::Bundle::kExtension),
+                                 .identifier = application + ".TransitWidget",
+                                 .containing = std::make_shared<protocol::Bundle>(protocol::Bundle{
+                                     .kind = std::string(protocol::Bundle::kApplication), .identifier = application})}};
 }
 
-std::optional<std::string> failureOfUpdate(const json& answer) {
-  if (answer.value("updateResult", "") != "failed") return std::nullopt;
-  return answer.value("reason", "the update failed");
+std::optional<std::string> failureOfUpdate(const protocol::UpdateResult& answer) {
+  if (answer.updateResult != WidgetUpdateResult::Failed) return std::nullopt;
+  return answer.reason.value_or("the update failed");
 }
 
 OnScreenWidget::OnScreenWidget(const CommandContext& context, const WidgetPresentation& presentation)
     : _client(context.runLoop, arguments(context, presentation)) {
   _client.setNoticeHandler(context.tell);
-  _client.call("initialize", initializationOf(presentation));
-  for (const char* step : {"loadView", "viewWillAppear", "viewDidAppear"}) _client.call(step);
+  _client.call(protocol::kInitialize, initializationOf(presentation));
+  for (const auto& step : {protocol::kLoadView, protocol::kViewWillAppear, protocol::kViewDidAppear})
+    _client.call(step);
 }
 
-std::optional<std::string> OnScreenWidget::update() { return failureOfUpdate(_client.call("performUpdate")); }
+std::optional<std::string> OnScreenWidget::update() { return failureOfUpdate(_client.call(protocol::kPerformUpdate)); }
 
 void OnScreenWidget::expand() {
-  if (_client.call("snapshot").value("largestAvailableDisplayMode", "") == "expanded")
-    _client.call("setActiveDisplayMode", {{"mode", "expanded"}});
+  if (_client.call(protocol::kSnapshot).largestAvailableDisplayMode == WidgetDisplayMode::Expanded)
+    _client.call(protocol::kSetActiveDisplayMode, {.mode = WidgetDisplayMode::Expanded});
 }
 
 void OnScreenWidget::close() {
-  for (const char* step : {"viewWillDisappear", "viewDidDisappear", "shutdown"}) _client.call(step);
+  for (const auto& step : {protocol::kViewWillDisappear, protocol::kViewDidDisappear, protocol::kShutdown})
+    _client.call(step);
 }
 
 }  // namespace nimbo

@@ -1,23 +1,22 @@
 #pragma once
 
-#include <nlohmann/json.hpp>
 #include <optional>
 #include <string>
 
 #include "host/Command.h"
 #include "host/WidgetClient.h"
-#include "platform/ui/Environment.h"
+#include "platform/foundation/Presentation.h"
 
 namespace nimbo {
 
-/// How a host shows the widget. The names are those of docs/protocol.md.
+/// How a host shows the widget.
 struct WidgetPresentation {
   double width = kDefaultWidth;                   ///< points
   double compactHeight = kDefaultRowHeight;       ///< points
   double expandedHeight = 4 * kDefaultRowHeight;  ///< points: room for four rows
   double scale = 1;
-  std::string textSize = "large";
-  std::string appearance = "light";
+  ContentSizeCategory textSize = ContentSizeCategory::large;
+  Appearance appearance = Appearance::light;
   std::optional<std::string> locale;       ///< absent: of the environment
   std::optional<std::string> virtualTime;  ///< ISO date at which the widget's time stands still
 
@@ -29,14 +28,14 @@ struct WidgetPresentation {
   bool operator==(const WidgetPresentation&) const = default;
 };
 
-/// `displayModes` of docs/protocol.md.
-nlohmann::json displayModesOf(const WidgetPresentation& presentation);
+/// The room that it gives each mode.
+protocol::DisplayModes displayModesOf(const WidgetPresentation& presentation);
 
-/// The parameters of `initialize` that present the widget so, in the compact mode.
-nlohmann::json initializationOf(const WidgetPresentation& presentation);
+/// What presents the widget so, in the compact mode.
+protocol::InitializeParams initializationOf(const WidgetPresentation& presentation);
 
-/// Why an update failed, from the answer to `performUpdate`; absent when it did not.
-std::optional<std::string> failureOfUpdate(const nlohmann::json& answer);
+/// Why an update failed; absent when it did not.
+std::optional<std::string> failureOfUpdate(const protocol::UpdateResult& answer);
 
 /// A widget process that is on the screen as long as this lives: it appears on construction, disappears, and so saves
 /// its rows, on `close`. Operations throw WidgetClientFailure.
@@ -48,8 +47,8 @@ class OnScreenWidget {
   std::optional<std::string> update();
   /// Switches to the expanded mode where the widget offers it; else the compact row says it all.
   void expand();
-  nlohmann::json snapshot() { return _client.call("snapshot"); }
-  void render(const std::string& path) { _client.call("render", {{"path", path}}); }
+  protocol::Snapshot snapshot() { return _client.call(protocol::kSnapshot); }
+  void render(const std::string& path) { _client.call(protocol::kRender, {.path = path}); }
   void close();
 
  private:

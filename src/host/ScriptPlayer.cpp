@@ -28,7 +28,7 @@ bool hasMethod(const json& message, const char* method) {
 }  // namespace
 
 ScriptPlayer::ScriptPlayer(WidgetClient& client, std::ostream& output) : _client(client), _output(output) {
-  client.setOpenHandler([](std::string_view, const json&) { return true; });
+  client.setOpenHandler([](const WidgetClient::Opening&) { return true; });
   client.connection().setLineObserver([this](std::string_view line) {
     _output << printableJSON(line) << "\n" << std::flush;
     const json message = json::parse(line, nullptr, false);
@@ -47,12 +47,12 @@ void ScriptPlayer::play(std::istream& script) {
     const std::size_t begin = line.find_first_not_of(" \t\r");
     if (begin == std::string::npos || line[begin] == '#') continue;
     const json message = messageOf(line);
-    const bool isUpdate = hasMethod(message, "performUpdate");
+    const bool isUpdate = hasMethod(message, protocol::kPerformUpdate.name);
     if (!(isUpdate && lastWasUpdate)) waitForAnswers();
     if (isAnswered(message)) ++_waitingFor;
     lastWasUpdate = isUpdate;
     _client.connection().sendLine(line);
-    if (!hasMethod(message, "shutdown")) continue;
+    if (!hasMethod(message, protocol::kShutdown.name)) continue;
     waitForAnswers();
     return;
   }

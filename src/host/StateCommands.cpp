@@ -12,8 +12,6 @@
 #include "host/HostPlatform.h"
 #include "host/TerminalText.h"
 #include "host/WidgetClient.h"
-#include "protocol/Coding.h"
-#include "protocol/Methods.h"
 
 namespace nimbo {
 
@@ -108,9 +106,9 @@ int runSettingsUnset(const CommandContext& context, const std::string& key) {
 
 int runAnalytics(const CommandContext& context, bool json) {
   HostPlatform platform(context);
-  std::vector<AnalyticsEntry> entries;
-  require(platform->analytics().list(entries));
-  for (const AnalyticsEntry& entry : entries) {
+  const auto entries = platform->analytics().list();
+  require(entries.error());
+  for (const AnalyticsEntry& entry : *entries) {
     if (json) {
       std::cout << printableJSON(jsonOfAnalyticsEntry(entry)) << "\n";
       continue;
@@ -136,8 +134,7 @@ int runDecode(const CommandContext& context, const std::string& file) {
   if (input.bad()) throw CommandFailure("cannot read " + file + ": " + std::strerror(errno));
   WidgetClient client(context.runLoop, context.widgetArguments);
   try {
-    const auto answer = client.call(protocol::kDecode.name, protocol::write(protocol::DecodeParams{base64(bytes)}));
-    std::cout << printableJSON(protocol::read<protocol::Handoff>(answer).text) << "\n";
+    std::cout << printableJSON(client.call(protocol::kDecode, {base64(bytes)}).text) << "\n";
   } catch (const WidgetRefusal& refusal) {
     throw CommandFailure(file + ": " + refusal.error.message);
   }

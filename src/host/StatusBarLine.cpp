@@ -1,5 +1,8 @@
 #include "host/StatusBarLine.h"
 
+#include <algorithm>
+#include <nlohmann/json.hpp>
+
 #include "host/GoneLines.h"
 #include "host/TerminalText.h"
 
@@ -11,11 +14,6 @@ namespace {
 
 constexpr const char* kErrorWord = "error";
 
-std::string memberText(const json& object, const char* key) {
-  const json text = object.value(key, json());
-  return text.is_string() ? text.get<std::string>() : std::string();
-}
-
 /// A line without a line end, which a bar has no room for.
 std::string inOneLine(std::string text) {
   std::replace(text.begin(), text.end(), '\n', ' ');
@@ -26,52 +24,62 @@ std::string lineOf(const std::string& text, const std::string& word, const std::
   return printableJSON(json{{"text", inOneLine(text)}, {"alt", word}, {"class", word}, {"tooltip", tooltip}}.dump());
 }
 
-bool isFetched(const json& snapshot) { return snapshot.at("result").is_string(); }
+const std::string& titleOf(const protocol::TransitItem& item) {
+  static const std::string kNone;
+  return item.primaryText ? *item.primaryText : kNone;
+}
+const std::string& titleOf(const protocol::SummaryItem& item) { return item.primaryText; }
+
+std::string secondaryTextOf(const protocol::TransitItem& item) { return item.secondaryText.value_or(""); }
+std::string secondaryTextOf(const protocol::SummaryItem&) { return {}; }
 
 /// Tells the rows apart by what they open: incidents an activity, good service and no favourites a URL, an error
 /// nothing.
-std::string classOf(const json& snapshot) {
-  if (snapshot.at("result") == "error") return kErrorWord;
-  const json& row = snapshot.at("listItem").at("summaryItem");
-  if (row.contains("artworks")) return "advisories";
-  const json& openable = row.at("openable");
-  if (!openable.is_object()) return isFetched(snapshot) ? "advisories" : kErrorWord;
-  if (!openable.contains("url")) return "advisories";
-  return row.at("artwork").is_object() ? "good" : "none";
+std::string wordOf(const protocol::TransitItem& item, bool isFetched) {
+  if (!item.openable) return isFetched ? "advisories" : kErrorWord;
+  if (!item.openable->url) return "advisories";
+  return item.artwork ? "good" : "none";
 }
+std::string wordOf(const protocol::SummaryItem&, bool) { return "advisories"; }
 
 /// "[12] " for a row with the shield of a line.
-std::string shieldOf(const json& row) {
-  const json artwork = row.value("artwork", json());
-  if (!artwork.is_object()) return {};
-  const json shield = artwork.value("shield", json());
-  const std::string text = shield.is_object() ? memberText(shield, "text") : std::string();
+std::string shieldOf(const protocol::TransitItem& item) {
+  if (!item.artwork || !item.artwork->shield) return {};
+  const std::string text = item.artwork->shield->text.value_or("");
   return text.empty() ? text : "[" + text + "] ";
 }
+std::string shieldOf(const protocol::SummaryItem&) { return {}; }
 
-std::string tooltipOf(const json& snapshot) {
-  const json& listItem = snapshot.at("listItem");
-  json rows = listItem.at("expandedItems");
-  if (rows.empty()) rows.push_back(listItem.at("summaryItem"));
+std::string headingOf(const protocol::Item& row) {
+  return std::visit([](const auto& item) { return markupText(shieldOf(item) + titleOf(item)); }, row);
+}
+
+std::string tooltipOf(const protocol::Snapshot& snapshot) {
+  std::vector<protocol::Item> rows = snapshot.listItem.expandedItems;
+  if (rows.empty() && snapshot.listItem.summaryItem) rows.push_back(*snapshot.listItem.summaryItem);
   std::string tooltip;
   const auto addLine = [&](const std::string& markup) { tooltip += (tooltip.empty() ? "" : "\n") + markup; };
-  for (const json& row : rows) {
-    addLine("<b>" + markupText(shieldOf(row) + memberText(row, "primaryText")) + "</b>");
-    if (const std::string text = memberText(row, "secondaryText"); !text.empty()) addLine(markupText(text));
+  for (const protocol::Item& row : rows) {
+    addLine("<b>" + headingOf(row) + "</b>");
+    const std::string text = std::visit([](const auto& item) { return secondaryTextOf(item); }, row);
+    if (!text.empty()) addLine(markupText(text));
   }
-  if (const json error = snapshot.value("error", json()); error.is_object())
-    addLine(markupText(memberText(error, "reason")));
-  for (const json& line : snapshot.at("goneLines")) addLine("<i>" + markupText(goneLineText(line)) + "</i>");
+  if (snapshot.error) addLine(markupText(snapshot.error->reason));
+  for (const std::string& line : snapshot.goneLines) addLine("<i>" + markupText(goneLineText(line)) + "</i>");
   return tooltip;
 }
 
 }  // namespace
 
-std::optional<std::string> statusBarLine(const json& snapshot) {
-  const std::string word = classOf(snapshot);
-  if (!isFetched(snapshot) && word != "good" && word != "advisories") return std::nullopt;
-  const json& row = snapshot.at("listItem").at("summaryItem");
-  return lineOf(markupText(shieldOf(row) + memberText(row, "primaryText")), word, tooltipOf(snapshot));
+std::optional<std::string> statusBarLine(const protocol::Snapshot& snapshot) {
+  const auto& row = snapshot.listItem.summaryItem;
+  if (!row) return std::nullopt;
+  const bool isFetched = snapshot.result.has_value();
+  const bool hasFailed = snapshot.result == protocol::FetchResult::error;
+  const std::string word =
+      hasFailed ? kErrorWord : std::visit([&](const auto& item) { return wordOf(item, isFetched); }, *row);
+  if (!isFetched && word != "good" && word != "advisories") return std::nullopt;
+  return lineOf(headingOf(*row), word, tooltipOf(snapshot));
 }
 
 std::string statusBarErrorLine(const std::string& reason) {

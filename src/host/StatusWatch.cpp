@@ -15,7 +15,7 @@ StatusWatch::~StatusWatch() {
   for (auto* timer : {&_restart, &_update}) cancel(*timer);
   if (!_widget) return;
   // The process does what it was asked before it finds its input closed.
-  for (const char* step : {"viewWillDisappear", "viewDidDisappear"}) _widget->ask(step);
+  for (const auto& step : {protocol::kViewWillDisappear, protocol::kViewDidDisappear}) _widget->ask(step);
 }
 
 void StatusWatch::cancel(std::shared_ptr<Timer>& timer) {
@@ -31,28 +31,28 @@ void StatusWatch::start() {
     return restartAfter(failure.what());
   }
   WidgetClient& client = _widget->client();
-  client.connection().setHandler("frame", [this](const json&, const JSONRPCResponder&) { look(); });
+  client.connection().setHandler(protocol::kFrame.name, [this](const json&, const JSONRPCResponder&) { look(); });
   client.setNoticeHandler(_context.tell);
-  _widget->ask("initialize", initializationOf(_presentation));
-  for (const char* step : {"loadView", "viewWillAppear", "viewDidAppear"}) _widget->ask(step);
+  _widget->ask(protocol::kInitialize, initializationOf(_presentation));
+  for (const auto& step : {protocol::kLoadView, protocol::kViewWillAppear, protocol::kViewDidAppear})
+    _widget->ask(step);
   update();
   look();
 }
 
 void StatusWatch::update() {
-  _widget->ask("performUpdate", json::object(), [this](const json&) { look(); });
+  _widget->ask(protocol::kPerformUpdate, {}, [this](const auto&) { look(); });
 }
 
 void StatusWatch::look() {
-  _widget->ask("snapshot", json::object(), [this](const json& snapshot) { showSnapshot(snapshot); });
+  _widget->ask(protocol::kSnapshot, {}, [this](const auto& snapshot) { showSnapshot(snapshot); });
 }
 
-void StatusWatch::showSnapshot(const json& snapshot) {
+void StatusWatch::showSnapshot(const protocol::Snapshot& snapshot) {
   if (const auto line = statusBarLine(snapshot)) showLine(*line);
-  const json& result = snapshot.at("result");
-  if (result.is_null()) return;
+  if (!snapshot.result) return;
   _restarts.reset();
-  if (result == "success") {
+  if (snapshot.result == protocol::FetchResult::success) {
     _updates.reset();
     cancel(_update);
   } else if (!_update) {

@@ -32,7 +32,7 @@ class StatusWatch {
   void start();
   void update();
   void look();
-  void showSnapshot(const nlohmann::json& snapshot);
+  void showSnapshot(const protocol::Snapshot& snapshot);
   void showLine(const std::string& line);
   /// Another process follows later.
   void restartAfter(const std::string& failure);

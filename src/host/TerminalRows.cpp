@@ -14,8 +14,6 @@
 
 namespace nimbo {
 
-using nlohmann::json;
-
 namespace {
 
 constexpr const char* kBold = "1";
@@ -25,10 +23,7 @@ std::string styled(const std::string& text, const std::string& attributes, const
   return style.colors && !attributes.empty() && !text.empty() ? "\x1b[" + attributes + "m" + text + "\x1b[0m" : text;
 }
 
-std::string textOf(const json& object, const char* key) {
-  const auto found = object.find(key);
-  return found != object.end() && found->is_string() ? printableText(found->get<std::string>()) : std::string();
-}
+std::string textOf(const std::optional<std::string>& text) { return text ? printableText(*text) : std::string(); }
 
 std::string colorCode(const Color& color, int plane) {
   const auto part = [](double value) { return std::to_string(std::lround(value * 255)); };
@@ -36,13 +31,12 @@ std::string colorCode(const Color& color, int plane) {
 }
 
 /// A shield as " 12 " on its colour, or as [12]; a symbol by the name of its mode.
-std::string shieldText(const json& shield, bool dimmed, const TerminalStyle& style) {
-  if (!shield.is_object()) return {};
-  std::string text = textOf(shield, "text");
-  if (text.empty()) text = textOf(shield, "accessibilityText");
+std::string shieldText(const protocol::Shield& shield, bool dimmed, const TerminalStyle& style) {
+  std::string text = textOf(shield.text);
+  if (text.empty()) text = textOf(shield.accessibilityText);
   if (text.empty()) return {};
   if (!style.colors) return "[" + text + "]";
-  const auto color = colorFromHexText(textOf(shield, "color"));
+  const auto color = colorFromHexText(textOf(shield.color));
   if (!color || dimmed) return styled("[" + text + "]", dimmed ? kFaint : kBold, style);
   constexpr Color kBlack{0, 0, 0, 1}, kWhite{1, 1, 1, 1};
   const Color& ink = contrastRatio(*color, kWhite) >= contrastRatio(*color, kBlack) ? kWhite : kBlack;
@@ -56,21 +50,50 @@ std::string imageText(const std::string& name) {
   return "•";
 }
 
-std::string artworkText(const json& row, const TerminalStyle& style) {
-  const json artwork = row.value("artwork", json());
-  if (!artwork.is_object() || row.value("artworkHidden", false)) return {};
-  const bool dimmed = artwork.value("alpha", 1.0) < 1;
-  if (artwork.contains("image")) return styled(imageText(textOf(artwork, "image")), dimmed ? kFaint : kBold, style);
-  return shieldText(artwork.value("shield", json()), dimmed, style);
+std::string artworkText(const protocol::TransitItem& item, const TerminalStyle& style) {
+  const auto& artwork = item.artwork;
+  if (!artwork || item.artworkHidden) return {};
+  const bool dimmed = artwork->alpha < 1;
+  if (artwork->image) return styled(imageText(textOf(artwork->image)), dimmed ? kFaint : kBold, style);
+  return artwork->shield ? shieldText(*artwork->shield, dimmed, style) : std::string();
 }
 
-std::string shieldsText(const json& row, const TerminalStyle& style) {
+std::string shieldsText(const std::vector<protocol::Shield>& shields, const TerminalStyle& style) {
   std::string text;
-  for (const json& shield : row.value("artworks", json::array())) {
+  for (const protocol::Shield& shield : shields) {
     const std::string one = shieldText(shield, false, style);
     if (!one.empty()) text += (text.empty() ? "" : " ") + one;
   }
   return text;
+}
+
+constexpr int kIndent = 2;
+
+/// Folded, with a sign at the end of the first line.
+std::string titleText(const std::string& title, const std::string& artwork, const TerminalStyle& style) {
+  const int room = style.columns - (artwork.empty() ? 0 : terminalWidth(artwork) + 1);
+  std::string text;
+  for (const std::string& line : foldedText(title, room)) {
+    const bool first = text.empty();
+    text += styled(line, kBold, style);
+    if (first && !artwork.empty())
+      text += std::string(static_cast<std::size_t>(room - terminalWidth(line) + 1), ' ') + artwork;
+    text += "\n";
+  }
+  return text;
+}
+
+std::string textOfItem(const protocol::TransitItem& item, const TerminalStyle& style) {
+  std::string text = titleText(textOf(item.primaryText), artworkText(item, style), style);
+  for (const std::string& line : foldedText(textOf(item.secondaryText), style.columns - kIndent))
+    text += std::string(kIndent, ' ') + line + "\n";
+  return text;
+}
+
+std::string textOfItem(const protocol::SummaryItem& item, const TerminalStyle& style) {
+  const std::string text = titleText(textOf(item.primaryText), "", style);
+  const std::string shields = shieldsText(item.artworks, style);
+  return shields.empty() ? text : text + std::string(kIndent, ' ') + shields + "\n";
 }
 
 }  // namespace
@@ -90,25 +113,10 @@ TerminalStyle TerminalStyle::ofStandardOutput() {
   return style;
 }
 
-std::string rowsAsText(const json& snapshot, const TerminalStyle& style) {
-  constexpr int kIndent = 2;
+std::string rowsAsText(const protocol::Snapshot& snapshot, const TerminalStyle& style) {
   std::string text;
-  for (const json& row : snapshot.value("rows", json::array())) {
-    const std::string artwork = artworkText(row, style);
-    const int room = style.columns - (artwork.empty() ? 0 : terminalWidth(artwork) + 1);
-    bool first = true;
-    for (const std::string& line : foldedText(textOf(row, "primaryText"), room)) {
-      text += styled(line, kBold, style);
-      if (first && !artwork.empty())
-        text += std::string(static_cast<std::size_t>(room - terminalWidth(line) + 1), ' ') + artwork;
-      text += "\n";
-      first = false;
-    }
-    for (const std::string& line : foldedText(textOf(row, "secondaryText"), style.columns - kIndent))
-      text += std::string(kIndent, ' ') + line + "\n";
-    const std::string shields = shieldsText(row, style);
-    if (!shields.empty()) text += std::string(kIndent, ' ') + shields + "\n";
-  }
+  for (const protocol::Row& row : snapshot.rows)
+    if (row.item) text += std::visit([&](const auto& item) { return textOfItem(item, style); }, *row.item);
   return text;
 }
 

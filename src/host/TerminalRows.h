@@ -1,7 +1,8 @@
 #pragma once
 
-#include <nlohmann/json.hpp>
 #include <string>
+
+#include "protocol/Snapshot.h"
 
 namespace nimbo {
 
@@ -16,6 +17,6 @@ struct TerminalStyle {
 };
 
 /// The rows of a snapshot as lines of text: title and shield on one line, the secondary text below.
-std::string rowsAsText(const nlohmann::json& snapshot, const TerminalStyle& style);
+std::string rowsAsText(const protocol::Snapshot& snapshot, const TerminalStyle& style);
 
 }  // namespace nimbo

@@ -16,7 +16,7 @@ WatchedWidget::WatchedWidget(GLibRunLoop& runLoop, const std::vector<std::string
     : _runLoop(runLoop), _patience(patience), _failed(std::move(failed)), _client(runLoop, arguments) {
   JSONRPCConnection& connection = _client.connection();
   connection.setLineObserver([this](std::string_view) { countLine(); });
-  connection.setMalformedHandler([this](const std::string& problem) { fail("it speaks nonsense: " + problem); });
+  _client.setNonsenseHandler([this](const std::string& problem) { fail("it speaks nonsense: " + problem); });
   connection.setClosedHandler([this] { fail("it ended"); });
 }
 
@@ -45,22 +45,9 @@ void WatchedWidget::countLine() {
   if (++_lines == kLinesPerSecond) fail("it does not stop talking");
 }
 
-void WatchedWidget::ask(std::string_view method, const json& params, Completion completion) {
-  call(method, params, [this, name = std::string(method), completion](const json& result, const auto& error) {
-    if (error && error->code == JSONRPCError::kConnectionClosed) return;
-    if (error) return fail("it refuses \"" + name + "\": " + error->message);
-    if (!completion) return;
-    try {
-      completion(result);
-    } catch (const json::exception& malformed) {
-      fail("it answers \"" + name + "\" with nonsense: " + malformed.what());
-    }
-  });
-}
-
-void WatchedWidget::call(std::string_view method, const json& params, JSONRPCConnection::Completion completion) {
+void WatchedWidget::send(const char* method, const json& params, JSONRPCConnection::Completion completion) {
   std::shared_ptr<Timer> timer;
-  if (method != "performUpdate") {
+  if (std::string_view(method) != protocol::kPerformUpdate.name) {
     timer = _runLoop.scheduleTimer(
         _patience, false, [this, name = std::string(method)](Timer&) { fail("it does not answer \"" + name + "\""); });
     _waiting.push_back(timer);

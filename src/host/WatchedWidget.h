@@ -3,7 +3,7 @@
 #include <functional>
 #include <memory>
 #include <string>
-#include <string_view>
+#include <type_traits>
 #include <vector>
 
 #include "host/WidgetClient.h"
@@ -14,7 +14,6 @@ namespace nimbo {
 /// is killed, and the host hears of it. Main thread only.
 class WatchedWidget {
  public:
-  using Completion = std::function<void(const nlohmann::json& result)>;
   using FailureHandler = std::function<void(const std::string& reason)>;
 
   /// Starts the widget with these arguments. `patience` is the time, in seconds, in which it answers anything but an
@@ -25,15 +24,41 @@ class WatchedWidget {
   ~WatchedWidget();
 
   WidgetClient& client() { return _client; }
-  /// A request that a sound process answers with a result. What `completion` throws at a malformed one is a failure.
-  void ask(std::string_view method, const nlohmann::json& params = nlohmann::json::object(),
-           Completion completion = nullptr);
-  /// A request that may be answered with an error.
-  void call(std::string_view method, const nlohmann::json& params, JSONRPCConnection::Completion completion);
+  /// A request that a sound process answers with a result.
+  template <class Params, class Result>
+  void ask(const protocol::Method<Params, Result>& method, const Params& params = {},
+           std::function<void(const std::type_identity_t<Result>& result)> completion = nullptr) {
+    call(method, params,
+         [this, name = method.name, completion = std::move(completion)](const std::optional<Result>& result,
+                                                                        const JSONRPCError& error) {
+           if (result && completion) completion(*result);
+           if (!result && error.code != JSONRPCError::kConnectionClosed)
+             fail("it refuses \"" + std::string(name) + "\": " + error.message);
+         });
+  }
+  /// A request that may be answered with an error; the error counts when there is no result.
+  template <class Params, class Result>
+  void call(const protocol::Method<Params, Result>& method, const Params& params,
+            std::function<void(const std::optional<std::type_identity_t<Result>>& result, const JSONRPCError& error)>
+                completion) {
+    send(method.name, protocol::write(params),
+         [this, name = method.name, completion = std::move(completion)](const nlohmann::json& json,
+                                                                        const std::optional<JSONRPCError>& error) {
+           std::optional<Result> result;
+           try {
+             if (!error) result = protocol::read<Result>(json);
+           } catch (const protocol::Malformed& malformed) {
+             return fail(nonsense(name, malformed));
+           }
+           completion(result, error.value_or(JSONRPCError()));
+         });
+  }
   /// Gives the process up for what its host finds wrong with it.
   void fail(const std::string& reason);
 
  private:
+  /// Sends a request, and fails when the answer does not come in time.
+  void send(const char* method, const nlohmann::json& params, JSONRPCConnection::Completion completion);
   void countLine();
 
   GLibRunLoop& _runLoop;

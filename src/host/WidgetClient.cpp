@@ -77,12 +77,13 @@ WidgetClient::WidgetClient(GLibRunLoop& runLoop, const std::vector<std::string>&
   fcntl(_output.get(), F_SETFL, fcntl(_output.get(), F_GETFL) | O_NONBLOCK);
   _connection = std::make_unique<JSONRPCConnection>(_runLoop, _input.get(), _output.get());
   _connection->setClosedHandler([this] { _running = false; });
-  handleOpening("openURL");
-  handleOpening("openUserActivity");
-  for (const char* heard : {"preferredContentSizeDidChange", "largestAvailableDisplayModeDidChange", "log"})
+  handleOpening(protocol::kOpenURL);
+  handleOpening(protocol::kOpenUserActivity);
+  for (const char* heard : {protocol::kPreferredContentSizeDidChange.name,
+                            protocol::kLargestAvailableDisplayModeDidChange.name, protocol::kLog.name})
     _connection->setHandler(heard, [](const json&, const JSONRPCResponder&) {});
-  _connection->setHandler("notice", [this](const json& params, const JSONRPCResponder&) {
-    const std::string message = params.value("message", "");
+  _connection->setHandler(protocol::kNotice.name, [this](const json& params, const JSONRPCResponder&) {
+    const std::string message = protocol::read<protocol::NoticeParams>(params).message;
     if (_noticeHandler)
       _noticeHandler(message);
     else
@@ -91,10 +92,22 @@ WidgetClient::WidgetClient(GLibRunLoop& runLoop, const std::vector<std::string>&
   _connection->start();
 }
 
-void WidgetClient::handleOpening(const char* method) {
-  _connection->setHandler(method, [this, method](const json& params, const JSONRPCResponder& responder) {
-    responder.answer({{"opened", _openHandler && _openHandler(method, params)}});
+template <class Params>
+void WidgetClient::handleOpening(const protocol::Method<Params, protocol::Opened>& method) {
+  _connection->setHandler(method.name, [this](const json& params, const JSONRPCResponder& responder) {
+    try {
+      const Opening opening = protocol::read<Params>(params);
+      responder.answer(protocol::write(protocol::Opened{_openHandler && _openHandler(opening)}));
+    } catch (const protocol::Malformed& malformed) {
+      if (!_nonsenseHandler) throw;
+      _nonsenseHandler(malformed.what());
+    }
   });
+}
+
+void WidgetClient::setNonsenseHandler(std::function<void(const std::string&)> handler) {
+  _connection->setMalformedHandler(handler);
+  _nonsenseHandler = std::move(handler);
 }
 
 void WidgetClient::kill() {

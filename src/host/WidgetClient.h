@@ -9,11 +9,14 @@
 #include <optional>
 #include <string>
 #include <string_view>
+#include <variant>
 #include <vector>
 
 #include "desktop/raii/FileDescriptor.h"
 #include "desktop/rpc/JSONRPCConnection.h"
 #include "desktop/system/GLibRunLoop.h"
+#include "protocol/Coding.h"
+#include "protocol/Methods.h"
 
 namespace nimbo {
 
@@ -30,11 +33,18 @@ struct WidgetRefusal : WidgetClientFailure {
   JSONRPCError error;
 };
 
+/// What to say of an answer that is none.
+inline std::string nonsense(std::string_view method, const protocol::Malformed& malformed) {
+  return "it answers \"" + std::string(method) + "\" with nonsense: " + malformed.what();
+}
+
 /// A widget process of one's own: starts it, speaks its protocol, ends it. Main thread only.
 class WidgetClient {
  public:
-  /// Hears what a tapped row wants to open (method and parameters as in docs/protocol.md); answers whether it opened.
-  using OpenHandler = std::function<bool(std::string_view method, const nlohmann::json& params)>;
+  /// What a tapped row wants to open.
+  using Opening = std::variant<protocol::OpenURLParams, protocol::OpenUserActivityParams>;
+  /// Hears of one; answers whether it opened.
+  using OpenHandler = std::function<bool(const Opening& opening)>;
   /// Hears what the user must be told.
   using NoticeHandler = std::function<void(const std::string& message)>;
 
@@ -48,6 +58,8 @@ class WidgetClient {
   void setOpenHandler(OpenHandler handler) { _openHandler = std::move(handler); }
   /// Until this is called, notices go to standard error.
   void setNoticeHandler(NoticeHandler handler) { _noticeHandler = std::move(handler); }
+  /// Hears of what is no message, or no such one as it says, in place of the widget, which else gets an error.
+  void setNonsenseHandler(std::function<void(const std::string& problem)> handler);
   JSONRPCConnection& connection() { return *_connection; }
   bool isRunning() const { return _running; }
   /// Ends a process that is not to be trusted to end by itself.
@@ -55,7 +67,15 @@ class WidgetClient {
 
   /// Asks and waits for the answer, serving the widget's own requests meanwhile. Throws WidgetClientFailure, for an
   /// error answer WidgetRefusal.
-  nlohmann::json call(std::string_view method, const nlohmann::json& params = nlohmann::json::object());
+  template <class Params, class Result>
+  Result call(const protocol::Method<Params, Result>& method, const Params& params = {}) {
+    const nlohmann::json answer = call(method.name, protocol::write(params));
+    try {
+      return protocol::read<Result>(answer);
+    } catch (const protocol::Malformed& malformed) {
+      throw WidgetClientFailure(nonsense(method.name, malformed));
+    }
+  }
   /// Runs the loop until `done` answers true. Throws WidgetClientFailure when the process ends first, or after
   /// `kPatience` seconds without a word from it.
   void waitUntil(const std::function<bool()>& done);
@@ -66,7 +86,9 @@ class WidgetClient {
   static std::filesystem::path widgetProgram();
 
  private:
-  void handleOpening(const char* method);
+  nlohmann::json call(std::string_view method, const nlohmann::json& params);
+  template <class Params>
+  void handleOpening(const protocol::Method<Params, protocol::Opened>& method);
 
   GLibRunLoop& _runLoop;
   FileDescriptor _input;   // what the widget writes
@@ -76,6 +98,7 @@ class WidgetClient {
   std::unique_ptr<JSONRPCConnection> _connection;
   OpenHandler _openHandler;
   NoticeHandler _noticeHandler;
+  std::function<void(const std::string&)> _nonsenseHandler;
 };
 
 }  // namespace nimbo

@@ -10,14 +10,14 @@
 #include "host/OnScreenWidget.h"
 #include "host/ScriptPlayer.h"
 #include "host/TerminalRows.h"
+#include "protocol/Names.h"
 
 namespace nimbo {
 
 namespace {
 
-void tellGoneLines(const nlohmann::json& snapshot) {
-  for (const nlohmann::json& line : snapshot.value("goneLines", nlohmann::json::array()))
-    printMessage(goneLineText(line));
+void tellGoneLines(const protocol::Snapshot& snapshot) {
+  for (const std::string& line : snapshot.goneLines) printMessage(goneLineText(line));
 }
 
 }  // namespace
@@ -28,9 +28,9 @@ int runStatus(const CommandContext& context, const StatusOptions& options) {
   OnScreenWidget widget(context, presentation);
   const std::optional<std::string> failure = widget.update();
   if (options.expanded) widget.expand();
-  const nlohmann::json snapshot = widget.snapshot();
+  const protocol::Snapshot snapshot = widget.snapshot();
   if (options.json)
-    std::cout << printableJSON(snapshot.dump(2)) << "\n";
+    std::cout << printableJSON(protocol::write(snapshot).dump(2)) << "\n";
   else
     std::cout << rowsAsText(snapshot, TerminalStyle::ofStandardOutput());
   widget.close();
@@ -44,26 +44,26 @@ int runUpdate(const CommandContext& context) {
   client.setNoticeHandler(context.tell);
   // Never on screen, so that no use of the widget is recorded, and without a host's sizes, so that the display mode
   // that was saved stays.
-  for (const char* step : {"initialize", "loadView", "viewWillAppear"}) client.call(step);
+  client.call(protocol::kInitialize);
+  for (const auto& step : {protocol::kLoadView, protocol::kViewWillAppear}) client.call(step);
   // The rows of the last time stay when there are no newer ones.
-  if (const auto failure = failureOfUpdate(client.call("performUpdate"))) throw CommandFailure(*failure);
-  for (const char* step : {"viewWillDisappear", "viewDidDisappear", "shutdown"}) client.call(step);
+  if (const auto failure = failureOfUpdate(client.call(protocol::kPerformUpdate))) throw CommandFailure(*failure);
+  for (const auto& step : {protocol::kViewWillDisappear, protocol::kViewDidDisappear, protocol::kShutdown})
+    client.call(step);
   return kExitSuccess;
 }
 
 int runRender(const CommandContext& context, const RenderOptions& options) {
   WidgetPresentation presentation;
-  if (const auto category = contentSizeCategoryFromName(options.textSize)) {
-    presentation.compactHeight = WidgetPresentation::rowHeightForTextSize(*category);
-    presentation.expandedHeight = 4 * presentation.compactHeight;
-  }
+  presentation.textSize = protocol::named<ContentSizeCategory>(options.textSize).value_or(presentation.textSize);
+  presentation.compactHeight = WidgetPresentation::rowHeightForTextSize(presentation.textSize);
+  presentation.expandedHeight = 4 * presentation.compactHeight;
   if (options.size) {
     presentation.width = options.size->width;
     (options.expanded ? presentation.expandedHeight : presentation.compactHeight) = options.size->height;
   }
   presentation.scale = options.scale;
-  presentation.textSize = options.textSize;
-  presentation.appearance = options.dark ? "dark" : "light";
+  presentation.appearance = options.dark ? Appearance::dark : Appearance::light;
   presentation.locale = options.locale;
   presentation.virtualTime = options.now;
   OnScreenWidget widget(context, presentation);

@@ -11,8 +11,8 @@ namespace {
 bool archiveAlike(const ArtworkImageSourceRef& a, const ArtworkImageSourceRef& b) {
   if (!dynamic_cast<const SecureCoding*>(a.get()) || !dynamic_cast<const SecureCoding*>(b.get())) return false;
   KeyedArchive& archive = Platform::current().archive();
-  const auto archived = archive.archivedDataWithRootObject(a, true);
-  return archived.bytes && archived.bytes == archive.archivedDataWithRootObject(b, true).bytes;
+  const auto first = archive.archivedDataWithRootObject(a, true), second = archive.archivedDataWithRootObject(b, true);
+  return first && second && *first == *second;
 }
 
 }  // namespace

@@ -10,6 +10,7 @@
 #include "handoff/NimboActivity.h"
 #include "platform/wire/StoredTransitIncident.h"
 #include "platform/wire/StoredTransitLineItem.h"
+#include "process/Snapshot.h"
 #include "widget/NBTransitIncidentViewControllerState.h"
 
 namespace nimbo {
@@ -66,21 +67,6 @@ json jsonOf(const ObjectRef& object) {
   return descriptionOf(object);
 }
 
-protocol::Shield shieldOf(const TransitArtwork& artwork) {
-  protocol::Shield result;
-  if (const auto& shield = artwork.shieldDataSource()) {
-    result.text = shield->shieldText;
-    result.color = shield->shieldColorString;
-    result.textColor = shield->shieldTextColorString;
-    result.type = shield->shieldType;
-  }
-  if (const auto& icon = artwork.iconDataSource())
-    result.icon = protocol::Icon{icon->iconType, icon->cartoID, icon->defaultTransitType, icon->iconAttributeKey,
-                                 icon->iconAttributeValue};
-  result.accessibilityText = artwork.accessibilityText();
-  return result;
-}
-
 std::optional<protocol::Shield> shieldOf(const TransitArtworkRef& artwork) {
   return artwork ? std::optional(shieldOf(*artwork)) : std::nullopt;
 }
@@ -99,7 +85,6 @@ protocol::Incident incidentOf(const TransitIncident& incident) {
                             .endDate = writableDate(incident.endDate()),
                             .lastUpdated = writableDate(incident.lastUpdated()),
                             .isBlocking = incident.isBlockingIncident(),
-                            .affectedLines = {},
                             .linkURL = incident.linkURL()};
   for (const auto& entity : incident.affectedEntities()) result.affectedLines.push_back(entity->muid());
   return result;
@@ -108,10 +93,8 @@ protocol::Incident incidentOf(const TransitIncident& incident) {
 protocol::Line lineOf(const TransitLineItem& line) {
   protocol::Line result{.muid = line.muid(),
                         .name = line.name(),
-                        .system = {},
                         .artwork = shieldOf(line.artwork()),
-                        .alternateArtwork = shieldOf(line.alternateArtwork()),
-                        .incidents = {}};
+                        .alternateArtwork = shieldOf(line.alternateArtwork())};
   if (const auto& system = line.system()) result.system = protocol::System{system->name(), shieldOf(system->artwork())};
   for (const TransitIncidentRef& incident : line.incidents()) result.incidents.push_back(incidentOf(*incident));
   return result;
@@ -140,12 +123,13 @@ Outcome<ObjectRef> readRecord(std::span<const std::uint8_t> bytes) {
 
 /// A list of StoredTransitIncident, or an NBTransitIncidentViewControllerState.
 Outcome<ObjectRef> readArchive(std::span<const std::uint8_t> bytes) {
-  const CBORKeyedArchive::Opened opened = CBORKeyedArchive::openData(bytes);
-  if (!opened.unarchiver) return opened.error;
+  const auto opened = CBORKeyedArchive::openData(bytes);
+  if (!opened) return opened.error();
+  KeyedUnarchiver& unarchiver = **opened;
   const ArchivableClass& stateClass = NBTransitIncidentViewControllerState::archivedClass();
-  opened.unarchiver->setClass_forClassName(stateClass, kEarlierStateClassName);
-  opened.unarchiver->setDecodingFailurePolicy(DecodingFailurePolicy::setErrorAndReturn);
-  const auto [root, error] = opened.unarchiver->decodeTopLevelObjectOfClasses_forKey(
+  unarchiver.setClass_forClassName(stateClass, kEarlierStateClassName);
+  unarchiver.setDecodingFailurePolicy(DecodingFailurePolicy::setErrorAndReturn);
+  const auto [root, error] = unarchiver.decodeTopLevelObjectOfClasses_forKey(
       {&kArrayClass, &StoredTransitIncident::archivedClass(), &stateClass}, kKeyedArchiveRootObjectKey);
   if (error) return error;
   if (!root) return failure("the archive's root holds neither a list of incidents nor a state with a result");
@@ -167,8 +151,8 @@ Outcome<ObjectRef> readHandoff(std::span<const std::uint8_t> bytes) {
   if (bytes.empty()) return failure("there are no bytes");
   if (isMap(bytes)) return readArchive(bytes);
   if (!isBzip2Stream(bytes)) return readRecord(bytes);
-  const Bzip2Decompressed record = bzip2DecompressedData(bytes, kMaximumRecordSize);
-  return record.bytes ? readRecord(*record.bytes) : record.error;
+  const auto record = bzip2DecompressedData(bytes, kMaximumRecordSize);
+  return record ? readRecord(*record) : record.error();
 }
 
 }  // namespace

@@ -1,6 +1,5 @@
 #include "process/RemoteHost.h"
 
-#include "process/Parameters.h"
 #include "process/Snapshot.h"
 
 namespace nimbo {
@@ -12,14 +11,19 @@ namespace {
 /// Domain of the errors that a host reports for an opening.
 constexpr const char* kHostErrorDomain = "WidgetHostErrorDomain";
 
-bool isOpened(const json& result) { return result.is_object() && result.value("opened", json(false)) == json(true); }
+/// What the host answered to an opening; whatever is no such answer opened nothing.
+protocol::Opened openedOf(const json& result, const std::optional<JSONRPCError>& failure) {
+  try {
+    if (!failure) return protocol::read<protocol::Opened>(result);
+  } catch (const protocol::Malformed&) {
+  }
+  return {};
+}
 
-ErrorRef hostError(const json& result, const std::optional<JSONRPCError>& failure) {
+ErrorRef hostError(const protocol::Opened& answer, const std::optional<JSONRPCError>& failure) {
   if (failure) return Error::errorWithDomain_code_reason(kHostErrorDomain, failure->code, failure->message);
-  if (isOpened(result)) return nullptr;
-  const bool saysWhy = result.is_object() && result.contains("error") && result["error"].is_string();
-  return Error::errorWithDomain_code_reason(kHostErrorDomain, 0,
-                                            saysWhy ? result["error"] : "the host did not open it");
+  if (answer.opened) return nullptr;
+  return Error::errorWithDomain_code_reason(kHostErrorDomain, 0, answer.error.value_or("the host did not open it"));
 }
 
 }  // namespace
@@ -33,18 +37,18 @@ void RemoteHost::setLargestAvailableDisplayMode(WidgetDisplayMode mode) {
   if (_contentObserver) _contentObserver();
   if (mode == _largestAvailableDisplayMode) return;
   _largestAvailableDisplayMode = mode;
-  _connection.notify("largestAvailableDisplayModeDidChange", {{"mode", nameOfDisplayMode(mode)}});
+  notify(_connection, protocol::kLargestAvailableDisplayModeDidChange, {mode});
 }
 
 void RemoteHost::preferredContentSizeDidChange(Size size) {
   if (_preferredSizeObserver) _preferredSizeObserver(size);
-  _connection.notify("preferredContentSizeDidChange", {{"size", {size.width, size.height}}});
+  notify(_connection, protocol::kPreferredContentSizeDidChange, {size});
 }
 
 void RemoteHost::openURL(const URL& url, std::function<void(bool)> completion) {
-  _connection.call("openURL", {{"url", url.absoluteString()}},
+  _connection.call(protocol::kOpenURL.name, protocol::write(protocol::OpenURLParams{url.absoluteString()}),
                    [completion = std::move(completion)](const json& result, const auto& failure) {
-                     completion(!failure && isOpened(result));
+                     completion(openedOf(result, failure).opened);
                    });
 }
 
@@ -55,16 +59,16 @@ std::shared_ptr<UserActivity> RemoteHost::createUserActivity(const std::string& 
 void RemoteHost::openUserActivity(const std::shared_ptr<const UserActivity>& activity,
                                   const ApplicationRecordRef& application, bool requireUnlockPrompt,
                                   Completion completion) {
-  const json params = {{"activityType", activity->activityType()},
-                       {"userInfo", userInfoJSON(activity->userInfo().get())},
-                       {"application", application ? json(application->identifier()) : json()},
-                       {"requireUnlockPrompt", requireUnlockPrompt}};
-  _connection.call("openUserActivity", params,
+  protocol::OpenUserActivityParams params{.activityType = activity->activityType(),
+                                          .userInfo = writtenUserInfo(activity->userInfo().get()),
+                                          .requireUnlockPrompt = requireUnlockPrompt};
+  if (application) params.application = application->identifier();
+  _connection.call(protocol::kOpenUserActivity.name, protocol::write(params),
                    [this, completion = std::move(completion)](const json& result, const auto& failure) {
                      // Such as when there are too many incidents to hand over: the tap would seem to do nothing.
-                     if (failure)
-                       _connection.notify("notice", {{"message", "Cannot open it: " + failure->message + "."}});
-                     if (completion) completion(!failure && isOpened(result), hostError(result, failure));
+                     if (failure) notify(_connection, protocol::kNotice, {"Cannot open it: " + failure->message + "."});
+                     const protocol::Opened answer = openedOf(result, failure);
+                     if (completion) completion(answer.opened, hostError(answer, failure));
                    });
 }
 

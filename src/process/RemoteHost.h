@@ -6,8 +6,16 @@
 #include "desktop/rpc/JSONRPCConnection.h"
 #include "platform/UserActivity.h"
 #include "platform/ui/WidgetHost.h"
+#include "protocol/Coding.h"
+#include "protocol/Methods.h"
 
 namespace nimbo {
+
+/// Tells the host something.
+template <class Params>
+void notify(JSONRPCConnection& connection, const protocol::Notification<Params>& notification, const Params& params) {
+  connection.notify(notification.name, protocol::write(params));
+}
 
 /// The host at the other end of the connection, as the widget sees it: its modes and sizes, and what it opens. Main
 /// thread only; the connection outlives it.
@@ -17,6 +25,9 @@ class RemoteHost final : public WidgetHost, public ActivityLauncher {
 
   void setActiveDisplayMode(WidgetDisplayMode mode) { _activeDisplayMode = mode; }
   void setMaximumSize(WidgetDisplayMode mode, Size size) { _maximumSizes[mode] = size; }
+  void setMaximumSizes(const protocol::DisplayModes& sizes) {
+    _maximumSizes = {{WidgetDisplayMode::Compact, sizes.compact}, {WidgetDisplayMode::Expanded, sizes.expanded}};
+  }
   void setBundleRecord(BundleRecordRef record) { _bundleRecord = std::move(record); }
   /// Hears each new preferred size, before the host does.
   void setPreferredSizeObserver(std::function<void(Size)> observer) { _preferredSizeObserver = std::move(observer); }

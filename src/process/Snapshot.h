@@ -1,16 +1,20 @@
 #pragma once
 
-#include <nlohmann/json.hpp>
+#include <map>
 
 #include "platform/foundation/Boxed.h"
+#include "protocol/Snapshot.h"
 #include "widget/NBTransitIncidentsViewController.h"
 
 namespace nimbo {
 
-/// The table as it stands, in the form of docs/protocol.md. The controller's view is loaded.
-nlohmann::json snapshotJSON(NBTransitIncidentsViewController& controller);
+/// The artwork's description.
+protocol::Shield shieldOf(const TransitArtwork& artwork);
 
-/// A user info as {key: base64 of the bytes}; texts stand as their UTF-8 bytes. Null gives an empty object.
-nlohmann::json userInfoJSON(const BoxedDictionary* userInfo);
+/// The table as it stands, but for the lines that are gone. The controller's view is loaded.
+protocol::Snapshot snapshotOf(NBTransitIncidentsViewController& controller);
+
+/// A user info as {key: Base64 of the bytes}; texts stand as their UTF-8 bytes. Null gives an empty one.
+std::map<std::string, std::string> writtenUserInfo(const BoxedDictionary* userInfo);
 
 }  // namespace nimbo

@@ -1,7 +1,6 @@
 #include "process/WidgetProcess.h"
 
 #include <algorithm>
-#include <map>
 #include <utility>
 
 #include "desktop/drawing/Rendering.h"
@@ -13,7 +12,6 @@
 #include "process/SharedSurface.h"
 #include "process/Snapshot.h"
 #include "protocol/Coding.h"
-#include "protocol/Methods.h"
 
 namespace nimbo {
 
@@ -26,30 +24,22 @@ constexpr int kProtocolVersion = 1;
 /// Room at both sides of the rows, in points.
 constexpr Insets kLayoutMargins{0, 16, 0, 16};
 
-/// Device pixels for each point.
-constexpr double kSmallestScale = 0.25, kLargestScale = 8;
-
-/// The widest span that one `advanceTime` may cross, in seconds: a year.
-constexpr double kLongestAdvance = 366.0 * 86400;
-
-BundleRecordRef bundleRecord(const Parameters& params) {
-  const std::string kind = params.text("kind");
-  const std::string identifier = params.text("identifier");
-  if (kind == "application") return std::make_shared<const ApplicationRecord>(identifier);
-  if (kind == "extension")
-    return std::make_shared<const ExtensionRecord>(
-        identifier, params.has("containing") ? bundleRecord(params.object("containing")) : nullptr);
-  return std::make_shared<const BundleRecord>(identifier);
+BundleRecordRef bundleRecord(const protocol::Bundle& bundle) {
+  if (bundle.kind == protocol::Bundle::kApplication)
+    return std::make_shared<const ApplicationRecord>(bundle.identifier);
+  if (bundle.kind == protocol::Bundle::kExtension)
+    return std::make_shared<const ExtensionRecord>(bundle.identifier,
+                                                   bundle.containing ? bundleRecord(*bundle.containing) : nullptr);
+  return std::make_shared<const BundleRecord>(bundle.identifier);
 }
 
-using MaximumSizes = std::map<WidgetDisplayMode, Size>;
-
-/// The most room of both modes; absent when the host says nothing of it.
-std::optional<MaximumSizes> maximumSizes(const Parameters& params) {
-  if (!params.has("displayModes")) return std::nullopt;
-  const Parameters modes = params.object("displayModes");
-  return MaximumSizes{{WidgetDisplayMode::Compact, modes.size("compact")},
-                      {WidgetDisplayMode::Expanded, modes.size("expanded")}};
+template <class Params>
+Params paramsOf(const json& params) {
+  try {
+    return protocol::read<Params>(params);
+  } catch (const protocol::Malformed& malformed) {
+    throw JSONRPCFailure(JSONRPCError::kInvalidParams, std::string("parameter ") + malformed.what());
+  }
 }
 
 }  // namespace
@@ -61,28 +51,26 @@ WidgetProcess::WidgetProcess(Options options, int input, int output)
       _runLoop(_virtualTime.get()),
       _connection(_runLoop, input, output),
       _host(_connection) {
-  addMethod("initialize", &WidgetProcess::initialize);
-  addMethod("loadView", &WidgetProcess::loadView);
-  addMethod("shutdown", &WidgetProcess::shutdown);
-  addViewMethod("viewWillAppear", &WidgetProcess::viewWillAppear);
-  addViewMethod("viewDidAppear", &WidgetProcess::viewDidAppear);
-  addViewMethod("viewWillDisappear", &WidgetProcess::viewWillDisappear);
-  addViewMethod("viewDidDisappear", &WidgetProcess::viewDidDisappear);
-  addViewMethod("didReceiveMemoryWarning", &WidgetProcess::didReceiveMemoryWarning);
-  addViewMethod("setActiveDisplayMode", &WidgetProcess::setActiveDisplayMode);
-  addViewMethod("transitionToSize", &WidgetProcess::transitionToSize);
-  addViewMethod("setTextSize", &WidgetProcess::setTextSize);
-  addViewMethod("selectRow", &WidgetProcess::selectRow);
-  addViewMethod("highlightRow", &WidgetProcess::highlightRow);
-  addViewMethod("snapshot", &WidgetProcess::snapshot);
-  addViewMethod("render", &WidgetProcess::render);
-  addViewMethod("setAppearance", &WidgetProcess::setAppearance);
-  addViewMethod("setScale", &WidgetProcess::setScale);
-  _connection.setHandler(protocol::kDecode.name, [](const json& params, const JSONRPCResponder& responder) {
-    responder.answer(decode(params));
-  });
-  if (_virtualTime) addMethod("advanceTime", &WidgetProcess::advanceTime);
-  _connection.setHandler("performUpdate",
+  addMethod(protocol::kInitialize, &WidgetProcess::initialize);
+  addMethod(protocol::kLoadView, &WidgetProcess::loadView);
+  addMethod(protocol::kShutdown, &WidgetProcess::shutdown);
+  addMethod(protocol::kDecode, &WidgetProcess::decode);
+  addViewMethod(protocol::kViewWillAppear, &WidgetProcess::viewWillAppear);
+  addViewMethod(protocol::kViewDidAppear, &WidgetProcess::viewDidAppear);
+  addViewMethod(protocol::kViewWillDisappear, &WidgetProcess::viewWillDisappear);
+  addViewMethod(protocol::kViewDidDisappear, &WidgetProcess::viewDidDisappear);
+  addViewMethod(protocol::kDidReceiveMemoryWarning, &WidgetProcess::didReceiveMemoryWarning);
+  addViewMethod(protocol::kSetActiveDisplayMode, &WidgetProcess::setActiveDisplayMode);
+  addViewMethod(protocol::kTransitionToSize, &WidgetProcess::transitionToSize);
+  addViewMethod(protocol::kSetTextSize, &WidgetProcess::setTextSize);
+  addViewMethod(protocol::kSelectRow, &WidgetProcess::selectRow);
+  addViewMethod(protocol::kHighlightRow, &WidgetProcess::highlightRow);
+  addViewMethod(protocol::kSnapshot, &WidgetProcess::snapshot);
+  addViewMethod(protocol::kRender, &WidgetProcess::render);
+  addViewMethod(protocol::kSetAppearance, &WidgetProcess::setAppearance);
+  addViewMethod(protocol::kSetScale, &WidgetProcess::setScale);
+  if (_virtualTime) addMethod(protocol::kAdvanceTime, &WidgetProcess::advanceTime);
+  _connection.setHandler(protocol::kPerformUpdate.name,
                          [this](const json&, const JSONRPCResponder& responder) { performUpdate(responder); });
   _connection.setClosedHandler([this] { _runLoop.quit(); });
   _host.setPreferredSizeObserver([this](Size size) { resizeView(size); });
@@ -97,18 +85,23 @@ int WidgetProcess::run() {
   return 0;
 }
 
-void WidgetProcess::addMethod(const char* name, Method method) {
-  _connection.setHandler(name, [this, method](const json& params, const JSONRPCResponder& responder) {
-    responder.answer((this->*method)(Parameters(params)));
+template <class Params, class Result>
+void WidgetProcess::addMethod(const protocol::Method<Params, Result>& method,
+                              Result (WidgetProcess::*answer)(const Params&)) {
+  _connection.setHandler(method.name, [this, answer](const json& params, const JSONRPCResponder& responder) {
+    responder.answer(protocol::write((this->*answer)(paramsOf<Params>(params))));
   });
 }
 
-void WidgetProcess::addViewMethod(const char* name, Method method) {
-  _connection.setHandler(name, [this, name, method](const json& params, const JSONRPCResponder& responder) {
-    if (!_controller || !_controller->isViewLoaded())
-      throw JSONRPCFailure(JSONRPCError::kInvalidState, std::string(name) + " needs \"loadView\" first");
-    responder.answer((this->*method)(Parameters(params)));
-  });
+template <class Params, class Result>
+void WidgetProcess::addViewMethod(const protocol::Method<Params, Result>& method,
+                                  Result (WidgetProcess::*answer)(const Params&)) {
+  _connection.setHandler(
+      method.name, [this, name = method.name, answer](const json& params, const JSONRPCResponder& responder) {
+        if (!_controller || !_controller->isViewLoaded())
+          throw JSONRPCFailure(JSONRPCError::kInvalidState, std::string(name) + " needs \"loadView\" first");
+        responder.answer(protocol::write((this->*answer)(paramsOf<Params>(params))));
+      });
 }
 
 void WidgetProcess::requireStage(std::initializer_list<Stage> stages, const char* method) const {
@@ -119,48 +112,38 @@ void WidgetProcess::requireStage(std::initializer_list<Stage> stages, const char
                        std::string(method) + " does not fit: the view is " + kNames[static_cast<std::size_t>(_stage)]);
 }
 
-json WidgetProcess::initialize(const Parameters& params) {
+protocol::Initialized WidgetProcess::initialize(const protocol::InitializeParams& params) {
   if (_platform) throw JSONRPCFailure(JSONRPCError::kInvalidState, "initialize was called already");
 
-  // Everything is read before anything is made: a bad parameter leaves the process as it was.
-  const auto locale = params.optionalText("locale");
-  const auto textSize = params.has("textSize") ? params.textSize("textSize") : ContentSizeCategory::large;
-  const auto scale = params.has("scale") ? params.number("scale", kSmallestScale, kLargestScale) : 1.0;
-  const auto appearance = params.has("appearance") ? params.appearance("appearance") : Appearance::light;
-  const auto mode =
-      params.has("activeDisplayMode") ? params.displayMode("activeDisplayMode") : WidgetDisplayMode::Compact;
-  const auto sizes = maximumSizes(params);
-  const BundleRecordRef record = params.has("bundle") ? bundleRecord(params.object("bundle")) : nullptr;
-
-  auto logSink = std::make_unique<HostLogSink>(
-      makeLogSink(LogOptions::fromEnvironment()), _runLoop,
-      [this](const std::string& category, const std::string& text) {
-        _connection.notify("log", {{"level", "error"}, {"category", category}, {"message", text}});
-      });
+  auto logSink = std::make_unique<HostLogSink>(makeLogSink(LogOptions::fromEnvironment()), _runLoop,
+                                               [this](const std::string& category, const std::string& text) {
+                                                 notify(_connection, protocol::kLog,
+                                                        {.level = "error", .category = category, .message = text});
+                                               });
   _platform = std::make_unique<DesktopPlatform>(
       DesktopPlatform::Options{.paths = _options.paths,
-                               .locale = locale.value_or(""),
+                               .locale = params.locale.value_or(""),
                                .runLoop = _runLoop,
                                .virtualTime = _virtualTime.get(),
                                .activityLauncher = _host,
                                .logSink = std::move(logSink),
                                .notice = [this](const ErrorRef& notice) { tellNotice(notice); }});
   Environment& environment = Environment::current();
-  environment.setContentSizeCategory(textSize);
-  environment.setScreenScale(scale);
-  environment.setAppearance(appearance);
-  _hostChoseMode = params.has("activeDisplayMode");
-  _host.setActiveDisplayMode(mode);
-  _host.setBundleRecord(record);
-  if (sizes)
-    for (const auto& [which, size] : *sizes) _host.setMaximumSize(which, size);
-  _controller = NBTransitIncidentsViewController::initWithNibName_bundle("", "", sizes ? &_host : nullptr);
-  return {{"name", "nimbo-transit-widget"}, {"version", NIMBO_VERSION}, {"protocol", kProtocolVersion}};
+  environment.setContentSizeCategory(params.textSize);
+  environment.setScreenScale(params.scale);
+  environment.setAppearance(params.appearance);
+  _hostChoseMode = params.activeDisplayMode.has_value();
+  _host.setActiveDisplayMode(params.activeDisplayMode.value_or(WidgetDisplayMode::Compact));
+  if (params.bundle) _host.setBundleRecord(bundleRecord(*params.bundle));
+  if (params.displayModes) _host.setMaximumSizes(*params.displayModes);
+  _controller =
+      NBTransitIncidentsViewController::initWithNibName_bundle("", "", params.displayModes ? &_host : nullptr);
+  return {"nimbo-transit-widget", NIMBO_VERSION, kProtocolVersion};
 }
 
-json WidgetProcess::loadView(const Parameters&) {
+protocol::Nothing WidgetProcess::loadView(const Nothing&) {
   if (!_controller) throw JSONRPCFailure(JSONRPCError::kInvalidState, "loadView needs \"initialize\" first");
-  requireStage({Stage::created}, "loadView");
+  requireStage({Stage::created}, protocol::kLoadView.name);
   _controller->view()->setLayoutMargins(kLayoutMargins);
   if (_controller->widgetHost()) {
     const NBTransitIncidentDataSource& rows = *_controller->dataSource();
@@ -173,58 +156,56 @@ json WidgetProcess::loadView(const Parameters&) {
         rows.isExpanded(), _host.maximumSizeForDisplayMode(_host.activeDisplayMode())));
   }
   _stage = Stage::hidden;
-  return json::object();
+  return {};
 }
 
-json WidgetProcess::viewWillAppear(const Parameters&) {
-  requireStage({Stage::hidden}, "viewWillAppear");
+protocol::Nothing WidgetProcess::viewWillAppear(const Nothing&) {
+  requireStage({Stage::hidden}, protocol::kViewWillAppear.name);
   _stage = Stage::appearing;
   _controller->viewWillAppear(false);
-  return json::object();
+  return {};
 }
 
-json WidgetProcess::viewDidAppear(const Parameters&) {
-  requireStage({Stage::appearing, Stage::visible}, "viewDidAppear");
+protocol::Nothing WidgetProcess::viewDidAppear(const Nothing&) {
+  requireStage({Stage::appearing, Stage::visible}, protocol::kViewDidAppear.name);
   _stage = Stage::visible;
   _controller->viewDidAppear(false);
-  return json::object();
+  return {};
 }
 
-json WidgetProcess::viewWillDisappear(const Parameters&) {
-  requireStage({Stage::appearing, Stage::visible}, "viewWillDisappear");
+protocol::Nothing WidgetProcess::viewWillDisappear(const Nothing&) {
+  requireStage({Stage::appearing, Stage::visible}, protocol::kViewWillDisappear.name);
   _stage = Stage::disappearing;
   _controller->viewWillDisappear(false);
-  return json::object();
+  return {};
 }
 
-json WidgetProcess::viewDidDisappear(const Parameters&) {
-  requireStage({Stage::disappearing}, "viewDidDisappear");
+protocol::Nothing WidgetProcess::viewDidDisappear(const Nothing&) {
+  requireStage({Stage::disappearing}, protocol::kViewDidDisappear.name);
   _stage = Stage::hidden;
   _controller->viewDidDisappear(false);
-  return json::object();
+  return {};
 }
 
-json WidgetProcess::didReceiveMemoryWarning(const Parameters&) {
+protocol::Nothing WidgetProcess::didReceiveMemoryWarning(const Nothing&) {
   _controller->didReceiveMemoryWarning();
-  return json::object();
+  return {};
 }
 
 void WidgetProcess::performUpdate(const JSONRPCResponder& responder) {
   if (!_controller) throw JSONRPCFailure(JSONRPCError::kInvalidState, "performUpdate needs \"initialize\" first");
   _controller->widgetPerformUpdateWithCompletionHandler([this, responder](WidgetUpdateResult result) {
-    static constexpr const char* kNames[] = {"newData", "noData", "failed"};
-    json answer = {{"updateResult", kNames[static_cast<std::size_t>(result)]}};
+    protocol::UpdateResult answer{.updateResult = result};
     _controller->transitLineItemResult()->withValue_orError(
-        [](const ObjectRef&) {}, [&](const ErrorRef& error) { answer["reason"] = error->reason(); });
-    responder.answer(answer);
+        [](const ObjectRef&) {}, [&](const ErrorRef& error) { answer.reason = error->reason(); });
+    responder.answer(protocol::write(answer));
   });
 }
 
-json WidgetProcess::setActiveDisplayMode(const Parameters& params) {
-  const WidgetDisplayMode mode = params.displayMode("mode");
-  if (params.has("maximumSize")) _host.setMaximumSize(mode, params.size("maximumSize"));
-  takeDisplayMode(mode);
-  return json::object();
+protocol::Nothing WidgetProcess::setActiveDisplayMode(const protocol::ActiveDisplayModeParams& params) {
+  if (params.maximumSize) _host.setMaximumSize(params.mode, *params.maximumSize);
+  takeDisplayMode(params.mode);
+  return {};
 }
 
 void WidgetProcess::takeDisplayMode(WidgetDisplayMode mode) {
@@ -235,122 +216,109 @@ void WidgetProcess::takeDisplayMode(WidgetDisplayMode mode) {
     _controller->widgetActiveDisplayModeDidChange_withMaximumSize(mode, _host.maximumSizeForDisplayMode(mode));
 }
 
-json WidgetProcess::transitionToSize(const Parameters& params) {
-  const Size size = params.size("size");
-  if (const auto sizes = maximumSizes(params))
-    for (const auto& [mode, maximum] : *sizes) _host.setMaximumSize(mode, maximum);
-  _controller->viewWillTransitionToSize_withTransitionCoordinator(size, nullptr);
-  resizeView(size);
-  return json::object();
+protocol::Nothing WidgetProcess::transitionToSize(const protocol::TransitionParams& params) {
+  if (params.displayModes) _host.setMaximumSizes(*params.displayModes);
+  _controller->viewWillTransitionToSize_withTransitionCoordinator(params.size, nullptr);
+  resizeView(params.size);
+  return {};
 }
 
-json WidgetProcess::setTextSize(const Parameters& params) {
-  Environment::current().setContentSizeCategory(params.textSize("category"));
+protocol::Nothing WidgetProcess::setTextSize(const protocol::TextSizeParams& params) {
+  Environment::current().setContentSizeCategory(params.category);
   announceFrame();
-  return json::object();
+  return {};
 }
 
-IndexPath WidgetProcess::existingRow(const Parameters& params) const {
-  const IndexPath indexPath = params.indexPath();
+IndexPath WidgetProcess::existingRow(std::uint32_t section, std::uint32_t row) const {
+  const IndexPath indexPath{section, row};
   if (indexPath.section != 0 || indexPath.row >= _controller->tableView()->numberOfRows())
     throw JSONRPCFailure(JSONRPCError::kInvalidParams, "there is no row " + std::to_string(indexPath.row) +
                                                            " in section " + std::to_string(indexPath.section));
   return indexPath;
 }
 
-json WidgetProcess::selectRow(const Parameters& params) {
-  return {{"selected", _controller->tableView()->selectRowAtIndexPath(existingRow(params))}};
+protocol::Selected WidgetProcess::selectRow(const protocol::RowParams& params) {
+  return {_controller->tableView()->selectRowAtIndexPath(existingRow(params.section, params.row))};
 }
 
-json WidgetProcess::highlightRow(const Parameters& params) {
-  const IndexPath indexPath = existingRow(params);
-  const bool highlighted = params.has("highlighted") ? params.flag("highlighted") : true;
+protocol::Highlighted WidgetProcess::highlightRow(const protocol::HighlightParams& params) {
+  const IndexPath indexPath = existingRow(params.section, params.row);
   TableView& tableView = *_controller->tableView();
-  if (highlighted)
+  if (params.highlighted)
     tableView.highlightRowAtIndexPath(indexPath);
   else if (tableView.highlightedRow() == indexPath)
     tableView.highlightRowAtIndexPath(std::nullopt);
   announceFrame();
-  return {{"highlighted", tableView.highlightedRow() == indexPath}};
+  return {tableView.highlightedRow() == indexPath};
 }
 
-json WidgetProcess::snapshot(const Parameters&) {
+protocol::Snapshot WidgetProcess::snapshot(const Nothing&) {
   _frameAnnounced = false;
-  json snapshot = snapshotJSON(*_controller);
-  json& gone = snapshot["goneLines"] = json::array();
-  for (const auto& identifier : _platform->transitLines().goneLines()) gone.push_back(writtenNameOfLine(*identifier));
-  json& asOf = snapshot["asOf"] = json::object();
-  for (const auto& [feed, date] : _platform->transitLines().asOf()) asOf[feed] = isoTextOfDate(date);
+  protocol::Snapshot snapshot = snapshotOf(*_controller);
+  for (const auto& identifier : _platform->transitLines().goneLines())
+    snapshot.goneLines.push_back(writtenNameOfLine(*identifier));
+  snapshot.asOf = _platform->transitLines().asOf();
   return snapshot;
 }
 
-json WidgetProcess::render(const Parameters& params) {
-  const bool toSurface = params.has("surface");
-  const std::string path = params.text(toSurface ? "surface" : "path");
+protocol::Rendered WidgetProcess::render(const protocol::RenderParams& params) {
+  if (!params.surface && !params.path)
+    throw JSONRPCFailure(JSONRPCError::kInvalidParams, "parameter \"path\" or \"surface\" must be given");
   _frameAnnounced = false;
   View& view = *_controller->view();
   view.layoutIfNeeded();
   const Environment& environment = Environment::current();
   const auto draw = [&view](Painter& painter) { view.draw(painter); };
-  const CairoSurface::Made made = renderToSurface(draw, view.bounds().size(), environment.screenScale(),
-                                                  colorOf(SystemColor::background, environment.appearance()));
-  ErrorRef error = made.error;
-  if (!error) error = toSurface ? writeSharedSurface(*made.surface, path) : writePNG(*made.surface, path);
+  const auto made = renderToSurface(draw, view.bounds().size(), environment.screenScale(),
+                                    colorOf(SystemColor::background, environment.appearance()));
+  ErrorRef error = made.error();
+  if (made) error = params.surface ? writeSharedSurface(**made, *params.surface) : writePNG(**made, *params.path);
   if (error) throw JSONRPCFailure(JSONRPCError::kDrawingFailed, error->reason());
-  return {{"width", made.surface->pixelWidth()},
-          {"height", made.surface->pixelHeight()},
-          {"stride", made.surface->stride()},
-          {"scale", made.surface->scale()}};
+  const CairoSurface& surface = **made;
+  return {surface.pixelWidth(), surface.pixelHeight(), surface.stride(), surface.scale()};
 }
 
-json WidgetProcess::setAppearance(const Parameters& params) {
-  Environment::current().setAppearance(params.appearance("appearance"));
+protocol::Nothing WidgetProcess::setAppearance(const protocol::AppearanceParams& params) {
+  Environment::current().setAppearance(params.appearance);
   announceFrame();
-  return json::object();
+  return {};
 }
 
-json WidgetProcess::setScale(const Parameters& params) {
-  Environment::current().setScreenScale(params.number("scale", kSmallestScale, kLargestScale));
+protocol::Nothing WidgetProcess::setScale(const protocol::ScaleParams& params) {
+  Environment::current().setScreenScale(params.scale);
   _controller->view()->setNeedsLayout();
   announceFrame();
-  return json::object();
+  return {};
 }
 
 void WidgetProcess::tellNotice(const ErrorRef& notice) {
-  _runLoop.dispatchAsync([this, notice] { _connection.notify("notice", {{"message", notice->reason()}}); });
+  _runLoop.dispatchAsync([this, notice] { notify(_connection, protocol::kNotice, {notice->reason()}); });
 }
 
 void WidgetProcess::announceFrame() {
   if (std::exchange(_frameAnnounced, true)) return;
-  _connection.notify("frame", json::object());
+  notify(_connection, protocol::kFrame, {});
 }
 
-json WidgetProcess::advanceTime(const Parameters& params) {
+protocol::Advanced WidgetProcess::advanceTime(const protocol::AdvanceParams& params) {
   if (!_platform) throw JSONRPCFailure(JSONRPCError::kInvalidState, "advanceTime needs \"initialize\" first");
-  const double seconds = params.number("seconds", 0, kLongestAdvance);
-  _virtualTime->advance(seconds);
-  _sentTo = dateByAdding(_sentTo, seconds);
-  return {{"now", isoTextOfDate(_sentTo)}};
+  _virtualTime->advance(params.seconds);
+  _sentTo = dateByAdding(_sentTo, params.seconds);
+  return {_sentTo};
 }
 
-json WidgetProcess::decode(const json& params) {
-  const auto bytes = [&] {
-    try {
-      return bytesFromBase64(protocol::read<protocol::DecodeParams>(params).bytes);
-    } catch (const protocol::Malformed& malformed) {
-      throw JSONRPCFailure(JSONRPCError::kInvalidParams, std::string("parameter ") + malformed.what());
-    }
-  }();
+protocol::Handoff WidgetProcess::decode(const protocol::DecodeParams& params) {
+  const auto bytes = bytesFromBase64(params.bytes);
   if (!bytes) throw JSONRPCFailure(JSONRPCError::kInvalidParams, "parameter \"bytes\" must be Base64");
   const Outcome<protocol::Handoff> handoff = decodeHandoff(*bytes);
   if (!handoff) throw JSONRPCFailure(JSONRPCError::kBrokenPayload, handoff.error()->reason());
-  return protocol::write(*handoff);
+  return *handoff;
 }
 
-json WidgetProcess::shutdown(const Parameters&) {
+protocol::Nothing WidgetProcess::shutdown(const Nothing&) {
   // After the answer is on its way.
   _runLoop.dispatchAsync([this] { _runLoop.quit(); });
-  return json::object();
+  return {};
 }
 
 void WidgetProcess::resizeView(Size size) {

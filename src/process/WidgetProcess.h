@@ -7,8 +7,8 @@
 #include "desktop/rpc/JSONRPCConnection.h"
 #include "desktop/system/Paths.h"
 #include "platform/VirtualTime.h"
-#include "process/Parameters.h"
 #include "process/RemoteHost.h"
+#include "protocol/Methods.h"
 #include "widget/NBTransitIncidentsViewController.h"
 
 namespace nimbo {
@@ -34,35 +34,37 @@ class WidgetProcess {
   /// Where the view is in its life; requests that do not fit get "invalid state".
   enum class Stage { created, hidden, appearing, visible, disappearing };
 
-  using Method = nlohmann::json (WidgetProcess::*)(const Parameters& params);
-
-  void addMethod(const char* name, Method method);
+  template <class Params, class Result>
+  void addMethod(const protocol::Method<Params, Result>& method, Result (WidgetProcess::*answer)(const Params&));
   /// A method that needs the loaded view.
-  void addViewMethod(const char* name, Method method);
+  template <class Params, class Result>
+  void addViewMethod(const protocol::Method<Params, Result>& method, Result (WidgetProcess::*answer)(const Params&));
   void requireStage(std::initializer_list<Stage> stages, const char* method) const;
 
-  nlohmann::json initialize(const Parameters& params);
-  nlohmann::json loadView(const Parameters& params);
-  nlohmann::json viewWillAppear(const Parameters& params);
-  nlohmann::json viewDidAppear(const Parameters& params);
-  nlohmann::json viewWillDisappear(const Parameters& params);
-  nlohmann::json viewDidDisappear(const Parameters& params);
-  nlohmann::json didReceiveMemoryWarning(const Parameters& params);
-  nlohmann::json setActiveDisplayMode(const Parameters& params);
-  nlohmann::json transitionToSize(const Parameters& params);
-  nlohmann::json setTextSize(const Parameters& params);
-  nlohmann::json selectRow(const Parameters& params);
-  nlohmann::json highlightRow(const Parameters& params);
-  nlohmann::json snapshot(const Parameters& params);
-  nlohmann::json render(const Parameters& params);
-  nlohmann::json setAppearance(const Parameters& params);
-  nlohmann::json setScale(const Parameters& params);
-  nlohmann::json advanceTime(const Parameters& params);
-  static nlohmann::json decode(const nlohmann::json& params);
-  nlohmann::json shutdown(const Parameters& params);
+  using Nothing = protocol::Nothing;
+  protocol::Initialized initialize(const protocol::InitializeParams& params);
+  Nothing loadView(const Nothing&);
+  Nothing viewWillAppear(const Nothing&);
+  Nothing viewDidAppear(const Nothing&);
+  Nothing viewWillDisappear(const Nothing&);
+  Nothing viewDidDisappear(const Nothing&);
+  Nothing didReceiveMemoryWarning(const Nothing&);
+  Nothing setActiveDisplayMode(const protocol::ActiveDisplayModeParams& params);
+  Nothing transitionToSize(const protocol::TransitionParams& params);
+  Nothing setTextSize(const protocol::TextSizeParams& params);
+  protocol::Selected selectRow(const protocol::RowParams& params);
+  protocol::Highlighted highlightRow(const protocol::HighlightParams& params);
+  protocol::Snapshot snapshot(const Nothing&);
+  protocol::Rendered render(const protocol::RenderParams& params);
+  Nothing setAppearance(const protocol::AppearanceParams& params);
+  Nothing setScale(const protocol::ScaleParams& params);
+  protocol::Advanced advanceTime(const protocol::AdvanceParams& params);
+  protocol::Handoff decode(const protocol::DecodeParams& params);
+  Nothing shutdown(const Nothing&);
   void performUpdate(const JSONRPCResponder& responder);
 
-  IndexPath existingRow(const Parameters& params) const;
+  /// Throws JSONRPCFailure for a row that is none.
+  IndexPath existingRow(std::uint32_t section, std::uint32_t row) const;
   /// Tells the controller of the host's mode, unless it knows.
   void takeDisplayMode(WidgetDisplayMode mode);
   void resizeView(Size size);

@@ -1,9 +1,12 @@
 #include "protocol/Coding.h"
 
+#include <cmath>
+#include <limits>
 #include <tuple>
 #include <type_traits>
 
-#include "protocol/Handoff.h"
+#include "protocol/Methods.h"
+#include "protocol/Names.h"
 
 namespace nimbo::protocol {
 
@@ -16,31 +19,184 @@ Malformed::Malformed(std::string where, std::string what)
 
 namespace {
 
-/// A member of a message. It is always there: an absent optional stands as null.
+constexpr double kInfinite = std::numeric_limits<double>::infinity();
+
+/// What holds for a member besides its type.
+struct Rules {
+  bool mayBeLeftOut = false;  ///< an absent optional is not written; else it stands as null
+  double least = -kInfinite;  ///< bounds of its numbers
+  double most = kInfinite;
+};
+constexpr Rules kMayBeLeftOut{.mayBeLeftOut = true};
+
+/// Points that a width or height may have.
+constexpr Rules kLength{.least = 0, .most = 100000};
+/// Device pixels for each point.
+constexpr Rules kScale{.least = 0.25, .most = 8};
+
+constexpr Rules mayBeLeftOut(Rules rules) {
+  rules.mayBeLeftOut = true;
+  return rules;
+}
+
 template <class Message, class Value>
 struct Field {
   const char* key;
   Value Message::*member;
+  Rules rules{};
 };
 // Said for compilers that do not deduce the arguments of aggregates by themselves.
 template <class Message, class Value>
 Field(const char*, Value Message::*) -> Field<Message, Value>;
+template <class Message, class Value>
+Field(const char*, Value Message::*, Rules) -> Field<Message, Value>;
+
+/// A member whose keys stand among the message's own.
+template <class Message, class Value>
+struct Embedded {
+  std::optional<Value> Message::*member;
+};
+template <class Message, class Value>
+Embedded(std::optional<Value> Message::*) -> Embedded<Message, Value>;
 
 /// The fields of each message: the one place where its keys are spelled.
 template <class Message>
 constexpr int kFields = 0;
 
 template <>
+constexpr std::tuple<> kFields<Nothing>{};
+template <>
+constexpr std::tuple kFields<Bundle>{Field{"kind", &Bundle::kind}, Field{"identifier", &Bundle::identifier},
+                                     Field{"containing", &Bundle::containing, kMayBeLeftOut}};
+template <>
+constexpr std::tuple kFields<DisplayModes>{Field{"compact", &DisplayModes::compact, kLength},
+                                           Field{"expanded", &DisplayModes::expanded, kLength}};
+template <>
+constexpr std::tuple kFields<InitializeParams>{
+    Field{"locale", &InitializeParams::locale, kMayBeLeftOut},
+    Field{"textSize", &InitializeParams::textSize, kMayBeLeftOut},
+    Field{"scale", &InitializeParams::scale, mayBeLeftOut(kScale)},
+    Field{"appearance", &InitializeParams::appearance, kMayBeLeftOut},
+    Field{"displayModes", &InitializeParams::displayModes, kMayBeLeftOut},
+    Field{"activeDisplayMode", &InitializeParams::activeDisplayMode, kMayBeLeftOut},
+    Field{"bundle", &InitializeParams::bundle, kMayBeLeftOut}};
+template <>
+constexpr std::tuple kFields<Initialized>{Field{"name", &Initialized::name}, Field{"version", &Initialized::version},
+                                          Field{"protocol", &Initialized::protocol}};
+template <>
+constexpr std::tuple kFields<UpdateResult>{Field{"updateResult", &UpdateResult::updateResult},
+                                           Field{"reason", &UpdateResult::reason, kMayBeLeftOut}};
+template <>
+constexpr std::tuple kFields<ActiveDisplayModeParams>{
+    Field{"mode", &ActiveDisplayModeParams::mode},
+    Field{"maximumSize", &ActiveDisplayModeParams::maximumSize, mayBeLeftOut(kLength)}};
+template <>
+constexpr std::tuple kFields<TransitionParams>{Field{"size", &TransitionParams::size, kLength},
+                                               Field{"displayModes", &TransitionParams::displayModes, kMayBeLeftOut}};
+template <>
+constexpr std::tuple kFields<TextSizeParams>{Field{"category", &TextSizeParams::category}};
+template <>
+constexpr std::tuple kFields<AppearanceParams>{Field{"appearance", &AppearanceParams::appearance}};
+template <>
+constexpr std::tuple kFields<ScaleParams>{Field{"scale", &ScaleParams::scale, kScale}};
+template <>
+constexpr std::tuple kFields<RowParams>{Field{"section", &RowParams::section}, Field{"row", &RowParams::row}};
+template <>
+constexpr std::tuple kFields<Selected>{Field{"selected", &Selected::selected}};
+template <>
+constexpr std::tuple kFields<HighlightParams>{Field{"section", &HighlightParams::section},
+                                              Field{"row", &HighlightParams::row},
+                                              Field{"highlighted", &HighlightParams::highlighted, kMayBeLeftOut}};
+template <>
+constexpr std::tuple kFields<Highlighted>{Field{"highlighted", &Highlighted::highlighted}};
+template <>
+constexpr std::tuple kFields<RenderParams>{Field{"path", &RenderParams::path, kMayBeLeftOut},
+                                           Field{"surface", &RenderParams::surface, kMayBeLeftOut}};
+template <>
+constexpr std::tuple kFields<Rendered>{Field{"width", &Rendered::width}, Field{"height", &Rendered::height},
+                                       Field{"stride", &Rendered::stride}, Field{"scale", &Rendered::scale}};
+template <>
+constexpr std::tuple kFields<AdvanceParams>{
+    Field{"seconds", &AdvanceParams::seconds, Rules{.least = 0, .most = 366.0 * 86400}}};
+template <>
+constexpr std::tuple kFields<Advanced>{Field{"now", &Advanced::now}};
+template <>
+constexpr std::tuple kFields<OpenURLParams>{Field{"url", &OpenURLParams::url}};
+template <>
+constexpr std::tuple kFields<OpenUserActivityParams>{
+    Field{"activityType", &OpenUserActivityParams::activityType}, Field{"userInfo", &OpenUserActivityParams::userInfo},
+    Field{"application", &OpenUserActivityParams::application},
+    Field{"requireUnlockPrompt", &OpenUserActivityParams::requireUnlockPrompt}};
+template <>
+constexpr std::tuple kFields<Opened>{Field{"opened", &Opened::opened}, Field{"error", &Opened::error, kMayBeLeftOut}};
+template <>
+constexpr std::tuple kFields<PreferredSizeParams>{Field{"size", &PreferredSizeParams::size}};
+template <>
+constexpr std::tuple kFields<LargestDisplayModeParams>{Field{"mode", &LargestDisplayModeParams::mode}};
+template <>
+constexpr std::tuple kFields<NoticeParams>{Field{"message", &NoticeParams::message}};
+template <>
+constexpr std::tuple kFields<LogParams>{Field{"level", &LogParams::level}, Field{"category", &LogParams::category},
+                                        Field{"message", &LogParams::message}};
+
+template <>
 constexpr std::tuple kFields<Icon>{Field{"iconType", &Icon::iconType}, Field{"cartoID", &Icon::cartoID},
                                    Field{"defaultTransitType", &Icon::defaultTransitType},
                                    Field{"iconAttributeKey", &Icon::iconAttributeKey},
                                    Field{"iconAttributeValue", &Icon::iconAttributeValue}};
-
 template <>
 constexpr std::tuple kFields<Shield>{
     Field{"text", &Shield::text},           Field{"color", &Shield::color},
     Field{"textColor", &Shield::textColor}, Field{"type", &Shield::type},
     Field{"icon", &Shield::icon},           Field{"accessibilityText", &Shield::accessibilityText}};
+template <>
+constexpr std::tuple kFields<Artwork>{Field{"image", &Artwork::image, kMayBeLeftOut},
+                                      Field{"shield", &Artwork::shield, kMayBeLeftOut},
+                                      Field{"size", &Artwork::size, kMayBeLeftOut}, Field{"alpha", &Artwork::alpha}};
+template <>
+constexpr std::tuple kFields<Openable>{Field{"url", &Openable::url, kMayBeLeftOut},
+                                       Field{"activityType", &Openable::activityType, kMayBeLeftOut}};
+template <>
+constexpr std::tuple kFields<TransitItem>{
+    Field{"primaryText", &TransitItem::primaryText}, Field{"secondaryText", &TransitItem::secondaryText},
+    Field{"artwork", &TransitItem::artwork}, Field{"artworkHidden", &TransitItem::artworkHidden},
+    Field{"openable", &TransitItem::openable}};
+template <>
+constexpr std::tuple kFields<SummaryItem>{Field{"primaryText", &SummaryItem::primaryText},
+                                          Field{"artworks", &SummaryItem::artworks},
+                                          Field{"userActivityData", &SummaryItem::userActivityData}};
+template <>
+constexpr std::tuple kFields<ViewNode>{Field{"class", &ViewNode::className}, Field{"frame", &ViewNode::frame},
+                                       Field{"hidden", &ViewNode::hidden}, Field{"views", &ViewNode::views}};
+template <>
+constexpr std::tuple kFields<Row>{Embedded{&Row::item},
+                                  Field{"cell", &Row::cell},
+                                  Field{"highlightable", &Row::highlightable},
+                                  Field{"separatorStyleOverride", &Row::separatorStyleOverride},
+                                  Field{"frame", &Row::frame},
+                                  Field{"views", &Row::views}};
+template <>
+constexpr std::tuple kFields<ListItem>{Field{"summaryItem", &ListItem::summaryItem},
+                                       Field{"expandedItems", &ListItem::expandedItems}};
+template <>
+constexpr std::tuple kFields<FetchError>{Field{"domain", &FetchError::domain}, Field{"code", &FetchError::code},
+                                         Field{"reason", &FetchError::reason}};
+template <>
+constexpr std::tuple kFields<Snapshot>{Field{"displayMode", &Snapshot::displayMode},
+                                       Field{"expanded", &Snapshot::expanded},
+                                       Field{"visible", &Snapshot::visible},
+                                       Field{"rowHeight", &Snapshot::rowHeight},
+                                       Field{"maxNumberOfRows", &Snapshot::maxNumberOfRows},
+                                       Field{"artworkColumnWidth", &Snapshot::artworkColumnWidth},
+                                       Field{"preferredContentSize", &Snapshot::preferredContentSize},
+                                       Field{"largestAvailableDisplayMode", &Snapshot::largestAvailableDisplayMode},
+                                       Field{"result", &Snapshot::result},
+                                       Field{"error", &Snapshot::error, kMayBeLeftOut},
+                                       Field{"rows", &Snapshot::rows},
+                                       Field{"listItem", &Snapshot::listItem},
+                                       Field{"updateDates", &Snapshot::updateDates},
+                                       Field{"goneLines", &Snapshot::goneLines},
+                                       Field{"asOf", &Snapshot::asOf}};
 
 template <>
 constexpr std::tuple kFields<Incident>{Field{"muid", &Incident::muid},
@@ -53,10 +209,8 @@ constexpr std::tuple kFields<Incident>{Field{"muid", &Incident::muid},
                                        Field{"isBlocking", &Incident::isBlocking},
                                        Field{"affectedLines", &Incident::affectedLines},
                                        Field{"linkURL", &Incident::linkURL}};
-
 template <>
 constexpr std::tuple kFields<System>{Field{"name", &System::name}, Field{"artwork", &System::artwork}};
-
 template <>
 constexpr std::tuple kFields<Line>{Field{"muid", &Line::muid},
                                    Field{"name", &Line::name},
@@ -64,13 +218,18 @@ constexpr std::tuple kFields<Line>{Field{"muid", &Line::muid},
                                    Field{"artwork", &Line::artwork},
                                    Field{"alternateArtwork", &Line::alternateArtwork},
                                    Field{"incidents", &Line::incidents}};
-
 template <>
 constexpr std::tuple kFields<DecodeParams>{Field{"bytes", &DecodeParams::bytes}};
-
 template <>
 constexpr std::tuple kFields<Handoff>{Field{"text", &Handoff::text}, Field{"line", &Handoff::line},
                                       Field{"incidents", &Handoff::incidents}};
+
+template <class T>
+constexpr bool kMayBeAbsent = false;
+template <class T>
+constexpr bool kMayBeAbsent<std::optional<T>> = true;
+template <class T>
+constexpr bool kMayBeAbsent<std::shared_ptr<T>> = true;
 
 /// Runs `readPart`, and completes the place of what is wrong with it.
 template <class ReadPart>
@@ -82,6 +241,15 @@ auto readAt(const std::string& key, ReadPart readPart) {
   }
 }
 
+std::string rangeText(const Rules& rules) { return json(rules.least).dump() + " to " + json(rules.most).dump(); }
+
+double readNumber(const json& number, const Rules& rules, const char* expected) {
+  const bool isNumber = number.is_number() && std::isfinite(number.get<double>());
+  if (isNumber && number.get<double>() >= rules.least && number.get<double>() <= rules.most)
+    return number.get<double>();
+  throw Malformed("", rules.most < kInfinite ? expected + (" from " + rangeText(rules)) : expected);
+}
+
 /// How a value stands in JSON. This one is for messages.
 template <class Value>
 struct Coding {
@@ -90,7 +258,7 @@ struct Coding {
     std::apply([&](const auto&... field) { (writeField(object, message, field), ...); }, kFields<Value>);
     return object;
   }
-  static Value read(const json& object) {
+  static Value read(const json& object, const Rules&) {
     if (!object.is_object()) throw Malformed("", "an object");
     Value message;
     std::apply([&](const auto&... field) { (readField(object, message, field), ...); }, kFields<Value>);
@@ -100,20 +268,31 @@ struct Coding {
  private:
   template <class Member>
   static void writeField(json& object, const Value& message, const Field<Value, Member>& field) {
+    if constexpr (kMayBeAbsent<Member>)
+      if (field.rules.mayBeLeftOut && !(message.*field.member)) return;
     object[field.key] = Coding<Member>::write(message.*field.member);
   }
   template <class Member>
   static void readField(const json& object, Value& message, const Field<Value, Member>& field) {
     const auto found = object.find(field.key);
+    if (found == object.end() && field.rules.mayBeLeftOut) return;
     if (found == object.end()) throw Malformed(field.key, "given");
-    message.*field.member = readAt(field.key, [&] { return Coding<Member>::read(*found); });
+    message.*field.member = readAt(field.key, [&] { return Coding<Member>::read(*found, field.rules); });
+  }
+  template <class Member>
+  static void writeField(json& object, const Value& message, const Embedded<Value, Member>& field) {
+    if (message.*field.member) object.update(Coding<Member>::write(*(message.*field.member)));
+  }
+  template <class Member>
+  static void readField(const json& object, Value& message, const Embedded<Value, Member>& field) {
+    if (object.contains("class")) message.*field.member = Coding<Member>::read(object, {});
   }
 };
 
 template <>
 struct Coding<std::string> {
   static json write(const std::string& text) { return text; }
-  static std::string read(const json& found) {
+  static std::string read(const json& found, const Rules&) {
     if (!found.is_string()) throw Malformed("", "a text");
     return found.get<std::string>();
   }
@@ -122,28 +301,75 @@ struct Coding<std::string> {
 template <>
 struct Coding<bool> {
   static json write(bool flag) { return flag; }
-  static bool read(const json& found) {
+  static bool read(const json& found, const Rules&) {
     if (!found.is_boolean()) throw Malformed("", "true or false");
     return found.get<bool>();
   }
 };
 
+template <>
+struct Coding<double> {
+  /// A zero without a sign.
+  static json write(double number) { return number + 0.0; }
+  static double read(const json& number, const Rules& rules) { return readNumber(number, rules, "a number"); }
+};
+
 template <std::integral Integer>
 struct Coding<Integer> {
   static json write(Integer number) { return number; }
-  static Integer read(const json& found) {
-    const bool fits = std::is_unsigned_v<Integer>  ? found.is_number_unsigned()
-                      : found.is_number_unsigned() ? found.get<std::uint64_t>() <= INT64_MAX
-                                                   : found.is_number_integer();
+  static Integer read(const json& found, const Rules&) {
+    const bool fits = found.is_number_unsigned()  ? std::in_range<Integer>(found.get<std::uint64_t>())
+                      : found.is_number_integer() ? std::in_range<Integer>(found.get<std::int64_t>())
+                                                  : false;
     if (!fits) throw Malformed("", std::is_unsigned_v<Integer> ? "a whole number, 0 or more" : "a whole number");
     return found.get<Integer>();
+  }
+};
+
+template <class Enumeration>
+requires std::is_enum_v<Enumeration>
+struct Coding<Enumeration> {
+  static json write(Enumeration value) { return nameOf(value); }
+  static Enumeration read(const json& found, const Rules&) {
+    const auto value = found.is_string() ? named<Enumeration>(found.get_ref<const std::string&>()) : std::nullopt;
+    if (!value) throw Malformed("", expected());
+    return *value;
+  }
+
+ private:
+  static std::string expected() {
+    std::string names;
+    for (const std::string_view name : kNames<Enumeration>)
+      names += (names.empty() ? "\"" : ", \"") + std::string(name) + "\"";
+    return "one of " + names;
+  }
+};
+
+template <>
+struct Coding<Size> {
+  static json write(const Size& size) { return {size.width + 0.0, size.height + 0.0}; }
+  static Size read(const json& found, const Rules& rules) {
+    constexpr const char* kExpected = "[width, height], each a number";
+    if (!found.is_array() || found.size() != 2) throw Malformed("", kExpected);
+    return {readNumber(found[0], rules, kExpected), readNumber(found[1], rules, kExpected)};
+  }
+};
+
+template <>
+struct Coding<Rect> {
+  static json write(const Rect& rect) { return {rect.x + 0.0, rect.y + 0.0, rect.width + 0.0, rect.height + 0.0}; }
+  static Rect read(const json& found, const Rules& rules) {
+    constexpr const char* kExpected = "[x, y, width, height], each a number";
+    if (!found.is_array() || found.size() != 4) throw Malformed("", kExpected);
+    const auto number = [&](std::size_t index) { return readNumber(found[index], rules, kExpected); };
+    return {number(0), number(1), number(2), number(3)};
   }
 };
 
 template <>
 struct Coding<Date> {
   static json write(Date date) { return isoTextOfDate(date); }
-  static Date read(const json& found) {
+  static Date read(const json& found, const Rules&) {
     const auto date = found.is_string() ? dateFromISOText(found.get_ref<const std::string&>()) : std::nullopt;
     if (!date) throw Malformed("", "an ISO date");
     return *date;
@@ -153,9 +379,18 @@ struct Coding<Date> {
 template <class Value>
 struct Coding<std::optional<Value>> {
   static json write(const std::optional<Value>& value) { return value ? Coding<Value>::write(*value) : json(); }
-  static std::optional<Value> read(const json& found) {
-    if (found.is_null()) return std::nullopt;
-    return Coding<Value>::read(found);
+  static std::optional<Value> read(const json& found, const Rules& rules) {
+    // What may be left out does not stand as null.
+    if (found.is_null() && !rules.mayBeLeftOut) return std::nullopt;
+    return Coding<Value>::read(found, rules);
+  }
+};
+
+template <class Value>
+struct Coding<std::shared_ptr<Value>> {
+  static json write(const std::shared_ptr<Value>& value) { return Coding<Value>::write(*value); }
+  static std::shared_ptr<Value> read(const json& found, const Rules& rules) {
+    return std::make_shared<Value>(Coding<Value>::read(found, rules));
   }
 };
 
@@ -166,13 +401,49 @@ struct Coding<std::vector<Element>> {
     for (const Element& element : elements) array.push_back(Coding<Element>::write(element));
     return array;
   }
-  static std::vector<Element> read(const json& array) {
+  static std::vector<Element> read(const json& array, const Rules& rules) {
     if (!array.is_array()) throw Malformed("", "a list");
     std::vector<Element> elements;
     elements.reserve(array.size());
     for (const json& element : array)
-      elements.push_back(readAt(std::to_string(elements.size()), [&] { return Coding<Element>::read(element); }));
+      elements.push_back(
+          readAt(std::to_string(elements.size()), [&] { return Coding<Element>::read(element, rules); }));
     return elements;
+  }
+};
+
+template <class Value>
+struct Coding<std::map<std::string, Value>> {
+  static json write(const std::map<std::string, Value>& values) {
+    json object = json::object();
+    for (const auto& [key, value] : values) object[key] = Coding<Value>::write(value);
+    return object;
+  }
+  static std::map<std::string, Value> read(const json& object, const Rules& rules) {
+    if (!object.is_object()) throw Malformed("", "an object");
+    std::map<std::string, Value> values;
+    for (const auto& [key, value] : object.items())
+      values[key] = readAt(key, [&value = value, &rules] { return Coding<Value>::read(value, rules); });
+    return values;
+  }
+};
+
+template <>
+struct Coding<Item> {
+  static json write(const Item& item) {
+    return std::visit(
+        []<class Alternative>(const Alternative& alternative) {
+          json object = Coding<Alternative>::write(alternative);
+          object["class"] = Alternative::kClass;
+          return object;
+        },
+        item);
+  }
+  static Item read(const json& object, const Rules&) {
+    const auto name = object.is_object() ? object.find("class") : object.end();
+    if (name != object.end() && *name == TransitItem::kClass) return Coding<TransitItem>::read(object, {});
+    if (name != object.end() && *name == SummaryItem::kClass) return Coding<SummaryItem>::read(object, {});
+    throw Malformed("", "an item of a known class");
   }
 };
 
@@ -185,12 +456,40 @@ json write(const Message& message) {
 
 template <class Message>
 Message read(const json& found) {
-  return Coding<Message>::read(found);
+  return Coding<Message>::read(found, {});
 }
 
-template json write(const DecodeParams&);
-template json write(const Handoff&);
-template DecodeParams read(const json&);
-template Handoff read(const json&);
+#define NIMBO_MESSAGE(Message)         \
+  template json write(const Message&); \
+  template Message read(const json&)
+
+NIMBO_MESSAGE(Nothing);
+NIMBO_MESSAGE(DisplayModes);
+NIMBO_MESSAGE(InitializeParams);
+NIMBO_MESSAGE(Initialized);
+NIMBO_MESSAGE(UpdateResult);
+NIMBO_MESSAGE(ActiveDisplayModeParams);
+NIMBO_MESSAGE(TransitionParams);
+NIMBO_MESSAGE(TextSizeParams);
+NIMBO_MESSAGE(AppearanceParams);
+NIMBO_MESSAGE(ScaleParams);
+NIMBO_MESSAGE(RowParams);
+NIMBO_MESSAGE(Selected);
+NIMBO_MESSAGE(HighlightParams);
+NIMBO_MESSAGE(Highlighted);
+NIMBO_MESSAGE(Snapshot);
+NIMBO_MESSAGE(RenderParams);
+NIMBO_MESSAGE(Rendered);
+NIMBO_MESSAGE(AdvanceParams);
+NIMBO_MESSAGE(Advanced);
+NIMBO_MESSAGE(DecodeParams);
+NIMBO_MESSAGE(Handoff);
+NIMBO_MESSAGE(OpenURLParams);
+NIMBO_MESSAGE(OpenUserActivityParams);
+NIMBO_MESSAGE(Opened);
+NIMBO_MESSAGE(PreferredSizeParams);
+NIMBO_MESSAGE(LargestDisplayModeParams);
+NIMBO_MESSAGE(NoticeParams);
+NIMBO_MESSAGE(LogParams);
 
 }  // namespace nimbo::protocol

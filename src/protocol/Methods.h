@@ -1,16 +1,55 @@
 #pragma once
 
 #include "protocol/Handoff.h"
+#include "protocol/Messages.h"
+#include "protocol/Snapshot.h"
 
 namespace nimbo::protocol {
 
-/// A request: its name, what it is asked with, and what is answered.
-template <class Params, class Result>
+/// A request: its name, what it is made with, and what is answered.
+template <class Params, class Result = Nothing>
 struct Method {
   const char* name;
 };
 
-// The requests of the host (docs/protocol.md).
+/// What is told without an answer.
+template <class Params>
+struct Notification {
+  const char* name;
+};
+
+// The host's requests.
+inline constexpr Method<InitializeParams, Initialized> kInitialize{"initialize"};
+inline constexpr Method<Nothing> kLoadView{"loadView"};
+inline constexpr Method<Nothing> kViewWillAppear{"viewWillAppear"};
+inline constexpr Method<Nothing> kViewDidAppear{"viewDidAppear"};
+inline constexpr Method<Nothing> kViewWillDisappear{"viewWillDisappear"};
+inline constexpr Method<Nothing> kViewDidDisappear{"viewDidDisappear"};
+inline constexpr Method<Nothing> kDidReceiveMemoryWarning{"didReceiveMemoryWarning"};
+inline constexpr Method<Nothing, UpdateResult> kPerformUpdate{"performUpdate"};
+inline constexpr Method<ActiveDisplayModeParams> kSetActiveDisplayMode{"setActiveDisplayMode"};
+inline constexpr Method<TransitionParams> kTransitionToSize{"transitionToSize"};
+inline constexpr Method<TextSizeParams> kSetTextSize{"setTextSize"};
+inline constexpr Method<AppearanceParams> kSetAppearance{"setAppearance"};
+inline constexpr Method<ScaleParams> kSetScale{"setScale"};
+inline constexpr Method<RowParams, Selected> kSelectRow{"selectRow"};
+inline constexpr Method<HighlightParams, Highlighted> kHighlightRow{"highlightRow"};
+inline constexpr Method<Nothing, Snapshot> kSnapshot{"snapshot"};
+inline constexpr Method<RenderParams, Rendered> kRender{"render"};
+inline constexpr Method<AdvanceParams, Advanced> kAdvanceTime{"advanceTime"};
 inline constexpr Method<DecodeParams, Handoff> kDecode{"decode"};
+inline constexpr Method<Nothing> kShutdown{"shutdown"};
+
+// The widget's requests.
+inline constexpr Method<OpenURLParams, Opened> kOpenURL{"openURL"};
+inline constexpr Method<OpenUserActivityParams, Opened> kOpenUserActivity{"openUserActivity"};
+
+// What the widget tells.
+inline constexpr Notification<PreferredSizeParams> kPreferredContentSizeDidChange{"preferredContentSizeDidChange"};
+inline constexpr Notification<LargestDisplayModeParams> kLargestAvailableDisplayModeDidChange{
+    "largestAvailableDisplayModeDidChange"};
+inline constexpr Notification<Nothing> kFrame{"frame"};
+inline constexpr Notification<NoticeParams> kNotice{"notice"};
+inline constexpr Notification<LogParams> kLog{"log"};
 
 }  // namespace nimbo::protocol

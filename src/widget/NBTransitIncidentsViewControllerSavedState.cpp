@@ -15,15 +15,14 @@ void NBTransitIncidentsViewController::_saveUIData() {
   const auto state = NBTransitIncidentViewControllerState::initWithLineItemsResult_expanded(
       _dataSource->transitLineItemResult(), _dataSource->isExpanded());
   const auto archived = Platform::current().archive().archivedDataWithRootObject(state, true);
-  if (!archived.bytes) {
+  if (!archived) {
     writeLog(NBTransitWidgetLogFacility, LogLevel::debug,
              "Unable to cache view model to disk because it couldnt be converted to Blob: %{private}@", {state});
     return;
   }
   writeLog(NBTransitWidgetLogFacility, LogLevel::debug,
            "Saving view model to Prefstore (key: %{private}@) : %{private}@", {kNimboTransitWidgetSavedUIData, state});
-  if (const ErrorRef error =
-          __nimbo_groupUserDefaults()->setValue_forKey(*archived.bytes, kNimboTransitWidgetSavedUIData))
+  if (const ErrorRef error = __nimbo_groupUserDefaults()->setValue_forKey(*archived, kNimboTransitWidgetSavedUIData))
     writeLog(NBTransitWidgetLogFacility, LogLevel::error, "The view model was not saved: %@", {error->reason()});
 }
 

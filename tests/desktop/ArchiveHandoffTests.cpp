@@ -52,7 +52,7 @@ TEST_F(HandoffPayload, OfEachKindIsShownWithItsContent) {
 
   const auto state = NBTransitIncidentViewControllerState::initWithLineItemsResult_expanded(
       Result::resultWithError(Error::errorWithDomain_code_userInfo("D", 4, {{"data", box(Bytes{1, 0xab})}})), true);
-  EXPECT_EQ(shown(*archive.archivedDataWithRootObject(state, true).bytes)["NBTransitIncidentViewControllerState"],
+  EXPECT_EQ(shown(*archive.archivedDataWithRootObject(state, true))["NBTransitIncidentViewControllerState"],
             json({{"expanded", true},
                   {"lineItemResultError", {{"domain", "D"}, {"code", 4}, {"userInfo", {{"data", "01ab"}}}}}}));
 

@@ -27,12 +27,11 @@ class PangoText : public testing::Test {
   }
   /// Black on white within 200 points, 40 high.
   Ink drawn(const TextLayout& layout, double scale = 1) {
-    return Ink(*renderToSurface(
-                    [&](Painter& painter) {
-                      painter.drawText(layout, {0, 0}, 200, kBlack);
-                    },
-                    {200, 40}, scale, kWhite)
-                    .surface);
+    return Ink(**renderToSurface(
+        [&](Painter& painter) {
+          painter.drawText(layout, {0, 0}, 200, kBlack);
+        },
+        {200, 40}, scale, kWhite));
   }
   static Ink::Found dark(const Ink& ink) {
     return ink.find([](std::uint32_t pixel) { return (pixel & 0xff) < 160; });

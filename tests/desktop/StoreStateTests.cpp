@@ -74,14 +74,12 @@ TEST_F(StateDatabaseTest, KeepsWhatCanBeReadOfADamagedFileInEveryProcess) {
     overwrite(file(), (page - 1) * 4096, std::string(4096, '\xee'));
   }
   SQLiteAnalyticsPipeline analytics(makeDatabase());
-  std::vector<AnalyticsEntry> entries;
-  const ErrorRef error = analytics.list(entries);
+  const ErrorRef error = analytics.list().error();
   ASSERT_NE(error, nullptr);
   EXPECT_THAT(notices, ElementsAre(error->reason()));
-  EXPECT_THAT(error->reason(),
-              testing::AllOf(HasSubstr(setAside().native()), HasSubstr("0 favorites and 2 settings")));
+  EXPECT_THAT(error->reason(), testing::AllOf(HasSubstr(setAside().native()), HasSubstr("0 favorites and 2 settings")));
   EXPECT_EQ(error->subject(), setAside().native());
-  EXPECT_EQ(analytics.list(entries), nullptr);
+  EXPECT_TRUE(analytics.list());
   // Those that had the damaged file open go over to the new one.
   EXPECT_EQ(host->setValue_forKey("since", "second"), nullptr);
   EXPECT_EQ(widget->stringForKey("second"), "since");
@@ -178,8 +176,9 @@ TEST_F(StateDatabaseTest, KeepsTheNewestAnalyticsUnlessTurnedOff) {
   analytics.captureUserAction(10, 706, std::nullopt);
   connect().execute("INSERT INTO analytics(content) VALUES ('{\"date\": \"tomorrow\"}'), ('[]'), ('')");
 
-  std::vector<AnalyticsEntry> entries;
-  ASSERT_EQ(analytics.list(entries), nullptr);
+  const auto listed = analytics.list();
+  ASSERT_TRUE(listed);
+  const std::vector<AnalyticsEntry>& entries = *listed;
   ASSERT_EQ(entries.size(), 1000u);
   EXPECT_EQ(std::get<AnalyticsUserAction>(entries.front().content).action, 1);
   EXPECT_EQ(std::get<AnalyticsUserAction>(entries.front().content).value, "v");
@@ -190,8 +189,7 @@ TEST_F(StateDatabaseTest, KeepsTheNewestAnalyticsUnlessTurnedOff) {
             R"("everExpanded":true,"transitMessageType":3,"tappedItemIndex":2,"incidentItems":[{"transitLineMuid":)"
             "\"18446744073709551615\",\"transitIncidentTitle\":\"Title \uFFFD\"}]}");
   EXPECT_EQ(analytics.clear(), nullptr);
-  EXPECT_EQ(analytics.list(entries), nullptr);
-  EXPECT_TRUE(entries.empty());
+  EXPECT_TRUE(analytics.list()->empty());
 }
 
 }  // namespace nimbo

@@ -45,13 +45,11 @@ class TextEncoder final : public KeyedEncoder {
 
 }  // namespace
 
-KeyedArchive::Archived ArchiveDouble::archivedDataWithRootObject(const ObjectRef& root, bool) {
+Outcome<Bytes> ArchiveDouble::archivedDataWithRootObject(const ObjectRef& root, bool) {
   TextEncoder encoder;
   encoder.encodeObject_forKey(root, kKeyedArchiveRootObjectKey);
-  if (fails)
-    return {std::nullopt,
-            Error::errorWithDomain_code_reason(std::string(kKeyedArchiveErrorDomain), 1, "cannot be archived")};
-  return {Bytes(encoder.text.begin(), encoder.text.end()), nullptr};
+  if (fails) return Error::errorWithDomain_code_reason(std::string(kKeyedArchiveErrorDomain), 1, "cannot be archived");
+  return Bytes(encoder.text.begin(), encoder.text.end());
 }
 
 }  // namespace nimbo

@@ -7,7 +7,7 @@ namespace nimbo {
 /// Archives to a readable text that nothing reads back: equal objects give equal bytes.
 class ArchiveDouble final : public KeyedArchive {
  public:
-  Archived archivedDataWithRootObject(const ObjectRef& root, bool requiringSecureCoding) override;
+  Outcome<Bytes> archivedDataWithRootObject(const ObjectRef& root, bool requiringSecureCoding) override;
   std::unique_ptr<KeyedUnarchiver> unarchiverForReadingFromData(std::span<const std::uint8_t>) override {
     return nullptr;
   }

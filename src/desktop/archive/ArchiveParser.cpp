@@ -86,15 +86,14 @@ class ArchiveBuilder final : public json::json_sax_t {
   std::string _failure;
 };
 
-ParsedArchive noArchive(std::string reason) {
-  return {nullptr, Error::errorWithDomain_code_reason(std::string(kKeyedArchiveErrorDomain),
-                                                      static_cast<std::int64_t>(ArchiveErrorCode::noArchive),
-                                                      std::move(reason))};
+ErrorRef noArchive(std::string reason) {
+  return Error::errorWithDomain_code_reason(std::string(kKeyedArchiveErrorDomain),
+                                            static_cast<std::int64_t>(ArchiveErrorCode::noArchive), std::move(reason));
 }
 
 }  // namespace
 
-ParsedArchive parseArchive(std::span<const std::uint8_t> bytes) {
+Outcome<json> parseArchive(std::span<const std::uint8_t> bytes) {
   if (bytes.size() > kMaximumArchiveSize)
     return noArchive("the archive has " + std::to_string(bytes.size()) + " bytes, more than " +
                      std::to_string(kMaximumArchiveSize));
@@ -107,7 +106,7 @@ ParsedArchive parseArchive(std::span<const std::uint8_t> bytes) {
     return noArchive("this is no archive: the outermost map has no \"" + std::string(kArchiveMarkerKey) + "\"");
   if (*marker != kArchiveVersion)
     return noArchive("the archive is of version " + marker->dump() + ", not " + std::to_string(kArchiveVersion));
-  return {std::move(content), nullptr};
+  return content;
 }
 
 }  // namespace nimbo

@@ -3,17 +3,13 @@
 #include <nlohmann/json.hpp>
 #include <span>
 
-#include "platform/foundation/Error.h"
+#include "platform/foundation/Outcome.h"
 
 namespace nimbo {
 
-/// The values of an archive, not yet objects.
-struct ParsedArchive {
-  nlohmann::json content;  ///< the outermost map; null with an error
-  ErrorRef error;          ///< null when the bytes are a whole archive of this version
-};
-
-/// Reads CBOR within the bounds of archives: maps with distinct text keys, UTF-8 texts, no tags, nothing after the end.
-ParsedArchive parseArchive(std::span<const std::uint8_t> bytes);
+/// The values of an archive, not yet objects: its outermost map. Reads CBOR within the bounds of archives: maps with
+/// distinct text keys, UTF-8 texts, no tags, nothing after the end. An error for all that is no whole archive of this
+/// version.
+Outcome<nlohmann::json> parseArchive(std::span<const std::uint8_t> bytes);
 
 }  // namespace nimbo

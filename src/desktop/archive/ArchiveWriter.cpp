@@ -148,15 +148,15 @@ json ArchiveWriter::codedObjectOf(const SecureCoding& object) {
   return fields;
 }
 
-KeyedArchive::Archived notArchivable(std::string reason) {
-  return {std::nullopt, Error::errorWithDomain_code_reason(std::string(kKeyedArchiveErrorDomain),
-                                                           static_cast<std::int64_t>(ArchiveErrorCode::notArchivable),
-                                                           std::move(reason))};
+ErrorRef notArchivable(std::string reason) {
+  return Error::errorWithDomain_code_reason(std::string(kKeyedArchiveErrorDomain),
+                                            static_cast<std::int64_t>(ArchiveErrorCode::notArchivable),
+                                            std::move(reason));
 }
 
 }  // namespace
 
-KeyedArchive::Archived CBORKeyedArchive::archivedDataWithRootObject(const ObjectRef& root, bool) {
+Outcome<Bytes> CBORKeyedArchive::archivedDataWithRootObject(const ObjectRef& root, bool) {
   ArchiveWriter writer;
   json content{{kArchiveMarkerKey, kArchiveVersion}};
   {
@@ -168,7 +168,7 @@ KeyedArchive::Archived CBORKeyedArchive::archivedDataWithRootObject(const Object
   if (bytes.size() > kMaximumArchiveSize)
     return notArchivable("the archive has " + std::to_string(bytes.size()) + " bytes, more than " +
                          std::to_string(kMaximumArchiveSize));
-  return {std::move(bytes), nullptr};
+  return bytes;
 }
 
 }  // namespace nimbo

@@ -31,8 +31,8 @@ class Decompression {
   int _status;
 };
 
-Bzip2Decompressed failure(int status, std::string reason) {
-  return {std::nullopt, Error::errorWithDomain_code_reason(std::string(kBzip2ErrorDomain), status, std::move(reason))};
+ErrorRef failure(int status, std::string reason) {
+  return Error::errorWithDomain_code_reason(std::string(kBzip2ErrorDomain), status, std::move(reason));
 }
 
 char* asCharacters(const std::uint8_t* bytes) {
@@ -57,7 +57,7 @@ std::optional<Bytes> Bzip2Compressor::Bzip2Compress(std::span<const std::uint8_t
   return output;
 }
 
-Bzip2Decompressed bzip2DecompressedData(std::span<const std::uint8_t> bytes, std::size_t maximumSize) {
+Outcome<Bytes> bzip2DecompressedData(std::span<const std::uint8_t> bytes, std::size_t maximumSize) {
   if (bytes.size() > kMaximumCount) return failure(BZ_DATA_ERROR, "the bzip2 stream is too large");
   Decompression decompression;
   if (decompression.status() != BZ_OK) return failure(decompression.status(), "there is no memory to decompress");
@@ -82,7 +82,7 @@ Bzip2Decompressed bzip2DecompressedData(std::span<const std::uint8_t> bytes, std
       return failure(BZ_UNEXPECTED_EOF, "the bzip2 stream is cut off" + where());
   }
   if (stream.avail_in != 0) return failure(BZ_DATA_ERROR, "other bytes follow the bzip2 stream" + where());
-  return {std::move(output), nullptr};
+  return output;
 }
 
 }  // namespace nimbo

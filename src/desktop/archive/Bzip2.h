@@ -1,7 +1,7 @@
 #pragma once
 
 #include "platform/Bzip2Compress.h"
-#include "platform/foundation/Error.h"
+#include "platform/foundation/Outcome.h"
 
 namespace nimbo {
 
@@ -12,16 +12,11 @@ class Bzip2Compressor final : public Compressor {
   std::optional<Bytes> Bzip2Compress(std::span<const std::uint8_t> bytes) override;
 };
 
-struct Bzip2Decompressed {
-  std::optional<Bytes> bytes;
-  ErrorRef error;  ///< null with bytes; else what is wrong with the stream, and where
-};
-
 /// Domain of errors of broken bzip2 streams; the codes are libbz2's.
 inline constexpr std::string_view kBzip2ErrorDomain = "Bzip2ErrorDomain";
 
 /// The content of one whole bzip2 stream; an error for one that is broken, cut off, followed by other bytes, or that
-/// holds more than `maximumSize` bytes.
-Bzip2Decompressed bzip2DecompressedData(std::span<const std::uint8_t> bytes, std::size_t maximumSize);
+/// holds more than `maximumSize` bytes. Errors say what is wrong, and where.
+Outcome<Bytes> bzip2DecompressedData(std::span<const std::uint8_t> bytes, std::size_t maximumSize);
 
 }  // namespace nimbo

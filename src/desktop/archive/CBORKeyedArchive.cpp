@@ -6,13 +6,14 @@
 namespace nimbo {
 
 std::unique_ptr<KeyedUnarchiver> CBORKeyedArchive::unarchiverForReadingFromData(std::span<const std::uint8_t> bytes) {
-  return openData(bytes).unarchiver;
+  auto opened = openData(bytes);
+  return opened ? std::move(*opened) : nullptr;
 }
 
-CBORKeyedArchive::Opened CBORKeyedArchive::openData(std::span<const std::uint8_t> bytes) {
-  ParsedArchive parsed = parseArchive(bytes);
-  if (parsed.error) return {nullptr, parsed.error};
-  return {std::make_unique<CBORKeyedUnarchiver>(std::move(parsed.content)), nullptr};
+Outcome<std::unique_ptr<KeyedUnarchiver>> CBORKeyedArchive::openData(std::span<const std::uint8_t> bytes) {
+  auto parsed = parseArchive(bytes);
+  if (!parsed) return parsed.error();
+  return std::unique_ptr<KeyedUnarchiver>(std::make_unique<CBORKeyedUnarchiver>(std::move(*parsed)));
 }
 
 }  // namespace nimbo

@@ -27,19 +27,19 @@ double pixelCount(double points, double scale) {
 
 }  // namespace
 
-CairoSurface::Made CairoSurface::make(Size size, double scale) {
+Outcome<CairoSurfaceRef> CairoSurface::make(Size size, double scale) {
   const auto isLength = [](double value) { return std::isfinite(value) && value >= 0; };
   if (!isLength(size.width) || !isLength(size.height) || !isLength(scale) || scale == 0)
-    return {nullptr, badSize(size, scale, "cannot be drawn: give lengths of at least 0 and a scale above 0.")};
+    return badSize(size, scale, "cannot be drawn: give lengths of at least 0 and a scale above 0.");
   const double width = pixelCount(size.width, scale), height = pixelCount(size.height, scale);
   if (width > kMaximumPixelsEachWay || height > kMaximumPixelsEachWay || width * height > kMaximumPixelCount)
-    return {nullptr, badSize(size, scale, "is too large: choose a smaller size or scale.")};
+    return badSize(size, scale, "is too large: choose a smaller size or scale.");
   CairoSurfaceHandle handle(
       cairo_image_surface_create(CAIRO_FORMAT_ARGB32, static_cast<int>(width), static_cast<int>(height)));
   if (cairo_surface_status(handle.get()) != CAIRO_STATUS_SUCCESS)
-    return {nullptr, badSize(size, scale, "does not fit into memory: choose a smaller size or scale.")};
+    return badSize(size, scale, "does not fit into memory: choose a smaller size or scale.");
   cairo_surface_set_device_scale(handle.get(), scale, scale);
-  return {std::make_shared<const CairoSurface>(std::move(handle), size, scale), nullptr};
+  return std::make_shared<const CairoSurface>(std::move(handle), size, scale);
 }
 
 int CairoSurface::pixelWidth() const { return cairo_image_surface_get_width(get()); }

@@ -7,8 +7,8 @@
 #include <utility>
 
 #include "desktop/raii/CairoHandles.h"
-#include "platform/foundation/Error.h"
 #include "platform/foundation/Geometry.h"
+#include "platform/foundation/Outcome.h"
 
 namespace nimbo {
 
@@ -20,17 +20,16 @@ inline constexpr std::int64_t kDrawingErrorNotDrawn =
 /// Pixels that a picture may have at most: 256 MiB of memory.
 inline constexpr double kMaximumPixelCount = 64e6;
 
+class CairoSurface;
+/// Never null.
+using CairoSurfaceRef = std::shared_ptr<const CairoSurface>;
+
 /// A picture's pixels in memory. One thread at a time.
 class CairoSurface final {
  public:
-  struct Made {
-    std::shared_ptr<const CairoSurface> surface;  ///< null when refused
-    ErrorRef error;                               ///< null unless the surface is
-  };
-
   /// Transparent pixels for `size` points, `scale` of them for each point, broken ones counted whole and at least one
   /// each way. Refused: a size or scale that is no number or negative, a scale of 0, more than `kMaximumPixelCount`.
-  static Made make(Size size, double scale);
+  static Outcome<CairoSurfaceRef> make(Size size, double scale);
 
   CairoSurface(CairoSurfaceHandle handle, Size size, double scale)
       : _surface(std::move(handle)), _size(size), _scale(scale) {}

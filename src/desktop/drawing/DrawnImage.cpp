@@ -8,16 +8,17 @@
 namespace nimbo {
 
 ImageRef drawImage(Size size, double scale, const std::function<void(cairo_t*)>& draw) {
-  CairoSurface::Made made = CairoSurface::make(size, scale);
-  if (!made.surface) {
-    writeLog({kDefaultLogSubsystem, "Images"}, LogLevel::error, "An image is not drawn: %@", {made.error->reason()});
+  const auto surface = CairoSurface::make(size, scale);
+  if (!surface) {
+    writeLog({kDefaultLogSubsystem, "Images"}, LogLevel::error, "An image is not drawn: %@",
+             {surface.error()->reason()});
     return nullptr;
   }
   {
-    const CairoContextHandle context(cairo_create(made.surface->get()));
+    const CairoContextHandle context(cairo_create((*surface)->get()));
     draw(context.get());
   }
-  return std::make_shared<const CairoImage>(std::move(made.surface));
+  return std::make_shared<const CairoImage>(*surface);
 }
 
 }  // namespace nimbo

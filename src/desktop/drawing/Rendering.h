@@ -13,7 +13,7 @@ using DrawOperation = std::function<void(Painter&)>;
 
 /// A picture of `size` points at `scale` device pixels a point, over `background`. Errors are those of
 /// `CairoSurface::make`. Main thread.
-CairoSurface::Made renderToSurface(const DrawOperation& draw, Size size, double scale, const Color& background);
+Outcome<CairoSurfaceRef> renderToSurface(const DrawOperation& draw, Size size, double scale, const Color& background);
 
 /// The same as a PNG file at `path`, replaced whole or not at all. Null on success.
 ErrorRef renderToPNG(const DrawOperation& draw, Size size, double scale, const Color& background,

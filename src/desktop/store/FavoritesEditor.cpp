@@ -102,7 +102,7 @@ FavoritesEditor::FavoritesEditor(std::shared_ptr<StateDatabase> database, FirstF
   if (!_firstFavorites) _firstFavorites = [] { return std::vector<TransitLineRef>(); };
 }
 
-ErrorRef FavoritesEditor::list(Favorites& favorites) const {
+Outcome<Favorites> FavoritesEditor::list() const {
   std::optional<Favorites> stored;
   const ErrorRef error = _database->read([&](SQLiteConnection& connection) -> ErrorRef {
     if (wereSet(connection)) stored = storedFavorites(connection);
@@ -114,8 +114,7 @@ ErrorRef FavoritesEditor::list(Favorites& favorites) const {
     for (const TransitLineRef& line : _firstFavorites())
       stored->push_back(std::make_shared<const FavoriteTransitLine>(line));
   }
-  favorites = std::move(*stored);
-  return nullptr;
+  return std::move(*stored);
 }
 
 ErrorRef FavoritesEditor::change(const StateDatabase::Work& work) {

@@ -2,6 +2,7 @@
 
 #include "desktop/store/StateDatabase.h"
 #include "platform/FavoritesStore.h"
+#include "platform/foundation/Outcome.h"
 
 namespace nimbo {
 
@@ -28,7 +29,7 @@ class FavoritesEditor final {
   /// Sets `favorites` to all favourites in their order; while none were ever set, to the first ones. A line whose
   /// content cannot be read is a favourite without a line. Null on success, otherwise `favorites` stays: also after
   /// damage that took some of them, until the next change.
-  ErrorRef list(Favorites& favorites) const;
+  Outcome<Favorites> list() const;
 
   // The first change begins from the first favourites. Each answers null on success.
 

@@ -17,13 +17,12 @@ class GuardedFavorites::Persister final : public FavoritesPersister {
   explicit Persister(std::shared_ptr<State> state) : _state(std::move(state)) {}
 
   std::optional<Favorites> readFavorites() override {
-    Favorites favorites;
-    const ErrorRef failure = _state->editor.list(favorites);
+    auto favorites = _state->editor.list();
     {
       const std::lock_guard guard(_state->lock);
-      _state->failure = failure;
+      _state->failure = favorites.error();
     }
-    if (!failure) return favorites;
+    if (favorites) return std::move(*favorites);
     const auto line = std::make_shared<const BasicTransitLineItem>(
         BasicTransitLineItem::Fields{.identifier = std::make_shared<const MapItemIdentifier>(kUnreadableMuid)});
     return Favorites{std::make_shared<const FavoriteTransitLine>(line)};

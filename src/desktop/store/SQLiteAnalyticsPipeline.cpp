@@ -34,14 +34,16 @@ void SQLiteAnalyticsPipeline::keep(const AnalyticsEntry& entry) {
              {error->reason()});
 }
 
-ErrorRef SQLiteAnalyticsPipeline::list(std::vector<AnalyticsEntry>& entries) const {
-  entries.clear();
-  return _database->read([&](SQLiteConnection& connection) -> ErrorRef {
+Outcome<std::vector<AnalyticsEntry>> SQLiteAnalyticsPipeline::list() const {
+  std::vector<AnalyticsEntry> entries;
+  const ErrorRef error = _database->read([&](SQLiteConnection& connection) -> ErrorRef {
     SQLiteStatement query = connection.prepare("SELECT content FROM analytics ORDER BY id");
     while (query.step())
       if (auto entry = analyticsEntryOfJSON(query.text(0))) entries.push_back(std::move(*entry));
     return nullptr;
   });
+  if (error) return error;
+  return entries;
 }
 
 ErrorRef SQLiteAnalyticsPipeline::clear() {

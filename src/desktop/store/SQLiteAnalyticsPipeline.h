@@ -2,6 +2,7 @@
 
 #include "desktop/store/AnalyticsEntry.h"
 #include "desktop/store/SQLiteSharedSettings.h"
+#include "platform/foundation/Outcome.h"
 
 namespace nimbo {
 
@@ -22,7 +23,7 @@ class SQLiteAnalyticsPipeline final : public AnalyticsPipeline {
                                 bool wasLocked, Date startDate, TimeInterval duration) override;
 
   /// Sets `entries` to what is kept, the oldest first; a record that cannot be understood is left out. Null on success.
-  ErrorRef list(std::vector<AnalyticsEntry>& entries) const;
+  Outcome<std::vector<AnalyticsEntry>> list() const;
   /// Forgets everything. Null on success.
   ErrorRef clear();
 

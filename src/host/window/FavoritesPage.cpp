@@ -64,11 +64,10 @@ bool FavoritesPage::isFavorite(const TransitLine& line) const {
 }
 
 void FavoritesPage::readFavorites() {
-  Favorites all;
-  if (const ErrorRef failure = _context.platform->favoritesEditor().list(all))
-    return _context.navigator.tell(textOfError(*failure));
+  const auto all = _context.platform->favoritesEditor().list();
+  if (!all) return _context.navigator.tell(textOfError(*all.error()));
   _favorites.clear();
-  for (const FavoriteRef& favorite : all)
+  for (const FavoriteRef& favorite : *all)
     if (const auto* line = dynamic_cast<const FavoriteTransitLine*>(favorite.get()); line && line->transitLine())
       _favorites.push_back(line->transitLine());
 }

@@ -2,12 +2,12 @@
 
 #include <map>
 #include <memory>
-#include <nlohmann/json.hpp>
 #include <string>
 #include <vector>
 
 #include "host/window/SharedPicture.h"
 #include "platform/foundation/Date.h"
+#include "protocol/Snapshot.h"
 
 namespace nimbo {
 
@@ -26,8 +26,8 @@ struct WidgetContent {
   bool isExpanded = false;
   std::map<std::string, Date> asOf;  ///< when the publishers made their alerts, by the names of the feeds
 
-  /// Takes rows and modes from a snapshot of docs/protocol.md. Throws nlohmann::json::exception for anything else.
-  static WidgetContent ofSnapshot(const nlohmann::json& snapshot);
+  /// Takes rows and modes from a snapshot.
+  static WidgetContent ofSnapshot(const protocol::Snapshot& snapshot);
 };
 
 using WidgetContentRef = std::shared_ptr<const WidgetContent>;

@@ -5,12 +5,8 @@
 
 #include "desktop/rpc/Base64.h"
 #include "platform/foundation/Log.h"
-#include "protocol/Coding.h"
-#include "protocol/Methods.h"
 
 namespace nimbo {
-
-using nlohmann::json;
 
 namespace {
 
@@ -19,8 +15,8 @@ constexpr std::string_view kProcessErrorDomain = "org.nimbo.WidgetHostProcess";
 
 constexpr LogFacility kLog{kDefaultLogSubsystem, "WidgetHostProcess"};
 
-SharedPicture::Layout layoutOf(const json& answer) {
-  return {answer.at("width"), answer.at("height"), answer.at("stride"), answer.at("scale")};
+SharedPicture::Layout layoutOf(const protocol::Rendered& answer) {
+  return {answer.width, answer.height, answer.stride, answer.scale};
 }
 
 }  // namespace
@@ -80,10 +76,11 @@ void WidgetHostProcess::tellPresentation() {
   }
   const WidgetPresentation old = std::exchange(_told, next);
   if (displayModesOf(old) != displayModesOf(next))
-    _widget->ask("transitionToSize", {{"size", {next.width, _contentHeight}}, {"displayModes", displayModesOf(next)}});
-  if (old.scale != next.scale) _widget->ask("setScale", {{"scale", next.scale}});
-  if (old.appearance != next.appearance) _widget->ask("setAppearance", {{"appearance", next.appearance}});
-  if (old.textSize != next.textSize) _widget->ask("setTextSize", {{"category", next.textSize}});
+    _widget->ask(protocol::kTransitionToSize,
+                 {.size = {next.width, _contentHeight}, .displayModes = displayModesOf(next)});
+  if (old.scale != next.scale) _widget->ask(protocol::kSetScale, {next.scale});
+  if (old.appearance != next.appearance) _widget->ask(protocol::kSetAppearance, {next.appearance});
+  if (old.textSize != next.textSize) _widget->ask(protocol::kSetTextSize, {next.textSize});
 }
 
 void WidgetHostProcess::setExpanded(bool expanded) {
@@ -94,7 +91,8 @@ void WidgetHostProcess::setExpanded(bool expanded) {
 void WidgetHostProcess::setExpandedMode(bool expanded) {
   if (expanded == _isExpanded) return;
   _isExpanded = expanded;
-  _widget->ask("setActiveDisplayMode", {{"mode", expanded ? "expanded" : "compact"}});
+  _widget->ask(protocol::kSetActiveDisplayMode,
+               {.mode = expanded ? WidgetDisplayMode::Expanded : WidgetDisplayMode::Compact});
   askForContent();
 }
 
@@ -110,10 +108,10 @@ void WidgetHostProcess::start() {
   _isExpanded = _wantsExpanded;
   _awaitsContent = _contentIsStale = false;
   setUpConnection();
-  json initialization = initializationOf(_told);
-  if (_isExpanded) initialization["activeDisplayMode"] = "expanded";
-  _widget->ask("initialize", initialization);
-  _widget->ask("loadView");
+  protocol::InitializeParams initialization = initializationOf(_told);
+  if (_isExpanded) initialization.activeDisplayMode = WidgetDisplayMode::Expanded;
+  _widget->ask(protocol::kInitialize, initialization);
+  _widget->ask(protocol::kLoadView);
   if (_visible)
     appear();
   else
@@ -122,29 +120,23 @@ void WidgetHostProcess::start() {
 
 void WidgetHostProcess::setUpConnection() {
   WidgetClient& client = _widget->client();
-  client.connection().setHandler("frame", [this](const json&, const JSONRPCResponder&) { askForContent(); });
+  client.connection().setHandler(protocol::kFrame.name,
+                                 [this](const auto&, const JSONRPCResponder&) { askForContent(); });
   client.setNoticeHandler([this](const std::string& message) { _delegate.widgetTells(message); });
-  client.setOpenHandler([this](std::string_view method, const json& params) {
-    try {
-      return _delegate.widgetOpens(method, params);
-    } catch (const json::exception& malformed) {
-      _widget->fail(std::string("it speaks nonsense: ") + malformed.what());
-      return false;
-    }
-  });
+  client.setOpenHandler([this](const WidgetClient::Opening& opening) { return _delegate.widgetOpens(opening); });
 }
 
 void WidgetHostProcess::appear() {
   _appeared = true;
-  _widget->ask("viewWillAppear");
-  _widget->ask("viewDidAppear");
+  _widget->ask(protocol::kViewWillAppear);
+  _widget->ask(protocol::kViewDidAppear);
   askForContent();
 }
 
 void WidgetHostProcess::disappear() {
   _appeared = false;
-  _widget->ask("viewWillDisappear");
-  _widget->ask("viewDidDisappear");
+  _widget->ask(protocol::kViewWillDisappear);
+  _widget->ask(protocol::kViewDidDisappear);
 }
 
 void WidgetHostProcess::stop() {
@@ -181,10 +173,9 @@ void WidgetHostProcess::restart() {
   if (_visible && !_widget) start();
 }
 
-void WidgetHostProcess::askOfRow(std::string_view method, std::size_t row, json params) {
-  if (!_widget) return;
-  params.update({{"section", 0}, {"row", row}});
-  _widget->call(method, params, [](const json&, const auto&) {});
+template <class Params, class Result>
+void WidgetHostProcess::askOfRow(const protocol::Method<Params, Result>& method, const Params& params) {
+  if (_widget) _widget->call(method, params, [](const auto&, const auto&) {});
 }
 
 void WidgetHostProcess::askForContent() {
@@ -201,17 +192,17 @@ void WidgetHostProcess::askForContent() {
   }
   _awaitsContent = true;
   _contentIsStale = false;
-  _widget->ask("render", {{"surface", picture->path()}}, [this, picture](const json& answer) {
+  _widget->ask(protocol::kRender, {.surface = picture->path()}, [this, picture](const protocol::Rendered& answer) {
     if (!picture->map(layoutOf(answer))) _widget->fail("it has not drawn what it says");
   });
-  _widget->ask("snapshot", json::object(), [this, picture](const json& snapshot) {
+  _widget->ask(protocol::kSnapshot, {}, [this, picture](const protocol::Snapshot& snapshot) {
     _awaitsContent = false;
     if (!picture->pixels().empty()) show(picture, snapshot);
     if (_contentIsStale) askForContent();
   });
 }
 
-void WidgetHostProcess::show(const std::shared_ptr<SharedPicture>& picture, const json& snapshot) {
+void WidgetHostProcess::show(const std::shared_ptr<SharedPicture>& picture, const protocol::Snapshot& snapshot) {
   auto content = std::make_shared<WidgetContent>(WidgetContent::ofSnapshot(snapshot));
   content->picture = picture;
   _contentHeight = picture->layout().height / picture->layout().scale;
@@ -228,7 +219,7 @@ void WidgetHostProcess::show(const std::shared_ptr<SharedPicture>& picture, cons
 void WidgetHostProcess::update() {
   if (!_widget || _isUpdating) return;
   setUpdating(true);
-  _widget->ask("performUpdate", json::object(), [this](const json&) { setUpdating(false); });
+  _widget->ask(protocol::kPerformUpdate, {}, [this](const auto&) { setUpdating(false); });
 }
 
 void WidgetHostProcess::setUpdating(bool updating) {
@@ -236,10 +227,12 @@ void WidgetHostProcess::setUpdating(bool updating) {
 }
 
 void WidgetHostProcess::highlightRow(std::size_t row, bool highlighted) {
-  askOfRow("highlightRow", row, {{"highlighted", highlighted}});
+  askOfRow(protocol::kHighlightRow, {.row = static_cast<std::uint32_t>(row), .highlighted = highlighted});
 }
 
-void WidgetHostProcess::selectRow(std::size_t row) { askOfRow("selectRow", row); }
+void WidgetHostProcess::selectRow(std::size_t row) {
+  askOfRow(protocol::kSelectRow, {.row = static_cast<std::uint32_t>(row)});
+}
 
 void WidgetHostProcess::decode(const Bytes& handoff,
                                std::function<void(const Outcome<protocol::Handoff>&)> completion) {
@@ -248,14 +241,12 @@ void WidgetHostProcess::decode(const Bytes& handoff,
   };
   if (!_widget && !_gaveUp) start();
   if (!_widget) return completion(failure("the widget process does not run"));
-  _widget->call(protocol::kDecode.name, protocol::write(protocol::DecodeParams{base64(handoff)}),
-                [this, failure, completion = std::move(completion)](const json& result, const auto& error) {
-                  if (error) return completion(failure(error->message));
-                  try {
-                    completion(protocol::read<protocol::Handoff>(result));
-                  } catch (const protocol::Malformed& malformed) {
-                    _widget->fail(std::string("it answers \"decode\" with nonsense: ") + malformed.what());
-                  }
+  _widget->call(protocol::kDecode, {base64(handoff)},
+                [failure, completion = std::move(completion)](const auto& result, const JSONRPCError& error) {
+                  if (result)
+                    completion(*result);
+                  else
+                    completion(failure(error.message));
                 });
 }
 

@@ -32,8 +32,8 @@ class WidgetHostProcess {
     virtual void widgetTells(const std::string& message) = 0;
     /// A fetch of the user's has begun or ended.
     virtual void widgetIsUpdating(bool updating) = 0;
-    /// Opens what a row opens (a request of docs/protocol.md); answers whether it did.
-    virtual bool widgetOpens(std::string_view method, const nlohmann::json& params) = 0;
+    /// Opens what a row opens; answers whether it did.
+    virtual bool widgetOpens(const WidgetClient::Opening& opening) = 0;
   };
 
   /// `arguments` are those of the widget program.
@@ -81,10 +81,11 @@ class WidgetHostProcess {
   void giveUp(const std::string& reason);
   void setUpConnection();
   /// A request about a row, which may be gone by now.
-  void askOfRow(std::string_view method, std::size_t row, nlohmann::json params = nlohmann::json::object());
+  template <class Params, class Result>
+  void askOfRow(const protocol::Method<Params, Result>& method, const Params& params);
   /// Tells the process what it does not know of the presentation.
   void tellPresentation();
-  void show(const std::shared_ptr<SharedPicture>& picture, const nlohmann::json& snapshot);
+  void show(const std::shared_ptr<SharedPicture>& picture, const protocol::Snapshot& snapshot);
   void setExpandedMode(bool expanded);
   void setUpdating(bool updating);
 

@@ -12,8 +12,6 @@
 
 namespace nimbo {
 
-using nlohmann::json;
-
 namespace {
 
 /// Setting: whether the user last had a row for each incident.
@@ -170,8 +168,8 @@ WidgetPresentation WidgetPage::presentation() const {
   presentation.compactHeight = WidgetPresentation::rowHeightForTextSize(preferences.textSize());
   presentation.expandedHeight = 4 * presentation.compactHeight;
   presentation.scale = get_scale_factor();
-  presentation.textSize = nameOfContentSizeCategory(preferences.textSize());
-  presentation.appearance = preferences.appearance() == Appearance::dark ? "dark" : "light";
+  presentation.textSize = preferences.textSize();
+  presentation.appearance = preferences.appearance();
   if (!preferences.locale().empty()) presentation.locale = preferences.locale();
   return presentation;
 }
@@ -211,13 +209,14 @@ void WidgetPage::widgetTells(const std::string& message) { _context.navigator.te
 
 void WidgetPage::widgetIsUpdating(bool updating) { _updating.set_spinning(updating); }
 
-bool WidgetPage::widgetOpens(std::string_view method, const json& params) {
+bool WidgetPage::widgetOpens(const WidgetClient::Opening& opening) {
   const auto request = [&]() -> Outcome<OpenRequest> {
-    if (method == "openURL") return openRequestOfURL(params.at("url").get<std::string>());
+    if (const auto* url = std::get_if<protocol::OpenURLParams>(&opening)) return openRequestOfURL(url->url);
+    const auto& activity = std::get<protocol::OpenUserActivityParams>(opening);
     std::map<std::string, Bytes, std::less<>> userInfo;
-    for (const auto& [key, text] : params.at("userInfo").items())
-      if (auto bytes = bytesFromBase64(text.get<std::string>())) userInfo.emplace(key, std::move(*bytes));
-    return openRequestOfActivity(params.at("activityType").get<std::string>(), userInfo);
+    for (const auto& [key, text] : activity.userInfo)
+      if (auto bytes = bytesFromBase64(text)) userInfo.emplace(key, std::move(*bytes));
+    return openRequestOfActivity(activity.activityType, userInfo);
   }();
   if (!request) {
     _context.navigator.tell(request.error()->reason());

@@ -40,7 +40,7 @@ class WidgetPage final : public Page, private WidgetHostProcess::Delegate {
   void widgetIsUpdating(bool updating) override;
   /// Opens what a row opens, once the widget has said as of when that is.
   void openAwaited();
-  bool widgetOpens(std::string_view method, const nlohmann::json& params) override;
+  bool widgetOpens(const WidgetClient::Opening& opening) override;
 
   const PageContext& _context;
   WidgetHostProcess _process;

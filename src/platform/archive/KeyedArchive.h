@@ -5,7 +5,7 @@
 #include <span>
 
 #include "platform/archive/SecureCoding.h"
-#include "platform/foundation/Error.h"
+#include "platform/foundation/Outcome.h"
 
 namespace nimbo {
 
@@ -41,16 +41,11 @@ class KeyedUnarchiver {
 /// Object graphs as bytes: keyed, self-describing, the same bytes for the same objects.
 class KeyedArchive {
  public:
-  struct Archived {
-    std::optional<Bytes> bytes;  ///< absent when the object cannot be archived
-    ErrorRef error;              ///< null unless it cannot
-  };
-
   virtual ~KeyedArchive() = default;
 
   /// The archive of `root`, under `kKeyedArchiveRootObjectKey`. With secure coding required, as everywhere here, every
-  /// object is a boxed value, an Error or a SecureCoding one.
-  virtual Archived archivedDataWithRootObject(const ObjectRef& root, bool requiringSecureCoding) = 0;
+  /// object is a boxed value, an Error or a SecureCoding one; an error for any other.
+  virtual Outcome<Bytes> archivedDataWithRootObject(const ObjectRef& root, bool requiringSecureCoding) = 0;
 
   /// A decoder over a copy of the bytes, or null when they are no archive.
   virtual std::unique_ptr<KeyedUnarchiver> unarchiverForReadingFromData(std::span<const std::uint8_t> bytes) = 0;

@@ -1,37 +1,9 @@
 #include "platform/ui/Environment.h"
 
 #include <algorithm>
-#include <array>
 #include <stdexcept>
 
 namespace nimbo {
-
-namespace {
-
-constexpr std::array<std::string_view, 12> kCategoryNames = {"extraSmall",
-                                                             "small",
-                                                             "medium",
-                                                             "large",
-                                                             "extraLarge",
-                                                             "extraExtraLarge",
-                                                             "extraExtraExtraLarge",
-                                                             "accessibilityMedium",
-                                                             "accessibilityLarge",
-                                                             "accessibilityExtraLarge",
-                                                             "accessibilityExtraExtraLarge",
-                                                             "accessibilityExtraExtraExtraLarge"};
-
-}  // namespace
-
-std::optional<ContentSizeCategory> contentSizeCategoryFromName(std::string_view name) {
-  const auto found = std::find(kCategoryNames.begin(), kCategoryNames.end(), name);
-  if (found == kCategoryNames.end()) return std::nullopt;
-  return static_cast<ContentSizeCategory>(found - kCategoryNames.begin());
-}
-
-std::string_view nameOfContentSizeCategory(ContentSizeCategory category) {
-  return kCategoryNames.at(static_cast<std::size_t>(category));
-}
 
 void Environment::setContentSizeCategory(ContentSizeCategory category) {
   if (category == _contentSizeCategory) return;

@@ -2,17 +2,11 @@
 
 #include <functional>
 #include <memory>
-#include <optional>
-#include <string_view>
 #include <vector>
 
 #include "platform/foundation/Presentation.h"
 
 namespace nimbo {
-
-/// "extraSmall" to "accessibilityExtraExtraExtraLarge"; absent for anything else.
-std::optional<ContentSizeCategory> contentSizeCategoryFromName(std::string_view name);
-std::string_view nameOfContentSizeCategory(ContentSizeCategory category);
 
 /// The screen and the user's preferences as views see them. One for each platform in force; main thread only.
 class Environment {

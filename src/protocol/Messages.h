@@ -1,0 +1,154 @@
+#pragma once
+
+#include <cstdint>
+#include <map>
+#include <memory>
+#include <optional>
+#include <string>
+
+#include "platform/foundation/Date.h"
+#include "platform/foundation/Geometry.h"
+#include "platform/foundation/Presentation.h"
+
+// What requests and notifications are made with and what is answered, as docs/protocol.md has them. An optional is
+// absent from the message unless it is said to stand as null. Lengths are points.
+namespace nimbo::protocol {
+
+/// Of what needs no more than its name.
+struct Nothing {};
+
+/// A program, and the one that it lives in.
+struct Bundle {
+  std::string kind;  ///< `kApplication`, `kExtension`, or any other
+  std::string identifier;
+  std::shared_ptr<Bundle> containing;  ///< null: none
+
+  static constexpr std::string_view kApplication = "application";
+  static constexpr std::string_view kExtension = "extension";
+};
+
+/// The most room that each mode gives.
+struct DisplayModes {
+  Size compact;
+  Size expanded;
+  bool operator==(const DisplayModes&) const = default;
+};
+
+struct InitializeParams {
+  std::optional<std::string> locale;
+  ContentSizeCategory textSize = ContentSizeCategory::large;
+  double scale = 1;
+  Appearance appearance = Appearance::light;
+  std::optional<DisplayModes> displayModes;
+  std::optional<WidgetDisplayMode> activeDisplayMode;
+  std::optional<Bundle> bundle;
+};
+
+struct Initialized {
+  std::string name;
+  std::string version;
+  std::int64_t protocol = 0;
+};
+
+struct UpdateResult {
+  WidgetUpdateResult updateResult = WidgetUpdateResult::NewData;
+  std::optional<std::string> reason;  ///< of a failure
+};
+
+struct ActiveDisplayModeParams {
+  WidgetDisplayMode mode = WidgetDisplayMode::Compact;
+  std::optional<Size> maximumSize;
+};
+
+struct TransitionParams {
+  Size size;
+  std::optional<DisplayModes> displayModes;
+};
+
+struct TextSizeParams {
+  ContentSizeCategory category = ContentSizeCategory::large;
+};
+
+struct AppearanceParams {
+  Appearance appearance = Appearance::light;
+};
+
+struct ScaleParams {
+  double scale = 1;
+};
+
+struct RowParams {
+  std::uint32_t section = 0;
+  std::uint32_t row = 0;
+};
+
+struct Selected {
+  bool selected = false;
+};
+
+struct HighlightParams {
+  std::uint32_t section = 0;
+  std::uint32_t row = 0;
+  bool highlighted = true;
+};
+
+struct Highlighted {
+  bool highlighted = false;
+};
+
+/// One of the two.
+struct RenderParams {
+  std::optional<std::string> path;
+  std::optional<std::string> surface;
+};
+
+struct Rendered {
+  std::int32_t width = 0;   ///< pixels
+  std::int32_t height = 0;  ///< pixels
+  std::int32_t stride = 0;  ///< bytes
+  double scale = 1;
+};
+
+struct AdvanceParams {
+  double seconds = 0;
+};
+
+struct Advanced {
+  Date now;
+};
+
+struct OpenURLParams {
+  std::string url;
+};
+
+struct OpenUserActivityParams {
+  std::string activityType;
+  std::map<std::string, std::string> userInfo;  ///< Base64 by key
+  std::optional<std::string> application;       ///< null: whichever opens it
+  bool requireUnlockPrompt = false;
+};
+
+struct Opened {
+  bool opened = false;
+  std::optional<std::string> error;
+};
+
+struct PreferredSizeParams {
+  Size size;
+};
+
+struct LargestDisplayModeParams {
+  WidgetDisplayMode mode = WidgetDisplayMode::Expanded;
+};
+
+struct NoticeParams {
+  std::string message;
+};
+
+struct LogParams {
+  std::string level;
+  std::string category;
+  std::string message;
+};
+
+}  // namespace nimbo::protocol
