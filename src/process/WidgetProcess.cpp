@@ -4,7 +4,7 @@
 #include <map>
 #include <utility>
 
-#include "desktop/drawing/Rendering.h"
+#include "desktop/drawing/DrawingPart.h"
 #include "desktop/gtfs/LineNames.h"
 #include "desktop/rpc/Base64.h"
 #include "platform/ui/SystemColors.h"
@@ -279,15 +279,15 @@ json WidgetProcess::render(const Parameters& params) {
   view.layoutIfNeeded();
   const Environment& environment = Environment::current();
   const auto draw = [&view](Painter& painter) { view.draw(painter); };
-  const CairoSurface::Made made = renderToSurface(draw, view.bounds().size(), environment.screenScale(),
-                                                  colorOf(SystemColor::background, environment.appearance()));
-  ErrorRef error = made.error;
-  if (!error) error = toSurface ? writeSharedSurface(*made.surface, path) : writePNG(*made.surface, path);
+  const auto picture = drawingPart().render(draw, view.bounds().size(), environment.screenScale(),
+                                            colorOf(SystemColor::background, environment.appearance()));
+  ErrorRef error = picture.error();
+  if (!error) error = toSurface ? writeSharedSurface(**picture, path) : (*picture)->writePNG(path);
   if (error) throw JSONRPCFailure(JSONRPCError::kDrawingFailed, error->reason());
-  return {{"width", made.surface->pixelWidth()},
-          {"height", made.surface->pixelHeight()},
-          {"stride", made.surface->stride()},
-          {"scale", made.surface->scale()}};
+  return {{"width", (*picture)->pixelWidth()},
+          {"height", (*picture)->pixelHeight()},
+          {"stride", (*picture)->stride()},
+          {"scale", (*picture)->scale()}};
 }
 
 json WidgetProcess::setAppearance(const Parameters& params) {

@@ -46,7 +46,7 @@ ICUStringTables::ICUStringTables(std::string_view locale) : _english(tableNamed(
     const std::size_t dash = name.rfind('-');
     name = name.substr(0, dash == std::string_view::npos ? 0 : dash);
   }
-  _format.emplace(table ? tag : std::string(kFallbackLanguage));
+  _languageTag = table ? tag : std::string(kFallbackLanguage);
   if (table) _table = std::move(*table);
   _isRightToLeft = stringForKey("TransitWidget_Text_Direction") == "rtl";
 }
@@ -59,6 +59,7 @@ std::optional<std::string> ICUStringTables::stringForKey(std::string_view key) c
 
 std::string ICUStringTables::format(const std::string& pattern, std::span<const FormatArgument> arguments) const {
   try {
+    if (!_format) _format = stringsPart().makePatternFormat(_languageTag);
     return _format->fill(pattern, arguments);
   } catch (const std::runtime_error& failure) {
     writeLog({kDefaultLogSubsystem, "StringTables"}, LogLevel::error, "Unable to fill the pattern %@: %@",

@@ -3,8 +3,7 @@
 #include <optional>
 #include <string>
 
-#include "desktop/raii/ICUHandles.h"
-#include "platform/foundation/Date.h"
+#include "desktop/strings/StringsPart.h"
 
 namespace nimbo {
 
@@ -21,7 +20,7 @@ class DateText {
   std::string textOfPeriod(std::optional<Date> start, std::optional<Date> end, Date now) const;
 
  private:
-  ICUDateFormat _format;  // null without one
+  std::unique_ptr<DateFormat> _format;  // null without one
 };
 
 }  // namespace nimbo
