@@ -9,7 +9,7 @@
 
 #include "desktop/drawing/CairoPainter.h"
 #include "desktop/drawing/DrawnImage.h"
-#include "desktop/drawing/VectorImageNamed.h"
+#include "desktop/drawing/VectorImage.h"
 #include "platform/ui/SystemColors.h"
 
 namespace nimbo {
@@ -130,11 +130,6 @@ void drawBadge(cairo_t* context, double width, double height) {
 
 }  // namespace
 
-void CairoShieldRenderer::setCachesIconAtlases(bool caches) {
-  _keepsSymbols = caches;
-  if (!caches) _symbols.clear();
-}
-
 ImageRef CairoShieldRenderer::render(const TransitArtwork& artwork, std::int64_t shieldSize, double screenScale,
                                      bool nightMode) {
   const Look look{shieldMetrics(shieldSize), screenScale, nightMode, artwork.hasRoutingIncidentBadge()};
@@ -196,7 +191,7 @@ ImageRef CairoShieldRenderer::renderShield(const TransitShield& shield, const Lo
 }
 
 ImageRef CairoShieldRenderer::renderSymbol(std::string_view name, const Look& look) {
-  const auto drawing = symbol(name);
+  const VectorImage* drawing = vectorImageNamed(name);
   if (!drawing) return nullptr;
   const double height = look.metrics.height;
   const ShieldColors colors = symbolColors(look.nightMode);
@@ -247,13 +242,6 @@ void CairoShieldRenderer::drawCentered(cairo_t* context, const TextLayout& text,
   const double baseline = (box.height + _text.metrics({pointSize, true}).capHeight) / 2;
   const double width = text.size().width;
   CairoPainter(context).drawText(text, {(box.width - width) / 2, baseline - text.firstBaseline()}, width, color);
-}
-
-std::shared_ptr<const VectorImage> CairoShieldRenderer::symbol(std::string_view name) {
-  if (const auto kept = _symbols.find(name); kept != _symbols.end()) return kept->second;
-  auto drawing = vectorImageNamed(name);
-  if (_keepsSymbols) _symbols.emplace(name, drawing);
-  return drawing;
 }
 
 }  // namespace nimbo
