@@ -80,8 +80,10 @@ TEST(StringTables, AnswerPatternsThatCannotBeFilled) {
   const ICUStringTables english("en");
   const std::vector<FormatArgument> arguments{std::string("A"), std::uint64_t{2}};
   EXPECT_EQ(english.format("{1, plural, one {# in {0}} other {# in {0}}}", arguments), "2 in A");
+  // What is not given stays; what ICU quotes, it quotes.
+  EXPECT_EQ(english.format("it's {1} '{0}' {0} {2}", std::span(arguments).first(1)), "it's {1} {0} A {2}");
   for (const std::string pattern :
-       {"{", "{0", "{x}", "{0, plural, other {#}}", "{1, plural}", "{1, plural, one {#}}", "{1, plural, other {#}"}) {
+       {"{", "{0", "{0, plural, other {#}}", "{1, plural}", "{1, plural, one {#}}", "{1, plural, other {#}"}) {
     const TestPlatform platform;
     EXPECT_EQ(english.format(pattern, arguments), pattern);
     EXPECT_EQ(platform.log.lines().size(), 1u) << pattern;
