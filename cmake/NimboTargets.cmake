@@ -43,7 +43,7 @@ function(nimbo_part name)
 
   set(exports ${CMAKE_CURRENT_BINARY_DIR}/${part}.exports)
   add_custom_command(OUTPUT ${exports} DEPENDS ${part} VERBATIM
-    COMMAND sh -c "$1 -D --undefined-only --just-symbols $2 | sed -n 's/.*5nimbo.*/-Wl,-u,&,--export-dynamic-symbol=&/p' >$3"
+    COMMAND sh -c "$1 -D --undefined-only -j $2 | sed -n 's/.*5nimbo.*/-Wl,-u,&,--export-dynamic-symbol=&/p' >$3"
       exports ${CMAKE_NM} $<TARGET_FILE:${part}> ${exports})
   add_custom_target(${part}_exports DEPENDS ${exports})
   target_link_options(nimbo_desktop INTERFACE @${exports})
