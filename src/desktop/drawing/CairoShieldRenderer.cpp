@@ -75,10 +75,6 @@ std::string plainText(const ServerFormattedString& string) {
 /// The next length at which a right edge is as sharp as the left one.
 double wholePixels(double length, double screenScale) { return std::ceil(length * screenScale - 1e-6) / screenScale; }
 
-void setColor(cairo_t* context, const Color& color) {
-  cairo_set_source_rgba(context, color.red, color.green, color.blue, color.alpha);
-}
-
 void addRoundedBox(cairo_t* context, const Rect& box, double radius) {
   constexpr double kQuarter = std::numbers::pi / 2;
   cairo_new_sub_path(context);

@@ -5,6 +5,7 @@
 #include <algorithm>
 #include <numbers>
 
+#include "desktop/drawing/DrawnImage.h"
 #include "platform/foundation/Log.h"
 
 namespace nimbo {
@@ -46,10 +47,7 @@ void VectorImage::draw(cairo_t* context, const Rect& rect, const Color& currentC
           break;
       }
     }
-    const auto setPaint = [&](const Paint& paint) {
-      const Color& color = paint.color ? *paint.color : currentColor;
-      cairo_set_source_rgba(context, color.red, color.green, color.blue, color.alpha);
-    };
+    const auto setPaint = [&](const Paint& paint) { setColor(context, paint.color.value_or(currentColor)); };
     cairo_set_fill_rule(context, shape.fillsEvenOdd ? CAIRO_FILL_RULE_EVEN_ODD : CAIRO_FILL_RULE_WINDING);
     if (shape.fill.isUsed) {
       setPaint(shape.fill);
