@@ -4,9 +4,9 @@
 #include <string>
 
 #include "desktop/drawing/Picture.h"
-#include "desktop/gtfs/Outcome.h"
 #include "platform/artwork/ArtworkCache.h"
 #include "platform/artwork/NamedImage.h"
+#include "platform/foundation/Outcome.h"
 #include "platform/ui/Painter.h"
 #include "platform/ui/TextSystem.h"
 
