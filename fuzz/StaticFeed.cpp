@@ -4,8 +4,8 @@
 #include <unistd.h>
 
 #include "Fuzz.h"
+#include "desktop/gtfs/FeedsPart.h"
 #include "desktop/gtfs/StaticFeedReader.h"
-#include "desktop/gtfs/ZipFeedFiles.h"
 
 namespace nimbo {
 
@@ -57,7 +57,7 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size
   if (text.starts_with("PK")) {
     const FileDescriptor file(::memfd_create("feed.zip", MFD_CLOEXEC));
     require(::write(file.get(), data, size) == static_cast<ssize_t>(size), "there is memory");
-    if (const auto zip = ZipFeedFiles::open(file, "fuzz")) bytesOf(**zip);
+    if (const auto zip = openZippedFeed(file, "fuzz")) bytesOf(**zip);
     return 0;
   }
   Tables whole(text, size + 1), pieces(text, 3);

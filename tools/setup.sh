@@ -9,7 +9,7 @@ packages=(
   g++ cmake ninja-build pkg-config ccache
   libglib2.0-dev libsqlite3-dev libcurl4-openssl-dev libprotozero-dev libzip-dev libcsv-dev libicu-dev
   nlohmann-json3-dev libcli11-dev libpango1.0-dev libcairo2-dev libfontconfig-dev libbz2-dev libsystemd-dev
-  libgtkmm-4.0-dev fonts-dejavu-core ca-certificates
+  libseccomp-dev libgtkmm-4.0-dev fonts-dejavu-core ca-certificates
 )
 case $purpose in
   run) ;;

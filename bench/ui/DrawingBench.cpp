@@ -5,7 +5,7 @@
 
 #include <cstdlib>
 
-#include "desktop/drawing/Rendering.h"
+#include "desktop/drawing/DrawingPart.h"
 #include "peers/BareRows.h"
 #include "platform/Platform.h"
 #include "platform/ui/Environment.h"
@@ -39,9 +39,9 @@ class Rows {
   void draw() {
     _view->layoutIfNeeded();
     const auto draw = [this](Painter& painter) { _view->draw(painter); };
-    const auto made =
-        renderToSurface(draw, _view->bounds().size(), 1, colorOf(SystemColor::background, Appearance::light));
-    benchmark::DoNotOptimize((*made)->pixels().data());
+    const auto picture =
+        drawingPart().render(draw, _view->bounds().size(), 1, colorOf(SystemColor::background, Appearance::light));
+    benchmark::DoNotOptimize((*picture)->pixels().data());
   }
 
   void layOut(double rowHeight) {

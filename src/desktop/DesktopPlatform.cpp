@@ -4,7 +4,6 @@
 #include <cstdlib>
 #include <sstream>
 
-#include "desktop/drawing/CairoShieldRenderer.h"
 #include "desktop/gtfs/FeedConfiguration.h"
 #include "desktop/gtfs/SampleCity.h"
 
@@ -78,27 +77,26 @@ DesktopPlatform::DesktopPlatform(Options options)
       _favoritesEditor(_database, [folder = _paths.config] { return firstFavorites(folder); }),
       _favorites(_favoritesEditor, _transitLines),
       _memoryPressure(options.runLoop),
-      _text(languageTag(_locale)),
-      _platform(std::make_unique<Platform>(
-          PlatformServices{.clock = _clock,
-                           .mainRunLoop = options.runLoop,
-                           .log = *_log,
-                           .signposts = *_log,
-                           .random = _random,
-                           .strings = _strings,
-                           .sharedSettings = _sharedSettings,
-                           .favorites = _favorites,
-                           .transitLines = _favorites,
-                           .network = _network,
-                           .memoryPressure = _memoryPressure,
-                           .activityLauncher = options.activityLauncher,
-                           .analytics = _analytics,
-                           .deviceLockState = _deviceLockState,
-                           .archive = _archive,
-                           .compressor = _compressor,
-                           .images = _images,
-                           .text = _text,
-                           .shieldRenderer = std::make_shared<CairoShieldRenderer>(_text)})) {
+      _drawing(std::make_shared<LateDrawing>(languageTag(_locale))),
+      _platform(std::make_unique<Platform>(PlatformServices{.clock = _clock,
+                                                            .mainRunLoop = options.runLoop,
+                                                            .log = *_log,
+                                                            .signposts = *_log,
+                                                            .random = _random,
+                                                            .strings = _strings,
+                                                            .sharedSettings = _sharedSettings,
+                                                            .favorites = _favorites,
+                                                            .transitLines = _favorites,
+                                                            .network = _network,
+                                                            .memoryPressure = _memoryPressure,
+                                                            .activityLauncher = options.activityLauncher,
+                                                            .analytics = _analytics,
+                                                            .deviceLockState = _deviceLockState,
+                                                            .archive = _archive,
+                                                            .compressor = _compressor,
+                                                            .images = *_drawing,
+                                                            .text = *_drawing,
+                                                            .shieldRenderer = _drawing})) {
   _transitLines.setLanguage(languageTag(_locale));
 }
 

@@ -6,8 +6,7 @@
 
 #include "desktop/archive/Bzip2.h"
 #include "desktop/archive/CBORKeyedArchive.h"
-#include "desktop/drawing/CairoImageResources.h"
-#include "desktop/drawing/PangoTextSystem.h"
+#include "desktop/drawing/LateDrawing.h"
 #include "desktop/gtfs/GTFSTransitLineService.h"
 #include "desktop/store/FavoritesEditor.h"
 #include "desktop/store/GuardedFavorites.h"
@@ -78,8 +77,7 @@ class DesktopPlatform {
   SoftLinkedDeviceLockState _deviceLockState;
   CBORKeyedArchive _archive;
   Bzip2Compressor _compressor;
-  CairoImageResources _images;
-  PangoTextSystem _text;
+  std::shared_ptr<LateDrawing> _drawing;
   std::unique_ptr<Platform> _platform;
 };
 

@@ -1,36 +1,21 @@
 #include "process/Sandbox.h"
 
-#include <linux/audit.h>
-#include <linux/filter.h>
-#include <linux/seccomp.h>
 #include <sched.h>
+#include <seccomp.h>
 #include <sys/ioctl.h>
 #include <sys/prctl.h>
 #include <sys/socket.h>
-#include <sys/syscall.h>
 #include <unistd.h>
 
+#include <algorithm>
 #include <cerrno>
-#include <cstddef>
+#include <memory>
 #include <string>
 #include <system_error>
-#include <vector>
 
 namespace nimbo {
 
 namespace {
-
-// A filter of classic BPF (seccomp(2)), made here: a library would take longer to load than the filter to install.
-
-#if defined(__x86_64__)
-constexpr std::uint32_t kMachine = AUDIT_ARCH_X86_64;
-#elif defined(__aarch64__)
-constexpr std::uint32_t kMachine = AUDIT_ARCH_AARCH64;
-#elif defined(__riscv) && __riscv_xlen == 64
-constexpr std::uint32_t kMachine = AUDIT_ARCH_RISCV64;
-#else
-constexpr std::uint32_t kMachine = 0;  // its numbers of system calls have not been looked at
-#endif
 
 #if defined(__SANITIZE_ADDRESS__)
 constexpr bool kIsTraced = true;  // looking for leaks, the sanitizer traces the process from a copy of it
@@ -38,103 +23,121 @@ constexpr bool kIsTraced = true;  // looking for leaks, the sanitizer traces the
 constexpr bool kIsTraced = false;
 #endif
 
-constexpr std::uint32_t kAllow = SECCOMP_RET_ALLOW;
-constexpr std::uint32_t kRefuse = SECCOMP_RET_ERRNO | EPERM;
+#if defined(__s390__)
+constexpr unsigned kCloneFlags = 1;  // the argument of clone that holds them
+#else
+constexpr unsigned kCloneFlags = 0;
+#endif
 
-/// A program of classic BPF over a system call: seccomp(2).
+/// A filter of system calls that allows what is not refused. The kernel reads most arguments as 32 bits, and the upper
+/// half of a register may hold anything: they are compared without it.
 class Filter {
  public:
-  void load(std::size_t offset) { add(BPF_LD | BPF_W | BPF_ABS, static_cast<std::uint32_t>(offset)); }
-  /// The lower half of an argument, which comes first on these machines.
-  void loadArgument(std::size_t index) { load(offsetof(seccomp_data, args) + 8 * index); }
-  void answer(std::uint32_t action) { add(BPF_RET | BPF_K, action); }
-  /// `then` is for values of which the comparison (BPF_JEQ, BPF_JGE, BPF_JSET) with `operand` holds.
-  template <class Then>
-  void when(std::uint16_t comparison, std::uint32_t operand, Then then) {
-    const std::size_t jump = _code.size();
-    add(BPF_JMP | BPF_K | comparison, operand);
-    then();
-    _code[jump].jf = static_cast<std::uint8_t>(_code.size() - jump - 1);
-  }
-  void answerWhen(std::uint16_t comparison, std::uint32_t operand, std::uint32_t action) {
-    when(comparison, operand, [&] { answer(action); });
-  }
-  void answerUnlessEqual(std::uint32_t value, std::uint32_t action) {
-    add(BPF_JMP | BPF_K | BPF_JEQ, value, 1);
-    answer(action);
+  Filter() : _context(::seccomp_init(SCMP_ACT_ALLOW)) {
+    if (!_context) _failure = ENOMEM;
+    // Calls by the numbers of another machine, such as those of 32 bits.
+    keepFailure(::seccomp_attr_set(_context.get(), SCMP_FLTATR_ACT_BADARCH, SCMP_ACT_ERRNO(EPERM)));
   }
 
-  bool install() {
-    const sock_fprog program{static_cast<unsigned short>(_code.size()), _code.data()};
-    return ::prctl(PR_SET_SECCOMP, SECCOMP_MODE_FILTER, &program) == 0;
+  void refuse(std::initializer_list<int> calls, int error = EPERM) {
+    const auto action = SCMP_ACT_ERRNO(static_cast<unsigned>(error));
+    for (const int call : calls) keepFailure(::seccomp_rule_add_array(_context.get(), action, call, 0, nullptr));
+  }
+  void refuseWhereEqual(int call, unsigned argument, std::uint32_t value) {
+    refuseWhereBitsAre(call, argument, ~0u, value);
+  }
+  void refuseUnlessEqual(int call, unsigned argument, std::uint32_t value) {
+    for (std::uint32_t bit = 1; bit != 0; bit <<= 1) refuseWhereBitsAre(call, argument, bit, ~value & bit);
+  }
+  /// Of the values below 32 only these pass.
+  void refuseUnlessAmong(int call, unsigned argument, std::initializer_list<std::uint32_t> values) {
+    constexpr std::uint32_t kEnd = 32;
+    for (std::uint32_t value = 0; value < kEnd; ++value)
+      if (std::find(values.begin(), values.end(), value) == values.end()) refuseWhereEqual(call, argument, value);
+    for (std::uint32_t bit = kEnd; bit != 0; bit <<= 1) refuseWhereBitsAre(call, argument, bit, bit);
+  }
+  void refuseWhereBitsAre(int call, unsigned argument, std::uint32_t mask, std::uint32_t bits) {
+    const scmp_arg_cmp comparison{argument, SCMP_CMP_MASKED_EQ, mask, bits};
+    keepFailure(::seccomp_rule_add_array(_context.get(), SCMP_ACT_ERRNO(EPERM), call, 1, &comparison));
+  }
+
+  /// The errno value of what went wrong first; 0 when the filter is in force.
+  int install() {
+    keepFailure(_failure == 0 ? ::seccomp_load(_context.get()) : 0);
+    return _failure;
   }
 
  private:
-  void add(std::uint16_t code, std::uint32_t operand, std::uint8_t skippedWhenTrue = 0) {
-    _code.push_back({code, skippedWhenTrue, 0, operand});
+  struct Releaser {
+    void operator()(void* context) const { ::seccomp_release(context); }
+  };
+  void keepFailure(int code) {
+    if (_failure == 0 && code < 0) _failure = -code;
   }
-  std::vector<sock_filter> _code;
+
+  std::unique_ptr<void, Releaser> _context;
+  int _failure = 0;
 };
 
-Filter makeFilter() {
-  constexpr std::uint32_t kOtherNumbering = 0x40000000;  // of x32 programs
+int installFilter() {
   Filter filter;
-  const auto refuse = [&](std::initializer_list<std::uint32_t> calls) {
-    for (const std::uint32_t call : calls) filter.answerWhen(BPF_JEQ, call, kRefuse);
-  };
-  // Of this system call only those pass of which an argument compares so.
-  const auto passWhen = [&](std::uint32_t call, std::size_t argument, std::uint16_t comparison,
-                            std::initializer_list<std::uint32_t> operands) {
-    filter.when(BPF_JEQ, call, [&] {
-      filter.loadArgument(argument);
-      for (const std::uint32_t operand : operands) filter.answerWhen(comparison, operand, kAllow);
-      filter.answer(kRefuse);
-    });
-  };
-  filter.load(offsetof(seccomp_data, arch));
-  filter.answerUnlessEqual(kMachine, kRefuse);
-  filter.load(offsetof(seccomp_data, nr));
-  filter.answerWhen(BPF_JGE, kOtherNumbering, kRefuse);
   // programs
-  refuse({SYS_execve, SYS_execveat});
+  filter.refuse({SCMP_SYS(execve), SCMP_SYS(execveat), SCMP_SYS(fork), SCMP_SYS(vfork)});
   // other processes
-  refuse({SYS_kill, SYS_tkill, SYS_rt_sigqueueinfo, SYS_rt_tgsigqueueinfo, SYS_pidfd_getfd, SYS_pidfd_send_signal,
-          SYS_process_vm_readv, SYS_process_vm_writev, SYS_process_madvise, SYS_kcmp});
+  filter.refuse({SCMP_SYS(kill), SCMP_SYS(tkill), SCMP_SYS(rt_sigqueueinfo), SCMP_SYS(rt_tgsigqueueinfo),
+                 SCMP_SYS(pidfd_getfd), SCMP_SYS(pidfd_send_signal), SCMP_SYS(process_vm_readv),
+                 SCMP_SYS(process_vm_writev), SCMP_SYS(process_madvise), SCMP_SYS(kcmp)});
   // namespaces and mounts
-  refuse({SYS_unshare, SYS_setns, SYS_mount, SYS_umount2, SYS_pivot_root, SYS_chroot, SYS_move_mount, SYS_open_tree,
-          SYS_fsopen, SYS_fsconfig, SYS_fsmount, SYS_fspick, SYS_open_by_handle_at, SYS_swapon, SYS_swapoff});
+  filter.refuse({SCMP_SYS(unshare), SCMP_SYS(setns), SCMP_SYS(mount), SCMP_SYS(umount2), SCMP_SYS(pivot_root),
+                 SCMP_SYS(chroot), SCMP_SYS(move_mount), SCMP_SYS(open_tree), SCMP_SYS(fsopen), SCMP_SYS(fsconfig),
+                 SCMP_SYS(fsmount), SCMP_SYS(fspick), SCMP_SYS(open_by_handle_at), SCMP_SYS(swapon),
+                 SCMP_SYS(swapoff)});
   // the kernel
-  refuse({SYS_init_module, SYS_finit_module, SYS_delete_module, SYS_kexec_load, SYS_reboot, SYS_bpf,
-          SYS_perf_event_open, SYS_userfaultfd, SYS_io_uring_setup, SYS_io_uring_enter, SYS_io_uring_register,
-          SYS_fanotify_init, SYS_syslog, SYS_acct, SYS_quotactl, SYS_personality});
+  filter.refuse({SCMP_SYS(init_module),
+                 SCMP_SYS(finit_module),
+                 SCMP_SYS(delete_module),
+                 SCMP_SYS(kexec_load),
+                 SCMP_SYS(kexec_file_load),
+                 SCMP_SYS(iopl),
+                 SCMP_SYS(ioperm),
+                 SCMP_SYS(modify_ldt),
+                 SCMP_SYS(reboot),
+                 SCMP_SYS(bpf),
+                 SCMP_SYS(perf_event_open),
+                 SCMP_SYS(userfaultfd),
+                 SCMP_SYS(io_uring_setup),
+                 SCMP_SYS(io_uring_enter),
+                 SCMP_SYS(io_uring_register),
+                 SCMP_SYS(fanotify_init),
+                 SCMP_SYS(syslog),
+                 SCMP_SYS(acct),
+                 SCMP_SYS(quotactl),
+                 SCMP_SYS(personality)});
   // keys, users, the clock, the machine's name
-  refuse({SYS_add_key, SYS_request_key, SYS_keyctl, SYS_setuid, SYS_setgid, SYS_setreuid, SYS_setregid, SYS_setresuid,
-          SYS_setresgid, SYS_setgroups, SYS_setfsuid, SYS_setfsgid, SYS_capset, SYS_settimeofday, SYS_clock_settime,
-          SYS_adjtimex, SYS_clock_adjtime, SYS_sethostname, SYS_setdomainname});
+  filter.refuse({SCMP_SYS(add_key), SCMP_SYS(request_key), SCMP_SYS(keyctl), SCMP_SYS(setuid), SCMP_SYS(setgid),
+                 SCMP_SYS(setreuid), SCMP_SYS(setregid), SCMP_SYS(setresuid), SCMP_SYS(setresgid), SCMP_SYS(setgroups),
+                 SCMP_SYS(setfsuid), SCMP_SYS(setfsgid), SCMP_SYS(capset), SCMP_SYS(settimeofday),
+                 SCMP_SYS(clock_settime), SCMP_SYS(adjtimex), SCMP_SYS(clock_adjtime), SCMP_SYS(sethostname),
+                 SCMP_SYS(setdomainname)});
+  // the same, by the names that they have on machines of 32 bits
+  filter.refuse({SCMP_SYS(umount), SCMP_SYS(setuid32), SCMP_SYS(setgid32), SCMP_SYS(setreuid32), SCMP_SYS(setregid32),
+                 SCMP_SYS(setresuid32), SCMP_SYS(setresgid32), SCMP_SYS(setgroups32), SCMP_SYS(setfsuid32),
+                 SCMP_SYS(setfsgid32), SCMP_SYS(stime), SCMP_SYS(clock_settime64), SCMP_SYS(clock_adjtime64)});
   // connections from outside
-  refuse({SYS_listen, SYS_accept, SYS_accept4});
-#if defined(__x86_64__)
-  refuse({SYS_fork, SYS_vfork, SYS_iopl, SYS_ioperm, SYS_modify_ldt, SYS_kexec_file_load});
-#endif
-  passWhen(SYS_tgkill, 0, BPF_JEQ, {static_cast<std::uint32_t>(::getpid())});
-  passWhen(SYS_socket, 0, BPF_JEQ, {AF_UNIX, AF_INET, AF_INET6, AF_NETLINK});
-  filter.when(BPF_JEQ, SYS_ioctl, [&] {
-    filter.loadArgument(1);
-    filter.answerUnlessEqual(TIOCSTI, kAllow);
-    filter.answer(kRefuse);
-  });
+  filter.refuse({SCMP_SYS(listen), SCMP_SYS(accept), SCMP_SYS(accept4)});
+  filter.refuseUnlessEqual(SCMP_SYS(tgkill), 0, static_cast<std::uint32_t>(::getpid()));
+  filter.refuseUnlessAmong(SCMP_SYS(socket), 0, {AF_UNIX, AF_INET, AF_INET6, AF_NETLINK});
+  filter.refuseWhereEqual(SCMP_SYS(ioctl), 1, TIOCSTI);
   if (!kIsTraced) {
-    filter.answerWhen(BPF_JEQ, SYS_ptrace, kRefuse);
+    filter.refuse({SCMP_SYS(ptrace)});
     // Threads may come, processes may not. Where clone3 is missing, the C library makes its threads with clone.
-    filter.answerWhen(BPF_JEQ, SYS_clone3, SECCOMP_RET_ERRNO | ENOSYS);
-    passWhen(SYS_clone, 0, BPF_JSET, {CLONE_THREAD});
+    filter.refuse({SCMP_SYS(clone3)}, ENOSYS);
+    filter.refuseWhereBitsAre(SCMP_SYS(clone), kCloneFlags, CLONE_THREAD, 0);
   }
-  filter.answer(kAllow);
-  return filter;
+  return filter.install();
 }
 
-ErrorRef refusal(const char* what) {
-  const int code = errno;
+ErrorRef refusal(const char* what, int code) {
   return Error::errorWithDomain_code_reason(std::string(kSandboxErrorDomain), code,
                                             std::string("This system does not let a program give up ") + what + ": " +
                                                 std::generic_category().message(code) + ".");
@@ -144,9 +147,8 @@ ErrorRef refusal(const char* what) {
 
 ErrorRef giveUpPrivileges() {
   ::close_range(STDERR_FILENO + 1, ~0u, 0);  // an older kernel closes nothing
-  if (::prctl(PR_SET_NO_NEW_PRIVS, 1, 0, 0, 0) != 0) return refusal("gaining privileges");
-  errno = ENOSYS;
-  if (kMachine == 0 || !makeFilter().install()) return refusal("system calls");
+  if (::prctl(PR_SET_NO_NEW_PRIVS, 1, 0, 0, 0) != 0) return refusal("gaining privileges", errno);
+  if (const int code = installFilter()) return refusal("system calls", code);
   return nullptr;
 }
 

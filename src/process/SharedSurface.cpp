@@ -10,13 +10,13 @@
 
 namespace nimbo {
 
-ErrorRef writeSharedSurface(const CairoSurface& surface, const std::filesystem::path& path) {
+ErrorRef writeSharedSurface(const Picture& picture, const std::filesystem::path& path) {
   const auto failure = [&] {
     return Error::errorWithDomain_code_reason(std::string(kDrawingErrorDomain), kDrawingErrorNotDrawn,
                                               "cannot draw into " + path.native() + ": " + std::strerror(errno));
   };
   const FileDescriptor file(::open(path.c_str(), O_RDWR | O_CLOEXEC));
-  const auto pixels = surface.pixels();
+  const auto pixels = picture.pixels();
   if (!file || ::ftruncate(file.get(), static_cast<off_t>(pixels.size())) != 0) return failure();
   for (std::size_t written = 0; written < pixels.size();) {
     const ssize_t count =

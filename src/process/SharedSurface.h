@@ -2,13 +2,12 @@
 
 #include <filesystem>
 
-#include "desktop/drawing/CairoSurface.h"
-#include "platform/foundation/Error.h"
+#include "desktop/drawing/Picture.h"
 
 namespace nimbo {
 
 /// Puts a picture's pixels, row by row, into a file that the host made for them (memory that both share, such as
 /// "/proc/PID/fd/N"), which takes the size of the picture. Null on success.
-ErrorRef writeSharedSurface(const CairoSurface& surface, const std::filesystem::path& path);
+ErrorRef writeSharedSurface(const Picture& picture, const std::filesystem::path& path);
 
 }  // namespace nimbo

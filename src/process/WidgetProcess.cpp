@@ -3,7 +3,7 @@
 #include <algorithm>
 #include <utility>
 
-#include "desktop/drawing/Rendering.h"
+#include "desktop/drawing/DrawingPart.h"
 #include "desktop/gtfs/LineNames.h"
 #include "desktop/rpc/Base64.h"
 #include "platform/ui/SystemColors.h"
@@ -269,13 +269,14 @@ protocol::Rendered WidgetProcess::render(const protocol::RenderParams& params) {
   view.layoutIfNeeded();
   const Environment& environment = Environment::current();
   const auto draw = [&view](Painter& painter) { view.draw(painter); };
-  const auto made = renderToSurface(draw, view.bounds().size(), environment.screenScale(),
-                                    colorOf(SystemColor::background, environment.appearance()));
-  ErrorRef error = made.error();
-  if (made) error = params.surface ? writeSharedSurface(**made, *params.surface) : writePNG(**made, *params.path);
+  const auto picture = drawingPart().render(draw, view.bounds().size(), environment.screenScale(),
+                                            colorOf(SystemColor::background, environment.appearance()));
+  ErrorRef error = picture.error();
+  if (!error)
+    error = params.surface ? writeSharedSurface(**picture, *params.surface) : (*picture)->writePNG(*params.path);
   if (error) throw JSONRPCFailure(JSONRPCError::kDrawingFailed, error->reason());
-  const CairoSurface& surface = **made;
-  return {surface.pixelWidth(), surface.pixelHeight(), surface.stride(), surface.scale()};
+  const Picture& drawn = **picture;
+  return {drawn.pixelWidth(), drawn.pixelHeight(), drawn.stride(), drawn.scale()};
 }
 
 protocol::Nothing WidgetProcess::setAppearance(const protocol::AppearanceParams& params) {

@@ -7,7 +7,7 @@
 #include <csignal>
 #include <cstdio>
 
-#include "desktop/drawing/PangoTextSystem.h"
+#include "desktop/drawing/DrawingPart.h"
 #include "desktop/system/SmallMemory.h"
 #include "process/Sandbox.h"
 #include "process/WidgetProcess.h"
@@ -52,8 +52,8 @@ int main(int argc, char** argv) {
     std::perror("nimbo-transit-widget: standard output");
     return 1;
   }
-  nimbo::PangoTextSystem::lookForFonts();
   try {
+    nimbo::drawingPart().lookForFonts();
     return nimbo::WidgetProcess(std::move(options), STDIN_FILENO, output).run();
   } catch (const std::exception& exception) {
     std::fprintf(stderr, "nimbo-transit-widget: %s\n", exception.what());

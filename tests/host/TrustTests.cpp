@@ -8,6 +8,7 @@
 #include <sys/ioctl.h>
 #include <sys/socket.h>
 #include <sys/stat.h>
+#include <sys/syscall.h>
 #include <sys/wait.h>
 #include <unistd.h>
 
@@ -84,6 +85,12 @@ TEST(Trust, OfTheWidgetProcessIsGivenUp) {
         holds = holds && isRefused(::execv("/bin/true", none)) && isRefused(::kill(1, 0)) &&
                 isRefused(::socket(AF_PACKET, SOCK_RAW, 0)) && isRefused(::unshare(CLONE_NEWUSER)) &&
                 isRefused(::ioctl(0, TIOCSTI, "x")) && (kMayFork || isRefused(::fork()));
+        // The kernel reads the lower half of these arguments alone.
+        constexpr long kUpperHalf = 1L << 32;
+        holds = holds && ::raise(0) == 0 && ::syscall(SYS_socket, kUpperHalf | AF_UNIX, SOCK_STREAM, 0) >= 0 &&
+                isRefused(::syscall(SYS_socket, kUpperHalf | AF_PACKET, SOCK_RAW, 0)) &&
+                isRefused(::syscall(SYS_socket, AF_VSOCK, SOCK_STREAM, 0)) &&
+                isRefused(::syscall(SYS_ioctl, 0, kUpperHalf | TIOCSTI, "x"));
         std::thread([] {}).join();
         ::_exit(holds ? 0 : 1);
       },

@@ -1,7 +1,7 @@
 #include "desktop/drawing/CairoImageResources.h"
 
 #include "desktop/drawing/DrawnImage.h"
-#include "desktop/drawing/VectorImageNamed.h"
+#include "desktop/drawing/VectorImage.h"
 #include "platform/ui/SystemColors.h"
 
 namespace nimbo {
@@ -12,8 +12,8 @@ ImageRef CairoImageResources::image(std::string_view name, double screenScale, b
   if (_images.size() > kMaximumKept) _images.clear();
   const auto [entry, isNew] = _images.try_emplace({std::string(name), screenScale, nightMode});
   if (!isNew) return entry->second;
-  if (const auto drawing = vectorImageNamed(name)) {
-    const Size size = drawing->size();
+  if (const VectorImage* drawing = vectorImageNamed(name)) {
+    const Size size = drawing->size;
     entry->second = drawImage(size, screenScale, [&](cairo_t* context) {
       drawing->draw(context, {0, 0, size.width, size.height},
                     colorOf(SystemColor::label, nightMode ? Appearance::dark : Appearance::light));

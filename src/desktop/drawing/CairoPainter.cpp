@@ -7,15 +7,12 @@
 #include <stdexcept>
 
 #include "desktop/drawing/CairoImage.h"
+#include "desktop/drawing/DrawnImage.h"
 #include "desktop/drawing/PangoTextLayout.h"
 
 namespace nimbo {
 
 namespace {
-
-void setColor(cairo_t* context, const Color& color) {
-  cairo_set_source_rgba(context, color.red, color.green, color.blue, color.alpha);
-}
 
 /// The nearest corner of a device pixel.
 Point onPixel(cairo_t* context, Point point) {

@@ -8,7 +8,7 @@
 
 #include "desktop/drawing/CairoPainter.h"
 #include "desktop/drawing/DrawnImage.h"
-#include "desktop/drawing/VectorImageNamed.h"
+#include "desktop/drawing/VectorImage.h"
 #include "platform/ui/SystemColors.h"
 
 namespace nimbo {
@@ -78,10 +78,6 @@ constexpr double kTightPadding = 0.5, kMostCondensed = 0.75;
 /// The next length at which a right edge is as sharp as the left one.
 double wholePixels(double length, double screenScale) { return std::ceil(length * screenScale - 1e-6) / screenScale; }
 
-void setColor(cairo_t* context, const Color& color) {
-  cairo_set_source_rgba(context, color.red, color.green, color.blue, color.alpha);
-}
-
 void addRoundedBox(cairo_t* context, const Rect& box, double radius) {
   constexpr double kQuarter = std::numbers::pi / 2;
   cairo_new_sub_path(context);
@@ -132,11 +128,6 @@ void drawBadge(cairo_t* context, double width, double height) {
 }
 
 }  // namespace
-
-void CairoShieldRenderer::setCachesIconAtlases(bool caches) {
-  _keepsSymbols = caches;
-  if (!caches) _symbols.clear();
-}
 
 ImageRef CairoShieldRenderer::render(const TransitArtwork& artwork, std::int64_t shieldSize, double screenScale,
                                      bool nightMode) {
@@ -201,7 +192,7 @@ ImageRef CairoShieldRenderer::renderShield(const TransitShield& shield, const Lo
 }
 
 ImageRef CairoShieldRenderer::renderSymbol(std::string_view name, const Look& look) {
-  const auto drawing = symbol(name);
+  const VectorImage* drawing = vectorImageNamed(name);
   if (!drawing) return nullptr;
   const double height = look.metrics.height;
   const ShieldColors colors = symbolColors(look.nightMode);
@@ -269,13 +260,6 @@ void CairoShieldRenderer::drawCentered(cairo_t* context, const FittedText& text,
   cairo_scale(context, text.condensed, 1);
   CairoPainter(context).drawText(*text.layout, {0, 0}, text.layout->size().width, color);
   cairo_restore(context);
-}
-
-std::shared_ptr<const VectorImage> CairoShieldRenderer::symbol(std::string_view name) {
-  if (const auto kept = _symbols.find(name); kept != _symbols.end()) return kept->second;
-  auto drawing = vectorImageNamed(name);
-  if (_keepsSymbols) _symbols.emplace(name, drawing);
-  return drawing;
 }
 
 }  // namespace nimbo

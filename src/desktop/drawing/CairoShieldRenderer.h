@@ -1,14 +1,12 @@
 #pragma once
 
 #include <functional>
-#include <map>
 #include <memory>
 #include <optional>
 #include <string>
 #include <string_view>
 
 #include "desktop/drawing/ShieldStyle.h"
-#include "desktop/drawing/VectorImage.h"
 #include "desktop/raii/CairoHandles.h"
 #include "platform/artwork/ArtworkCache.h"
 #include "platform/ui/TextSystem.h"
@@ -16,14 +14,14 @@
 namespace nimbo {
 
 /// Draws shields as rounded boxes, circles and pills with their text fitted, and modes of transport as symbols; as
-/// CairoImages. The kept icons are the parsed symbols.
+/// CairoImages. No icons are kept: they are parts of the program.
 class CairoShieldRenderer final : public ShieldIconRenderer {
  public:
   /// `text` is the platform's, outlives the renderer, and lays out for the same painters.
   explicit CairoShieldRenderer(TextSystem& text) : _text(text) {}
 
   ImageRef render(const TransitArtwork& artwork, std::int64_t shieldSize, double screenScale, bool nightMode) override;
-  void setCachesIconAtlases(bool caches) override;
+  void setCachesIconAtlases(bool) override {}
 
  private:
   /// How one artwork is to be drawn.
@@ -58,11 +56,8 @@ class CairoShieldRenderer final : public ShieldIconRenderer {
   double circleTextWidth(const ShieldMetrics& metrics) const;
   /// Centres the capital letters in a box at the origin.
   void drawCentered(cairo_t* context, const FittedText& text, Size box, const Color& color) const;
-  std::shared_ptr<const VectorImage> symbol(std::string_view name);
 
   TextSystem& _text;
-  bool _keepsSymbols = true;
-  std::map<std::string, std::shared_ptr<const VectorImage>, std::less<>> _symbols;
 };
 
 }  // namespace nimbo

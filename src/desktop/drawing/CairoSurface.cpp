@@ -3,8 +3,11 @@
 #include <cairo.h>
 
 #include <algorithm>
+#include <cerrno>
 #include <cmath>
 #include <cstdio>
+
+#include "desktop/system/AtomicFile.h"
 
 namespace nimbo {
 
@@ -52,6 +55,24 @@ std::span<const std::uint8_t> CairoSurface::pixels() const {
   cairo_surface_flush(get());
   return {cairo_image_surface_get_data(get()),
           static_cast<std::size_t>(stride()) * static_cast<std::size_t>(pixelHeight())};
+}
+
+ErrorRef CairoSurface::writePNG(const std::filesystem::path& path) const {
+  // A folder that is missing is a slip of the hand, not a wish for one.
+  std::error_code ignored;
+  if (const auto folder = path.parent_path(); !folder.empty() && !std::filesystem::is_directory(folder, ignored))
+    return fileError("write", path, ENOENT);
+  std::string bytes;
+  const auto append = [](void* closure, const unsigned char* data, unsigned int length) {
+    static_cast<std::string*>(closure)->append(reinterpret_cast<const char*>(data), length);
+    return CAIRO_STATUS_SUCCESS;
+  };
+  const cairo_status_t status = cairo_surface_write_to_png_stream(get(), append, &bytes);
+  if (status != CAIRO_STATUS_SUCCESS)
+    return Error::errorWithDomain_code_reason(std::string(kDrawingErrorDomain), kDrawingErrorNotDrawn,
+                                              "Cannot encode " + path.native() + " as PNG: " +
+                                                  cairo_status_to_string(status) + ". Try a smaller size or scale.");
+  return writeFileAtomically(path, bytes);
 }
 
 }  // namespace nimbo

@@ -21,4 +21,8 @@ ImageRef drawImage(Size size, double scale, const std::function<void(cairo_t*)>&
   return std::make_shared<const CairoImage>(*surface);
 }
 
+void setColor(cairo_t* context, const Color& color) {
+  cairo_set_source_rgba(context, color.red, color.green, color.blue, color.alpha);
+}
+
 }  // namespace nimbo

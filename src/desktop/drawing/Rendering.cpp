@@ -2,11 +2,9 @@
 
 #include <cairo.h>
 
-#include <cerrno>
 #include <string>
 
 #include "desktop/drawing/CairoPainter.h"
-#include "desktop/system/AtomicFile.h"
 
 namespace nimbo {
 
@@ -28,25 +26,7 @@ Outcome<CairoSurfaceRef> renderToSurface(const DrawOperation& draw, Size size, d
 ErrorRef renderToPNG(const DrawOperation& draw, Size size, double scale, const Color& background,
                      const std::filesystem::path& path) {
   const auto surface = renderToSurface(draw, size, scale, background);
-  return surface ? writePNG(**surface, path) : surface.error();
-}
-
-ErrorRef writePNG(const CairoSurface& surface, const std::filesystem::path& path) {
-  // A folder that is missing is a slip of the hand, not a wish for one.
-  std::error_code ignored;
-  if (const auto folder = path.parent_path(); !folder.empty() && !std::filesystem::is_directory(folder, ignored))
-    return fileError("write", path, ENOENT);
-  std::string bytes;
-  const auto append = [](void* closure, const unsigned char* data, unsigned int length) {
-    static_cast<std::string*>(closure)->append(reinterpret_cast<const char*>(data), length);
-    return CAIRO_STATUS_SUCCESS;
-  };
-  const cairo_status_t status = cairo_surface_write_to_png_stream(surface.get(), append, &bytes);
-  if (status != CAIRO_STATUS_SUCCESS)
-    return Error::errorWithDomain_code_reason(std::string(kDrawingErrorDomain), kDrawingErrorNotDrawn,
-                                              "Cannot encode " + path.native() + " as PNG: " +
-                                                  cairo_status_to_string(status) + ". Try a smaller size or scale.");
-  return writeFileAtomically(path, bytes);
+  return surface ? (*surface)->writePNG(path) : surface.error();
 }
 
 }  // namespace nimbo

@@ -2,26 +2,29 @@
 
 #include <cairo.h>
 
+#include <algorithm>
 #include <numbers>
 
-#include "desktop/drawing/VectorImageReader.h"
+#include "desktop/drawing/DrawnImage.h"
+#include "platform/foundation/Log.h"
 
 namespace nimbo {
 
-VectorImage::Parsed VectorImage::parse(std::string_view svg) {
-  VectorImageReader reader(svg);
-  const std::shared_ptr<VectorImage> image(new VectorImage);
-  if (!reader.read(*image)) return {nullptr, reader.problem()};
-  return {image, {}};
+const VectorImage* vectorImageNamed(std::string_view name) {
+  const auto image = std::ranges::find(kVectorImages, name, &VectorImage::name);
+  if (image != kVectorImages.end()) return &*image;
+  writeLog({kDefaultLogSubsystem, "Images"}, LogLevel::error, "There is no image named %@; nothing is shown for it",
+           {name});
+  return nullptr;
 }
 
 void VectorImage::draw(cairo_t* context, const Rect& rect, const Color& currentColor) const {
   cairo_save(context);
   cairo_translate(context, rect.x, rect.y);
-  cairo_scale(context, rect.width / _size.width, rect.height / _size.height);
+  cairo_scale(context, rect.width / size.width, rect.height / size.height);
   cairo_set_line_cap(context, CAIRO_LINE_CAP_ROUND);
   cairo_set_line_join(context, CAIRO_LINE_JOIN_ROUND);
-  for (const Shape& shape : _shapes) {
+  for (const Shape& shape : shapes) {
     cairo_new_path(context);
     for (const auto& [operation, v] : shape.steps) {
       switch (operation) {
@@ -44,10 +47,7 @@ void VectorImage::draw(cairo_t* context, const Rect& rect, const Color& currentC
           break;
       }
     }
-    const auto setPaint = [&](const Paint& paint) {
-      const Color& color = paint.color ? *paint.color : currentColor;
-      cairo_set_source_rgba(context, color.red, color.green, color.blue, color.alpha);
-    };
+    const auto setPaint = [&](const Paint& paint) { setColor(context, paint.color.value_or(currentColor)); };
     cairo_set_fill_rule(context, shape.fillsEvenOdd ? CAIRO_FILL_RULE_EVEN_ODD : CAIRO_FILL_RULE_WINDING);
     if (shape.fill.isUsed) {
       setPaint(shape.fill);

@@ -5,10 +5,10 @@
 #include <cstdlib>
 
 #include "desktop/gtfs/FeedLog.h"
+#include "desktop/gtfs/FeedsPart.h"
 #include "desktop/gtfs/FileReading.h"
 #include "desktop/gtfs/FolderFeedFiles.h"
 #include "desktop/gtfs/TransitLineServiceError.h"
-#include "desktop/gtfs/ZipFeedFiles.h"
 #include "desktop/raii/FileDescriptor.h"
 #include "desktop/system/AtomicFile.h"
 #include "platform/Clock.h"
@@ -62,9 +62,7 @@ Outcome<std::unique_ptr<StaticFeedFiles>> openLocal(const std::filesystem::path&
   FileDescriptor file(::open(path.c_str(), O_RDONLY | O_CLOEXEC | O_NONBLOCK));
   if (!file) return unreadable(std::generic_category().message(errno));
   if (!std::filesystem::is_regular_file(path, ignored)) return unreadable("it is neither a file nor a folder");
-  auto zip = ZipFeedFiles::open(file, path.native());
-  if (!zip) return zip.error();
-  return std::unique_ptr<StaticFeedFiles>(std::move(*zip));
+  return openZippedFeed(file, path.native());
 }
 
 /// A file without a name in the folder: it goes when it is closed, whatever happens.
@@ -137,7 +135,7 @@ Outcome<std::optional<FreshStaticFeed>> StaticFeedStore::fetch(const Feed& feed,
   const auto answer = HTTPFetcher::fetch(request, stop, [&](std::string_view piece) { return writeAll(file, piece); });
   if (!answer) return answer.error();
   if (answer->isUnchanged) return std::optional<FreshStaticFeed>();
-  auto files = ZipFeedFiles::open(file, feed.staticFeed.publicText());
+  auto files = openZippedFeed(file, feed.staticFeed.publicText());
   if (!files) return files.error();
   auto fresh = parse(**files, feed, remoteFingerprint(feed.staticFeed, answer->validators));
   if (!fresh) return fresh.error();

@@ -14,7 +14,7 @@ namespace nimbo {
 class ZipFeedFiles final : public StaticFeedFiles {
  public:
   /// Opens the archive in a file opened for reading. `place` names it in messages.
-  static Outcome<std::unique_ptr<ZipFeedFiles>> open(const FileDescriptor& file, std::string place);
+  static Outcome<std::unique_ptr<StaticFeedFiles>> open(const FileDescriptor& file, std::string place);
 
   Outcome<bool> read(std::string_view name, std::uint64_t limit, const Sink& sink) override;
   std::string_view place() const override { return _place; }

@@ -61,7 +61,7 @@ ICUStringTables::ICUStringTables(std::string_view locale) : _english(tableNamed(
   const std::string tag = tagOfLocale(locale);
   const std::string_view name = nameOfTable(tag);
   if (!name.empty() && name != kFallbackLanguage) _table = *tableNamed(name);  // English is behind every table
-  _format.emplace(name.empty() ? std::string(kFallbackLanguage) : tag);
+  _languageTag = name.empty() ? std::string(kFallbackLanguage) : tag;
   _isSpanish = name == "es";
   _isRightToLeft = stringForKey("TransitWidget_Text_Direction") == "rtl";
 }
@@ -81,6 +81,7 @@ std::string ICUStringTables::format(const std::string& pattern, std::span<const 
     arguments = keptApart;
   }
   try {
+    if (!_format) _format = stringsPart().makePatternFormat(_languageTag);
     return _format->fill(_isSpanish ? withSpanishAnd(pattern, arguments) : pattern, arguments);
   } catch (const std::runtime_error& failure) {
     writeLog({kDefaultLogSubsystem, "StringTables"}, LogLevel::error, "Unable to fill the pattern %@: %@",

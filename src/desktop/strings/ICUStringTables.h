@@ -3,7 +3,7 @@
 #include <map>
 #include <optional>
 
-#include "desktop/strings/MessageFormat.h"
+#include "desktop/strings/StringsPart.h"
 
 namespace nimbo {
 
@@ -34,7 +34,8 @@ class ICUStringTables final : public StringTables {
   Table _english;
   bool _isSpanish;
   bool _isRightToLeft;
-  std::optional<MessageFormat> _format;  ///< there is one from the constructor on
+  std::string _languageTag;                        ///< by whose rules patterns are filled
+  mutable std::unique_ptr<PatternFormat> _format;  ///< null before the first pattern
 };
 
 }  // namespace nimbo

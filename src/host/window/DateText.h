@@ -3,8 +3,7 @@
 #include <optional>
 #include <string>
 
-#include "desktop/raii/ICUHandles.h"
-#include "platform/foundation/Date.h"
+#include "desktop/strings/StringsPart.h"
 
 namespace nimbo {
 
@@ -16,15 +15,12 @@ class DateText {
   /// format for it, dates are told in ISO form.
   explicit DateText(const std::string& locale);
 
-  /// Where in a sentence a date stands.
-  enum class Place { beginning, middle };
-
-  std::string textOf(Date date, Place place = Place::middle) const;
+  std::string textOf(Date date, DateFormat::Place place = DateFormat::Place::middle) const;
   /// From when until when something lasts, as one phrase; empty when neither is known.
   std::string textOfPeriod(std::optional<Date> start, std::optional<Date> end, Date now) const;
 
  private:
-  ICUDateFormat _format;  // null without one
+  std::unique_ptr<DateFormat> _format;  // null without one
 };
 
 }  // namespace nimbo

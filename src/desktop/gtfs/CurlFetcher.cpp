@@ -1,4 +1,4 @@
-#include "desktop/gtfs/HTTPFetcher.h"
+#include "desktop/gtfs/CurlFetcher.h"
 
 #include <new>
 
@@ -31,7 +31,7 @@ struct Transfer {
 
   bool hasDocument() const {
     long status = 0;
-    Curl::library().easy_getinfo(handle, CURLINFO_RESPONSE_CODE, &status);
+    curl_easy_getinfo(handle, CURLINFO_RESPONSE_CODE, &status);
     return status == 200;
   }
 
@@ -69,8 +69,8 @@ struct Transfer {
 };
 
 CurlHandle makeHandle() {
-  static const bool isReady = Curl::library().global_init(CURL_GLOBAL_DEFAULT) == CURLE_OK;
-  CurlHandle handle(isReady ? Curl::library().easy_init() : nullptr);
+  static const bool isReady = curl_global_init(CURL_GLOBAL_DEFAULT) == CURLE_OK;
+  CurlHandle handle(isReady ? curl_easy_init() : nullptr);
   if (!handle) throw std::bad_alloc();
   return handle;
 }
@@ -78,7 +78,7 @@ CurlHandle makeHandle() {
 CurlHeaders conditionsOf(const HTTPValidators& validators) {
   CurlHeaders headers;
   const auto add = [&](const std::string& line) {
-    curl_slist* longer = Curl::library().slist_append(headers.get(), line.c_str());
+    curl_slist* longer = curl_slist_append(headers.get(), line.c_str());
     if (!longer) throw std::bad_alloc();
     (void)headers.release();
     headers.reset(longer);
@@ -89,7 +89,7 @@ CurlHeaders conditionsOf(const HTTPValidators& validators) {
 }
 
 void setOptions(CURL* handle, Transfer& transfer, const CurlHeaders& headers) {
-  const auto set = [&](CURLoption option, auto value) { Curl::library().easy_setopt(handle, option, value); };
+  const auto set = [&](CURLoption option, auto value) { curl_easy_setopt(handle, option, value); };
   set(CURLOPT_URL, transfer.request.address.text().c_str());
   set(CURLOPT_PROTOCOLS_STR, "http,https");
   set(CURLOPT_REDIR_PROTOCOLS_STR, "http,https");
@@ -155,8 +155,7 @@ Failure failureOf(CURLcode result, const Transfer& transfer) {
     case CURLE_ABORTED_BY_CALLBACK:
       return {Code::internal, "the program is ending."};
     default:
-      return {Code::unreachable,
-              std::string(Curl::library().easy_strerror(result)) + ". Check the address and the network."};
+      return {Code::unreachable, std::string(curl_easy_strerror(result)) + ". Check the address and the network."};
   }
 }
 
@@ -170,7 +169,8 @@ Failure failureOfStatus(long status) {
 
 }  // namespace
 
-Outcome<HTTPAnswer> HTTPFetcher::fetch(const HTTPRequest& request, const std::stop_token& stop, const Sink& sink) {
+Outcome<HTTPAnswer> fetchWithCurl(const HTTPRequest& request, const std::stop_token& stop,
+                                  const HTTPFetcher::Sink& sink) {
   const CurlHandle handle = makeHandle();
   const CurlHeaders headers = conditionsOf(request.validators);
   const bool isConditional = headers != nullptr;
@@ -180,10 +180,10 @@ Outcome<HTTPAnswer> HTTPFetcher::fetch(const HTTPRequest& request, const std::st
     return transitLineServiceError(failure.code, "Cannot fetch " + request.address.publicText() + ": " + failure.what,
                                    request.address.publicText());
   };
-  if (const CURLcode result = Curl::library().easy_perform(handle.get()); result != CURLE_OK)
+  if (const CURLcode result = curl_easy_perform(handle.get()); result != CURLE_OK)
     return failed(failureOf(result, transfer));
   long status = 0;
-  Curl::library().easy_getinfo(handle.get(), CURLINFO_RESPONSE_CODE, &status);
+  curl_easy_getinfo(handle.get(), CURLINFO_RESPONSE_CODE, &status);
   if (status == 304 && isConditional) {
     // The server may leave out what has not changed.
     const auto orHeld = [](std::string& value, const std::string& held) {

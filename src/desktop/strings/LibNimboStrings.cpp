@@ -1,0 +1,137 @@
+// libnimbo-strings.so: what StringsPart.h declares.
+
+#include <unicode/brkiter.h>
+#include <unicode/datefmt.h>
+#include <unicode/msgfmt.h>
+#include <unicode/utext.h>
+
+#include <algorithm>
+#include <map>
+#include <stdexcept>
+#include <vector>
+
+#include "desktop/strings/StringsPart.h"
+
+namespace nimbo {
+
+namespace {
+
+void check(UErrorCode status) {
+  if (U_FAILURE(status)) throw std::runtime_error(u_errorName(status));
+}
+
+std::string utf8(const icu::UnicodeString& text) {
+  std::string bytes;
+  return text.toUTF8String(bytes);
+}
+
+class ICUPatternFormat final : public PatternFormat {
+ public:
+  explicit ICUPatternFormat(const std::string& languageTag) {
+    UErrorCode status = U_ZERO_ERROR;
+    _locale = icu::Locale::forLanguageTag(languageTag, status);
+    check(status);
+  }
+
+  std::string fill(const std::string& pattern, std::span<const FormatArgument> arguments) override {
+    const auto isCount = [](const FormatArgument& argument) { return std::holds_alternative<std::uint64_t>(argument); };
+    const bool hasCounts = std::any_of(arguments.begin(), arguments.end(), isCount);
+    if (hasCounts || arguments.size() > kMarks.size()) return fillByICU(pattern, arguments);
+    std::string text;
+    std::string_view rest = textWithMarks(pattern);
+    for (std::size_t at; (at = rest.find_first_of(kMarks)) != std::string_view::npos; rest.remove_prefix(at + 1)) {
+      const std::size_t index = kMarks.find(rest[at]);
+      text += rest.substr(0, at);
+      text += index < arguments.size() ? std::get<std::string>(arguments[index]) : "{" + std::to_string(index) + "}";
+    }
+    return text += rest;
+  }
+
+ private:
+  /// Characters that no table has.
+  static constexpr std::string_view kMarks = "\1\2\3\4\5\6";
+
+  std::string fillByICU(const std::string& pattern, std::span<const FormatArgument> arguments) {
+    UErrorCode status = U_ZERO_ERROR;
+    const icu::MessageFormat format(icu::UnicodeString::fromUTF8(pattern), _locale, status);
+    std::vector<icu::Formattable> values;
+    for (const FormatArgument& argument : arguments) {
+      if (const auto* count = std::get_if<std::uint64_t>(&argument))
+        values.emplace_back(icu::StringPiece(std::to_string(*count)), status);  // its integers have a sign
+      else
+        values.emplace_back(icu::UnicodeString::fromUTF8(std::get<std::string>(argument)));
+    }
+    icu::UnicodeString text;
+    icu::FieldPosition everywhere;
+    format.format(values.data(), static_cast<std::int32_t>(values.size()), text, everywhere, status);
+    check(status);
+    return utf8(text);
+  }
+
+  /// The pattern filled with a mark for each text. ICU puts texts into a pattern as they are: it is asked once where,
+  /// since rows are made by the thousand (docs/decisions/0006-parts-opened-late.md).
+  const std::string& textWithMarks(const std::string& pattern) {
+    std::string& kept = _textsWithMarks[pattern];
+    if (kept.empty()) {
+      std::vector<FormatArgument> marks;
+      for (const char mark : kMarks) marks.emplace_back(std::string(1, mark));
+      kept = fillByICU(pattern, marks);
+    }
+    return kept;
+  }
+
+  icu::Locale _locale;
+  std::map<std::string, std::string> _textsWithMarks;
+};
+
+class ICUDateFormat final : public DateFormat {
+ public:
+  explicit ICUDateFormat(std::unique_ptr<icu::DateFormat> format) : _format(std::move(format)) {}
+
+  std::string textOf(Date date, Place place) override {
+    UErrorCode ignored = U_ZERO_ERROR;  // the date is right in any context
+    _format->setContext(place == Place::beginning ? UDISPCTX_CAPITALIZATION_FOR_BEGINNING_OF_SENTENCE
+                                                  : UDISPCTX_CAPITALIZATION_FOR_MIDDLE_OF_SENTENCE,
+                        ignored);
+    icu::UnicodeString text;
+    return utf8(_format->format(static_cast<UDate>(date.time_since_epoch().count()) / 1000, text));
+  }
+
+ private:
+  std::unique_ptr<icu::DateFormat> _format;
+};
+
+class ICUStrings final : public StringsPart {
+  std::unique_ptr<PatternFormat> makePatternFormat(const std::string& languageTag) override {
+    return std::make_unique<ICUPatternFormat>(languageTag);
+  }
+  std::unique_ptr<DateFormat> makeDateFormat(const std::string& locale) override {
+    std::unique_ptr<icu::DateFormat> format(icu::DateFormat::createDateTimeInstance(
+        icu::DateFormat::kLongRelative, icu::DateFormat::kShort, icu::Locale::createCanonical(locale.c_str())));
+    if (!format) return nullptr;
+    return std::make_unique<ICUDateFormat>(std::move(format));
+  }
+  std::size_t clusterBoundary(std::string_view text, std::size_t position) override {
+    UErrorCode status = U_ZERO_ERROR;
+    UText bytes = UTEXT_INITIALIZER;
+    utext_openUTF8(&bytes, text.data(), static_cast<std::int64_t>(text.size()), &status);
+    const std::unique_ptr<UText, void (*)(UText*)> closed(&bytes, [](UText* opened) { utext_close(opened); });
+    const std::unique_ptr<icu::BreakIterator> clusters(
+        icu::BreakIterator::createCharacterInstance(icu::Locale::getRoot(), status));
+    check(status);
+    clusters->setText(&bytes, status);
+    check(status);
+    const auto wanted = static_cast<std::int32_t>(position);
+    const std::int32_t found = clusters->isBoundary(wanted) ? wanted : clusters->preceding(wanted);
+    return static_cast<std::size_t>(std::max(found, 0));
+  }
+};
+
+}  // namespace
+
+}  // namespace nimbo
+
+extern "C" nimbo::StringsPart* nimbo_strings() {
+  static nimbo::ICUStrings part;
+  return &part;
+}

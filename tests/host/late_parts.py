@@ -1,0 +1,47 @@
+"""Installed programs open their parts late, and say which file is missing: late_parts.py CMAKE BUILD"""
+
+import os
+import pathlib
+import re
+import subprocess
+import sys
+import tempfile
+
+LIBRARIES = re.compile(r"calling init: \S*(libnimbo-|libcurl|libzip|libicu|libpango|libcairo)")
+
+
+def main(cmake, build):
+    folder = pathlib.Path(tempfile.mkdtemp())
+    subprocess.run([cmake, "--install", build, "--prefix", folder], check=True, stdout=subprocess.DEVNULL)
+    program = folder / "bin/nimbo-transit"
+    parts = {path.name: path for path in folder.glob("**/libnimbo-*.so")}
+
+    def run(*arguments, **environment):
+        command = [program, "--config", folder / "config", "--state", folder / "state", *arguments]
+        return subprocess.run(command, capture_output=True, text=True, env=dict(os.environ, **environment))
+
+    def without(part, *arguments):
+        away = parts[part].with_suffix(".away")
+        parts[part].rename(away)
+        result = run(*arguments)
+        away.rename(parts[part])
+        assert part in result.stdout + result.stderr, f"without {part}: {result}"
+        return result
+
+    for arguments in (["favorite", "list"], ["lines", "red"], ["settings", "get", "x"]):
+        loaded = LIBRARIES.findall(run(*arguments, LD_DEBUG="files").stderr)
+        assert not loaded, f"{arguments} loads {loaded}"
+    assert "4 Advisories" in run("status").stdout
+    assert without("libnimbo-drawing.so", "status").returncode != 0
+    without("libnimbo-strings.so", "status")
+
+    feed = folder / "feed"
+    feed.mkdir()
+    (feed / "agency.txt").write_text("agency_id,agency_name\n1,City\n")
+    (feed / "routes.txt").write_text("route_id,agency_id,route_short_name,route_type\nR,1,Red,1\n")
+    run("feed", "add", "city", "--static", feed, "--alerts", "http://127.0.0.1:1/alerts.pb")
+    run("favorite", "add", "city:R")
+    without("libnimbo-feeds.so", "status", "--json")
+
+
+main(*sys.argv[1:])
