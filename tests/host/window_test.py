@@ -108,7 +108,7 @@ def tour(session, folder):
 
     window.see("1, Harbour Line, .*4 Advisories", "push button")
     window.click("4 Advisories")
-    for text in "Incidents", "Signals fail", "Music plays":
+    for text in "Incidents", "Signals fail", "Music plays", "^As of ":
         window.see(text)
     press("key", "Escape")
     window.click("Show More")

@@ -195,14 +195,12 @@ void WidgetPage::widgetDidChange(const WidgetContentRef& content) {
   _waiting.hide();
   _failure.hide();
   showExpandButton();
-  openAwaited();
 }
 
 void WidgetPage::widgetDidFail(const std::string& reason) {
   _failureReason.set_text(LocalizedFormat(LocalizedString("Window_Widget_Failed"), {reason}));
   _failure.show();
   _waiting.hide();
-  openAwaited();
 }
 
 void WidgetPage::widgetTells(const std::string& message) { _context.navigator.tell(message); }
@@ -222,18 +220,14 @@ bool WidgetPage::widgetOpens(const WidgetClient::Opening& opening) {
     _context.navigator.tell(request.error()->reason());
     return false;
   }
-  // The widget hears that it opened before it hears that it disappears.
-  _awaited = *request;
+  // As of when it is comes before what is opened is decoded.
   _process.askForContent();
-  return true;
-}
-
-void WidgetPage::openAwaited() {
-  if (!_awaited) return;
+  // The widget hears that it opened before it hears that it disappears.
   _context.command.runLoop.dispatchAsync(
-      [&navigator = _context.navigator, request = *std::exchange(_awaited, {}), alive = std::weak_ptr<bool>(_alive)] {
+      [&navigator = _context.navigator, request = *request, alive = std::weak_ptr<bool>(_alive)] {
         if (!alive.expired()) navigator.open(request);
       });
+  return true;
 }
 
 }  // namespace nimbo

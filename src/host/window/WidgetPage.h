@@ -38,14 +38,11 @@ class WidgetPage final : public Page, private WidgetHostProcess::Delegate {
   void widgetDidFail(const std::string& reason) override;
   void widgetTells(const std::string& message) override;
   void widgetIsUpdating(bool updating) override;
-  /// Opens what a row opens, once the widget has said as of when that is.
-  void openAwaited();
   bool widgetOpens(const WidgetClient::Opening& opening) override;
 
   const PageContext& _context;
   WidgetHostProcess _process;
   WidgetContentRef _content;
-  std::optional<OpenRequest> _awaited;
   bool _wantsExpanded;
   double _width = WidgetPresentation::kDefaultWidth;
 
