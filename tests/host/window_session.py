@@ -95,7 +95,8 @@ class Window:
     def click(self, name, role="push button"):
         def place():
             box = self.box(name, role)
-            return box.width > 0 and box.height > 1 and (box.x + box.width // 2, box.y + box.height // 2)
+            # A page that is still to slide in stands beside the window.
+            return box.width > 0 and box.height > 1 and box.x >= 0 and (box.x + box.width // 2, box.y + box.height // 2)
 
         places = [None, wait(f"a place of {name}", place)]
         # Until it stands still.
