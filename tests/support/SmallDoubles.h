@@ -2,7 +2,9 @@
 
 #include <deque>
 #include <memory>
+#include <sstream>
 #include <string>
+#include <utility>
 #include <vector>
 
 #include "platform/AnalyticsPipeline.h"
@@ -27,43 +29,36 @@ class ScriptedRandomSource final : public RandomSource {
   std::deque<std::uint32_t> numbers;
 };
 
-/// Keeps the events as "subsystem category name message". The test's thread.
+/// Keeps the events. The test's thread.
 class RecordingSignposts final : public Signposts {
  public:
   void event(const LogFacility& facility, std::string_view name, std::string_view message) override {
-    events.push_back(std::string(facility.subsystem) + " " + std::string(facility.category) + " " + std::string(name) +
-                     " " + std::string(message));
+    std::ostringstream event;
+    event << facility.subsystem << " " << facility.category << " " << name << message;
+    events.push_back(event.str());
   }
   std::vector<std::string> events;
 };
 
-/// Memory is never short by itself: the test calls the handlers.
+/// Keeps the calls of sources, and their handlers for the test to call.
 class MemoryPressureDouble final : public MemoryPressure {
  public:
-  struct Made {
-    MemoryPressureKind kind;
-    std::string queueLabel;
-    std::function<void()> handler;
-    bool active = false;
-    bool cancelled = false;
-  };
-
   std::unique_ptr<MemoryPressureSource> makeSource(MemoryPressureKind kind, std::shared_ptr<SerialQueue> queue,
                                                    std::function<void()> handler) override {
-    made.push_back(std::make_shared<Made>(Made{kind, queue->label(), std::move(handler)}));
-    return std::make_unique<Source>(made.back());
+    handlers.emplace_back(kind, std::move(handler));
+    queueLabel = queue->label();
+    return std::make_unique<Source>(calls);
   }
-  std::vector<std::shared_ptr<Made>> made;
+  std::vector<std::pair<MemoryPressureKind, std::function<void()>>> handlers;
+  std::string queueLabel;  ///< of the newest source
+  std::vector<std::string> calls;
 
  private:
-  class Source final : public MemoryPressureSource {
-   public:
-    explicit Source(std::shared_ptr<Made> made) : _made(std::move(made)) {}
-    void activate() override { _made->active = true; }
-    void cancel() override { _made->cancelled = true; }
-
-   private:
-    std::shared_ptr<Made> _made;
+  struct Source final : MemoryPressureSource {
+    explicit Source(std::vector<std::string>& calls) : _calls(calls) {}
+    void activate() override { _calls.push_back("activate"); }
+    void cancel() override { _calls.push_back("cancel"); }
+    std::vector<std::string>& _calls;
   };
 };
 

@@ -42,17 +42,14 @@ class TestRunLoop final : public RunLoop {
 
  private:
   /// Virtual time is never late: only records by how much it might be.
-  class TolerantTimer final : public Timer {
-   public:
-    TolerantTimer(std::shared_ptr<Timer> timer, std::vector<TimeInterval>& tolerances)
-        : _timer(std::move(timer)), _tolerances(tolerances) {}
-    bool isValid() const override { return _timer->isValid(); }
-    void invalidate() override { _timer->invalidate(); }
-    void setTolerance(TimeInterval tolerance) override { _tolerances.push_back(tolerance); }
-
-   private:
-    std::shared_ptr<Timer> _timer;
-    std::vector<TimeInterval>& _tolerances;
+  struct TolerantTimer final : Timer {
+    TolerantTimer(std::shared_ptr<Timer> inner, std::vector<TimeInterval>& given)
+        : timer(std::move(inner)), tolerances(given) {}
+    bool isValid() const override { return timer->isValid(); }
+    void invalidate() override { timer->invalidate(); }
+    void setTolerance(TimeInterval tolerance) override { tolerances.push_back(tolerance); }
+    std::shared_ptr<Timer> timer;
+    std::vector<TimeInterval>& tolerances;
   };
 
   bool runOne();

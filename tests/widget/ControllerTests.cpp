@@ -95,7 +95,11 @@ TEST_F(Controller, KeepsAnUpdaterOnlyWhileVisibleWithLineItems) {
   EXPECT_EQ(controller->updater(), nullptr) << "after a failed fetch";
 
   controller->widgetPerformUpdateWithCompletionHandler(nullptr);
+  answer({lineItem(1, "1")});
+  controller->widgetPerformUpdateWithCompletionHandler(nullptr);
   disappear();
+  EXPECT_EQ(controller->updater(), nullptr);
+  EXPECT_EQ(platform.time.pendingTimers(), 0u);
   const TransitLineItems ending{lineItem(1, "1", {incident(1, {}, dateByAdding(currentDate(), 60))})};
   answer(ending);
   EXPECT_EQ(controller->updater(), nullptr) << "a fetch that ends while hidden";
@@ -157,23 +161,23 @@ TEST_F(Controller, KeepsItsTableInsideTheMargins) {
 
 TEST_F(Controller, SignpostsEveryKindOfMemoryPressureWhileItLives) {
   load(nullptr);
-  const auto& made = platform.memoryPressure.made;
-  std::vector<MemoryPressureKind> kinds;
-  for (const auto& source : made) {
-    EXPECT_TRUE(source->active && !source->cancelled);
-    EXPECT_EQ(source->queueLabel, "org.nimbo.Map.TransitWidget.memoryPresure");
-    kinds.push_back(source->kind);
-    source->handler();
-  }
+  MemoryPressureDouble& pressure = platform.memoryPressure;
+  EXPECT_EQ(pressure.queueLabel, "org.nimbo.Map.TransitWidget.memoryPresure");
+  EXPECT_EQ(pressure.calls, std::vector<std::string>(4, "activate"));
   using enum MemoryPressureKind;
-  EXPECT_THAT(kinds, ElementsAre(systemWarning, systemCritical, processWarning, processCritical));
-  const std::string log = "org.nimbo.Map.suggestions TransitWidget ", message = "  enableTelemetry=YES ";
-  EXPECT_THAT(
-      platform.signposts.events,
-      ElementsAre(log + "SystemMemoryPressureWarning" + message, log + "SystemMemoryPressureCritical" + message,
-                  log + "ProcessMemoryPressureWarning" + message, log + "ProcessMemoryPressureCritical" + message));
+  const std::string log = "org.nimbo.Map.suggestions TransitWidget ", message = " enableTelemetry=YES ";
+  for (const auto& [kind, name] : {std::pair{systemWarning, "SystemMemoryPressureWarning"},
+                                   {systemCritical, "SystemMemoryPressureCritical"},
+                                   {processWarning, "ProcessMemoryPressureWarning"},
+                                   {processCritical, "ProcessMemoryPressureCritical"}}) {
+    platform.signposts.events.clear();
+    for (const auto& [made, handler] : pressure.handlers)
+      if (made == kind) handler();
+    EXPECT_THAT(platform.signposts.events, ElementsAre(log + name + message));
+  }
+  pressure.calls.clear();
   controller = nullptr;
-  for (const auto& source : made) EXPECT_TRUE(source->cancelled);
+  EXPECT_EQ(pressure.calls, std::vector<std::string>(4, "cancel"));
 }
 
 TEST_F(Controller, JudgesItsRowsAnewWhereverTheClockJumps) {

@@ -8,7 +8,6 @@
 #include "handoff/URL+NBOpenable.h"
 #include "items/NBTransitDataSourceBuilderForResult.h"
 #include "items/NBTransitIncidentsDataSourceBuilder.h"
-#include "items/NumberList.h"
 #include "platform/artwork/NamedImage.h"
 #include "platform/artwork/SizedTransitArtwork.h"
 #include "support/TestPlatform.h"
@@ -302,24 +301,6 @@ TEST_F(ListBuilder, AnswersOneListItemAndEqualOnesForEqualLines) {
   EXPECT_EQ(builder->listItem(), list);
   EXPECT_TRUE(list->isEqual(build(Network("A/rail:1,2 B/rail:2 C:")).get()));
   EXPECT_FALSE(list->isEqual(build(Network("A/rail:1,2 B/bus:2 C:")).get()));
-}
-
-TEST(NumberList, FindsTheFirstOfEachNumber) {
-  NumberList list;
-  // Numbers that differ and are the same number folded, too.
-  const auto number = [](std::uint64_t i) { return i % 2 == 0 ? i : (i << 32) ^ (i << 16); };
-  for (std::uint64_t i = 0; i < 384; ++i) list.append(number(i));
-  for (std::uint64_t i = 1; i < 384; ++i) {
-    EXPECT_EQ(list.firstIndexOf(number(i)), i);
-    EXPECT_EQ(list.firstIndexOf(number(i), i), i);
-    EXPECT_EQ(list.firstIndexOf(number(i), i + 1), 384u);
-  }
-  list.append(number(7));
-  EXPECT_EQ(list.firstIndexOf(number(7), 8), 384u);
-  list.replace(7, 1000);
-  EXPECT_EQ(list.firstIndexOf(number(7)), 384u);
-  EXPECT_EQ(list.firstIndexOf(1000), 7u);
-  EXPECT_EQ(list.at(7), 1000u);
 }
 
 }  // namespace

@@ -87,43 +87,34 @@ NBTransitListItemRef list(ObjectRef summary, NBTransitItems expanded) {
 }
 
 TEST_F(TableModel, ShowsOneCompactRowOrAllExpandedOnes) {
+  platform.shieldRenderer->width = [](std::int64_t, const std::string&) { return 100.0; };
   make(success(kTwoIncidents));
   EXPECT_EQ(model->rowHeight(), 110.0);
-  EXPECT_EQ(delegate->updates, 0);
   EXPECT_THAT(table->subviews(), SizeIs(1)) << "an empty footer";
   EXPECT_THAT(cells(), ElementsAre(kSummary));
-  EXPECT_EQ(table->cellForRowAtIndexPath({0, 0})->separatorStyleOverride(), 0);
-  EXPECT_EQ(model->tableView_estimatedHeightForRowAtIndexPath(*table, {0, 0}), 5);
-
-  model->setExpanded(true);
-  EXPECT_EQ(delegate->updates, 1);
-  EXPECT_THAT(cells(), ElementsAre(kRow, kRow, kRow));
-  for (const auto& [index, separator] : {std::pair{0, 1}, {1, 1}, {2, 0}})
-    EXPECT_EQ(table->cellForRowAtIndexPath({0, index})->separatorStyleOverride(), separator) << index;
-  EXPECT_EQ(model->preferredContentSizeForExpanded_maxSize(true, {320, 110}), (Size{320, 330}));
-  EXPECT_EQ(updatesAfter([&] { model->setExpanded(true); }), 0);
-  EXPECT_EQ(updatesAfter([&] { model->setExpanded(false); }), 1);
+  const auto& summary = dynamic_cast<const NBTransitSummaryCell&>(*table->cellForRowAtIndexPath({0, 0}));
+  EXPECT_EQ(summary.separatorStyleOverride(), 0);
+  EXPECT_EQ(summary.item(), model->listItem()->summaryItem());
+  EXPECT_EQ(summary.artworkCache(), cache);
   EXPECT_EQ(model->preferredContentSizeForExpanded_maxSize(false, {320, 110}), (Size{320, 110}));
-}
+  EXPECT_EQ(model->tableView_estimatedHeightForRowAtIndexPath(*table, {0, 0}), 5);
+  EXPECT_EQ(delegate->updates, 0);
 
-TEST_F(TableModel, FillsItsCells) {
-  platform.shieldRenderer->width = [](std::int64_t, const std::string&) { return 100.0; };
-  make(success(kTwoIncidents), 0, 359, true);
-  EXPECT_TRUE(model->isExpanded()) << "from the start";
+  EXPECT_EQ(updatesAfter([&] { model->setExpanded(true); }), 1);
   model->setRowHeight_maxNumberOfRows(55, 0);
   EXPECT_THAT(cells(), ElementsAre(kRow, kRow, kRow));
-  for (std::int64_t i = 0; i < 3; ++i) {
-    const auto& cell = dynamic_cast<const NBTransitItemFixedHeightCell&>(*table->cellForRowAtIndexPath({0, i}));
-    EXPECT_EQ(cell.transitItem(), model->shieldAdjustedExpandedItems()->at(static_cast<std::size_t>(i)));
+  for (const auto& [index, separator] : {std::pair{0, 1}, {1, 1}, {2, 0}}) {
+    const auto& cell = dynamic_cast<const NBTransitItemFixedHeightCell&>(*table->cellForRowAtIndexPath({0, index}));
+    EXPECT_EQ(cell.separatorStyleOverride(), separator) << index;
+    EXPECT_EQ(cell.transitItem(), model->_itemAtIndexPath({0, index}));
     EXPECT_EQ(cell.trailingArtworkColumnWidth(), 100);
     EXPECT_EQ(cell.rowHeight(), 55);
   }
-  model->setExpanded(false);
+  EXPECT_EQ(model->preferredContentSizeForExpanded_maxSize(true, {320, 110}), (Size{320, 165}));
+  EXPECT_EQ(updatesAfter([&] { model->setExpanded(true); }), 0);
+  EXPECT_EQ(updatesAfter([&] { model->setExpanded(false); }), 1);
   EXPECT_THAT(cells(), ElementsAre(kSummary));
-  const auto& cell = dynamic_cast<const NBTransitSummaryCell&>(*table->cellForRowAtIndexPath({0, 0}));
-  EXPECT_EQ(cell.item(), model->listItem()->summaryItem());
-  EXPECT_EQ(cell.artworkCache(), cache);
-  EXPECT_EQ(cell.rowHeight(), 55);
+  EXPECT_EQ(dynamic_cast<const NBTransitSummaryCell&>(*table->cellForRowAtIndexPath({0, 0})).rowHeight(), 55);
 }
 
 TEST_F(TableModel, RefusesToExpandWithoutExpandedRows) {
@@ -143,6 +134,7 @@ TEST_F(TableModel, RefusesToExpandWithoutExpandedRows) {
 
 TEST_F(TableModel, ShowsNothingOfRowsThatAreNotThere) {
   make(success(kTwoIncidents), 0, 359, true);
+  EXPECT_TRUE(model->isExpanded()) << "from the start";
   for (const IndexPath path : {IndexPath{0, 3}, {0, -1}, {1, 0}}) {
     EXPECT_EQ(model->_itemAtIndexPath(path), nullptr);
     EXPECT_FALSE(model->tableView_shouldHighlightRowAtIndexPath(*table, path));
@@ -197,78 +189,46 @@ TEST_F(TableModel, TellsItsDelegateOnlyOfWhatShowsAndTheSessionOfNewResults) {
   EXPECT_THAT(model->listItem()->expandedItemsOrEmpty(), SizeIs(2));
 }
 
-TEST_F(TableModel, ChangesItsRowsWhenAnIncidentEnds) {
-  const Date end = dateByAdding(TestPlatform::startDate(), 60);
-  make(success({lineItem(1, "1", {incident(10, {}, end)})}));
-  platform.time.advance(60);
-  model->recalculateDataSourceItemsWithAnalytics(nullptr);
-  EXPECT_EQ(delegate->updates, 0) << "an incident that ends now is still shown";
-  platform.time.advance(1);
-  model->recalculateDataSourceItemsWithAnalytics(nullptr);
-  EXPECT_EQ(delegate->updates, 1);
-}
-
-TEST_F(TableModel, LeavesTheShieldsWhatTheTextsNeedNot) {
-  platform.shieldRenderer->width = [](std::int64_t size, const std::string&) {
-    return std::vector{72.0, 72.5, 73.0, 73.5, 145.0, 145.5, 186.0, 186.5}[static_cast<std::size_t>(size)];
-  };
-  for (const auto& [width, column] : {std::pair{400, 186}, {359, 145}, {287, 73}, {200, 73}}) {
-    make(success({lineItem(1, "1", {incident(10)})}), 0, width);
-    EXPECT_EQ(model->artworkColumnWidth(), column) << width;
-  }
-}
-
-TEST_F(TableModel, ShrinksShieldsIntoTheColumnAndKeepsTheRestOfTheRow) {
+TEST_F(TableModel, ShrinksShieldsIntoTheColumnAndTellsItsDelegateOfWhatShows) {
+  // The texts keep 214 points, the column has at least 73.
   platform.shieldRenderer->width = [](std::int64_t size, const std::string& name) {
-    return name == "wide" ? 40.0 + 20.0 * static_cast<double>(size) : 80.0;
+    constexpr double kWidths[] = {72, 72.5, 73, 73.5, 145, 145.5, 186, 186.5};
+    return name == "wide" ? kWidths[size] : 50;
   };
-  make(nullptr);
-  // 359 - 214 leaves 145 points: of the wide shield size 5 is 140 wide.
-  const NBTransitItems rows{row("wide", 7, 0.5, true), row("slim")}, shrunk{row("wide", 5, 0.5, true), rows[1]};
-  const auto summary = NBTransitSummaryItem::initWithText_artworks_userActivityData("2", {}, nullptr);
+  const auto wide = [&](std::int64_t size) { return row("wide", size, 0.5, true); };
+  const NBTransitItemRef slim = row("slim");
+  const NBTransitItems rows{wide(7), slim};
+  const auto several = NBTransitSummaryItem::initWithText_artworks_userActivityData("2", {}, nullptr);
   const struct {
-    const char* name;
-    ObjectRef summary, shrunkSummary;
-    double column;
-  } cases[] = {{"a summary of several", summary, summary, 140},
-               {"a row of its own", rows[1], rows[1], 80},  // its column holds for all rows
-               {"the first row", rows[0], shrunk[0], 140},
-               {"none", nullptr, nullptr, 140}};
-  for (const auto& c : cases) {
-    SCOPED_TRACE(c.name);
-    model->setListItem(list(c.summary, rows));
-    EXPECT_TRUE(absentOrEqual(model->shieldAjustedSummaryItem(), c.shrunkSummary));
-    EXPECT_TRUE(std::ranges::equal(*model->shieldAdjustedExpandedItems(), shrunk, absentOrEqual));
-    EXPECT_EQ(model->artworkColumnWidth(), c.column);
-  }
-}
-
-TEST_F(TableModel, TellsItsDelegateOfAWidthThatChangesWhatShows) {
-  platform.shieldRenderer->width = [](std::int64_t size, const std::string& name) {
-    return name == "wide" ? 40.0 + 20.0 * static_cast<double>(size) : 50.0;
-  };
-  const NBTransitItems rows{row("wide"), row("slim")};
-  const struct {
-    const char* name;
-    NBTransitListItemRef list;
-    bool expanded;
+    ObjectRef summary;
+    NBTransitItems expanded;
+    bool isExpanded;
     double width;
+    std::int64_t wideShieldSize;
+    double column;
     int updates;
   } cases[] = {
-      {"a wider column", list(row("wide"), {}), false, 400, 1},
-      {"a narrower column", list(row("wide"), {}), false, 200, 1},
-      {"a width between two shield sizes", list(row("wide"), rows), true, 360, 0},
-      {"a smaller shield beside the column of the summary", list(row("slim"), rows), true, 300, 1},
-      {"the same, out of sight", list(row("slim"), rows), false, 300, 0},
-      {"nothing to compare with", list(nullptr, rows), false, 360, 1},
+      {wide(7), {}, false, 400, 6, 186, 1},
+      {wide(7), {}, false, 287, 2, 73, 1},
+      {wide(7), {}, false, 200, 2, 73, 1},
+      {wide(7), rows, true, 359.4, 4, 145, 0},
+      {several, rows, false, 400, 6, 186, 1},
+      {slim, rows, true, 300, 3, 73, 1},         // beside the column of the summary, which holds for all rows
+      {slim, rows, false, 300, 3, 73, 0},        // the same, out of sight
+      {nullptr, rows, false, 359.4, 4, 145, 1},  // nothing to compare with
   };
   for (const auto& c : cases) {
-    SCOPED_TRACE(c.name);
+    SCOPED_TRACE(std::to_string(&c - cases));
     make(nullptr);
-    model->setListItem(c.list);
-    model->setExpanded(c.expanded);
+    model->setListItem(list(c.summary, c.expanded));
+    model->setExpanded(c.isExpanded);
     EXPECT_EQ(updatesAfter([&] { model->setAvailableWidth(c.width); }), c.updates);
-    EXPECT_EQ(model->availableWidth(), c.width);
+    EXPECT_EQ(model->artworkColumnWidth(), c.column);
+    const NBTransitItems shrunk{wide(c.wideShieldSize), slim};
+    EXPECT_TRUE(std::ranges::equal(*model->shieldAdjustedExpandedItems(), c.expanded.empty() ? c.expanded : shrunk,
+                                   absentOrEqual));
+    const bool isWide = absentOrEqual(c.summary, rows[0]);
+    EXPECT_TRUE(absentOrEqual(model->shieldAjustedSummaryItem(), isWide ? ObjectRef(shrunk[0]) : c.summary));
   }
 }
 

@@ -7,7 +7,7 @@ namespace {
 
 TEST(NumberList, FindsTheFirstEqualNumberInListsOfEveryLength) {
   NumberList list;
-  for (std::uint64_t i = 0; i < 100; ++i) {
+  for (std::uint64_t i = 0; i < 300; ++i) {
     EXPECT_EQ(list.firstIndexOf(i << 32), list.count());
     list.append(i << 32);
     for (std::uint64_t j = 0; j <= i; ++j) ASSERT_EQ(list.firstIndexOf(j << 32), j);
