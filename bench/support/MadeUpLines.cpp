@@ -4,8 +4,8 @@
 
 #include <stdexcept>
 
-#include "platform/transit/BasicTransitIncident.h"
 #include "platform/transit/BasicTransitLineItem.h"
+#include "platform/transit/TransitIncident.h"
 
 namespace nimbo {
 
@@ -20,7 +20,7 @@ std::filesystem::path makeFolder() {
 TransitIncidentRef incident(std::uint64_t number) {
   static const Date now = currentDate();  // what two fetches bring is equal
   const std::string text = std::to_string(number);
-  BasicTransitIncident::Fields fields;
+  TransitIncidentFields fields;
   fields.muid = 0x9E3779B97F4A7C15u * (number + 1);
   fields.title = "Delays of up to 15 minutes after incident " + text;
   fields.summary = "Trains run at a lower frequency between Northgate and Old Docks because of works, number " + text;

@@ -17,6 +17,7 @@
 #include "host/StateCommands.h"
 #include "host/StatusBarCommand.h"
 #include "host/WidgetCommands.h"
+#include "platform/foundation/Version.h"
 
 namespace nimbo {
 namespace {
@@ -55,7 +56,7 @@ class CommandLine {
 
 CommandLine::CommandLine() {
   _app.require_subcommand(1);
-  _app.set_version_flag("--version", NIMBO_VERSION);
+  _app.set_version_flag("--version", kVersion);
   _app.add_option("--config", _config, "Folder of feeds.json (default: $XDG_CONFIG_HOME/nimbo-transit)")
       ->check(checkFolder);
   _app.add_option("--state", _state, "Folder of favorites and last rows (default: $XDG_STATE_HOME/nimbo-transit)")

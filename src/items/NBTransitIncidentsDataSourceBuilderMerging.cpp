@@ -87,9 +87,7 @@ NBTransitItemRef NBTransitIncidentsDataSourceBuilder::itemAffectingLines(const N
                                   std::move(common), kRowShieldSize, _artworkCache),
                               kFullArtworkAlpha)
                         : artworkOfImageNamed("WidgetGenericTransit", kDimmedArtworkAlpha);
-  return NBTransitItem::initWithPrimaryText_secondaryText_artwork_artworkHidden_openable(
-      item.primaryText(), _prependLineNames_toText(lines, item.secondaryText()), std::move(artwork),
-      item.isArtworkHidden(), item.openable());
+  return item.copyWithSecondaryText_artwork(_prependLineNames_toText(lines, item.secondaryText()), std::move(artwork));
 }
 
 std::optional<std::string> NBTransitIncidentsDataSourceBuilder::_prependLineNames_toText(

@@ -22,6 +22,12 @@ NBTransitItemRef NBTransitItem::copyWithZone() const {
                                                                           _artworkHidden, _openable);
 }
 
+NBTransitItemRef NBTransitItem::copyWithSecondaryText_artwork(std::optional<std::string> secondaryText,
+                                                              NBConfiguredArtworkRef artwork) const {
+  return initWithPrimaryText_secondaryText_artwork_artworkHidden_openable(
+      _primaryText, std::move(secondaryText), std::move(artwork), _artworkHidden, _openable);
+}
+
 bool NBTransitItem::isEqualToTransitItem(const NBTransitItem& other) const {
   return absentOrEqual(_artwork, other._artwork) && _artworkHidden == other._artworkHidden &&
          _primaryText == other._primaryText && _secondaryText == other._secondaryText &&

@@ -38,6 +38,9 @@ class NBTransitItem : public Object {
 
   /// An equal item that is another object. A derived class answers one of its own class.
   virtual std::shared_ptr<const NBTransitItem> copyWithZone() const;
+  /// The same row with another second line and another artwork.
+  std::shared_ptr<const NBTransitItem> copyWithSecondaryText_artwork(std::optional<std::string> secondaryText,
+                                                                     NBConfiguredArtworkRef artwork) const;
 
   bool isEqualToTransitItem(const NBTransitItem& other) const;
 

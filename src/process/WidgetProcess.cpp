@@ -6,6 +6,7 @@
 #include "desktop/drawing/DrawingPart.h"
 #include "desktop/gtfs/LineNames.h"
 #include "desktop/rpc/Base64.h"
+#include "platform/foundation/Version.h"
 #include "platform/ui/SystemColors.h"
 #include "process/HandoffDecoder.h"
 #include "process/HostLogSink.h"
@@ -138,7 +139,7 @@ protocol::Initialized WidgetProcess::initialize(const protocol::InitializeParams
   if (params.displayModes) _host.setMaximumSizes(*params.displayModes);
   _controller =
       NBTransitIncidentsViewController::initWithNibName_bundle("", "", params.displayModes ? &_host : nullptr);
-  return {"nimbo-transit-widget", NIMBO_VERSION, kProtocolVersion};
+  return {"nimbo-transit-widget", kVersion, kProtocolVersion};
 }
 
 protocol::Nothing WidgetProcess::loadView(const Nothing&) {

@@ -9,6 +9,7 @@
 
 #include "desktop/drawing/DrawingPart.h"
 #include "desktop/system/SmallMemory.h"
+#include "platform/foundation/Version.h"
 #include "process/Sandbox.h"
 #include "process/WidgetProcess.h"
 
@@ -31,7 +32,7 @@ int main(int argc, char** argv) {
   app.add_option("--config", config, "Folder of feeds.json (default: $XDG_CONFIG_HOME/nimbo-transit)");
   app.add_option("--state", state, "Folder of what the widget keeps (default: $XDG_STATE_HOME/nimbo-transit)");
   app.add_option("--virtual-time", virtualTime, "ISO date at which time stands still; \"advanceTime\" moves it");
-  app.set_version_flag("--version", NIMBO_VERSION);
+  app.set_version_flag("--version", nimbo::kVersion);
   CLI11_PARSE(app, argc, argv);
 
   nimbo::WidgetProcess::Options options{nimbo::Paths::resolve(config, state), std::nullopt};

@@ -25,15 +25,6 @@ constexpr double kWidthBesideArtwork = 214.0;
 
 bool itemsEqual(const NBTransitItems& a, const NBTransitItems& b) { return std::ranges::equal(a, b, absentOrEqual); }
 
-/// The same row with a smaller shield.
-std::shared_ptr<const NBTransitItem> itemWithArtwork(const NBTransitItem& item,
-                                                     std::shared_ptr<const SizedTransitArtwork> artwork) {
-  return NBTransitItem::initWithPrimaryText_secondaryText_artwork_artworkHidden_openable(
-      item.primaryText(), item.secondaryText(),
-      NBConfiguredArtwork::initWithArtworkSource_alpha(std::move(artwork), item.artwork()->alpha()),
-      item.isArtworkHidden(), item.openable());
-}
-
 }  // namespace
 
 std::shared_ptr<NBTransitIncidentDataSource>
@@ -150,7 +141,8 @@ NBTransitItems NBTransitIncidentDataSource::itemsFittingColumn(const NBTransitIt
   return artworkColumnCalculator()->itemsFromItems_sizeParameter_outArtworkColumnWidth_downSizingBlock(
       items, _sizeParameters(), &_artworkColumnWidth,
       [](const std::shared_ptr<const NBTransitItem>& item, const std::shared_ptr<const SizedTransitArtwork>& artwork) {
-        return itemWithArtwork(*item, artwork);
+        return item->copyWithSecondaryText_artwork(
+            item->secondaryText(), NBConfiguredArtwork::initWithArtworkSource_alpha(artwork, item->artwork()->alpha()));
       });
 }
 

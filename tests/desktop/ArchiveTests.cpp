@@ -163,7 +163,7 @@ std::string answersOf(const TransitLineItem& item) {
 }
 
 TransitLineItemRef wholeLineItem() {
-  BasicTransitIncident::Fields incidentFields;
+  TransitIncidentFields incidentFields;
   incidentFields.muid = UINT64_MAX;
   incidentFields.title = "Title";
   incidentFields.summary = "";

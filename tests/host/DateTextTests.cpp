@@ -84,7 +84,7 @@ TEST(IncidentTexts, SayNothingTwice) {
       {{}, "A strike.", {"A strike."}},
   };
   for (const auto& c : cases) {
-    BasicTransitIncident::Fields fields;
+    TransitIncidentFields fields;
     fields.title = "Works";
     fields.summary = c.summary;
     fields.fullDescription = c.description;

@@ -1,7 +1,7 @@
 #pragma once
 
-#include "platform/transit/BasicTransitIncident.h"
 #include "platform/transit/BasicTransitLineItem.h"
+#include "platform/transit/TransitIncident.h"
 
 namespace nimbo {
 
@@ -25,7 +25,7 @@ inline TransitArtworkRef modeArtwork(TransitMode mode) {
 
 /// An incident of title "Incident N" and summary "Summary N", in force since ever unless dates are given.
 inline TransitIncidentRef incident(std::uint64_t muid, std::optional<Date> start = {}, std::optional<Date> end = {}) {
-  BasicTransitIncident::Fields fields;
+  TransitIncidentFields fields;
   fields.muid = muid;
   fields.title = "Incident " + std::to_string(muid);
   fields.summary = "Summary " + std::to_string(muid);

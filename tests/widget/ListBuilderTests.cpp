@@ -236,7 +236,7 @@ TEST_F(ListBuilder, JoinsNamesAloneWhereAnIncidentHasNoText) {
       {{{"", nullptr}, {"W", nullptr}, {{}, system("")}, {"", system({})}}, "W"},
       {{{"", nullptr}, {{}, nullptr}}, ""},
   };
-  BasicTransitIncident::Fields titleOnly;
+  TransitIncidentFields titleOnly;
   titleOnly.title = "Title";
   Network network("");
   for (const auto& [lines, text] : cases) {
@@ -254,7 +254,7 @@ TEST_F(ListBuilder, JoinsNamesAloneWhereAnIncidentHasNoText) {
 }
 
 TEST_F(ListBuilder, JudgesEachCopyOfAnIncidentByItself) {
-  BasicTransitIncident::Fields textless;
+  TransitIncidentFields textless;
   textless.muid = 5;
   Network network("");
   network.lines = {lineItem(1, "A", {std::make_shared<const BasicTransitIncident>(textless)}),

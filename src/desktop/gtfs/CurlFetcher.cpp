@@ -5,7 +5,7 @@
 #include "desktop/gtfs/TransitLineServiceError.h"
 #include "desktop/gtfs/Utf8.h"
 #include "desktop/raii/CurlHandle.h"
-
+#include "platform/foundation/Version.h"
 namespace nimbo {
 
 namespace {
@@ -95,7 +95,7 @@ void setOptions(CURL* handle, Transfer& transfer, const CurlHeaders& headers) {
   set(CURLOPT_REDIR_PROTOCOLS_STR, "http,https");
   set(CURLOPT_FOLLOWLOCATION, 1L);
   set(CURLOPT_MAXREDIRS, kMostRedirects);
-  set(CURLOPT_USERAGENT, "nimbo-transit/" NIMBO_VERSION);
+  set(CURLOPT_USERAGENT, (std::string("nimbo-transit/") + kVersion).c_str());
   set(CURLOPT_ACCEPT_ENCODING, "gzip");
   set(CURLOPT_CONNECTTIMEOUT, kConnectSeconds);
   set(CURLOPT_TIMEOUT, static_cast<long>(transfer.request.timeLimit.count()));

@@ -6,8 +6,8 @@
 #include "platform/HostApplication.h"
 #include "platform/Localization.h"
 #include "platform/foundation/Log.h"
-#include "platform/transit/BasicTransitIncident.h"
 #include "platform/transit/BasicTransitLineItem.h"
+#include "platform/transit/TransitIncident.h"
 
 namespace nimbo {
 
@@ -84,15 +84,15 @@ TransitArtworkRef artworkOf(const std::optional<protocol::Shield>& shield) {
 TransitIncidents incidentsOf(const std::vector<protocol::Incident>& incidents) {
   TransitIncidents result;
   for (const protocol::Incident& incident : incidents) {
-    BasicTransitIncident::Fields fields{.muid = incident.muid,
-                                        .title = incident.title,
-                                        .summary = incident.summary,
-                                        .fullDescription = incident.fullDescription,
-                                        .startDate = incident.startDate,
-                                        .endDate = incident.endDate,
-                                        .lastUpdated = incident.lastUpdated,
-                                        .isBlockingIncident = incident.isBlocking,
-                                        .linkURL = incident.linkURL};
+    TransitIncidentFields fields{.muid = incident.muid,
+                                 .title = incident.title,
+                                 .summary = incident.summary,
+                                 .fullDescription = incident.fullDescription,
+                                 .startDate = incident.startDate,
+                                 .endDate = incident.endDate,
+                                 .lastUpdated = incident.lastUpdated,
+                                 .isBlockingIncident = incident.isBlocking,
+                                 .linkURL = incident.linkURL};
     for (const std::uint64_t line : incident.affectedLines)
       fields.affectedEntities.push_back(std::make_shared<const BasicAffectedEntity>(line));
     result.push_back(std::make_shared<const BasicTransitIncident>(std::move(fields)));

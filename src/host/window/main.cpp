@@ -9,6 +9,7 @@
 
 #include "desktop/system/SmallMemory.h"
 #include "host/window/WindowApplication.h"
+#include "platform/foundation/Version.h"
 
 namespace {
 
@@ -29,7 +30,7 @@ int main(int argc, char** argv) {
   app.add_option("--config", config, "Folder of feeds.json (default: $XDG_CONFIG_HOME/nimbo-transit)");
   app.add_option("--state", state, "Folder of favorites and last rows (default: $XDG_STATE_HOME/nimbo-transit)");
   app.add_option("URL", urls, "What to show, such as nimbo://?favorites=2&t=r");
-  app.set_version_flag("--version", NIMBO_VERSION);
+  app.set_version_flag("--version", nimbo::kVersion);
   CLI11_PARSE(app, argc, argv);
 
   std::signal(SIGPIPE, SIG_IGN);

@@ -7,4 +7,8 @@ const std::optional<std::string>& TransitIncident::linkURL() const {
   return absent;
 }
 
+std::string FieldsTransitIncident::description() const {
+  return "<" + std::string(className()) + ": " + std::to_string(muid()) + " " + title().value_or("(no title)") + ">";
+}
+
 }  // namespace nimbo

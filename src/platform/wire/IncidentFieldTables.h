@@ -41,8 +41,8 @@ struct WireObject<TransitIncidentAffectedEntity> {
 };
 
 template <>
-struct RecordTable<BasicTransitIncident::Fields> {
-  using Fields = BasicTransitIncident::Fields;
+struct RecordTable<TransitIncidentFields> {
+  using Fields = TransitIncidentFields;
   static constexpr std::tuple fields{Field{1, "muid", &Fields::muid},
                                      Field{2, "title", &Fields::title},
                                      Field{3, "summary", &Fields::summary},
@@ -63,7 +63,7 @@ struct RecordTable<BasicTransitIncident::Fields> {
 /// Only for incidents that are `StoredTransitIncident`s.
 template <>
 struct WireObject<TransitIncident> {
-  static const BasicTransitIncident::Fields& fields(const TransitIncident& incident) {
+  static const TransitIncidentFields& fields(const TransitIncident& incident) {
     return static_cast<const StoredTransitIncident&>(incident).fields();
   }
   template <class Fill>

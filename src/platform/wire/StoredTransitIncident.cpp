@@ -6,13 +6,13 @@
 
 namespace nimbo {
 
-template class Record<StoredTransitIncident, BasicTransitIncident::Fields, TransitIncident>;
+template class Record<StoredTransitIncident, TransitIncidentFields, FieldsTransitIncident>;
 
 std::shared_ptr<const StoredTransitIncident> StoredTransitIncident::initWithIncident(
     const TransitIncidentRef& incident) {
   if (!incident) return nullptr;
   if (auto stored = std::dynamic_pointer_cast<const StoredTransitIncident>(incident)) return stored;
-  BasicTransitIncident::Fields fields;
+  TransitIncidentFields fields;
   fields.muid = incident->muid();
   fields.title = incident->title();
   fields.summary = incident->summary();
@@ -37,9 +37,5 @@ const ArchivableClass& StoredTransitIncident::archivedClass() {
 }
 
 void StoredTransitIncident::encodeWithCoder(KeyedEncoder& coder) const { encodeRecord(*this, coder); }
-
-std::string StoredTransitIncident::description() const {
-  return "<StoredTransitIncident: " + std::to_string(muid()) + " " + title().value_or("(no title)") + ">";
-}
 
 }  // namespace nimbo
