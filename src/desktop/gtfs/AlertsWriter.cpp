@@ -9,7 +9,7 @@ namespace nimbo {
 
 namespace {
 
-using JSON = nlohmann::json;
+using nlohmann::json;
 using AlertBuilder = protozero::pbf_builder<AlertField>;
 
 // Names as published, in the order of their numbers from 1 on.
@@ -21,13 +21,13 @@ constexpr std::array<std::string_view, 11> kEffects = {
     "OTHER_EFFECT", "UNKNOWN_EFFECT",  "STOP_MOVED",         "NO_EFFECT", "ACCESSIBILITY_ISSUE"};
 constexpr std::array<std::string_view, 4> kSeverities = {"UNKNOWN_SEVERITY", "INFO", "WARNING", "SEVERE"};
 
-void writeName(AlertBuilder& alert, AlertField field, const JSON& value, std::span<const std::string_view> names) {
+void writeName(AlertBuilder& alert, AlertField field, const json& value, std::span<const std::string_view> names) {
   const auto found = std::find(names.begin(), names.end(), value.get<std::string>());
   if (found == names.end()) throw std::invalid_argument("not a name of GTFS-Realtime: " + value.dump());
   alert.add_enum(field, static_cast<std::int32_t>(found - names.begin()) + 1);
 }
 
-void writeText(AlertBuilder& alert, AlertField field, const JSON& texts) {
+void writeText(AlertBuilder& alert, AlertField field, const json& texts) {
   protozero::pbf_builder<TranslatedStringField> string(alert, field);
   for (const auto& [language, text] : texts.items()) {
     protozero::pbf_builder<TranslationField> translation(string, TranslatedStringField::translation);
@@ -36,8 +36,8 @@ void writeText(AlertBuilder& alert, AlertField field, const JSON& texts) {
   }
 }
 
-void writeAlert(AlertBuilder alert, const JSON& description, std::int64_t anchor) {
-  for (const JSON& period : description.at("periods")) {
+void writeAlert(AlertBuilder alert, const json& description, std::int64_t anchor) {
+  for (const json& period : description.at("periods")) {
     protozero::pbf_builder<TimeRangeField> range(alert, AlertField::activePeriod);
     const auto write = [&](TimeRangeField field, const char* key) {
       if (period.contains(key))
@@ -46,7 +46,7 @@ void writeAlert(AlertBuilder alert, const JSON& description, std::int64_t anchor
     write(TimeRangeField::start, "start");
     write(TimeRangeField::end, "end");
   }
-  for (const JSON& route : description.at("routes")) {
+  for (const json& route : description.at("routes")) {
     protozero::pbf_builder<EntitySelectorField> selector(alert, AlertField::informedEntity);
     selector.add_string(EntitySelectorField::routeID, route.get<std::string>());
   }
@@ -61,7 +61,7 @@ void writeAlert(AlertBuilder alert, const JSON& description, std::int64_t anchor
 
 }  // namespace
 
-std::string alertsFeedBytes(const JSON& alerts, Date anchor) {
+std::string alertsFeedBytes(const json& alerts, Date anchor) {
   const std::int64_t seconds = anchor.time_since_epoch() / std::chrono::seconds(1);
   std::string bytes;
   protozero::pbf_builder<FeedMessageField> message(bytes);
@@ -71,7 +71,7 @@ std::string alertsFeedBytes(const JSON& alerts, Date anchor) {
     header.add_enum(FeedHeaderField::incrementality, 0);
     header.add_uint64(FeedHeaderField::timestamp, static_cast<std::uint64_t>(seconds));
   }
-  for (const JSON& description : alerts) {
+  for (const json& description : alerts) {
     protozero::pbf_builder<FeedEntityField> entity(message, FeedMessageField::entity);
     entity.add_string(FeedEntityField::id, description.at("id").get<std::string>());
     writeAlert(AlertBuilder(entity, FeedEntityField::alert), description, seconds);

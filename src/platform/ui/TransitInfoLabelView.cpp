@@ -12,7 +12,7 @@ namespace nimbo {
 namespace {
 
 // What rounding to device pixels may take away must not cost a shield.
-constexpr double kTolerance = 1e-3;
+constexpr double kLayoutTolerance = 1e-3;
 
 }  // namespace
 
@@ -93,7 +93,7 @@ const TransitInfoLabelView::Row& TransitInfoLabelView::row() {
   made.scale = scale;
   made.rightToLeft = isRightToLeft();
   fillRow(made, shields);
-  const auto ceiled = [scale](double length) { return std::ceil(length * scale - kTolerance) / scale; };
+  const auto ceiled = [scale](double length) { return std::ceil(length * scale - kLayoutTolerance) / scale; };
   made.size.width = ceiled(made.size.width);
   // The middle of the capital letters is the middle of the shields.
   const double aboveMiddle = std::max(highest / 2, _font->ascent() - _font->capHeight() / 2);
@@ -111,7 +111,7 @@ void TransitInfoLabelView::fillRow(Row& row, const std::vector<std::pair<std::si
     ends.push_back(ends.back() + (ends.size() > 1 ? _spaceBetweenShields : 0) + size.width);
   std::size_t shown = shields.size();
   if (_maxWidth) {
-    const double room = std::max(*_maxWidth, 0.0) + kTolerance;
+    const double room = std::max(*_maxWidth, 0.0) + kLayoutTolerance;
     while (shown > 0 && ends[shown] > room) --shown;
     if (shown < shields.size() && _truncationTextGenerator && *_maxWidth > 0) {
       for (;; --shown) {
