@@ -5,8 +5,8 @@
 #include <tuple>
 
 #include "Fuzz.h"
-#include "desktop/gtfs/IncidentReader.h"
-#include "desktop/gtfs/StaticFeedBuilder.h"
+#include "desktop/gtfs/alerts/IncidentReader.h"
+#include "desktop/gtfs/static/StaticFeedBuilder.h"
 
 namespace nimbo {
 

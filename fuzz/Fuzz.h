@@ -5,7 +5,7 @@
 #include <span>
 #include <string_view>
 
-#include "desktop/gtfs/Utf8.h"
+#include "desktop/gtfs/text/Utf8.h"
 
 namespace nimbo {
 

@@ -1,10 +1,10 @@
 // What publishers write, as riders read it.
 
-#include "desktop/gtfs/PlainText.h"
+#include "desktop/gtfs/text/PlainText.h"
 
 #include "Fuzz.h"
-#include "desktop/gtfs/AlertTexts.h"
-#include "desktop/gtfs/Utf8.h"
+#include "desktop/gtfs/alerts/AlertTexts.h"
+#include "desktop/gtfs/text/Utf8.h"
 
 namespace nimbo {
 

@@ -4,8 +4,8 @@
 #include <unistd.h>
 
 #include "Fuzz.h"
-#include "desktop/gtfs/FeedsPart.h"
-#include "desktop/gtfs/StaticFeedReader.h"
+#include "desktop/gtfs/net/FeedsPart.h"
+#include "desktop/gtfs/static/StaticFeedBuilder.h"
 
 namespace nimbo {
 

@@ -6,11 +6,11 @@
 #include <string>
 #include <vector>
 
-#include "desktop/drawing/CairoImageResources.h"
+#include "desktop/drawing/CairoImage.h"
 #include "desktop/drawing/CairoShieldRenderer.h"
+#include "desktop/drawing/CairoSurface.h"
 #include "desktop/drawing/PangoTextSystem.h"
-#include "desktop/drawing/Rendering.h"
-#include "platform/ui/SystemColors.h"
+#include "platform/ui/Color.h"
 #include "support/TestPlatform.h"
 
 namespace nimbo {

@@ -3,7 +3,7 @@
 
 usage: tools/solver-compare.py DRIVER [--systems N] [--seed S]
 
-DRIVER is the program nimbo_solver_driver of a build with tests (tests/platform). Each system is built step by step in
+DRIVER is the program nimbo_solver_driver of a build with tests (tests/platform/ui). Each system is built step by step in
 our solver: constraints are added, changed and taken away again; kiwisolver gets what then stands, from scratch. They
 agree when
 

@@ -10,9 +10,9 @@
 #include <fstream>
 #include <sstream>
 
-#include "desktop/gtfs/FeedMuid.h"
-#include "desktop/gtfs/IncidentReader.h"
-#include "desktop/gtfs/StaticFeedStore.h"
+#include "desktop/gtfs/alerts/IncidentReader.h"
+#include "desktop/gtfs/feeds/FeedMuid.h"
+#include "desktop/gtfs/static/StaticFeedStore.h"
 #include "support/MadeUpFeed.h"
 #include "support/MadeUpLines.h"
 

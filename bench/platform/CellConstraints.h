@@ -2,7 +2,7 @@
 
 #include <vector>
 
-#include "platform/ui/layout/LayoutRelation.h"
+#include "platform/ui/layout/LayoutItem.h"
 
 namespace nimbo {
 

@@ -3,7 +3,7 @@
 #include <cstddef>
 
 #include "desktop/DesktopPlatform.h"
-#include "platform/transit/TransitLineItem.h"
+#include "platform/transit/TransitLine.h"
 
 namespace nimbo {
 

@@ -5,8 +5,8 @@
 #include <unordered_map>
 
 #include "platform/AnalyticsPipeline.h"
-#include "platform/transit/TransitLineItem.h"
-#include "platform/ui/IndexPath.h"
+#include "platform/transit/TransitLine.h"
+#include "platform/ui/TableView.h"
 #include "platform/ui/WidgetHost.h"
 
 namespace nimbo {

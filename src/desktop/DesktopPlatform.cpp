@@ -4,8 +4,8 @@
 #include <cstdlib>
 #include <sstream>
 
-#include "desktop/gtfs/FeedConfiguration.h"
-#include "desktop/gtfs/SampleCity.h"
+#include "desktop/gtfs/feeds/FeedConfiguration.h"
+#include "desktop/gtfs/feeds/SampleCity.h"
 
 namespace nimbo {
 

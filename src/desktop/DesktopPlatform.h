@@ -7,7 +7,7 @@
 #include "desktop/archive/Bzip2.h"
 #include "desktop/archive/CBORKeyedArchive.h"
 #include "desktop/drawing/LateDrawing.h"
-#include "desktop/gtfs/GTFSTransitLineService.h"
+#include "desktop/gtfs/feeds/GTFSTransitLineService.h"
 #include "desktop/store/FavoritesEditor.h"
 #include "desktop/store/GuardedFavorites.h"
 #include "desktop/store/SQLiteAnalyticsPipeline.h"
@@ -21,7 +21,6 @@
 #include "desktop/system/SoftLinkedDeviceLockState.h"
 #include "desktop/system/SystemClock.h"
 #include "desktop/system/SystemLog.h"
-#include "desktop/system/SystemRandom.h"
 #include "platform/Platform.h"
 #include "platform/VirtualTime.h"
 

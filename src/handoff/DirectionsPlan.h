@@ -1,7 +1,7 @@
 #pragma once
 
 #include "handoff/DirectionsPlanTransitPreferences.h"
-#include "platform/wire/StoredRouteRequest.h"
+#include "platform/wire/PlanRecords.h"
 
 namespace nimbo {
 

@@ -5,7 +5,8 @@
 #include <string>
 
 #include "handoff/NBOpenable.h"
-#include "platform/HostApplication.h"
+#include "platform/SystemServices.h"
+#include "platform/transit/TransitLine.h"
 
 namespace nimbo {
 
@@ -47,5 +48,11 @@ class NBUserActivityData final : public NBOpenable {
 };
 
 using NBUserActivityDataRef = std::shared_ptr<const NBUserActivityData>;
+
+/// Opens the map application at this line, with its incidents. Null when the payload cannot be compressed.
+NBUserActivityDataRef activityDataForLineItem(const TransitLineItemRef& lineItem);
+
+/// Opens the map application at the list of these incidents, in this order. Null when they cannot be archived.
+NBUserActivityDataRef activityDataForIncidents(const TransitIncidents& incidents);
 
 }  // namespace nimbo

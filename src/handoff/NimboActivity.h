@@ -1,10 +1,7 @@
 #pragma once
 
 #include "handoff/DirectionsPlan.h"
-#include "platform/wire/DroppedPin.h"
-#include "platform/wire/MapDisplayOptions.h"
-#include "platform/wire/StoredMapItem.h"
-#include "platform/wire/StoredSearchCategory.h"
+#include "platform/wire/PlanRecords.h"
 #include "platform/wire/StoredTransitLineItem.h"
 
 namespace nimbo {

@@ -7,7 +7,7 @@
 #include <filesystem>
 #include <vector>
 
-#include "desktop/gtfs/FeedConfiguration.h"
+#include "desktop/gtfs/feeds/FeedConfiguration.h"
 #include "platform/foundation/Date.h"
 #include "protocol/Names.h"
 

@@ -1,13 +1,11 @@
-#include "host/FavoriteCommands.h"
-
 #include <iostream>
 
-#include "desktop/gtfs/FeedCatalog.h"
-#include "desktop/gtfs/FeedLibrary.h"
-#include "desktop/gtfs/LineNames.h"
-#include "host/FeedCommands.h"
-#include "host/GoneLines.h"
+#include "desktop/gtfs/feeds/FeedCatalog.h"
+#include "desktop/gtfs/feeds/FeedLibrary.h"
+#include "desktop/gtfs/static/LineItems.h"
+#include "host/Commands.h"
 #include "host/HostPlatform.h"
+#include "host/TerminalText.h"
 
 namespace nimbo {
 

@@ -1,13 +1,12 @@
-#include "host/FeedCommands.h"
-
 #include <algorithm>
 #include <iostream>
 #include <vector>
 
-#include "desktop/gtfs/FeedCatalog.h"
-#include "desktop/gtfs/FeedCheck.h"
-#include "desktop/gtfs/FeedLibrary.h"
-#include "desktop/gtfs/LineNames.h"
+#include "desktop/gtfs/feeds/FeedCatalog.h"
+#include "desktop/gtfs/feeds/FeedCheck.h"
+#include "desktop/gtfs/feeds/FeedLibrary.h"
+#include "desktop/gtfs/static/LineItems.h"
+#include "host/Commands.h"
 #include "host/HostPlatform.h"
 #include "host/TerminalText.h"
 

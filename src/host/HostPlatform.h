@@ -1,7 +1,7 @@
 #pragma once
 
 #include "desktop/DesktopPlatform.h"
-#include "host/Command.h"
+#include "host/Commands.h"
 
 namespace nimbo {
 

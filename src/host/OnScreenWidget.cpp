@@ -2,8 +2,8 @@
 
 #include <algorithm>
 
-#include "platform/HostApplication.h"
-#include "platform/ui/TextStyles.h"
+#include "platform/SystemServices.h"
+#include "platform/ui/Font.h"
 
 namespace nimbo {
 

@@ -3,7 +3,7 @@
 #include <optional>
 #include <string>
 
-#include "host/Command.h"
+#include "host/Commands.h"
 #include "host/WidgetClient.h"
 #include "platform/foundation/Presentation.h"
 

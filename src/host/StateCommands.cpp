@@ -1,5 +1,3 @@
-#include "host/StateCommands.h"
-
 #include <unistd.h>
 
 #include <cerrno>
@@ -9,6 +7,7 @@
 #include <iterator>
 
 #include "desktop/rpc/Base64.h"
+#include "host/Commands.h"
 #include "host/HostPlatform.h"
 #include "host/TerminalText.h"
 #include "host/WidgetClient.h"

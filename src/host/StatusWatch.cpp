@@ -1,6 +1,6 @@
 #include "host/StatusWatch.h"
 
-#include "host/StatusBarLine.h"
+#include "host/StatusBar.h"
 
 namespace nimbo {
 

@@ -4,7 +4,6 @@
 #include <memory>
 #include <string>
 
-#include "host/Backoff.h"
 #include "host/OnScreenWidget.h"
 #include "host/WatchedWidget.h"
 

@@ -6,6 +6,14 @@
 
 namespace nimbo {
 
+/// What to tell the user of a favourite line, "FEED:ROUTE_ID", that its feed does not know any more.
+inline std::string goneLineText(const std::string& line) {
+  return "the favorite line " + line +
+         " is gone from its feed, and its incidents with it. Find it anew with \"lines\", or forget it with \"favorite "
+         "remove " +
+         line + "\".";
+}
+
 /// `text` for a terminal: every control character (escape sequences of a hostile feed among them) is a blank, line ends
 /// stay, and characters that set a direction go: few terminals know them, and they turn what stands around. Bad UTF-8
 /// becomes U+FFFD.

@@ -1,5 +1,6 @@
 #pragma once
 
+#include <algorithm>
 #include <functional>
 #include <memory>
 #include <string>
@@ -7,8 +8,27 @@
 #include <vector>
 
 #include "host/WidgetClient.h"
+#include "platform/foundation/Date.h"
 
 namespace nimbo {
+
+/// How long to wait before the next of several attempts: each time twice as long as the time before.
+class Backoff {
+ public:
+  /// `first` and `most` in seconds, 0 < first <= most.
+  Backoff(TimeInterval first, TimeInterval most) : _first(first), _most(most), _next(first) {}
+
+  TimeInterval next() {
+    const TimeInterval wait = _next;
+    _next = std::min(2 * _next, _most);
+    return wait;
+  }
+  /// An attempt succeeded: the next wait is the first one again.
+  void reset() { _next = _first; }
+
+ private:
+  TimeInterval _first, _most, _next;
+};
 
 /// A widget process that a host on screen can rely on: one that ends, hangs, does not stop talking or speaks nonsense
 /// is killed, and the host hears of it. Main thread only.

@@ -1,15 +1,14 @@
-#include "host/WidgetCommands.h"
-
 #include <cerrno>
 #include <cstring>
 #include <filesystem>
 #include <fstream>
 #include <iostream>
 
-#include "host/GoneLines.h"
+#include "host/Commands.h"
 #include "host/OnScreenWidget.h"
 #include "host/ScriptPlayer.h"
 #include "host/TerminalRows.h"
+#include "host/TerminalText.h"
 #include "protocol/Names.h"
 
 namespace nimbo {

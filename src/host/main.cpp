@@ -12,11 +12,8 @@
 #include <set>
 
 #include "host/Arguments.h"
-#include "host/FavoriteCommands.h"
-#include "host/FeedCommands.h"
-#include "host/StateCommands.h"
-#include "host/StatusBarCommand.h"
-#include "host/WidgetCommands.h"
+#include "host/Commands.h"
+#include "host/StatusBar.h"
 #include "platform/foundation/Version.h"
 
 namespace nimbo {

@@ -1,7 +1,6 @@
 #include "incidents/DebugTransitIncident.h"
 
-#include "incidents/DebugAffectedEntities.h"
-#include "platform/Clock.h"
+#include "platform/SystemServices.h"
 
 namespace nimbo {
 

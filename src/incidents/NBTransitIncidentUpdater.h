@@ -3,11 +3,23 @@
 #include <memory>
 #include <set>
 
-#include "incidents/NBTransitIncidentUpdaterObserver.h"
 #include "platform/RunLoop.h"
-#include "platform/transit/TransitLineItem.h"
+#include "platform/foundation/Date.h"
+#include "platform/transit/TransitLine.h"
 
 namespace nimbo {
+
+class NBTransitIncidentUpdater;
+
+/// Hears of an updater's moments, on the main thread. May invalidate the updater meanwhile.
+class NBTransitIncidentUpdaterObserver {
+ public:
+  virtual ~NBTransitIncidentUpdaterObserver() = default;
+  /// An incident starts or ends at `date`, which was reached: the rows are to be built again for the present moment.
+  virtual void transitIncidentUpdater_dateExpired(NBTransitIncidentUpdater& updater, Date date) = 0;
+  /// The refresh interval has passed: the line items are to be fetched again.
+  virtual void transitIncidentUpdaterNeedsRefresh(NBTransitIncidentUpdater& updater) = 0;
+};
 
 /// Tells when the rows of some line items change by themselves, because an incident starts or ends, and when the line
 /// items are to be fetched again. Runs from its creation until `invalidate`: the timers hold it, so its owner

@@ -1,6 +1,10 @@
 #include "items/NBConfiguredArtwork.h"
 
+#include <map>
+#include <utility>
+
 #include "platform/Platform.h"
+#include "platform/artwork/ArtworkImageSource.h"
 #include "platform/foundation/Hash.h"
 
 namespace nimbo {
@@ -35,5 +39,18 @@ bool NBConfiguredArtwork::isEqual(const Object* other) const {
 }
 
 std::uint64_t NBConfiguredArtwork::hash() const { return hashOfDouble(_alpha) ^ hashOf(_artworkSource); }
+
+namespace {
+struct NamedArtworks {
+  std::map<std::pair<std::string, double>, NBConfiguredArtworkRef> made;
+};
+}  // namespace
+
+NBConfiguredArtworkRef artworkOfImageNamed(const std::string& name, double alpha) {
+  const auto artworks = Platform::current().singleton<NamedArtworks>([] { return std::make_shared<NamedArtworks>(); });
+  NBConfiguredArtworkRef& artwork = artworks->made[{name, alpha}];
+  if (!artwork) artwork = NBConfiguredArtwork::initWithArtworkSource_alpha(NamedImage::imageNamed(name), alpha);
+  return artwork;
+}
 
 }  // namespace nimbo

@@ -1,6 +1,7 @@
 #pragma once
 
 #include <memory>
+#include <string>
 
 #include "platform/artwork/ArtworkImageSource.h"
 
@@ -36,5 +37,9 @@ class NBConfiguredArtwork : public Object {
 };
 
 using NBConfiguredArtworkRef = std::shared_ptr<const NBConfiguredArtwork>;
+
+/// One of the widget's own images at an opacity: one object for each while the platform is in force, so that rows which
+/// show it are found equal at a glance. Main thread only.
+NBConfiguredArtworkRef artworkOfImageNamed(const std::string& name, double alpha);
 
 }  // namespace nimbo

@@ -1,6 +1,6 @@
 #include "items/NBTransitIncidentFilter.h"
 
-#include "platform/Clock.h"
+#include "platform/SystemServices.h"
 
 namespace nimbo {
 

@@ -14,7 +14,7 @@
 #include "items/NumberList.h"
 #include "platform/artwork/ArtworkCache.h"
 #include "platform/foundation/URL.h"
-#include "platform/transit/TransitLineItem.h"
+#include "platform/transit/TransitLine.h"
 
 namespace nimbo {
 

@@ -3,14 +3,13 @@
 #include <algorithm>
 #include <utility>
 
-#include "handoff/NBUserActivityData+Payloads.h"
-#include "handoff/URL+NBOpenable.h"
+#include "handoff/NBOpenable.h"
+#include "handoff/NBUserActivityData.h"
+#include "items/NBConfiguredArtwork.h"
 #include "items/NBTransitIncidentsDataSourceBuilder.h"
-#include "items/NamedArtwork.h"
 #include "platform/Localization.h"
-#include "platform/MapURLBuilder.h"
 #include "platform/UserSession.h"
-#include "platform/artwork/SizedTransitArtwork.h"
+#include "platform/artwork/ArtworkCache.h"
 #include "platform/transit/IncidentStringProvider.h"
 
 namespace nimbo {

@@ -4,10 +4,10 @@
 #include <functional>
 #include <utility>
 
+#include "items/NBConfiguredArtwork.h"
 #include "items/NBTransitIncidentsDataSourceBuilder.h"
-#include "items/NamedArtwork.h"
 #include "platform/Localization.h"
-#include "platform/artwork/SizedTransitArtwork.h"
+#include "platform/artwork/ArtworkCache.h"
 
 namespace nimbo {
 

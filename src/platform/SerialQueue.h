@@ -6,9 +6,14 @@
 #include <memory>
 #include <mutex>
 #include <string>
+#include <string_view>
 #include <thread>
 
 namespace nimbo {
+
+/// Runs `work` as the outermost frame of a thread, or of a callback from a library: what it throws becomes a log line
+/// that names `what`, where a platform is in force, and goes no further.
+void runGuarded(std::string_view what, const std::function<void()>& work) noexcept;
 
 /// Work in order on one background thread, which starts with the first piece of work.
 class SerialQueue {

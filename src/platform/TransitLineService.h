@@ -6,7 +6,7 @@
 
 #include "platform/foundation/Error.h"
 #include "platform/transit/MapItemIdentifier.h"
-#include "platform/transit/TransitLineItem.h"
+#include "platform/transit/TransitLine.h"
 
 namespace nimbo {
 

@@ -4,8 +4,15 @@
 #include <optional>
 
 #include "platform/Platform.h"
+#include "platform/SystemServices.h"
 
 namespace nimbo {
+
+URL MapURLBuilder::build() const {
+  std::string text = std::string(kHostApplicationURLScheme) + "://?favorites=" + std::to_string(_favoritesType);
+  if (_mapType == kMapTypeTransit) text += "&t=r";
+  return URL(std::move(text));
+}
 
 namespace {
 

@@ -3,8 +3,8 @@
 #include <mutex>
 #include <vector>
 
-#include "platform/Clock.h"
 #include "platform/RunLoop.h"
+#include "platform/SystemServices.h"
 
 namespace nimbo {
 

@@ -2,7 +2,7 @@
 
 #include <filesystem>
 
-#include "desktop/drawing/Picture.h"
+#include "desktop/drawing/DrawingPart.h"
 
 namespace nimbo {
 

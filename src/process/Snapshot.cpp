@@ -3,12 +3,12 @@
 #include <limits>
 
 #include "desktop/rpc/Base64.h"
+#include "handoff/NBOpenable.h"
 #include "handoff/NBUserActivityData.h"
-#include "handoff/URL+NBOpenable.h"
 #include "items/NBConfiguredArtwork.h"
 #include "items/NBTransitSummaryItem.h"
-#include "platform/artwork/NamedImage.h"
-#include "platform/artwork/SizedTransitArtwork.h"
+#include "platform/artwork/ArtworkCache.h"
+#include "platform/artwork/ArtworkImageSource.h"
 
 namespace nimbo {
 

@@ -4,10 +4,10 @@
 #include <utility>
 
 #include "desktop/drawing/DrawingPart.h"
-#include "desktop/gtfs/LineNames.h"
+#include "desktop/gtfs/static/LineItems.h"
 #include "desktop/rpc/Base64.h"
 #include "platform/foundation/Version.h"
-#include "platform/ui/SystemColors.h"
+#include "platform/ui/Color.h"
 #include "process/HandoffDecoder.h"
 #include "process/HostLogSink.h"
 #include "process/SharedSurface.h"

@@ -2,9 +2,14 @@
 
 #include "platform/Platform.h"
 #include "platform/ui/Environment.h"
-#include "platform/ui/RoundToViewScale.h"
+#include "platform/ui/View.h"
 
 namespace nimbo {
+
+double DynamicTypeValue::scaledValue() const {
+  const FontRef font = _fontProvider ? _fontProvider() : nullptr;
+  return font ? font->_scaledValueForValue(_unscaledValue) : _unscaledValue;
+}
 
 namespace {
 

@@ -1,17 +1,43 @@
 #pragma once
 
 #include <cstdint>
+#include <functional>
 #include <map>
 #include <memory>
 #include <string>
 
+#include "platform/ui/Font.h"
 #include "platform/ui/StackView.h"
 #include "platform/ui/StyledLabel.h"
 #include "platform/ui/WeakKeyMap.h"
 #include "platform/ui/layout/LayoutConstraint.h"
-#include "ui/DynamicTypeValue.h"
 
 namespace nimbo {
+
+/// Answers the font that a text or a length follows, at the present text size; may answer null.
+using FontProvider = std::function<FontRef()>;
+
+/// A length that grows and shrinks with a font. Main thread only.
+class DynamicTypeValue final : public Object {
+ public:
+  /// The length in points at the default text size; the provider may be empty.
+  DynamicTypeValue(double unscaledValue, FontProvider fontProvider)
+      : _fontProvider(std::move(fontProvider)), _unscaledValue(unscaledValue) {}
+
+  const FontProvider& fontProvider() const { return _fontProvider; }
+  void setFontProvider(FontProvider fontProvider) { _fontProvider = std::move(fontProvider); }
+  double unscaledValue() const { return _unscaledValue; }
+  void setUnscaledValue(double value) { _unscaledValue = value; }
+
+  /// Points, at the font's present size; without a font the unscaled value.
+  double scaledValue() const;
+
+  std::string_view className() const override { return "DynamicTypeValue"; }
+
+ private:
+  FontProvider _fontProvider;
+  double _unscaledValue;
+};
 
 /// Keeps fonts and lengths in step with the user's text size. Registrations do not keep objects alive and end with
 /// them; registering an object again replaces what was registered. An empty provider registers nothing. One for each

@@ -3,9 +3,9 @@
 #include <algorithm>
 
 #include "items/NBConfiguredArtwork.h"
-#include "items/NBTransitDataSourceBuilderForResult.h"
+#include "items/NBTransitItemDataSourceBuilder.h"
 #include "items/NBTransitSummaryItem.h"
-#include "platform/artwork/SizedTransitArtwork.h"
+#include "platform/artwork/ArtworkCache.h"
 #include "platform/foundation/Boxed.h"
 #include "platform/foundation/Log.h"
 #include "ui/NBTransitItemFixedHeightCell.h"

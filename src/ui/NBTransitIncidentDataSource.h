@@ -11,8 +11,8 @@
 #include "items/NBTransitListItem.h"
 #include "platform/artwork/ArtworkCache.h"
 #include "platform/ui/TableView.h"
-#include "ui/ArtworkWidthCalculatorSizeParameter.h"
 #include "ui/NBTransitItemArtworkColumnCalculator.h"
+#include "ui/TransitDirectionsListArtworkWidthCalculator.h"
 
 namespace nimbo {
 

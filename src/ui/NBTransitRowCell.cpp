@@ -1,6 +1,6 @@
 #include "ui/NBTransitRowCell.h"
 
-#include "platform/ui/RoundToViewScale.h"
+#include "platform/ui/View.h"
 
 namespace nimbo {
 

@@ -4,11 +4,19 @@
 #include <unordered_map>
 #include <vector>
 
-#include "platform/artwork/SizedTransitArtwork.h"
+#include "platform/artwork/ArtworkCache.h"
+#include "platform/foundation/Geometry.h"
 #include "platform/foundation/Object.h"
-#include "ui/ArtworkWidthCalculatorSizeParameter.h"
 
 namespace nimbo {
+
+/// The room for the shield column, in points.
+struct ArtworkWidthCalculatorSizeParameter {
+  double defaultArtworkViewWidth = 0;  ///< the narrowest the column may be, and its width without shields
+  double maxArtworkViewWidth = 0;      ///< the widest the column may be
+  Insets artworkInsets;                ///< left and right are added to every shield's width
+  bool operator==(const ArtworkWidthCalculatorSizeParameter&) const = default;
+};
 
 using SizedTransitArtworkRef = std::shared_ptr<const SizedTransitArtwork>;
 

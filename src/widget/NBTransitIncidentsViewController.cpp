@@ -1,8 +1,8 @@
 #include "widget/NBTransitIncidentsViewController.h"
 
 #include "incidents/NBTransitIncidentFetcher.h"
-#include "platform/HostApplication.h"
 #include "platform/Platform.h"
+#include "platform/SystemServices.h"
 #include "platform/foundation/Log.h"
 #include "platform/ui/Environment.h"
 #include "ui/ArtworkCache+Nimbo.h"

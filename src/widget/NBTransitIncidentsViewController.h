@@ -6,7 +6,7 @@
 #include <string>
 
 #include "analytics/NBTransitIncidentsAnalyticsDelegate.h"
-#include "incidents/NBTransitIncidentFetcherRequest.h"
+#include "incidents/NBTransitIncidentFetcher.h"
 #include "incidents/NBTransitIncidentUpdater.h"
 #include "incidents/Result.h"
 #include "platform/MemoryPressure.h"

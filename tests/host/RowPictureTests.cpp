@@ -6,7 +6,7 @@
 #include <array>
 #include <cctype>
 
-#include "desktop/DrawingInk.h"
+#include "desktop/drawing/Ink.h"
 #include "host/Programs.h"
 
 namespace nimbo {

@@ -4,7 +4,7 @@
 #include <map>
 
 #include "platform/artwork/ArtworkCache.h"
-#include "platform/artwork/NamedImage.h"
+#include "platform/artwork/ArtworkImageSource.h"
 #include "platform/ui/TextSystem.h"
 
 namespace nimbo {

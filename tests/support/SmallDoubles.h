@@ -8,12 +8,8 @@
 #include <vector>
 
 #include "platform/AnalyticsPipeline.h"
-#include "platform/Bzip2Compress.h"
-#include "platform/DeviceLockState.h"
 #include "platform/MemoryPressure.h"
-#include "platform/NetworkFailureDiagnosis.h"
-#include "platform/RandomSource.h"
-#include "platform/Signposts.h"
+#include "platform/SystemServices.h"
 
 namespace nimbo {
 

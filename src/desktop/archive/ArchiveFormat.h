@@ -1,5 +1,7 @@
 #pragma once
 
+#include <glib.h>
+
 #include <cstddef>
 #include <cstdint>
 #include <string>
@@ -8,6 +10,7 @@
 #include <vector>
 
 // The keyed archive as CBOR (RFC 8949); docs/formats.md describes it for readers of other programs.
+
 namespace nimbo {
 
 /// Key of the version in the outermost map. It sorts first, so that an archive is known by its first bytes.
@@ -68,5 +71,15 @@ class ArchivePath {
  private:
   std::vector<Step> _steps;
 };
+
+/// Whether a text may stand in CBOR: valid UTF-8, zero characters included, which GLib does not take for text.
+inline bool isUTF8(std::string_view text) {
+  for (;;) {
+    const std::string_view part = text.substr(0, text.find('\0'));
+    if (!g_utf8_validate_len(part.data(), part.size(), nullptr)) return false;
+    if (part.size() == text.size()) return true;
+    text.remove_prefix(part.size() + 1);
+  }
+}
 
 }  // namespace nimbo

@@ -1,6 +1,6 @@
 #pragma once
 
-#include "platform/Bzip2Compress.h"
+#include "platform/SystemServices.h"
 #include "platform/foundation/Outcome.h"
 
 namespace nimbo {

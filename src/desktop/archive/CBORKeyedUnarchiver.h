@@ -2,11 +2,47 @@
 
 #include <map>
 #include <nlohmann/json.hpp>
+#include <span>
 
 #include "desktop/archive/ArchiveFormat.h"
 #include "platform/archive/KeyedArchive.h"
+#include "platform/archive/SecureCoding.h"
+#include "platform/foundation/Outcome.h"
 
 namespace nimbo {
+
+/// The values of an archive, not yet objects: its outermost map. Reads CBOR within the bounds of archives: maps with
+/// distinct text keys, UTF-8 texts, no tags, nothing after the end. An error for all that is no whole archive of this
+/// version.
+Outcome<nlohmann::json> parseArchive(std::span<const std::uint8_t> bytes);
+
+class CBORKeyedUnarchiver;
+
+/// The keyed fields of one object of an archive. Lives while the object is read.
+class CBORKeyedDecoder final : public KeyedDecoder {
+ public:
+  CBORKeyedDecoder(const nlohmann::json& fields, CBORKeyedUnarchiver& unarchiver)
+      : _fields(fields), _unarchiver(unarchiver) {}
+
+  bool containsValueForKey(std::string_view key) const override;
+  ObjectRef decodeObjectOfClasses_forKey(const AllowedClasses& classes, std::string_view key) override;
+  bool decodeBoolForKey(std::string_view key) override;
+  std::int64_t decodeInt64ForKey(std::string_view key) override;
+  std::uint64_t decodeUInt64ForKey(std::string_view key) override;
+  double decodeDoubleForKey(std::string_view key) override;
+  std::optional<std::string> decodeStringForKey(std::string_view key) override;
+  std::optional<Date> decodeDateForKey(std::string_view key) override;
+  std::optional<Bytes> decodeBytesForKey(std::string_view key) override;
+  void failWithReason(std::string reason) override;
+
+ private:
+  /// The field, or null when it is absent, not `isKind`, or the decoding has failed. Another kind fails the decoding.
+  const nlohmann::json* field(std::string_view key, bool (*isKind)(const nlohmann::json&), const char* kind);
+  void failAtKey(std::string_view key, const std::string& reason);
+
+  const nlohmann::json& _fields;
+  CBORKeyedUnarchiver& _unarchiver;
+};
 
 /// Reads the objects of a parsed archive.
 class CBORKeyedUnarchiver final : public KeyedUnarchiver {

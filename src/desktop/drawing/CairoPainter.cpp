@@ -7,7 +7,6 @@
 #include <stdexcept>
 
 #include "desktop/drawing/CairoImage.h"
-#include "desktop/drawing/DrawnImage.h"
 #include "desktop/drawing/PangoTextLayout.h"
 
 namespace nimbo {

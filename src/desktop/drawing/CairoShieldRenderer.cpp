@@ -6,10 +6,10 @@
 #include <cmath>
 #include <numbers>
 
+#include "desktop/drawing/CairoImage.h"
 #include "desktop/drawing/CairoPainter.h"
-#include "desktop/drawing/DrawnImage.h"
 #include "desktop/drawing/VectorImage.h"
-#include "platform/ui/SystemColors.h"
+#include "platform/ui/Color.h"
 
 namespace nimbo {
 

@@ -2,7 +2,7 @@
 
 #include <utility>
 
-#include "desktop/drawing/Picture.h"
+#include "desktop/drawing/DrawingPart.h"
 #include "desktop/raii/CairoHandles.h"
 #include "platform/foundation/Geometry.h"
 #include "platform/foundation/Outcome.h"
@@ -43,5 +43,13 @@ class CairoSurface final : public Picture {
   Size _size;
   double _scale;
 };
+
+/// A picture of `size` points at `scale` device pixels a point, over `background`. Errors are those of
+/// `CairoSurface::make`. Main thread.
+Outcome<CairoSurfaceRef> renderToSurface(const DrawOperation& draw, Size size, double scale, const Color& background);
+
+/// The same as a PNG file at `path`, replaced whole or not at all. Null on success.
+ErrorRef renderToPNG(const DrawOperation& draw, Size size, double scale, const Color& background,
+                     const std::filesystem::path& path);
 
 }  // namespace nimbo

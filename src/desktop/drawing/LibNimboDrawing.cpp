@@ -1,10 +1,10 @@
 // libnimbo-drawing.so: what DrawingPart.h declares.
 
-#include "desktop/drawing/CairoImageResources.h"
+#include "desktop/drawing/CairoImage.h"
 #include "desktop/drawing/CairoShieldRenderer.h"
+#include "desktop/drawing/CairoSurface.h"
 #include "desktop/drawing/DrawingPart.h"
 #include "desktop/drawing/PangoTextSystem.h"
-#include "desktop/drawing/Rendering.h"
 
 namespace nimbo {
 

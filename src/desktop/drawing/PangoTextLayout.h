@@ -1,6 +1,6 @@
 #pragma once
 
-#include "desktop/raii/GObjectHandle.h"
+#include "desktop/raii/CairoHandles.h"
 #include "platform/ui/TextSystem.h"
 
 typedef struct _cairo cairo_t;

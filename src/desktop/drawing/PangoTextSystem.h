@@ -4,7 +4,7 @@
 #include <optional>
 #include <string>
 
-#include "desktop/raii/GObjectHandle.h"
+#include "desktop/raii/CairoHandles.h"
 #include "platform/ui/TextSystem.h"
 
 typedef struct _PangoContext PangoContext;

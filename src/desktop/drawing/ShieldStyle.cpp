@@ -2,7 +2,7 @@
 
 #include <algorithm>
 
-#include "platform/ui/SystemColors.h"
+#include "platform/ui/Color.h"
 
 namespace nimbo {
 

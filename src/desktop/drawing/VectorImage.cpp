@@ -5,7 +5,7 @@
 #include <algorithm>
 #include <numbers>
 
-#include "desktop/drawing/DrawnImage.h"
+#include "desktop/drawing/CairoImage.h"
 #include "platform/foundation/Log.h"
 
 namespace nimbo {

@@ -7,6 +7,14 @@ typedef struct _cairo_surface cairo_surface_t;
 
 namespace nimbo {
 
+struct GObjectDeleter {
+  void operator()(void* object) const;
+};
+
+/// Adopts one reference of a GObject.
+template <class T>
+using GObjectHandle = std::unique_ptr<T, GObjectDeleter>;
+
 struct CairoContextDeleter {
   void operator()(cairo_t* context) const;
 };

@@ -1,7 +1,6 @@
 #include "desktop/store/StateDatabase.h"
 
-#include "desktop/raii/SQLiteFailure.h"
-#include "desktop/raii/SQLiteTransaction.h"
+#include "desktop/raii/SQLite.h"
 
 namespace nimbo {
 

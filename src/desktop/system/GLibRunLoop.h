@@ -13,6 +13,25 @@
 
 namespace nimbo {
 
+/// What a watched descriptor has to be ready with.
+enum class Readiness {
+  readable,  ///< data, or the end of it
+  urgent     ///< exceptional data (POLLPRI), as kernel files announce events
+};
+
+/// Attaches a source to `context` that calls `callback` for as long as `fd` is ready or in error, and says whether it
+/// is in error. Kernel files tell each event to the first who polls: the callback must not poll again. The descriptor
+/// stays the caller's and outlives the source.
+GSourceHandle attachDescriptorSource(GMainContext* context, int fd, Readiness readiness,
+                                     std::function<void(bool inError)> callback);
+
+/// Attaches a source to `context` that calls `callback` once for each time it was woken; it sleeps at first.
+GSourceHandle attachWakeableSource(GMainContext* context, std::function<void()> callback);
+
+/// Wakes a source of `attachWakeableSource` in `microseconds` from now, instead of when it was to wake before. Any
+/// thread.
+void wakeSourceIn(GSource* source, long long microseconds);
+
 /// The main run loop over GLib's default main context; the thread that makes it is the main thread. One at a time in a
 /// process. What callbacks throw is logged, and the loop goes on. Ends its timers and drops queued work when it goes.
 class GLibRunLoop final : public RunLoop {

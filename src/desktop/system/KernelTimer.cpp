@@ -9,7 +9,7 @@
 #include <stdexcept>
 #include <utility>
 
-#include "desktop/system/GLibSources.h"
+#include "desktop/system/GLibRunLoop.h"
 
 namespace nimbo {
 

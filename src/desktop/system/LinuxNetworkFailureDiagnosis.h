@@ -2,7 +2,7 @@
 
 #include <filesystem>
 
-#include "platform/NetworkFailureDiagnosis.h"
+#include "platform/SystemServices.h"
 
 namespace nimbo {
 

@@ -3,7 +3,7 @@
 #include <filesystem>
 #include <mutex>
 
-#include "platform/DeviceLockState.h"
+#include "platform/SystemServices.h"
 
 namespace nimbo {
 

@@ -1,6 +1,6 @@
 #pragma once
 
-#include "platform/Clock.h"
+#include "platform/SystemServices.h"
 
 namespace nimbo {
 
@@ -8,6 +8,12 @@ namespace nimbo {
 class SystemClock final : public Clock {
  public:
   Date now() const override;
+};
+
+/// Random numbers of the kernel.
+class SystemRandom final : public RandomSource {
+ public:
+  std::uint32_t next() override;
 };
 
 }  // namespace nimbo

@@ -1,12 +1,33 @@
 #include "desktop/system/SystemLog.h"
 
+#include <unistd.h>
+
+#include <cstdlib>
 #include <string>
+#include <string_view>
 #include <utility>
 
-#include "desktop/system/JournalSink.h"
-#include "desktop/system/StandardErrorSink.h"
+#include "desktop/system/LogSink.h"
 
 namespace nimbo {
+
+LogOptions LogOptions::fromEnvironment() {
+  const auto variable = [](const char* name) -> std::string_view {
+    const char* value = std::getenv(name);
+    return value ? value : "";
+  };
+  LogOptions options;
+  const std::string_view level = variable("NIMBO_LOG");
+  if (level == "debug")
+    options.level = LogLevel::debug;
+  else if (level == "info")
+    options.level = LogLevel::info;
+  else if (level != "error")
+    options.unknownLevel = level;
+  options.showsPrivate = variable("NIMBO_LOG_PRIVATE") == "1";
+  options.toJournal = isJournalStream(STDERR_FILENO, std::getenv("JOURNAL_STREAM"));
+  return options;
+}
 
 SystemLog::SystemLog(const LogOptions& options, std::unique_ptr<LogSink> sink)
     : _options(options), _sink(std::move(sink)) {

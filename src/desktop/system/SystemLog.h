@@ -1,13 +1,25 @@
 #pragma once
 
 #include <memory>
+#include <string>
 
-#include "desktop/system/LogOptions.h"
 #include "desktop/system/LogSink.h"
-#include "platform/Signposts.h"
+#include "platform/SystemServices.h"
 #include "platform/foundation/Log.h"
 
 namespace nimbo {
+
+/// What the log keeps and where it goes.
+struct LogOptions {
+  LogLevel level = LogLevel::error;  ///< lines below this level are dropped
+  bool showsPrivate = false;         ///< private arguments are written out
+  bool toJournal = false;            ///< to the journal instead of standard error
+  std::string unknownLevel;          ///< the level that was asked for when it is none; empty otherwise
+
+  /// The level from NIMBO_LOG (debug, info or error), private arguments with NIMBO_LOG_PRIVATE=1, and the journal where
+  /// standard error is connected to it.
+  static LogOptions fromEnvironment();
+};
 
 /// The program's log and its point events: one stream of lines to one sink. Point events are kept at debug level, and
 /// in the journal, whose readers choose for themselves.

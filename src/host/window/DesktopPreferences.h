@@ -12,6 +12,9 @@
 
 namespace nimbo {
 
+/// The style sheet of the application's windows, texts larger by `textScale` than the desktop has them.
+std::string windowStyle(Appearance appearance, double textScale);
+
 /// How the user wants things to look and read: as the desktop has it, changed by what he chose in this application.
 /// Follows both while it lives, and dresses all windows of the program so. Main thread; one at a time.
 class DesktopPreferences {

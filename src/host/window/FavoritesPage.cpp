@@ -3,8 +3,8 @@
 #include <algorithm>
 
 #include "desktop/store/FavoritesEditor.h"
-#include "host/window/Accessible.h"
-#include "host/window/ErrorTexts.h"
+#include "host/window/Texts.h"
+#include "host/window/WidgetTexts.h"
 #include "platform/Localization.h"
 
 namespace nimbo {

@@ -8,7 +8,7 @@
 #include <set>
 #include <vector>
 
-#include "desktop/gtfs/FeedCatalog.h"
+#include "desktop/gtfs/feeds/FeedCatalog.h"
 #include "host/window/LineRow.h"
 #include "host/window/Page.h"
 

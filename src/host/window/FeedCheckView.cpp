@@ -4,9 +4,8 @@
 #include <gtkmm/expander.h>
 #include <gtkmm/label.h>
 
-#include "host/window/DateText.h"
-#include "host/window/ErrorTexts.h"
-#include "host/window/Wrapping.h"
+#include "host/window/Texts.h"
+#include "host/window/WidgetTexts.h"
 #include "platform/Localization.h"
 
 namespace nimbo {

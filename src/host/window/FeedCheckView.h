@@ -3,7 +3,7 @@
 #include <gtkmm/box.h>
 #include <gtkmm/spinner.h>
 
-#include "desktop/gtfs/FeedCheck.h"
+#include "desktop/gtfs/feeds/FeedCheck.h"
 #include "host/window/PageContext.h"
 
 namespace nimbo {

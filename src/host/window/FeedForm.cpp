@@ -2,8 +2,8 @@
 
 #include <gtkmm/dialog.h>
 
-#include "host/window/Accessible.h"
-#include "host/window/ErrorTexts.h"
+#include "host/window/Texts.h"
+#include "host/window/WidgetTexts.h"
 #include "platform/Localization.h"
 
 namespace nimbo {

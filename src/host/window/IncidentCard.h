@@ -1,6 +1,7 @@
 #pragma once
 
 #include <gtkmm/box.h>
+#include <gtkmm/listbox.h>
 #include <gtkmm/listboxrow.h>
 
 #include <map>
@@ -41,6 +42,20 @@ class IncidentCard final : public Gtk::ListBoxRow {
   Gtk::Box _box{Gtk::Orientation::VERTICAL, 6};
   Gtk::Box _affectedLines{Gtk::Orientation::VERTICAL, 4};
   Gtk::Box _asOf;
+};
+
+/// A card for each of some incidents, those that are in force first. What they affect is looked up in the feeds by and
+/// by.
+class IncidentCards final : public Gtk::ListBox {
+ public:
+  /// `line` is the line whose incidents they are; absent for a list over lines.
+  IncidentCards(const PageContext& context, const TransitIncidents& incidents, std::optional<std::uint64_t> line);
+
+ private:
+  void lookUpLines(const PageContext& context, const TransitIncidents& incidents);
+
+  std::vector<IncidentCard*> _cards;
+  std::shared_ptr<Workers::Job> _lookup;
 };
 
 }  // namespace nimbo

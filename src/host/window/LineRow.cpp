@@ -3,9 +3,9 @@
 #include <gtkmm/eventcontrollerkey.h>
 #include <gtkmm/label.h>
 
-#include "host/window/Accessible.h"
-#include "host/window/LineTexts.h"
 #include "host/window/ShieldImage.h"
+#include "host/window/Texts.h"
+#include "host/window/WidgetTexts.h"
 #include "platform/Localization.h"
 
 namespace nimbo {

@@ -1,5 +1,6 @@
 #pragma once
 
+#include <giomm/menumodel.h>
 #include <gtkmm/applicationwindow.h>
 #include <gtkmm/button.h>
 #include <gtkmm/headerbar.h>
@@ -7,11 +8,14 @@
 #include <gtkmm/label.h>
 #include <gtkmm/menubutton.h>
 
+#include "host/window/Page.h"
 #include "host/window/PageContext.h"
-#include "host/window/PageStack.h"
 #include "host/window/WidgetPage.h"
 
 namespace nimbo {
+
+/// The menu of the window: its actions, and how things look.
+Glib::RefPtr<Gio::MenuModel> makeMainMenu();
 
 /// The application's window: the widget screen, and in front of it the page that was opened last.
 class MainWindow final : public Gtk::ApplicationWindow, public Navigator {

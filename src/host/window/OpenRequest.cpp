@@ -3,8 +3,8 @@
 #include <glib.h>
 
 #include "desktop/rpc/Base64.h"
-#include "platform/HostApplication.h"
 #include "platform/Localization.h"
+#include "platform/SystemServices.h"
 #include "platform/foundation/Log.h"
 #include "platform/transit/BasicTransitLineItem.h"
 #include "platform/transit/TransitIncident.h"

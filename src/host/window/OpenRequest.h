@@ -8,7 +8,7 @@
 
 #include "platform/foundation/Boxed.h"
 #include "platform/foundation/Outcome.h"
-#include "platform/transit/TransitLineItem.h"
+#include "platform/transit/TransitLine.h"
 #include "protocol/Handoff.h"
 
 namespace nimbo {

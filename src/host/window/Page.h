@@ -2,12 +2,31 @@
 
 #include <gtkmm/box.h>
 #include <gtkmm/scrolledwindow.h>
+#include <gtkmm/stack.h>
+#include <gtkmm/widget.h>
 
+#include <memory>
 #include <string>
-
-#include "host/window/Column.h"
+#include <vector>
 
 namespace nimbo {
+
+/// One column in the middle of its room, not wider than is good to read.
+class Column final : public Gtk::Widget {
+ public:
+  /// The child, which outlives the column, stays in it.
+  explicit Column(Gtk::Widget& child);
+  ~Column() override;
+
+ protected:
+  Gtk::SizeRequestMode get_request_mode_vfunc() const override { return Gtk::SizeRequestMode::HEIGHT_FOR_WIDTH; }
+  void measure_vfunc(Gtk::Orientation orientation, int forSize, int& minimum, int& natural, int& minimumBaseline,
+                     int& naturalBaseline) const override;
+  void size_allocate_vfunc(int width, int height, int baseline) override;
+
+ private:
+  Gtk::Widget& _child;
+};
 
 /// A place in the window: a column of content that scrolls.
 class Page : public Gtk::ScrolledWindow {
@@ -23,6 +42,30 @@ class Page : public Gtk::ScrolledWindow {
   std::string _title;
   Gtk::Box _content{Gtk::Orientation::VERTICAL, 12};
   Column _column{_content};
+};
+
+/// The pages from the first one to the one in front. A page that is left goes once it has moved off the screen.
+class PageStack final : public Gtk::Stack {
+ public:
+  explicit PageStack(std::unique_ptr<Page> first);
+
+  void push(std::unique_ptr<Page> page);
+  /// Leaves the page in front; nothing happens on the first one.
+  void pop();
+  void popToFirst();
+
+  Page& front() const { return *_pages.back(); }
+  std::size_t depth() const { return _pages.size(); }
+  /// Another page is in front.
+  sigc::signal<void()>& signalFrontChanged() { return _frontChanged; }
+
+ private:
+  void show(Gtk::StackTransitionType transition);
+  void dropLeft();
+
+  std::vector<std::unique_ptr<Page>> _pages;
+  std::vector<std::unique_ptr<Page>> _left;  // still moving off the screen
+  sigc::signal<void()> _frontChanged;
 };
 
 }  // namespace nimbo

@@ -3,15 +3,25 @@
 #include <map>
 #include <string>
 
-#include "desktop/gtfs/FeedLibrary.h"
-#include "host/Command.h"
+#include "desktop/gtfs/feeds/FeedLibrary.h"
+#include "host/Commands.h"
 #include "host/HostPlatform.h"
 #include "host/window/DesktopPreferences.h"
-#include "host/window/Navigator.h"
+#include "host/window/OpenRequest.h"
 #include "host/window/Workers.h"
 #include "platform/foundation/Date.h"
 
 namespace nimbo {
+
+/// Goes to other places on behalf of a page.
+class Navigator {
+ public:
+  virtual ~Navigator() = default;
+  /// Shows a place: in front of the pages there are, or by going back to it.
+  virtual void open(const OpenRequest& request) = 0;
+  /// Tells the user of something that went wrong, in words that he can act on.
+  virtual void tell(const std::string& message) = 0;
+};
 
 /// What every page has at hand; all of it outlives the pages.
 struct PageContext {

@@ -3,7 +3,7 @@
 #include <cmath>
 
 #include "desktop/drawing/CairoImage.h"
-#include "host/window/Accessible.h"
+#include "host/window/WidgetTexts.h"
 #include "platform/Platform.h"
 #include "platform/transit/TransitLine.h"
 

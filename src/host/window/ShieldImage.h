@@ -3,7 +3,7 @@
 #include <gtkmm/drawingarea.h>
 
 #include "host/window/DesktopPreferences.h"
-#include "platform/artwork/Image.h"
+#include "platform/artwork/ArtworkImageSource.h"
 #include "platform/transit/TransitArtwork.h"
 
 namespace nimbo {

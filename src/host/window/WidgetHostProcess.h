@@ -9,7 +9,7 @@
 #include "host/OnScreenWidget.h"
 #include "host/WatchedWidget.h"
 #include "host/window/WidgetContent.h"
-#include "platform/Clock.h"
+#include "platform/SystemServices.h"
 #include "platform/foundation/Outcome.h"
 #include "protocol/Handoff.h"
 

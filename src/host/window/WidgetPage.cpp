@@ -5,8 +5,8 @@
 #include <gtkmm/native.h>
 
 #include "desktop/rpc/Base64.h"
-#include "host/window/Accessible.h"
-#include "host/window/ErrorTexts.h"
+#include "host/window/Texts.h"
+#include "host/window/WidgetTexts.h"
 #include "platform/Localization.h"
 #include "platform/Platform.h"
 

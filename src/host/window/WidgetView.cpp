@@ -9,7 +9,7 @@
 #include <algorithm>
 #include <cmath>
 
-#include "host/window/Accessible.h"
+#include "host/window/WidgetTexts.h"
 
 namespace nimbo {
 

@@ -1,7 +1,7 @@
 #include "host/window/WindowApplication.h"
 
 #include "desktop/system/SmallMemory.h"
-#include "host/window/ErrorTexts.h"
+#include "host/window/Texts.h"
 #include "platform/Localization.h"
 
 namespace nimbo {

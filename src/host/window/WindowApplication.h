@@ -5,7 +5,7 @@
 #include <memory>
 #include <optional>
 
-#include "host/Command.h"
+#include "host/Commands.h"
 #include "host/HostPlatform.h"
 #include "host/window/DesktopPreferences.h"
 #include "host/window/MainWindow.h"

@@ -1,5 +1,7 @@
 #pragma once
 
+#include <optional>
+
 namespace nimbo {
 
 // Lengths are points: 1/72 inch on paper, one device pixel at a screen scale of 1. The origin is at the top left.
@@ -26,6 +28,14 @@ struct Rect {
 struct Insets {
   double top = 0, left = 0, bottom = 0, right = 0;
   bool operator==(const Insets&) const = default;
+};
+
+/// The size that a view's content wants, in points; absent where it does not care.
+struct ContentSize {
+  std::optional<double> width;
+  std::optional<double> height;
+  double firstLineHeight = 0;  ///< what of the height is given up last
+  bool operator==(const ContentSize&) const = default;
 };
 
 }  // namespace nimbo

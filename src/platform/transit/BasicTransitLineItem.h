@@ -1,6 +1,6 @@
 #pragma once
 
-#include "platform/transit/TransitLineItem.h"
+#include "platform/transit/TransitLine.h"
 
 namespace nimbo {
 

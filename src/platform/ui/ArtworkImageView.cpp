@@ -1,6 +1,5 @@
 #include "platform/ui/ArtworkImageView.h"
 
-#include "platform/ui/DrawingContext.h"
 #include "platform/ui/Painter.h"
 
 namespace nimbo {

@@ -1,8 +1,11 @@
 #pragma once
 
-#include "platform/artwork/Image.h"
+#include <optional>
+
+#include "platform/artwork/ArtworkImageSource.h"
 #include "platform/foundation/Geometry.h"
 #include "platform/ui/Color.h"
+#include "platform/ui/Environment.h"
 #include "platform/ui/TextSystem.h"
 
 namespace nimbo {
@@ -20,6 +23,13 @@ class Painter {
   /// Until the matching `restore`, everything is moved by `offset` and cut off outside `clip` (after the move).
   virtual void save(Point offset, const Rect& clip) = 0;
   virtual void restore() = 0;
+};
+
+/// What a view that draws itself inherits from those it is in.
+struct DrawingContext {
+  Appearance appearance = Appearance::light;
+  double screenScale = 1;
+  std::optional<Color> vibrantColor;  ///< in place of the colours of texts and images, inside a visual effect
 };
 
 }  // namespace nimbo

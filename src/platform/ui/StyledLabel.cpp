@@ -3,7 +3,6 @@
 #include <algorithm>
 #include <cmath>
 
-#include "platform/ui/DrawingContext.h"
 #include "platform/ui/Painter.h"
 
 namespace nimbo {

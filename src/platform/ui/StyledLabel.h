@@ -4,8 +4,8 @@
 #include <optional>
 #include <string>
 
+#include "platform/ui/Color.h"
 #include "platform/ui/Font.h"
-#include "platform/ui/SystemColors.h"
 #include "platform/ui/View.h"
 
 namespace nimbo {

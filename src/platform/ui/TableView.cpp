@@ -3,10 +3,9 @@
 #include <algorithm>
 #include <stdexcept>
 
-#include "platform/ui/DrawingContext.h"
+#include "platform/ui/Color.h"
 #include "platform/ui/Painter.h"
-#include "platform/ui/RoundToViewScale.h"
-#include "platform/ui/SystemColors.h"
+#include "platform/ui/View.h"
 
 namespace nimbo {
 

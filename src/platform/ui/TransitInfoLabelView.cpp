@@ -3,9 +3,8 @@
 #include <algorithm>
 #include <cmath>
 
-#include "platform/ui/DrawingContext.h"
 #include "platform/ui/Painter.h"
-#include "platform/ui/RoundToViewScale.h"
+#include "platform/ui/View.h"
 
 namespace nimbo {
 

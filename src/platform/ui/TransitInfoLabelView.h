@@ -9,8 +9,8 @@
 #include <vector>
 
 #include "platform/artwork/ArtworkCache.h"
+#include "platform/ui/Color.h"
 #include "platform/ui/Font.h"
-#include "platform/ui/SystemColors.h"
 #include "platform/ui/View.h"
 
 namespace nimbo {

@@ -5,12 +5,9 @@
 #include <stdexcept>
 #include <utility>
 
-#include "platform/ui/DrawingContext.h"
 #include "platform/ui/Environment.h"
 #include "platform/ui/Painter.h"
-#include "platform/ui/RoundToViewScale.h"
 #include "platform/ui/layout/LayoutEngine.h"
-#include "platform/ui/layout/LayoutLog.h"
 
 namespace nimbo {
 
@@ -245,6 +242,11 @@ void View::drawTree(Painter& painter, const DrawingContext& context) {
     view->drawTree(painter, inner);
     painter.restore();
   }
+}
+
+double roundToViewScale(double length, const View* view) {
+  const double scale = view ? view->screenScale() : Environment::current().screenScale();
+  return std::round(length * scale) / scale;
 }
 
 }  // namespace nimbo

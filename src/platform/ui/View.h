@@ -5,9 +5,8 @@
 #include <vector>
 
 #include "platform/foundation/Geometry.h"
-#include "platform/ui/ContentSize.h"
 #include "platform/ui/layout/LayoutConstraint.h"
-#include "platform/ui/layout/LayoutGuide.h"
+#include "platform/ui/layout/LayoutItem.h"
 
 namespace nimbo {
 
@@ -155,5 +154,10 @@ class View : public LayoutItem {
   bool _needsLayout = true;
   bool _subtreeNeedsLayout = true;  // this view or one inside it needs layout
 };
+
+class View;
+
+/// Rounds a length in points to whole device pixels of the screen that the view is on; of the main screen for no view.
+double roundToViewScale(double length, const View* view);
 
 }  // namespace nimbo

@@ -2,7 +2,7 @@
 
 #include "platform/foundation/Date.h"
 #include "platform/wire/FieldTable.h"
-#include "platform/wire/WireType.h"
+#include "platform/wire/Scalar.h"
 
 // Writing (backwards, as ProtobufWriter does) and reading the fields of a struct with a table.
 namespace nimbo {

@@ -8,7 +8,7 @@
 #include <type_traits>
 #include <vector>
 
-#include "platform/wire/CodableRecord.h"
+#include "platform/wire/Record.h"
 #include "platform/wire/Scalar.h"
 
 namespace nimbo {

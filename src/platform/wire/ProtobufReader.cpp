@@ -3,7 +3,7 @@
 #include <algorithm>
 #include <bit>
 
-#include "platform/wire/WireType.h"
+#include "platform/wire/Scalar.h"
 
 namespace nimbo {
 

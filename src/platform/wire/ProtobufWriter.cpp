@@ -2,7 +2,7 @@
 
 #include <algorithm>
 
-#include "platform/wire/CodableRecord.h"
+#include "platform/wire/Record.h"
 
 namespace nimbo {
 

@@ -8,7 +8,7 @@
 #include <string_view>
 
 #include "platform/foundation/Boxed.h"
-#include "platform/wire/WireType.h"
+#include "platform/wire/Scalar.h"
 
 namespace nimbo {
 

@@ -2,11 +2,13 @@
 
 #include <typeinfo>
 
+#include "platform/archive/SecureCoding.h"
 #include "platform/foundation/Object.h"
 #include "platform/wire/FieldValues.h"
 #include "platform/wire/Record.h"
 
 // The operations of records, for the sources that instantiate them.
+
 namespace nimbo {
 
 template <class Derived, class Fields, class Base>
@@ -57,6 +59,29 @@ std::shared_ptr<const BoxedDictionary> Record<Derived, Fields, Base>::dictionary
 template <class Derived, class Fields, class Base>
 std::string Record<Derived, Fields, Base>::description() const {
   return Object::description() + " " + dictionaryRepresentation()->description();
+}
+
+/// Key of a record's encoded bytes in an archive.
+inline constexpr std::string_view kArchivedRecordKey = "record";
+
+/// Writes the record's bytes: an archive holds records in the form that hand-offs have, by the same schema.
+inline void encodeRecord(const CodableRecord& record, KeyedEncoder& coder) {
+  coder.encodeBytes_forKey(record.data(), kArchivedRecordKey);
+}
+
+/// Reads what `encodeRecord` wrote. Bytes that are missing or broken fail the decoding.
+template <class Record>
+ObjectRef decodeRecord(KeyedDecoder& coder) {
+  const std::optional<Bytes> bytes = coder.decodeBytesForKey(kArchivedRecordKey);
+  if (!bytes) {
+    coder.failWithReason("the bytes of the record are missing");
+    return nullptr;
+  }
+  ProtobufReader reader(*bytes);
+  auto record = std::make_shared<Record>();
+  if (record->readFrom(reader)) return record;
+  coder.failWithReason("the record is broken: " + reader.failureText());
+  return nullptr;
 }
 
 }  // namespace nimbo

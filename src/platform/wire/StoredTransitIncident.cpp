@@ -1,8 +1,7 @@
 #include "platform/wire/StoredTransitIncident.h"
 
-#include "platform/wire/IncidentFieldTables.h"
-#include "platform/wire/RecordArchiving.h"
 #include "platform/wire/RecordImplementation.h"
+#include "platform/wire/TransitFieldTables.h"
 
 namespace nimbo {
 

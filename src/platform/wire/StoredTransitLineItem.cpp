@@ -1,7 +1,5 @@
 #include "platform/wire/StoredTransitLineItem.h"
 
-#include "platform/wire/IncidentFieldTables.h"
-#include "platform/wire/RecordArchiving.h"
 #include "platform/wire/RecordImplementation.h"
 #include "platform/wire/TransitFieldTables.h"
 

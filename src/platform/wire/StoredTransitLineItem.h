@@ -1,7 +1,7 @@
 #pragma once
 
 #include "platform/archive/SecureCoding.h"
-#include "platform/transit/TransitLineItem.h"
+#include "platform/transit/TransitLine.h"
 #include "platform/wire/Record.h"
 #include "platform/wire/Scalar.h"
 

@@ -2,7 +2,7 @@
 
 #include <algorithm>
 
-#include "platform/ui/layout/LayoutLog.h"
+#include "platform/ui/layout/LayoutEngine.h"
 
 namespace nimbo {
 

@@ -5,7 +5,7 @@
 #include <stdexcept>
 
 #include "platform/ui/View.h"
-#include "platform/ui/layout/LayoutLog.h"
+#include "platform/ui/layout/LayoutEngine.h"
 
 namespace nimbo {
 

@@ -4,7 +4,6 @@
 #include <cmath>
 
 #include "platform/ui/View.h"
-#include "platform/ui/layout/LayoutLog.h"
 
 namespace nimbo {
 

@@ -9,9 +9,13 @@
 #include <vector>
 
 #include "platform/foundation/Geometry.h"
+#include "platform/foundation/Log.h"
 #include "platform/ui/layout/ConstraintInstaller.h"
 
 namespace nimbo {
+
+/// Where views and constraints report what they could not lay out.
+inline constexpr LogFacility kLayoutLogFacility{kDefaultLogSubsystem, "Layout"};
 
 class LayoutItem;
 class View;

@@ -6,7 +6,7 @@
 #include <string>
 #include <vector>
 
-#include "platform/ui/layout/LayoutRelation.h"
+#include "platform/ui/layout/LayoutItem.h"
 #include "platform/ui/layout/SolverTableau.h"
 
 namespace nimbo {

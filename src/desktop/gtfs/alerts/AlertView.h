@@ -1,0 +1,52 @@
+#pragma once
+
+#include <cstdint>
+#include <functional>
+#include <string_view>
+
+#include "desktop/gtfs/alerts/RealtimeFields.h"
+#include "desktop/gtfs/alerts/SelectorMatcher.h"
+
+namespace nimbo {
+
+/// An alert's texts as published and what else makes it the incident that it is: equal for an alert that a feed repeats
+/// under another identifier.
+struct AlertContent {
+  // TranslatedString messages; where one comes in pieces, the whole alert stands for it.
+  std::string_view header, description, url, effectDetail;
+  std::int32_t cause = kUnknownCause;
+  AlertEffect effect = AlertEffect::unknownEffect;
+
+  bool operator==(const AlertContent&) const = default;
+
+  /// Equal for equal contents, made without reading the texts: most alerts that are no repetition differ in it.
+  std::size_t sizeHash() const {
+    return hashBy([](std::string_view text) { return text.size(); });
+  }
+  std::size_t hash() const { return hashBy(std::hash<std::string_view>()); }
+
+ private:
+  template <class Hash>
+  std::size_t hashBy(const Hash& ofText) const {
+    std::size_t hash = static_cast<std::size_t>(cause) * 16 + static_cast<std::size_t>(effect);
+    for (const std::string_view text : {header, description, url, effectDetail}) hash = hash * 131 + ofText(text);
+    return hash;
+  }
+};
+
+/// What one pass over an Alert message tells about it.
+struct AlertView {
+  AlertContent content;
+  bool isSevere = false;
+
+  /// Whether the alert changes nothing for most riders: it has no effect or is about accessibility, and is not severe.
+  bool isMinor() const {
+    return !isSevere && (content.effect == AlertEffect::noEffect || content.effect == AlertEffect::accessibilityIssue);
+  }
+};
+
+/// Reads an Alert message and gives each of its selectors to `onSelector`. Causes and effects that are not known here
+/// count as the unknown one. Throws protozero::exception for damaged bytes.
+AlertView readAlertView(std::string_view alert, const std::function<void(const EntitySelector&)>& onSelector);
+
+}  // namespace nimbo

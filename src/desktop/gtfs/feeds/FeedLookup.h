@@ -1,0 +1,30 @@
+#pragma once
+
+#include <optional>
+#include <span>
+#include <stop_token>
+#include <string_view>
+#include <vector>
+
+#include "desktop/gtfs/feeds/FeedSource.h"
+#include "platform/transit/TransitLine.h"
+
+namespace nimbo {
+
+/// The index of each identifier's line in a feed; absent for one that the feed does not know: neither by its number nor
+/// by an agency, short name and mode that only one line has.
+std::vector<std::optional<std::uint32_t>> findLines(const StaticFeed& feed, const std::string& feedName,
+                                                    std::span<const MapItemIdentifierRef> identifiers);
+
+/// What one feed says of lines.
+struct FeedAnswer {
+  TransitLineItems items;    ///< one for each identifier, null for one whose line `findLines` does not find
+  std::optional<Date> asOf;  ///< when the publisher made the alerts; absent when he does not say, or none were needed
+};
+
+/// Looks lines up in one feed: their static data and their incidents by the alerts as they are now, texts in `language`
+/// (a BCP 47 tag). Blocks its thread.
+Outcome<FeedAnswer> lookUpInFeed(const FeedSource& source, std::span<const MapItemIdentifierRef> identifiers,
+                                 std::string_view language, const std::stop_token& stop);
+
+}  // namespace nimbo

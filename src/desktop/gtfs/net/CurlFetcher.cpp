@@ -1,0 +1,200 @@
+#include "desktop/gtfs/net/CurlFetcher.h"
+
+#include <new>
+
+#include "desktop/gtfs/feeds/TransitLineServiceError.h"
+#include "desktop/gtfs/text/Utf8.h"
+#include "desktop/raii/CurlHandle.h"
+#include "platform/foundation/Version.h"
+namespace nimbo {
+
+namespace {
+
+using Code = TransitLineServiceError;
+
+constexpr long kMostRedirects = 5;
+constexpr long kConnectSeconds = 15;
+constexpr long kStalledSeconds = 30;  // a server that sends less than this for so long will not do better
+constexpr long kStalledBytesASecond = 100;
+constexpr std::size_t kLongestValidator = 1024;
+
+/// One fetch in progress.
+struct Transfer {
+  const HTTPRequest& request;
+  const std::stop_token& stop;
+  const HTTPFetcher::Sink& sink;
+  CURL* handle;
+  HTTPValidators validators;
+  std::uint64_t received = 0;
+  bool isTooLarge = false;
+  bool isUnkept = false;
+
+  bool hasDocument() const {
+    long status = 0;
+    curl_easy_getinfo(handle, CURLINFO_RESPONSE_CODE, &status);
+    return status == 200;
+  }
+
+  std::size_t takePiece(std::string_view piece) {
+    if (!hasDocument()) return piece.size();  // the page of a redirect or an error
+    received += piece.size();
+    isTooLarge = received > request.limit;
+    isUnkept = !isTooLarge && !sink(piece);
+    return isTooLarge || isUnkept ? 0 : piece.size();
+  }
+
+  void takeHeader(std::string_view line) {
+    if (line.starts_with("HTTP/")) validators = {};  // of the answer before a redirect
+    const std::size_t colon = line.find(':');
+    if (colon == std::string_view::npos) return;
+    const std::string name = asciiLowerCase(line.substr(0, colon));
+    const std::string_view value = trimmed(line.substr(colon + 1));
+    if (value.size() > kLongestValidator || value.find('\0') != std::string_view::npos) return;
+    if (name == "etag")
+      validators.etag = value;
+    else if (name == "last-modified")
+      validators.lastModified = value;
+  }
+
+  static std::size_t onPiece(char* bytes, std::size_t size, std::size_t count, void* transfer) {
+    return static_cast<Transfer*>(transfer)->takePiece({bytes, size * count});
+  }
+  static std::size_t onHeader(char* bytes, std::size_t size, std::size_t count, void* transfer) {
+    static_cast<Transfer*>(transfer)->takeHeader({bytes, size * count});
+    return size * count;
+  }
+  static int onProgress(void* transfer, curl_off_t, curl_off_t, curl_off_t, curl_off_t) {
+    return static_cast<Transfer*>(transfer)->stop.stop_requested() ? 1 : 0;
+  }
+};
+
+CurlHandle makeHandle() {
+  static const bool isReady = curl_global_init(CURL_GLOBAL_DEFAULT) == CURLE_OK;
+  CurlHandle handle(isReady ? curl_easy_init() : nullptr);
+  if (!handle) throw std::bad_alloc();
+  return handle;
+}
+
+CurlHeaders conditionsOf(const HTTPValidators& validators) {
+  CurlHeaders headers;
+  const auto add = [&](const std::string& line) {
+    curl_slist* longer = curl_slist_append(headers.get(), line.c_str());
+    if (!longer) throw std::bad_alloc();
+    (void)headers.release();
+    headers.reset(longer);
+  };
+  if (!validators.etag.empty()) add("If-None-Match: " + validators.etag);
+  if (!validators.lastModified.empty()) add("If-Modified-Since: " + validators.lastModified);
+  return headers;
+}
+
+void setOptions(CURL* handle, Transfer& transfer, const CurlHeaders& headers) {
+  const auto set = [&](CURLoption option, auto value) { curl_easy_setopt(handle, option, value); };
+  set(CURLOPT_URL, transfer.request.address.text().c_str());
+  set(CURLOPT_PROTOCOLS_STR, "http,https");
+  set(CURLOPT_REDIR_PROTOCOLS_STR, "http,https");
+  set(CURLOPT_FOLLOWLOCATION, 1L);
+  set(CURLOPT_MAXREDIRS, kMostRedirects);
+  set(CURLOPT_USERAGENT, (std::string("nimbo-transit/") + kVersion).c_str());
+  set(CURLOPT_ACCEPT_ENCODING, "gzip");
+  set(CURLOPT_CONNECTTIMEOUT, kConnectSeconds);
+  set(CURLOPT_TIMEOUT, static_cast<long>(transfer.request.timeLimit.count()));
+  set(CURLOPT_MAXFILESIZE_LARGE, static_cast<curl_off_t>(transfer.request.limit));
+  set(CURLOPT_LOW_SPEED_TIME, kStalledSeconds);
+  set(CURLOPT_LOW_SPEED_LIMIT, kStalledBytesASecond);
+  set(CURLOPT_NOSIGNAL, 1L);
+  set(CURLOPT_QUICK_EXIT, 1L);  // a name being looked up must not hold up the end
+  set(CURLOPT_HTTPHEADER, headers.get());
+  set(CURLOPT_WRITEFUNCTION, &Transfer::onPiece);
+  set(CURLOPT_WRITEDATA, static_cast<void*>(&transfer));
+  set(CURLOPT_HEADERFUNCTION, &Transfer::onHeader);
+  set(CURLOPT_HEADERDATA, static_cast<void*>(&transfer));
+  set(CURLOPT_NOPROGRESS, 0L);
+  set(CURLOPT_XFERINFOFUNCTION, &Transfer::onProgress);
+  set(CURLOPT_XFERINFODATA, static_cast<void*>(&transfer));
+}
+
+struct Failure {
+  Code code;
+  std::string what;
+};
+
+Failure failureOf(CURLcode result, const Transfer& transfer) {
+  const std::string limit = std::to_string(transfer.request.limit >> 20) + " MiB";
+  if (transfer.isTooLarge) return {Code::tooLarge, "it sends more than " + limit + ". Check the address."};
+  if (transfer.isUnkept) return {Code::notKept, "what it sends cannot be kept. Free some space on the disk."};
+  switch (result) {
+    case CURLE_COULDNT_RESOLVE_HOST:
+    case CURLE_COULDNT_RESOLVE_PROXY:
+      return {Code::unreachable, "its server's name is not known. Check the address and the network."};
+    case CURLE_COULDNT_CONNECT:
+      return {Code::unreachable, "its server refuses the connection. Check the address and the network."};
+    case CURLE_OPERATION_TIMEDOUT:
+      return {Code::timedOut, "its server took too long. Try again later."};
+    case CURLE_PEER_FAILED_VERIFICATION:
+    case CURLE_SSL_CONNECT_ERROR:
+    case CURLE_SSL_CACERT_BADFILE:
+      return {Code::untrustedServer,
+              "its server's certificate cannot be trusted. Check the address and the date of "
+              "this machine."};
+    case CURLE_TOO_MANY_REDIRECTS:
+      return {Code::serverFailure, "its server redirects without end. Ask the publisher for the right address."};
+    case CURLE_UNSUPPORTED_PROTOCOL:
+    case CURLE_URL_MALFORMAT:
+      return {Code::badAddress, "it is no http or https address, or leads to one that is not. Check the address."};
+    case CURLE_PARTIAL_FILE:
+    case CURLE_GOT_NOTHING:
+    case CURLE_RECV_ERROR:
+    case CURLE_SEND_ERROR:
+    case CURLE_HTTP2_STREAM:
+      return {Code::unreachable, "the connection broke before everything had come. Try again later."};
+    case CURLE_OUT_OF_MEMORY:  // which is also what libcurl calls a header of more than 100 KB
+      return {Code::serverFailure, "its server sends a header that is too long. Check the address."};
+    case CURLE_FILESIZE_EXCEEDED:
+      return {Code::tooLarge, "it is larger than " + limit + ". Check the address."};
+    case CURLE_ABORTED_BY_CALLBACK:
+      return {Code::internal, "the program is ending."};
+    default:
+      return {Code::unreachable, std::string(curl_easy_strerror(result)) + ". Check the address and the network."};
+  }
+}
+
+Failure failureOfStatus(long status) {
+  const std::string answered = "its server answers with status " + std::to_string(status) + ". ";
+  if (status == 401 || status == 403)
+    return {Code::keyNeeded, answered + "The address may need a key from the publisher."};
+  if (status == 404 || status == 410) return {Code::serverFailure, answered + "Check the address."};
+  return {Code::serverFailure, answered + "Try again later."};
+}
+
+}  // namespace
+
+Outcome<HTTPAnswer> fetchWithCurl(const HTTPRequest& request, const std::stop_token& stop,
+                                  const HTTPFetcher::Sink& sink) {
+  const CurlHandle handle = makeHandle();
+  const CurlHeaders headers = conditionsOf(request.validators);
+  const bool isConditional = headers != nullptr;
+  Transfer transfer{request, stop, sink, handle.get(), {}};
+  setOptions(handle.get(), transfer, headers);
+  const auto failed = [&](const Failure& failure) {
+    return transitLineServiceError(failure.code, "Cannot fetch " + request.address.publicText() + ": " + failure.what,
+                                   request.address.publicText());
+  };
+  if (const CURLcode result = curl_easy_perform(handle.get()); result != CURLE_OK)
+    return failed(failureOf(result, transfer));
+  long status = 0;
+  curl_easy_getinfo(handle.get(), CURLINFO_RESPONSE_CODE, &status);
+  if (status == 304 && isConditional) {
+    // The server may leave out what has not changed.
+    const auto orHeld = [](std::string& value, const std::string& held) {
+      if (value.empty()) value = held;
+    };
+    orHeld(transfer.validators.etag, request.validators.etag);
+    orHeld(transfer.validators.lastModified, request.validators.lastModified);
+    return HTTPAnswer{true, std::move(transfer.validators)};
+  }
+  if (status != 200) return failed(failureOfStatus(status));
+  return HTTPAnswer{false, std::move(transfer.validators)};
+}
+
+}  // namespace nimbo

@@ -1,0 +1,69 @@
+#include "desktop/gtfs/net/FileReading.h"
+
+#include <fcntl.h>
+#include <sys/stat.h>
+
+#include <cerrno>
+#include <system_error>
+
+#include "desktop/gtfs/feeds/TransitLineServiceError.h"
+#include "desktop/raii/FileDescriptor.h"
+
+namespace nimbo {
+
+namespace {
+
+ErrorRef unreadable(const std::filesystem::path& path, const std::string& why) {
+  return transitLineServiceError(TransitLineServiceError::unreadableFile, "Cannot read " + path.native() + ": " + why,
+                                 path.native());
+}
+
+ErrorRef unreadable(const std::filesystem::path& path, int errnoValue) {
+  const std::string advice = errnoValue == ENOENT   ? " Check the path, or set the feed up anew."
+                             : errnoValue == EACCES ? " Allow yourself to read it."
+                                                    : "";
+  return unreadable(path, std::generic_category().message(errnoValue) + "." + advice);
+}
+
+}  // namespace
+
+Outcome<std::string> readFile(const std::filesystem::path& path, std::uint64_t limit) {
+  // Not blocking: a path may lead to a pipe that nobody writes to.
+  const FileDescriptor file(::open(path.c_str(), O_RDONLY | O_CLOEXEC | O_NONBLOCK));
+  if (!file) return unreadable(path, errno);
+  struct stat status {};
+  if (::fstat(file.get(), &status) != 0) return unreadable(path, errno);
+  if (!S_ISREG(status.st_mode)) return unreadable(path, "it is not a file. Name a file.");
+  const auto tooLarge = [&] {
+    return transitLineServiceError(TransitLineServiceError::tooLarge,
+                                   path.native() + " is larger than the " + std::to_string(limit >> 20) +
+                                       " MiB that such a file may have. Check that it is the right one.",
+                                   path.native());
+  };
+  if (static_cast<std::uint64_t>(status.st_size) > limit) return tooLarge();
+  std::string bytes;
+  bytes.resize(static_cast<std::size_t>(status.st_size) + 1);  // room to see the end without moving everything
+  std::size_t count = 0;
+  for (;;) {
+    if (count == bytes.size()) {  // also when the file has grown since
+      if (count > limit) return tooLarge();
+      bytes.resize(count + 1);
+    }
+    const ssize_t got = ::read(file.get(), bytes.data() + count, bytes.size() - count);
+    if (got < 0 && errno == EINTR) continue;
+    if (got < 0) return unreadable(path, errno);
+    if (got == 0) break;
+    count += static_cast<std::size_t>(got);
+  }
+  bytes.resize(count);
+  return bytes;
+}
+
+std::string fileFingerprint(const std::filesystem::path& path) {
+  struct stat status {};
+  if (::stat(path.c_str(), &status) != 0) return {};
+  return std::to_string(status.st_size) + "@" + std::to_string(status.st_mtim.tv_sec) + "." +
+         std::to_string(status.st_mtim.tv_nsec);
+}
+
+}  // namespace nimbo

@@ -1,0 +1,149 @@
+#include "host/StatusBar.h"
+
+#include <glib-unix.h>
+#include <unistd.h>
+
+#include <algorithm>
+#include <csignal>
+#include <iostream>
+#include <nlohmann/json.hpp>
+
+#include "host/OnScreenWidget.h"
+#include "host/StatusWatch.h"
+#include "host/TerminalText.h"
+
+namespace nimbo {
+
+using nlohmann::json;
+
+namespace {
+
+constexpr const char* kErrorWord = "error";
+
+/// A line without a line end, which a bar has no room for.
+std::string inOneLine(std::string text) {
+  std::replace(text.begin(), text.end(), '\n', ' ');
+  return text;
+}
+
+std::string lineOf(const std::string& text, const std::string& word, const std::string& tooltip) {
+  return printableJSON(json{{"text", inOneLine(text)}, {"alt", word}, {"class", word}, {"tooltip", tooltip}}.dump());
+}
+
+const std::string& titleOf(const protocol::TransitItem& item) {
+  static const std::string kNone;
+  return item.primaryText ? *item.primaryText : kNone;
+}
+const std::string& titleOf(const protocol::SummaryItem& item) { return item.primaryText; }
+
+std::string secondaryTextOf(const protocol::TransitItem& item) { return item.secondaryText.value_or(""); }
+std::string secondaryTextOf(const protocol::SummaryItem&) { return {}; }
+
+/// Tells the rows apart by what they open: incidents an activity, good service and no favourites a URL, an error
+/// nothing.
+std::string wordOf(const protocol::TransitItem& item, bool isFetched) {
+  if (!item.openable) return isFetched ? "advisories" : kErrorWord;
+  if (!item.openable->url) return "advisories";
+  return item.artwork ? "good" : "none";
+}
+std::string wordOf(const protocol::SummaryItem&, bool) { return "advisories"; }
+
+/// "[12] " for a row with the shield of a line.
+std::string shieldOf(const protocol::TransitItem& item) {
+  if (!item.artwork || !item.artwork->shield) return {};
+  const std::string text = item.artwork->shield->text.value_or("");
+  return text.empty() ? text : "[" + text + "] ";
+}
+std::string shieldOf(const protocol::SummaryItem&) { return {}; }
+
+std::string headingOf(const protocol::Item& row) {
+  return std::visit([](const auto& item) { return markupText(shieldOf(item) + titleOf(item)); }, row);
+}
+
+std::string tooltipOf(const protocol::Snapshot& snapshot) {
+  std::vector<protocol::Item> rows = snapshot.listItem.expandedItems;
+  if (rows.empty() && snapshot.listItem.summaryItem) rows.push_back(*snapshot.listItem.summaryItem);
+  std::string tooltip;
+  const auto addLine = [&](const std::string& markup) { tooltip += (tooltip.empty() ? "" : "\n") + markup; };
+  for (const protocol::Item& row : rows) {
+    addLine("<b>" + headingOf(row) + "</b>");
+    const std::string text = std::visit([](const auto& item) { return secondaryTextOf(item); }, row);
+    if (!text.empty()) addLine(markupText(text));
+  }
+  if (snapshot.error) addLine(markupText(snapshot.error->reason));
+  for (const std::string& line : snapshot.goneLines) addLine("<i>" + markupText(goneLineText(line)) + "</i>");
+  return tooltip;
+}
+
+}  // namespace
+
+std::optional<std::string> statusBarLine(const protocol::Snapshot& snapshot) {
+  const auto& row = snapshot.listItem.summaryItem;
+  if (!row) return std::nullopt;
+  const bool isFetched = snapshot.result.has_value();
+  const bool hasFailed = snapshot.result == protocol::FetchResult::error;
+  const std::string word =
+      hasFailed ? kErrorWord : std::visit([&](const auto& item) { return wordOf(item, isFetched); }, *row);
+  if (!isFetched && word != "good" && word != "advisories") return std::nullopt;
+  return lineOf(headingOf(*row), word, tooltipOf(snapshot));
+}
+
+std::string statusBarErrorLine(const std::string& reason) {
+  return lineOf("⚠", kErrorWord, "<b>Nimbo Transit</b>\n" + markupText(reason));
+}
+
+namespace {
+
+/// Rows that a tooltip has room for.
+constexpr int kTooltipRows = 10;
+
+WidgetPresentation presentationForBar() {
+  WidgetPresentation presentation;
+  presentation.expandedHeight = kTooltipRows * WidgetPresentation::kDefaultRowHeight;
+  return presentation;
+}
+
+/// Ends the loop when the signal comes, instead of the process, for as long as the handle lives.
+GSourceHandle quitOnSignal(GLibRunLoop& runLoop, int signal) {
+  GSourceHandle source(g_unix_signal_source_new(signal));
+  const auto quit = [](gpointer loop) -> gboolean {
+    static_cast<GLibRunLoop*>(loop)->quit();
+    return G_SOURCE_CONTINUE;
+  };
+  g_source_set_callback(source.get(), quit, &runLoop, nullptr);
+  g_source_attach(source.get(), nullptr);
+  return source;
+}
+
+}  // namespace
+
+int runStatusBar(const CommandContext& context, const std::optional<std::string>& now) {
+  WidgetPresentation presentation = presentationForBar();
+  presentation.virtualTime = now;
+  try {
+    OnScreenWidget widget(context, presentation);
+    const std::optional<std::string> failure = widget.update();
+    std::cout << statusBarLine(widget.snapshot()).value_or("") << "\n";
+    widget.close();
+    if (failure) throw CommandFailure(*failure);
+  } catch (const WidgetClientFailure& failure) {
+    std::cout << statusBarErrorLine(failure.what()) << "\n";
+    throw;
+  }
+  return kExitSuccess;
+}
+
+int runStatusWatch(const CommandContext& context) {
+  const GSourceHandle handles[] = {quitOnSignal(context.runLoop, SIGTERM), quitOnSignal(context.runLoop, SIGINT),
+                                   context.runLoop.watchUrgent(STDOUT_FILENO, [&](bool inError) {
+                                     // The reader of the pipe is gone.
+                                     if (inError) context.runLoop.quit();
+                                   })};
+  const StatusWatch watch(context, presentationForBar(), [&](const std::string& line) {
+    if (!(std::cout << line << std::endl)) context.runLoop.quit();
+  });
+  context.runLoop.run();
+  return kExitSuccess;
+}
+
+}  // namespace nimbo

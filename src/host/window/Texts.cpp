@@ -1,0 +1,165 @@
+#include "host/window/Texts.h"
+
+#include "desktop/DesktopPlatform.h"
+#include "desktop/gtfs/feeds/TransitLineServiceError.h"
+#include "desktop/store/FavoritesEditor.h"
+#include "desktop/store/StateDatabaseFile.h"
+#include "desktop/system/AtomicFile.h"
+#include "desktop/system/LatePart.h"
+#include "platform/Localization.h"
+#include "platform/foundation/Log.h"
+#include "platform/transit/IncidentStringProvider.h"
+
+namespace nimbo {
+
+DateText::DateText(const std::string& locale) {
+  const std::string name = locale.empty() ? DesktopPlatform::localeOfEnvironment() : locale;
+  try {
+    // Of the language of the phrases around them.
+    _format = stringsPart().makeDateFormat(ICUStringTables::speak(name) ? name : "en");
+  } catch (const LatePartMissing&) {
+    // ISO dates it is, as for a locale without a format.
+  }
+}
+
+std::string DateText::textOf(Date date, DateFormat::Place place) const {
+  return _format ? _format->textOf(date, place) : isoTextOfDate(date);
+}
+
+std::string DateText::textOfPeriod(std::optional<Date> start, std::optional<Date> end, Date now) const {
+  const auto filled = [this](const char* key, Date first, std::optional<Date> second = std::nullopt) {
+    const std::string pattern = LocalizedString(key);
+    const std::string text =
+        textOf(first, pattern.starts_with("{0}") ? DateFormat::Place::beginning : DateFormat::Place::middle);
+    return second ? LocalizedFormat(pattern, {text, textOf(*second)}) : LocalizedFormat(pattern, {text});
+  };
+  if (start && end) return filled("Window_Period_FromUntil", *start, *end);
+  if (start) return filled(*start > now ? "Window_Period_From" : "Window_Period_Since", *start);
+  if (end) return filled("Window_Period_Until", *end);
+  return {};
+}
+
+namespace {
+
+/// Whether a text says what an excerpt says. Excerpts are on one line, with a colon after what was a heading.
+bool says(const std::string& text, const std::string& excerpt) {
+  const auto words = [](std::string all) {
+    std::erase_if(all, [](char c) { return c == ' ' || c == '\n' || c == ':'; });
+    return all;
+  };
+  return words(text).find(words(excerpt)) != std::string::npos;
+}
+
+}  // namespace
+
+std::string nameOfLine(const TransitLine& line) {
+  const TransitArtworkRef& artwork = line.artwork();
+  if (artwork && artwork->accessibilityText() && !artwork->accessibilityText()->empty())
+    return *artwork->accessibilityText();
+  return line.name() && !line.name()->empty() ? *line.name() : std::to_string(line.muid());
+}
+
+std::string nameBesideShield(const TransitLine& line) {
+  const std::string name = nameOfLine(line);
+  const TransitArtworkRef& artwork = line.artwork();
+  if (!artwork || !artwork->shieldDataSource()) return name;
+  const std::string shortName = artwork->shieldDataSource()->shieldText.value_or("") + ", ";
+  return name.starts_with(shortName) ? name.substr(shortName.size()) : name;
+}
+
+std::string systemNameOfLine(const TransitLine& line) {
+  return line.system() ? line.system()->name().value_or("") : std::string();
+}
+
+std::vector<std::string> textsBelowTitle(const TransitIncident& incident) {
+  const std::string title = IncidentStringProvider::cellTitleForIncident(&incident);
+  const std::string summary = incident.summary().value_or(""), description = incident.fullDescription().value_or("");
+  std::vector<std::string> texts;
+  if (!summary.empty() && summary != title && !says(description, summary)) texts.push_back(summary);
+  if (!description.empty() && description != title) texts.push_back(description);
+  return texts;
+}
+
+namespace {
+
+const char* keyOfCode(TransitLineServiceError code) {
+  switch (code) {
+    using enum TransitLineServiceError;
+    case configuration:
+      return "Window_Error_Configuration";
+    case badFeedName:
+      return "Window_Error_FeedName";
+    case feedNameTaken:
+      return "Window_Error_FeedNameTaken";
+    case unknownFeed:
+      return "Window_Error_UnknownFeed";
+    case badAddress:
+      return "Window_Error_Address";
+    case unreadableFile:
+      return "Window_Error_Unreadable";
+    case badStaticFeed:
+      return "Window_Error_StaticFeed";
+    case badAlerts:
+      return "Window_Error_Alerts";
+    case staleAlerts:
+      return "Window_Error_StaleAlerts";
+    case unreachable:
+      return "Window_Error_Unreachable";
+    case timedOut:
+      return "Window_Error_TimedOut";
+    case serverFailure:
+      return "Window_Error_Server";
+    case keyNeeded:
+      return "Window_Error_KeyNeeded";
+    case untrustedServer:
+      return "Window_Error_Untrusted";
+    case tooLarge:
+      return "Window_Error_TooLarge";
+    case notKept:
+      return "Window_Error_NotKept";
+    case unknownLine:
+    case internal:
+      break;
+  }
+  return nullptr;
+}
+
+const char* keyOfCode(FavoritesError code) {
+  return code == FavoritesError::lost ? "Window_Error_FavoritesLost" : "Window_Error_FavoritesChanged";
+}
+
+const char* keyOfCode(StateDatabaseError code) {
+  switch (code) {
+    using enum StateDatabaseError;
+    case cannotRead:
+      return "Window_Error_Unreadable";
+    case cannotWrite:
+      return "Window_Error_Unwritable";
+    case newerVersion:
+      return "Window_Error_NewerState";
+    case foreign:
+      return "Window_Error_ForeignState";
+    case setAside:
+      return "Window_Error_StateSetAside";
+  }
+  return nullptr;
+}
+
+/// Null for an error that the window has no words for.
+const char* keyOfError(const Error& error) {
+  if (error.domain() == kTransitLineServiceErrorDomain)
+    return keyOfCode(static_cast<TransitLineServiceError>(error.code()));
+  if (error.domain() == kFavoritesErrorDomain) return keyOfCode(static_cast<FavoritesError>(error.code()));
+  if (error.domain() == kStateDatabaseErrorDomain) return keyOfCode(static_cast<StateDatabaseError>(error.code()));
+  return error.domain() == kFileErrorDomain ? "Window_Error_Unwritable" : nullptr;
+}
+
+}  // namespace
+
+std::string textOfError(const Error& error) {
+  writeLog({kDefaultLogSubsystem, "Window"}, LogLevel::info, "%{private}@", {error.reason()});
+  const char* key = keyOfError(error);
+  return LocalizedFormat(LocalizedString(key ? key : "TransitWidgetLoadingError_Unknown"), {error.subject()});
+}
+
+}  // namespace nimbo

@@ -1,0 +1,348 @@
+#include "GtfsFixtures.h"
+#include "desktop/gtfs/alerts/AlertTexts.h"
+#include "desktop/gtfs/feeds/TransitLineServiceError.h"
+
+namespace nimbo {
+namespace {
+
+const char* const kAgencies = "agency_id,agency_name,agency_lang\nA,Trams,en\nB,Boats,en\n";
+const char* const kRoutes =
+    "route_id,agency_id,route_short_name,route_type\n"
+    "t1,A,1,0\nt2,A,2,900\nb1,A,7,700\nb2,A,8,3\nf1,B,F,4\n";
+const char* const kTrips = "route_id,service_id,trip_id\nb1,s,trip-7\n";
+
+/// Alerts read against the two agencies' five lines.
+class Reader {
+ public:
+  Reader()
+      : _files{{"agency.txt", kAgencies}, {"routes.txt", kRoutes}, {"trips.txt", kTrips}},
+        _parsed(readStaticFeed(_files, "city")),
+        _feed(_parsed->feed.finish("", {})) {
+    for (std::uint32_t i = 0; i < _feed.lineCount(); ++i) query.lines.push_back({i, _feed.line(i).muid});
+    query.feed = "city";
+    query.language = {"en", ""};
+    query.now = dateFromUnixTime(kNow);
+    query.countsUnfit = true;
+    query.trips = [this](std::string_view trip) { return _parsed->trips.lineOfTrip(trip); };
+  }
+
+  IncidentReading read(const std::string& entities) {
+    auto alerts = AlertsFeed::read(feedBytes(entities), "test");
+    EXPECT_TRUE(alerts);
+    return readIncidents(*alerts, _feed, query);
+  }
+
+  /// The short names of lines that have incidents.
+  std::string lines(const IncidentReading& reading) {
+    std::string names;
+    for (std::size_t i = 0; i < query.lines.size(); ++i)
+      if (!reading.incidents[i].empty()) names += _feed.line(query.lines[i].index).shortName;
+    return names;
+  }
+
+  /// The incidents of line 1, by their periods in seconds from now.
+  static std::string periods(const IncidentReading& reading) {
+    std::string text;
+    const auto add = [&](std::optional<Date> date) {
+      text += date ? std::to_string(static_cast<long>(intervalBetween(dateFromUnixTime(kNow), *date))) : "";
+    };
+    for (const auto& incident : reading.incidents[0]) {
+      add(incident->startDate());
+      text += "..";
+      add(incident->endDate());
+      text += " ";
+    }
+    return text;
+  }
+
+  IncidentQuery query;
+
+ private:
+  MemoryFeedFiles _files;
+  Outcome<ParsedStaticFeed> _parsed;
+  StaticFeed _feed;
+};
+
+TEST(Selector, ConcernsTheLinesThatAllItsFieldsMean) {
+  const struct {
+    const char* selector;
+    const char* lines;
+    const char* unfit;
+  } cases[] = {
+      {"route_id: 't1'", "1", ""},
+      {"agency_id: 'A' route_id: 't1'", "1", ""},
+      {"agency_id: 'unheard of' route_id: 't1'", "1", ""},
+      {"agency_id: 'B' route_id: 't1'", "", "route that is not of the agency or trip beside it"},
+      {"route_type: 700 route_id: 'b2'", "8", ""},
+      {"route_type: 1 route_id: 'b2'", "8", ""},
+      {"agency_id: 'A'", "1278", ""},
+      {"agency_id: 'unheard of'", "", "agency that the static feed does not have"},
+      {"route_type: 0", "12", ""},
+      {"route_type: 3", "78", ""},
+      {"route_type: 700", "78", ""},
+      {"route_type: 702", "", "route type that no line has"},
+      {"agency_id: 'B' route_type: 3", "", "route type that no line has"},
+      {"route_id: 't1' stop_id: 's' direction_id: 1", "1", ""},
+      {"agency_id: 'A' stop_id: 's'", "", "stop alone (which lines serve it is not known)"},
+      {"agency_id: 'A' trip { route_id: 't2' }", "2", ""},
+      {"trip { trip_id: 'trip-7' }", "7", ""},
+      {"trip { trip_id: 'trip-8' }", "", "trip without a route, not in the static feed"},
+      {"route_id: 'gone'", "", "route that the static feed does not have"},
+      {"route_id: ''", "", "selector that names no line"},
+  };
+  for (const auto& [selector, lines, unfit] : cases) {
+    Reader reader;
+    const IncidentReading reading = reader.read(alert("a", "T", "informed_entity { " + std::string(selector) + " }"));
+    EXPECT_EQ(reader.lines(reading), lines) << selector;
+    ASSERT_EQ(reading.unfit.entries().size(), *unfit ? 1u : 0u) << selector;
+    if (*unfit) {
+      EXPECT_EQ(reading.unfit.entries()[0].reason, unfit) << selector;
+    }
+  }
+}
+
+TEST(Periods, EachIsAnIncidentOfOneNumber) {
+  const auto at = [](long offset) { return std::to_string(static_cast<long>(kNow) + offset); };
+  const auto range = [&](const std::string& field, long start, long end) {
+    return field + " { start: " + at(start) + " end: " + at(end) + " } ";
+  };
+  const struct {
+    const char* what;
+    std::string fields, periods;
+  } cases[] = {
+      {"none: always", "", ".. "},
+      {"by date, not as published", range("active_period", 500, 600) + range("active_period", -5, 5),
+       "-5..5 500..600 "},
+      {"overlapping and touching ones are one",
+       range("active_period", 0, 9) + range("active_period", 5, 20) + range("active_period", 20, 30) +
+           range("active_period", 6, 7),
+       "0..30 "},
+      {"open ends", "active_period { end: " + at(9) + " } active_period { start: " + at(50) + " end: 0 }", "..9 50.. "},
+      {"no end as publishers write it", "active_period { start: " + at(-9) + " end: 18446744073709551615 }", "-9.. "},
+      {"the year 3000", "active_period { start: 0 end: 32503680000 }", "..30753680000 "},
+      {"milliseconds", "active_period { start: " + at(-9) + "000 end: " + at(9) + "000 }", "-9..9 "},
+      {"an end at or before its start",
+       range("active_period", 5, 5) + range("active_period", 9, 2) + range("active_period", 1, 2), "1..2 "},
+      {"nothing but such: never", range("active_period", 5, 5), ""},
+      {"impact before communication before active",
+       range("active_period", 1, 2) + range("impact_period", 7, 8) + range("communication_period", 4, 5), "7..8 "},
+      {"communication before active", range("communication_period", 4, 5) + range("active_period", 1, 2), "4..5 "},
+      {"over for more than a day", range("active_period", -200000, -100000) + range("active_period", -60, -30),
+       "-60..-30 "},
+  };
+  for (const auto& [what, fields, periods] : cases) {
+    Reader reader;
+    const IncidentReading reading = reader.read(alert("a", "T", route("t1") + fields));
+    EXPECT_EQ(Reader::periods(reading), periods) << what;
+    for (const auto& incident : reading.incidents[0]) EXPECT_EQ(incident->muid(), reading.incidents[0][0]->muid());
+  }
+}
+
+TEST(Periods, ToComeAreTheNextSixteen) {
+  std::string fields;
+  for (int day = 259; day >= 0; --day)
+    fields += "active_period { start: " + std::to_string(kNow - 10 + static_cast<std::uint64_t>(day) * 86400) +
+              " end: " + std::to_string(kNow + static_cast<std::uint64_t>(day) * 86400) + " } ";
+  Reader reader;
+  const IncidentReading reading = reader.read(alert("a", "T", route("t1") + fields));
+  ASSERT_EQ(reading.incidents[0].size(), 17u);  // one is in force
+  EXPECT_EQ(reading.incidents[0].back()->startDate(), dateFromUnixTime(kNow - 10 + 16 * 86400));
+  EXPECT_EQ(reading.periods, 260u);
+}
+
+TEST(Alert, IsSkippedAloneAndCounted) {
+  const struct {
+    std::string entities;
+    const char* reason;
+  } cases[] = {
+      {"entity { id: 'x' is_deleted: true alert { informed_entity { route_id: 't2' } } }", "deleted entity"},
+      {"entity { alert { informed_entity { route_id: 't2' } } }", "entity without id"},
+      {"entity { id: 'x' trip_update { trip_id: 'trip-7' } }", "entity that is no alert"},
+      {"entity { id: 'x' }", "entity without content"},
+  };
+  for (const auto& [entities, reason] : cases) {
+    auto feed = AlertsFeed::read(feedBytes(entities + alert("a", "T", route("t1"))), "test");
+    ASSERT_TRUE(feed);
+    ASSERT_EQ(feed->skipped().entries().size(), 1u) << reason;
+    EXPECT_EQ(feed->skipped().entries()[0].reason, reason);
+    EXPECT_EQ(feed->alerts().size(), 1u);
+  }
+  const struct {
+    std::string alert;
+    const char* reason;
+  } alerts[] = {
+      {alert("x", "T", route("t2") + "effect: 10"), "alert without effect on the service, or about accessibility"},
+      {alert("x", "T", route("t2") + "effect: 11"), "alert without effect on the service, or about accessibility"},
+      {alert("x", " \\n", route("t2")), "alert that says nothing"},
+  };
+  for (const auto& [text, reason] : alerts) {
+    Reader reader;
+    const IncidentReading reading = reader.read(text + alert("a", "T", route("t1")));
+    EXPECT_EQ(reader.lines(reading), "1");
+    ASSERT_EQ(reading.skipped.entries().size(), 1u) << reason;
+    EXPECT_EQ(reading.skipped.entries()[0].reason, reason);
+  }
+}
+
+TEST(Alert, WithoutEffectCountsWhenSevereOrAskedFor) {
+  const std::string lift = alert("x", "Lift", route("t2") + "effect: 11 ");
+  Reader reader;
+  EXPECT_EQ(reader.lines(reader.read(alert("x", "Fire", route("t2") + "effect: 10 severity_level: 4"))), "2");
+  reader.query.minorAlerts = true;
+  EXPECT_EQ(reader.lines(reader.read(lift)), "2");
+}
+
+TEST(Alert, DamagedInsideIsSkippedAlone) {
+  transit_realtime::FeedMessage message;
+  message.ParseFromString(feedBytes(alert("good", "T", route("t1"))));
+  std::string bytes = message.SerializeAsString();
+  bytes += std::string("\x12\x08\x0A\x01x\x2A\x03\x2A\x7F\x0A", 10);  // an alert whose selector is longer than it is
+  bytes += std::string("\x12\x03\x0A\x7Fx", 5);                       // an entity whose id is longer than it is
+  bytes += std::string("\x12\x02\x0B\x0C", 4);                        // a group, which no field here is
+  auto feed = AlertsFeed::read(bytes, "test");
+  ASSERT_TRUE(feed);
+  EXPECT_EQ(feed->skipped().entries().at(0).count, 2u);
+  EXPECT_EQ(feed->alerts().size(), 2u);
+}
+
+TEST(AlertsFeed, IsRefusedWithWhatItIsInstead) {
+  const std::pair<std::string, std::string> cases[] = {
+      {"", "it is empty"},
+      {"<!doctype html><title>Sorry</title>", "web page"},
+      {"\n{\"entity\": []}", "JSON"},
+      {feedBytes(alert("a", "T", "")).erase(20), "cut off"},
+      {std::string("\x12\x03\x0A\x01x", 5), "cut off or no GTFS-Realtime feed"},
+      {std::string("\x0A\x07\x0A\x03"
+                   "2.0\x10\x01",
+                   9),
+       "DIFFERENTIAL"},
+  };
+  for (const auto& [bytes, what] : cases) {
+    const auto feed = AlertsFeed::read(bytes, "https://example.org/alerts");
+    ASSERT_FALSE(feed) << what;
+    EXPECT_NE(feed.error()->reason().find(what), std::string::npos) << feed.error()->reason();
+    EXPECT_NE(feed.error()->reason().find("https://example.org/alerts"), std::string::npos);
+    EXPECT_EQ(feed.error()->subject(), "https://example.org/alerts");
+    EXPECT_EQ(feed.error()->code(), static_cast<std::int64_t>(TransitLineServiceError::badAlerts));
+  }
+  EXPECT_TRUE(AlertsFeed::read(feedBytes(""), "a feed without alerts"));
+}
+
+TEST(Alert, TextsComeFromWhatThereIs) {
+  const std::string description = "description_text { translation { text: 'Stop <b>closed</b>.\\n\\nUse stop B.' } } ";
+  const std::string detail = "effect_detail { translation { text: 'Stop shift' } } ";
+  const struct {
+    const char* what;
+    std::string alert;
+    std::optional<std::string> title, summary, description;
+  } cases[] = {
+      {"header", "header_text { translation { text: 'Works\\non line 1 ' } } " + description, "Works on line 1",
+       "Stop closed.", "Stop closed.\n\nUse stop B."},
+      {"first line of the description", description + detail, "Stop closed.", "Use stop B.",
+       "Stop closed.\n\nUse stop B."},
+      {"the effect's detail", "effect: 9 " + detail, "Stop shift", {}, {}},
+      {"the effect's own words", "effect: 9 header_text { translation { text: ' ' } }", "Haltestelle verlegt", {}, {}},
+      {"an effect of the future", "effect: 77", {}, {}, {}},
+      {"a description that only repeats the header",
+       "header_text { translation { text: 'No service.' } } "
+       "description_text { translation { text: '<p>No\\nservice</p>' } }",
+       "No service.",
+       {},
+       {}},
+  };
+  for (const auto& [what, text, title, summary, whole] : cases) {
+    transit_realtime::Alert message;
+    ASSERT_TRUE(google::protobuf::TextFormat::ParseFromString(text, &message));
+    const auto texts =
+        alertTextsIn(message.SerializeAsString(), static_cast<AlertEffect>(message.effect()), {"de", ""});
+    ASSERT_EQ(texts.has_value(), title.has_value()) << what;
+    if (!texts) continue;
+    EXPECT_EQ(texts->title, title) << what;
+    EXPECT_EQ(texts->summary, summary) << what;
+    EXPECT_EQ(texts->description, whole) << what;
+  }
+}
+
+TEST(Alert, SummaryLeavesOutATitleThatStandsByItself) {
+  const struct {
+    const char *title, *description, *summary;
+  } cases[] = {
+      {"No service", "No service: trains rest.", "trains rest."},
+      {"No service", "No service : trains rest.", "trains rest."},
+      {"No service!", "No service! Trains rest.", "Trains rest."},
+      {"Why wait?", "Why wait? Walk.", "Walk."},
+      {"Line 1.", "Line\n1\nis closed.", "is closed."},
+      {"Line 1", "Line 1 is closed until Friday.", "Line 1 is closed until Friday."},
+      {"Line 1", "Line 1, 2 and 3 are closed.", "Line 1, 2 and 3 are closed."},
+      {"Line 1", "Line 1.5 km long.", "Line 1.5 km long."},
+      {"Line 1", "Line 12: closed.", "Line 12: closed."},
+  };
+  for (const auto& c : cases) {
+    transit_realtime::Alert message;
+    message.mutable_header_text()->add_translation()->set_text(c.title);
+    message.mutable_description_text()->add_translation()->set_text(c.description);
+    const auto texts = alertTextsIn(message.SerializeAsString(), AlertEffect::unknownEffect, {"en", ""});
+    EXPECT_EQ(texts->summary, c.summary);
+    EXPECT_EQ(texts->description, c.description);
+  }
+}
+
+TEST(Incident, IsOneForAllAlertsOfItsContent) {
+  const std::string later = "active_period { start: " + std::to_string(kNow + 100) + " } ";
+  Reader reader;
+  const IncidentReading reading = reader.read(alert("z", "Strike", route("t1") + "cause: 4") +
+                                              alert("b", "Strike", route("t2") + "cause: 4 " + later) +
+                                              alert("c", "Strike", route("b1") + "cause: 5"));
+  const auto& first = reading.incidents[0].at(0);
+  const auto& second = reading.incidents[1].at(0);
+  EXPECT_EQ(first->muid(), second->muid());
+  EXPECT_EQ(first->affectedEntities().size(), 2u);
+  EXPECT_EQ(first->startDate(), std::nullopt);  // each line in the periods of its own alert
+  EXPECT_EQ(second->startDate(), dateFromUnixTime(kNow + 100));
+  EXPECT_NE(first->muid(), reading.incidents[2].at(0)->muid());  // another cause
+
+  // The number depends neither on the order of the feed nor on the lines that were asked for.
+  reader.query.lines.resize(1);
+  const IncidentReading other = reader.read(alert("b", "Strike", route("t2") + "cause: 4 " + later) +
+                                            alert("z", "Strike", route("t1") + "cause: 4"));
+  EXPECT_EQ(other.incidents[0].at(0)->muid(), first->muid());
+}
+
+TEST(Incident, OfOneIdentifierInSeveralEntities) {
+  const std::string dutch = "entity { id: 'x' alert { " + route("t1") +
+                            " header_text { translation { text: 'Staking' language: 'nl' } } } } ";
+  const std::string english =
+      "entity { id: 'x' alert { " + route("t1") + " header_text { translation { text: 'Strike' language: 'en' } } } } ";
+  const std::string flood =
+      "entity { id: 'x' alert { " + route("t1") + " header_text { translation { text: 'Flood' language: 'en' } } } } ";
+  Reader reader;
+  const IncidentReading languages = reader.read(dutch + english);
+  ASSERT_EQ(languages.incidents[0].size(), 1u);
+  EXPECT_EQ(languages.incidents[0][0]->title(), "Strike");
+  reader.query.language.user = "nl";  // whose text the third alert does not have
+  const IncidentReading inDutch = reader.read(dutch + english + "entity { id: 'y' alert { " + route("t2") +
+                                              " header_text { translation { text: 'Strike' language: 'en' } } } } ");
+  EXPECT_EQ(inDutch.incidents[0].at(0)->title(), "Staking");
+  EXPECT_EQ(inDutch.incidents[1].at(0)->title(), "Strike");
+  const IncidentReading others = reader.read(english + flood);
+  ASSERT_EQ(others.incidents[0].size(), 2u);
+  EXPECT_NE(others.incidents[0][0]->muid(), others.incidents[0][1]->muid());
+}
+
+TEST(Incident, BlocksOnlyALineThatDoesNotRunAtAll) {
+  Reader reader;
+  const IncidentReading reading = reader.read(
+      alert("a", "T",
+            route("t1") + "informed_entity { route_id: 't2' stop_id: 's' } effect: 1 url { translation { text: "
+                          "'https://example.org/a' } }"));
+  const auto& incident = reading.incidents[0].at(0);
+  EXPECT_TRUE(incident->isBlockingIncident());
+  EXPECT_FALSE(reading.incidents[1].at(0)->isBlockingIncident());
+  EXPECT_EQ(incident->iconType(), 1);
+  EXPECT_EQ(incident->linkURL(), "https://example.org/a");
+  EXPECT_EQ(incident->messageForRouteStepping(), "T");
+  EXPECT_EQ(incident->lastUpdated(), std::nullopt) << "the date of the feed is none of the incident";
+}
+
+}  // namespace
+}  // namespace nimbo

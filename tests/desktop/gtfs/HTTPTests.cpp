@@ -1,0 +1,288 @@
+#include <openssl/ssl.h>
+#include <openssl/x509.h>
+#include <zip.h>
+#include <zlib.h>
+
+#include "GtfsFixtures.h"
+#include "GtfsLoopbackServer.h"
+#include "desktop/gtfs/alerts/AlertsStore.h"
+#include "desktop/gtfs/feeds/TransitLineServiceError.h"
+#include "desktop/gtfs/net/FileReading.h"
+#include "desktop/gtfs/net/HTTPFetcher.h"
+#include "desktop/gtfs/static/StaticFeedStore.h"
+#include "support/TestPlatform.h"
+
+namespace nimbo {
+namespace {
+
+using Answer = LoopbackServer::Answer;
+using Code = TransitLineServiceError;
+
+std::string gzip(const std::string& text) {
+  std::string result(text.size() + 1000, '\0');
+  z_stream stream{};
+  deflateInit2(&stream, 9, Z_DEFLATED, 16 + MAX_WBITS, 8, Z_DEFAULT_STRATEGY);
+  stream.next_in = reinterpret_cast<Bytef*>(const_cast<char*>(text.data()));
+  stream.avail_in = static_cast<uInt>(text.size());
+  stream.next_out = reinterpret_cast<Bytef*>(result.data());
+  stream.avail_out = static_cast<uInt>(result.size());
+  deflate(&stream, Z_FINISH);
+  result.resize(stream.total_out);
+  deflateEnd(&stream);
+  return result;
+}
+
+TEST(HTTPFetcher, SaysWhatWentWrong) {
+  const std::string big(5000, 'x');
+  const struct {
+    const char* what;
+    Answer answer;
+    Code code;
+    const char* reason;
+  } cases[] = {
+      {"key", {LoopbackServer::answer("403 Forbidden", "")}, Code::keyNeeded, "key from the publisher"},
+      {"server error", {LoopbackServer::answer("503 Busy", "")}, Code::serverFailure, "status 503. Try again later"},
+      {"unchanged what is not held", {LoopbackServer::answer("304 Not Modified", "")}, Code::serverFailure, "304"},
+      {"redirect loop", {LoopbackServer::answer("302 Found\r\nLocation: /", "")}, Code::serverFailure, "redirects"},
+      {"redirect to a file",
+       {LoopbackServer::answer("302 Found\r\nLocation: file:///etc/passwd", "")},
+       Code::badAddress,
+       "leads to one that is not"},
+      {"cut off", {"HTTP/1.1 200 OK\r\nContent-Length: 99\r\n\r\nshort"}, Code::unreachable, "broke"},
+      {"announced too large", {LoopbackServer::answer("200 OK", big)}, Code::tooLarge, "larger than"},
+      {"long header",
+       {"HTTP/1.1 200 OK\r\nX: " + std::string(200'000, 'x')},
+       Code::serverFailure,
+       "header that is too long"},
+      {"endless", {"HTTP/1.1 200 OK\r\n\r\n" + big, true}, Code::tooLarge, "sends more than"},
+      {"unpacked too large",
+       {LoopbackServer::answer("200 OK\r\nContent-Encoding: gzip", gzip(std::string(5'000'000, '\0')).substr(0, 3999))},
+       Code::tooLarge,
+       "sends more than"},
+  };
+  for (const auto& [what, answer, code, reason] : cases) {
+    const LoopbackServer server([&answer = answer](const std::string&) { return answer; });
+    const auto address = *FeedAddress::parse(server.address("/?key=secret"));
+    const auto outcome =
+        HTTPFetcher::fetch({address, {}, 4000, std::chrono::seconds(20)}, {}, [](auto) { return true; });
+    ASSERT_FALSE(outcome) << what;
+    EXPECT_EQ(outcome.error()->code(), static_cast<std::int64_t>(code)) << what << outcome.error()->reason();
+    EXPECT_NE(outcome.error()->reason().find(reason), std::string::npos) << what << outcome.error()->reason();
+    EXPECT_NE(outcome.error()->reason().find(server.address("/?...")), std::string::npos) << what;
+    EXPECT_EQ(outcome.error()->subject(), server.address("/?...")) << what;
+  }
+}
+
+TEST(HTTPFetcher, GivesUpOnServersThatDoNotAnswer) {
+  std::mutex lock;
+  lock.lock();
+  auto server = std::make_unique<LoopbackServer>([&](const std::string&) {
+    const std::lock_guard untilTheEnd(lock);
+    return Answer{};
+  });
+  const std::string address = server->address();
+  const auto codeOf = [&](const std::string& text, const std::stop_token& stop) {
+    return static_cast<Code>(HTTPFetcher::fetch({*FeedAddress::parse(text), {}, 1000, std::chrono::seconds(1)}, stop,
+                                                [](auto) { return true; })
+                                 .error()
+                                 ->code());
+  };
+  EXPECT_EQ(codeOf(address, {}), Code::timedOut);
+  std::stop_source stopped;
+  stopped.request_stop();
+  EXPECT_EQ(codeOf(address, stopped.get_token()), Code::internal);
+  lock.unlock();
+  server.reset();
+  EXPECT_EQ(codeOf(address, {}), Code::unreachable);
+  const LoopbackServer plain([](const std::string&) { return Answer{"no TLS"}; });
+  EXPECT_EQ(codeOf("https" + plain.address().substr(4), {}), Code::untrustedServer);
+  for (const char* begin : {"HTTP/1.1 200 OK\r\nX: ", "HTTP/1.1 200 OK\r\n\r\n"}) {
+    const LoopbackServer slow([&](const std::string&) { return Answer{begin, true, true}; });
+    EXPECT_EQ(codeOf(slow.address(), {}), Code::timedOut) << begin;
+  }
+}
+
+TEST(HTTPFetcher, TrustsNoCertificateThatNobodyVouchesFor) {
+  const std::unique_ptr<EVP_PKEY, decltype(&EVP_PKEY_free)> key(EVP_EC_gen("P-256"), EVP_PKEY_free);
+  const std::unique_ptr<X509, decltype(&X509_free)> certificate(X509_new(), X509_free);
+  X509_NAME* const name = X509_get_subject_name(certificate.get());
+  X509_NAME_add_entry_by_txt(name, "CN", MBSTRING_ASC, reinterpret_cast<const unsigned char*>("127.0.0.1"), -1, -1, 0);
+  X509_set_issuer_name(certificate.get(), name);
+  X509_gmtime_adj(X509_getm_notBefore(certificate.get()), 0);
+  X509_gmtime_adj(X509_getm_notAfter(certificate.get()), 3600);
+  X509_set_pubkey(certificate.get(), key.get());
+  ASSERT_NE(X509_sign(certificate.get(), key.get(), EVP_sha256()), 0);
+  const std::unique_ptr<SSL_CTX, decltype(&SSL_CTX_free)> context(SSL_CTX_new(TLS_server_method()), SSL_CTX_free);
+  SSL_CTX_use_certificate(context.get(), certificate.get());
+  SSL_CTX_use_PrivateKey(context.get(), key.get());
+  LoopbackServer server([](const std::string&) { return Answer{}; });
+  server.speakTLS([&](int connection) {
+    const std::unique_ptr<SSL, decltype(&SSL_free)> tls(SSL_new(context.get()), SSL_free);
+    SSL_set_fd(tls.get(), connection);
+    char request[4096];
+    if (SSL_accept(tls.get()) != 1 || SSL_read(tls.get(), request, sizeof request) <= 0) return;
+    const std::string answer = LoopbackServer::answer("200 OK", "believed");
+    SSL_write(tls.get(), answer.data(), static_cast<int>(answer.size()));
+  });
+  const auto outcome =
+      HTTPFetcher::fetch({*FeedAddress::parse("https" + server.address().substr(4)), {}, 10, std::chrono::seconds(20)},
+                         {}, [](auto) { return true; });
+  ASSERT_FALSE(outcome);
+  EXPECT_EQ(outcome.error()->code(), static_cast<std::int64_t>(Code::untrustedServer)) << outcome.error()->reason();
+  EXPECT_NE(outcome.error()->reason().find("certificate cannot be trusted"), std::string::npos);
+}
+
+/// An alerts feed on a server whose answer the test sets, read by a store with a cache of the test's own.
+class AlertsStoreTest : public testing::Test {
+ protected:
+  AlertsStoreTest() { platform.time.setNow(dateFromUnixTime(kNow)); }
+
+  /// Titles and time of the alerts, or the error's code.
+  std::string load() {
+    const auto alerts = store.load(feed, {});
+    if (!alerts) return "error " + std::to_string(alerts.error()->code());
+    return std::to_string(alerts->alerts().size()) + " alerts of " +
+           std::to_string(static_cast<long>(intervalBetween(dateFromUnixTime(kNow), *alerts->timestamp())));
+  }
+  static std::string error(Code code) { return "error " + std::to_string(static_cast<int>(code)); }
+  static Answer good(int alerts, long made, const std::string& head = "200 OK") {
+    std::string entities;
+    for (int i = 0; i < alerts; ++i) entities += alert(std::to_string(i), "T", "");
+    return {
+        LoopbackServer::answer(head, feedBytes(entities, static_cast<std::uint64_t>(static_cast<long>(kNow) + made)))};
+  }
+
+  TestPlatform platform;
+  TemporaryFolder folder;
+  std::mutex lock;
+  Answer answer;
+  LoopbackServer server{[this](const std::string&) { return answer; }};
+  Feed feed{"city", *FeedAddress::parse("/none"), *FeedAddress::parse(server.address())};
+  AlertsStore store{FeedCache(folder.path() / "cache")};
+};
+
+TEST_F(AlertsStoreTest, AsksConditionallyAndTakesPackedAnswers) {
+  const std::string body = feedBytes(alert("a", "T", ""));
+  answer.bytes = LoopbackServer::answer(
+      "200 OK\r\nETag: \"v1\"\r\nLast-Modified: Sun, 15 Jun 2025 15:06:40 GMT\r\nContent-Encoding: gzip", gzip(body));
+  EXPECT_EQ(load(), "1 alerts of 0");
+  answer.bytes = LoopbackServer::answer("304 Not Modified", "");
+  EXPECT_EQ(load(), "1 alerts of 0");
+  EXPECT_EQ(load(), "1 alerts of 0");
+  const auto requests = server.requests();
+  EXPECT_NE(requests.at(0).find("User-Agent: nimbo-transit/"), std::string::npos);
+  EXPECT_EQ(requests.at(0).find("If-"), std::string::npos);
+  for (const char* line : {"If-None-Match: \"v1\"\r\n", "If-Modified-Since: Sun, 15 Jun 2025 15:06:40 GMT\r\n",
+                           "Accept-Encoding: gzip\r\n"})
+    EXPECT_NE(requests.at(2).find(line), std::string::npos) << line;
+}
+
+TEST_F(AlertsStoreTest, LetsTheLastAnswerStandInForAQuarterOfAnHour) {
+  answer = good(2, -60);
+  EXPECT_EQ(load(), "2 alerts of -60");
+  const std::string one = LoopbackServer::answer("200 OK", feedBytes(alert("1", "T", ""), kNow));
+  std::string hundredThousand = feedBytes("");
+  for (int i = 0; i <= 100'000; ++i) hundredThousand += std::string_view("\x12\0", 2);
+  const struct {
+    Answer answer;
+    Code alone;  // without an answer that could stand in
+  } failures[] = {
+      {{LoopbackServer::answer("500 Oops", "")}, Code::serverFailure},
+      {{LoopbackServer::answer("302 Found\r\nLocation: file://" + folder.write("f", feedBytes("")).native(), "")},
+       Code::badAddress},
+      {{LoopbackServer::answer("200 OK", "<html>maintenance</html>")}, Code::badAlerts},
+      {{LoopbackServer::answer("200 OK", "")}, Code::badAlerts},
+      {{one.substr(0, one.size() - 1)}, Code::unreachable},
+      {{"HTTP/1.1 200 OK\r\nContent-Length: 20\r\n\r\n" + feedBytes(alert("1", "T", ""))}, Code::badAlerts},
+      {{LoopbackServer::answer("200 OK\r\nContent-Encoding: gzip", gzip(std::string(70'000'000, '\0')))},
+       Code::tooLarge},
+      {{"HTTP/1.1 200 OK\r\n\r\n" + std::string(1 << 20, '\0'), true}, Code::tooLarge},
+      {{"HTTP/1.1 200 OK\r\n" + std::string(1 << 16, 'x') + ": y\r\n", true}, Code::unreachable},
+      {{LoopbackServer::answer("200 OK", hundredThousand)}, Code::tooLarge},
+      {good(1, -1200), Code::staleAlerts}};
+  const AlertsStore other(FeedCache(folder.path() / "empty"));
+  for (const auto& failure : failures) {
+    answer = failure.answer;
+    EXPECT_EQ(load(), "2 alerts of -60") << answer.bytes.substr(0, 80);
+    const auto alone = other.load(feed, {});
+    ASSERT_FALSE(alone) << answer.bytes.substr(0, 80);
+    EXPECT_EQ("error " + std::to_string(alone.error()->code()), error(failure.alone)) << alone.error()->reason();
+  }
+  answer = good(1, -120);  // older than what is held
+  EXPECT_EQ(load(), "2 alerts of -60");
+  platform.time.advance(14 * 60 - 1);
+  EXPECT_EQ(load(), "2 alerts of -60");
+  platform.time.advance(60);  // now the publisher's time is more than 15 minutes ago
+  answer = failures[0].answer;
+  EXPECT_EQ(load(), error(Code::serverFailure));
+  platform.time.advance(-86400);  // a clock that was wrong by a day tells no age
+  EXPECT_EQ(load(), error(Code::serverFailure));
+}
+
+TEST_F(AlertsStoreTest, JudgesAgeByThePublishersOwnTime) {
+  for (const int made : {-1200, 1200}) {
+    answer = good(0, made);
+    feed.maximumAlertsAge = kDefaultMaximumAlertsAge;
+    EXPECT_EQ(load(), error(Code::staleAlerts));
+    feed.maximumAlertsAge = std::chrono::minutes(60);
+    EXPECT_EQ(load(), "0 alerts of " + std::to_string(made));
+  }
+  platform.time.advance(1200);
+  feed.maximumAlertsAge = kDefaultMaximumAlertsAge;
+  answer = good(0, 1260, "200 OK\r\nETag: \"a\"");
+  EXPECT_EQ(load(), "0 alerts of 1260");
+  platform.time.advance(20 * 60);
+  answer.bytes = LoopbackServer::answer("304 Not Modified", "");  // unchanged, which makes it no younger
+  EXPECT_EQ(load(), error(Code::staleAlerts));
+}
+
+TEST_F(AlertsStoreTest, DoesWithoutADamagedCache) {
+  answer = good(2, 0, "200 OK\r\nETag: \"a\"");
+  EXPECT_EQ(load(), "2 alerts of 0");
+  const auto file = FeedCache(folder.path() / "cache").alerts("city");
+  const std::string bytes = *readFile(file, 1 << 20);
+  for (const std::string& damaged : {bytes.substr(0, bytes.size() - 1), std::string("?"), bytes + "x"}) {
+    std::ofstream(file, std::ios::binary) << damaged;
+    EXPECT_EQ(load(), "2 alerts of 0");
+    EXPECT_EQ(server.requests().back().find("If-None-Match"), std::string::npos);
+  }
+  // A file counts as long as it can be read, however old it is.
+  feed.alerts = *FeedAddress::parse(folder.write("alerts.pb", feedBytes("", kNow - 1'000'000)).native());
+  EXPECT_EQ(load(), "0 alerts of -1000000");
+  std::filesystem::remove(feed.alerts.path());
+  EXPECT_EQ(load(), error(Code::unreadableFile));
+}
+
+TEST(StaticFeedStore, AsksAServerOnceADayAndKeepsWhatItHas) {
+  TestPlatform platform;
+  TemporaryFolder folder;
+  const auto path = folder.path() / "made.zip";
+  zip_t* archive = zip_open(path.c_str(), ZIP_CREATE, nullptr);
+  static const char kRoutes[] = "route_id\n1\n";
+  zip_file_add(archive, "routes.txt", zip_source_buffer(archive, kRoutes, sizeof kRoutes - 1, 0), 0);
+  zip_close(archive);
+  Answer answer{LoopbackServer::answer("200 OK\r\nETag: \"a\"", *readFile(path, 1 << 20))};
+  const LoopbackServer server([&](const std::string&) { return answer; });
+  const StaticFeedStore store(FeedCache(folder.path() / "cache"));
+  const Feed feed{"city", *FeedAddress::parse(server.address()), *FeedAddress::parse("/none")};
+  const auto requestsAfterLoad = [&] {
+    EXPECT_TRUE(store.load(feed, {}));
+    return server.requests().size();
+  };
+  EXPECT_EQ(requestsAfterLoad(), 1u);
+  EXPECT_EQ(requestsAfterLoad(), 1u);
+  platform.time.advance(86400);
+  answer.bytes = LoopbackServer::answer("304 Not Modified", "");
+  EXPECT_EQ(requestsAfterLoad(), 2u);
+  EXPECT_NE(server.requests().back().find("If-None-Match: \"a\""), std::string::npos);
+  EXPECT_EQ(requestsAfterLoad(), 2u);
+  platform.time.advance(86400);
+  answer.bytes = LoopbackServer::answer("500 Oops", "");
+  EXPECT_EQ(requestsAfterLoad(), 3u);
+  EXPECT_TRUE(platform.log.contains("Keeping the older static feed"));
+  std::filesystem::remove_all(folder.path() / "cache");
+  EXPECT_FALSE(store.load(feed, {}));
+}
+
+}  // namespace
+}  // namespace nimbo

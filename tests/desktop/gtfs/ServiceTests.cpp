@@ -1,0 +1,196 @@
+#include <condition_variable>
+
+#include "GtfsFixtures.h"
+#include "GtfsLoopbackServer.h"
+#include "desktop/gtfs/feeds/FeedCatalog.h"
+#include "desktop/gtfs/feeds/FeedCheck.h"
+#include "desktop/gtfs/feeds/FeedMuid.h"
+#include "desktop/gtfs/feeds/GTFSTransitLineService.h"
+#include "desktop/gtfs/feeds/SampleCity.h"
+#include "desktop/gtfs/feeds/TransitLineServiceError.h"
+#include "support/TestPlatform.h"
+
+namespace nimbo {
+namespace {
+
+using Code = TransitLineServiceError;
+
+class LineServiceTest : public testing::Test {
+ protected:
+  LineServiceTest() { platform.time.setNow(dateFromUnixTime(kNow)); }
+
+  /// Sets up a feed of lines r1, r2... with these short names.
+  void addFeed(const std::string& name, const std::vector<std::string>& shortNames, const std::string& alerts) {
+    std::string routes = "route_id,route_short_name,route_type\n";
+    for (std::size_t i = 0; i < shortNames.size(); ++i)
+      routes += "r" + std::to_string(i + 1) + "," + shortNames[i] + ",3\n";
+    folder.write(name + "/routes.txt", routes);
+    ASSERT_FALSE(FeedConfiguration(paths.config)
+                     .add({name, *FeedAddress::parse((folder.path() / name).native()), *FeedAddress::parse(alerts)}));
+  }
+  void addFeed(const std::string& name, const std::vector<std::string>& shortNames) {
+    addFeed(name, shortNames, folder.write(name + "/alerts.pb", feedBytes(alert("a", "In " + name, route("r1")))));
+  }
+  static MapItemIdentifierRef line(const std::string& feed, const std::string& routeID,
+                                   const std::string& shortName = "") {
+    return std::make_shared<const MapItemIdentifier>(
+        lineMuid(feed, routeID), TransitLineLocator{feed, "", routeID, shortName, TransitMode::bus});
+  }
+
+  /// The names of the lines, each with the titles of its incidents, or the error's code.
+  std::string lookup(const std::vector<MapItemIdentifierRef>& identifiers) {
+    std::string text;
+    bool isDone = false;
+    service->lookup(identifiers, [&](const TransitLineItems& items, const ErrorRef& error) {
+      isDone = true;
+      if (error) {
+        EXPECT_EQ(error->domain(), kTransitLineServiceErrorDomain);
+        EXPECT_TRUE(items.empty());
+        text = "error " + std::to_string(error->code());
+      }
+      for (const auto& item : items) {
+        text += item->name().value_or("?");
+        for (const auto& incident : item->incidents()) text += " (" + *incident->title() + ")";
+        text += "; ";
+      }
+    });
+    EXPECT_FALSE(isDone);
+    platform.loop.waitAndDrain([&] { return isDone; });
+    return text;
+  }
+  static std::string error(Code code) { return "error " + std::to_string(static_cast<int>(code)); }
+
+  TestPlatform platform;
+  TemporaryFolder folder;
+  Paths paths = Paths::resolve(folder.path() / "config", folder.path() / "state");
+  std::unique_ptr<GTFSTransitLineService> service = std::make_unique<GTFSTransitLineService>(paths);
+};
+
+TEST_F(LineServiceTest, AnswersInTheOrderOfTheIdentifiers) {
+  addFeed("north", {"1", "2"});
+  addFeed("south", {"1", "3"});
+  EXPECT_EQ(lookup({line("south", "r2"), line("north", "r1"), line("south", "r1"),
+                    std::make_shared<const MapItemIdentifier>(lineMuid("north", "r2"))}),
+            "3; 1 (In north); 1 (In south); 2; ");
+  EXPECT_EQ(lookup({}), "");
+}
+
+TEST_F(LineServiceTest, FailsWhenAFeedDoes) {
+  addFeed("north", {"1"});
+  addFeed("south", {"1"}, folder.path() / "missing.pb");
+  EXPECT_EQ(lookup({line("north", "r1")}), "1 (In north); ");
+  EXPECT_EQ(lookup({line("north", "r1"), line("south", "r1")}), error(Code::unreadableFile));
+  EXPECT_EQ(lookup({line("north", "r1"), line("east", "r1")}), error(Code::unknownFeed));
+  std::string many;
+  for (int i = 0; i <= 5000; ++i) many += alert(std::to_string(i), "T" + std::to_string(i), route("r1"));
+  addFeed("west", {"1"}, folder.write("many.pb", feedBytes(many)));
+  EXPECT_EQ(lookup({line("west", "r1")}), error(Code::tooLarge));
+  folder.write("config/feeds.json", "{");
+  EXPECT_EQ(lookup({line("north", "r1")}), error(Code::configuration));
+}
+
+TEST_F(LineServiceTest, FindsRenumberedLinesAndNamesThoseThatAreGone) {
+  addFeed("north", {"1", "2", "5", "5"});
+  const auto renumbered = line("north", "old-2", "2");
+  EXPECT_EQ(lookup({renumbered, line("north", "gone", "9"), line("north", "old-5", "5"), line("north", "r1")}),
+            "2; 1 (In north); ");
+  ASSERT_EQ(service->goneLines().size(), 2u);
+  EXPECT_EQ(service->goneLines()[0]->locator()->routeID, "gone");
+  EXPECT_EQ(service->goneLines()[1]->locator()->routeID, "old-5");
+  EXPECT_EQ(platform.log.texts("TransitLineService", LogLevel::error).size(), 2u);
+  EXPECT_EQ(lookup({line("north", "gone", "9")}), error(Code::unknownLine));
+
+  bool isDone = false;
+  service->lookup({renumbered}, [&](const TransitLineItems& items, const ErrorRef&) {
+    EXPECT_EQ(items.at(0)->muid(), renumbered->muid());  // the favourite's own number
+    EXPECT_EQ(items.at(0)->identifier()->locator()->routeID, "r2");
+    isDone = true;
+  });
+  platform.loop.waitAndDrain([&] { return isDone; });
+}
+
+TEST_F(LineServiceTest, AsksAllServersAtTheSameTime) {
+  std::mutex lock;
+  std::condition_variable arrived;
+  int count = 0;
+  const LoopbackServer server([&](const std::string&) {
+    std::unique_lock guard(lock);
+    ++count;
+    arrived.notify_all();
+    arrived.wait(guard, [&] { return count == 2; });
+    return LoopbackServer::Answer{LoopbackServer::answer("200 OK", feedBytes(""))};
+  });
+  addFeed("north", {"1"}, server.address("/north"));
+  addFeed("south", {"2"}, server.address("/south"));
+  EXPECT_EQ(lookup({line("north", "r1"), line("south", "r1")}), "1; 2; ");
+}
+
+TEST_F(LineServiceTest, NeverCallsBackOnceItIsGone) {
+  std::mutex lock;
+  lock.lock();
+  bool isAsked = false;
+  {
+    const LoopbackServer server([&](const std::string&) {
+      platform.loop.dispatchAsync([&] { isAsked = true; });
+      const std::lock_guard untilTheEnd(lock);
+      return LoopbackServer::Answer{};
+    });
+    addFeed("north", {"1"}, server.address());
+    service->lookup({line("north", "r1")}, [](const auto&, const auto&) { FAIL(); });
+    platform.loop.waitAndDrain([&] { return isAsked; });
+    service.reset();
+    lock.unlock();
+  }
+  platform.loop.runUntilIdle();
+}
+
+TEST_F(LineServiceTest, ServesTheSampleCityUntilAFeedIsSetUp) {
+  std::vector<MapItemIdentifierRef> favorites;
+  for (const auto& favorite : SampleCity::favorites()) favorites.push_back(favorite->identifier());
+  service->setLanguage("de-AT");
+  const std::string before = lookup(favorites);
+  EXPECT_TRUE(before.starts_with("M1 (Verspätungen bis zu 15 Minuten); M2 (Verspätungen bis zu 15 Minuten); "))
+      << before;
+  platform.time.advance(1000);
+  EXPECT_EQ(lookup(favorites), before);
+  addFeed("north", {"1"});
+  EXPECT_EQ(lookup(favorites), error(Code::unknownFeed));
+}
+
+TEST_F(LineServiceTest, CatalogFindsLines) {
+  const FeedLibrary library(paths);
+  const FeedCatalog catalog(library);
+  EXPECT_EQ(catalog.linesMatching("")->lines.size(), 12u);
+  EXPECT_EQ(catalog.linesMatching("aIrPort")->lines.size(), 1u);
+  EXPECT_EQ(catalog.linesMatching("merebay")->lines.size(), 2u);
+  EXPECT_EQ((*catalog.lineNamed("sample:coast"))->name(), "Coast Express");
+  for (const char* name : {"coast", "sample:", "sample:x", "metro:coast"})
+    EXPECT_FALSE(catalog.lineNamed(name)) << name;
+  addFeed("north", {"1", "2"});
+  addFeed("south", {"1"});
+  std::filesystem::remove(folder.path() / "south/routes.txt");
+  const auto lines = catalog.linesMatching("r");
+  EXPECT_EQ(lines->lines.size(), 2u);
+  EXPECT_EQ(lines->errors.size(), 1u);
+}
+
+TEST_F(LineServiceTest, CheckTellsHowTheHalvesFit) {
+  const std::string alerts = folder.write("alerts.pb", feedBytes(alert("a", "T", route("r1") + route("r9")) +
+                                                                 alert("b", "T", "effect: 10 " + route("r2"))));
+  addFeed("north", {"1", "2"}, alerts);
+  const Feed feed = *FeedConfiguration(paths.config).feedNamed("north");
+  FeedCheckReport report = checkFeed(feed, FeedCache(paths.cache));
+  ASSERT_TRUE(report.staticFeed && report.alerts);
+  EXPECT_EQ(report.staticFeed->lines, 2u);
+  EXPECT_EQ(report.alerts->alerts, 2u);
+  EXPECT_EQ(report.alerts->selectors, 3u);
+  EXPECT_EQ(report.alerts->affectedLines, 1u);
+  EXPECT_EQ(report.alerts->unfit.entries().at(0).example, "route r9");
+  EXPECT_EQ(report.alerts->skipped.entries().at(0).example, "b");
+  std::filesystem::remove(folder.path() / "north/routes.txt");
+  report = checkFeed(feed, FeedCache(paths.cache));
+  EXPECT_TRUE(report.staticError && report.alerts);
+}
+
+}  // namespace
+}  // namespace nimbo

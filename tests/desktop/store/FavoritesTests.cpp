@@ -1,0 +1,186 @@
+#include <thread>
+
+#include "desktop/store/Fixture.h"
+#include "desktop/store/GuardedFavorites.h"
+#include "support/TransitFixtures.h"
+
+namespace nimbo {
+
+using testing::ElementsAre;
+using testing::IsEmpty;
+using Names = std::vector<std::string>;
+
+class FavoritesTest : public StoreTest {
+ protected:
+  FavoritesEditor makeEditor() {
+    return {makeDatabase(), [this] { return firstFavorites; }};
+  }
+  Favorites read() {
+    return GuardedFavorites(makeEditor(), platform.transitLines).remotePersister()->readFavorites().value();
+  }
+
+  /// Names of lines and kinds of other favourites in their order.
+  Names names() {
+    Names names;
+    for (const FavoriteRef& favorite : read()) {
+      const auto* line = dynamic_cast<const FavoriteTransitLine*>(favorite.get());
+      if (!line)
+        names.push_back(favorite->kind());
+      else
+        names.push_back(line->transitLine() ? *line->transitLine()->name() : "no line");
+    }
+    return names;
+  }
+
+  std::vector<TransitLineRef> firstFavorites;
+};
+
+TEST_F(FavoritesTest, BeginWithTheFirstOnesUntilTheUserChangesThem) {
+  firstFavorites = {lineItem(1, "A"), lineItem(2, "B")};
+  FavoritesEditor editor = makeEditor();
+  EXPECT_THAT(names(), ElementsAre("A", "B"));
+  EXPECT_NE(editor.remove({7}), nullptr);
+  firstFavorites.pop_back();
+  EXPECT_THAT(names(), ElementsAre("A")) << "a refused change keeps nothing";
+  EXPECT_EQ(editor.add({lineItem(3, "C")}), nullptr);
+  firstFavorites = {lineItem(9, "Z")};
+  EXPECT_THAT(names(), ElementsAre("A", "C"));
+  EXPECT_EQ(editor.remove({3, 1}), nullptr);
+  EXPECT_THAT(names(), IsEmpty()) << "an emptied list stays empty";
+}
+
+TEST_F(FavoritesTest, ChangeLinesAndLeaveOtherKindsInTheirPlaces) {
+  FavoritesEditor editor = makeEditor();
+  ASSERT_EQ(editor.add({lineItem(1, "A")}), nullptr);
+  connect().execute("INSERT INTO favorites(position, kind, content) VALUES (1, 'place', x'00ff'), (4, 'guide', 12)");
+  ASSERT_EQ(editor.add({lineItem(2, "B"), lineItem(3, "C")}), nullptr);
+  const Names beforeRefusals{"C", "place", "guide", "B", "A"};
+  const struct {
+    ErrorRef error;
+    std::optional<FavoritesError> refusal;
+    Names after;
+  } steps[] = {
+      {editor.move(1, 2), {}, names()},
+      {editor.move(3, 0), {}, names()},
+      {editor.move(2, 1), {}, names()},
+      {editor.move(2, 3), FavoritesError::position, names()},
+      {editor.move(9, 0), FavoritesError::unknown, names()},
+      {editor.remove({1, 9}), FavoritesError::unknown, names()},
+      {editor.add({lineItem(4, "D"), lineItem(2, "B")}), FavoritesError::duplicate, names()},
+      {editor.add({lineItem(4, "D"), lineItem(4, "D")}), FavoritesError::duplicate, names()},
+  };
+  EXPECT_THAT(steps[0].after, ElementsAre("B", "place", "guide", "C", "A"));
+  for (const auto& step : steps) {
+    SCOPED_TRACE(&step - steps);
+    EXPECT_EQ(step.error ? std::optional(FavoritesError{step.error->code()}) : std::nullopt, step.refusal);
+    if (&step != steps) {
+      EXPECT_EQ(step.after, beforeRefusals);
+    }
+  }
+  EXPECT_EQ(editor.remove({3}), nullptr);
+  EXPECT_THAT(names(), ElementsAre("place", "guide", "B", "A"));
+  EXPECT_EQ(connect().integer("SELECT count(*) FROM favorites WHERE (kind, content) IN"
+                              " (VALUES ('place', x'00ff'), ('guide', 12))"),
+            2);
+}
+
+TEST_F(FavoritesTest, KeepWholeLines) {
+  BasicTransitLineItem::Fields fields;
+  fields.identifier = std::make_shared<const MapItemIdentifier>(
+      0xfedcba9876543210, TransitLineLocator{"city", "agency \xff", "U1", "1", TransitMode::tram});
+  fields.name = "Zürich \"1\"";
+  fields.lineColorString = "#336699";
+  fields.isBus = true;
+  fields.system = std::make_shared<const TransitSystem>(1u << 31, "System", modeArtwork(TransitMode::ferry));
+  fields.modeArtwork = modeArtwork(TransitMode::bus);
+  TransitArtwork::Fields shield = shieldArtwork("1")->fields();
+  shield.iconFallbackShieldDataSource = TransitShield{2, {}, "#000000", "#ffffff"};
+  fields.alternateArtwork = std::make_shared<const TransitArtwork>(shield);
+  const auto line = std::make_shared<const BasicTransitLineItem>(fields);
+  ASSERT_EQ(makeEditor().add({line}), nullptr);
+
+  const auto read = this->read();
+  const TransitLineRef kept = dynamic_cast<const FavoriteTransitLine&>(*read.at(0)).transitLine();
+  ASSERT_NE(kept, nullptr);
+  EXPECT_EQ(kept->muid(), line->muid());
+  EXPECT_EQ(kept->identifier()->locator()->feed, "city");
+  EXPECT_EQ(kept->identifier()->locator()->agencyID, "agency \uFFFD");
+  EXPECT_EQ(kept->identifier()->locator()->routeID, "U1");
+  EXPECT_EQ(kept->identifier()->locator()->mode, TransitMode::tram);
+  EXPECT_EQ(kept->name(), line->name());
+  EXPECT_EQ(kept->lineColorString(), "#336699");
+  EXPECT_TRUE(kept->isBus());
+  EXPECT_EQ(kept->system()->muid(), 1u << 31);
+  EXPECT_EQ(kept->system()->name(), "System");
+  EXPECT_TRUE(artworksAreEquivalent(kept->system()->artwork().get(), fields.system->artwork().get()));
+  EXPECT_TRUE(artworksAreEquivalent(kept->modeArtwork().get(), line->modeArtwork().get()));
+  EXPECT_TRUE(artworksAreEquivalent(kept->alternateArtwork().get(), line->alternateArtwork().get()));
+  EXPECT_EQ(kept->artwork(), nullptr);
+}
+
+TEST_F(FavoritesTest, KeepTheContentOfALineThatCannotBeRead) {
+  FavoritesEditor editor = makeEditor();
+  ASSERT_EQ(editor.add({lineItem(1, "A"), lineItem(2, "B"), lineItem(3, "C"), lineItem(4, "D")}), nullptr);
+  connect().execute(
+      "UPDATE favorites SET content = CASE muid WHEN 1 THEN '{\"isBus\": 7}' WHEN 2 THEN '[' END"
+      " WHERE muid < 4");
+  EXPECT_THAT(names(), ElementsAre("no line", "no line", "no line", "D"));
+  EXPECT_EQ(editor.move(1, 3), nullptr);
+  EXPECT_THAT(names(), ElementsAre("no line", "no line", "D", "no line"));
+  EXPECT_EQ(connect().integer("SELECT count(*) FROM favorites WHERE content = '['"), 1);
+}
+
+TEST_F(FavoritesTest, FailTheLookupRatherThanSeemToBeNone) {
+  ASSERT_EQ(makeEditor().add({lineItem(1, "A")}), nullptr);
+  GuardedFavorites favorites(makeEditor(), platform.transitLines);
+  const auto persister = favorites.remotePersister();
+  const auto lookUp = [&] {
+    std::vector<MapItemIdentifierRef> identifiers;
+    const Favorites read = persister->readFavorites().value();
+    for (const FavoriteRef& favorite : read)
+      identifiers.push_back(dynamic_cast<const FavoriteTransitLine&>(*favorite).transitLine()->identifier());
+    std::optional<std::string> reason;
+    favorites.lookup(identifiers, [&](const TransitLineItems&, const ErrorRef& error) {
+      reason = error ? error->reason() : std::string();
+    });
+    EXPECT_EQ(reason, std::nullopt) << "never before the lookup has returned";
+    if (platform.transitLines.pending() > 0) platform.transitLines.answer({});
+    platform.loop.runUntilIdle();
+    return reason.value();
+  };
+  EXPECT_EQ(lookUp(), "");
+  std::filesystem::remove_all(folder());
+  std::filesystem::create_directories(file());
+  EXPECT_THAT(lookUp(), testing::HasSubstr("Cannot read " + file().native()));
+  std::filesystem::remove(file());
+  EXPECT_EQ(makeEditor().add({lineItem(2, "B")}), nullptr);
+  EXPECT_EQ(lookUp(), "");
+  // Damage that takes favourites is no emptied list either, until the user has seen to it.
+  connect().prepare("PRAGMA wal_checkpoint(TRUNCATE)").step();
+  const auto page = connect().integer("SELECT rootpage FROM sqlite_schema WHERE name = 'favorites'");
+  overwrite(file(), (page - 1) * 4096, std::string(4096, '\xee'));
+  for (int i = 0; i < 3; ++i) EXPECT_THAT(lookUp(), testing::HasSubstr(".broken-2026-01-05T12-00-00"));
+  EXPECT_EQ(notices.size(), 1u);
+  EXPECT_EQ(makeEditor().add({lineItem(3, "C")}), nullptr);
+  EXPECT_EQ(lookUp(), "");
+  EXPECT_EQ(platform.transitLines.lookups(), (std::vector<std::vector<std::uint64_t>>{{1}, {2}, {3}}));
+}
+
+TEST_F(FavoritesTest, LoseNothingWhenHostsChangeThemAtOnce) {
+  constexpr std::uint64_t kHosts = 4, kLines = 8;
+  std::vector<std::thread> threads;
+  for (std::uint64_t host = 0; host < kHosts; ++host)
+    threads.emplace_back([editor = makeEditor(), host]() mutable {
+      for (std::uint64_t i = 0; i < kLines; ++i) {
+        const std::uint64_t muid = host * kLines + i;
+        EXPECT_EQ(editor.add({lineItem(muid, "L")}), nullptr);
+        EXPECT_EQ(editor.move(muid, 0), nullptr);
+      }
+    });
+  for (std::thread& thread : threads) thread.join();
+  EXPECT_EQ(names().size(), kHosts * kLines);
+  EXPECT_EQ(connect().integer("SELECT count(DISTINCT muid) + count(DISTINCT position) FROM favorites"),
+            2 * kHosts * kLines);
+}
+
+}  // namespace nimbo

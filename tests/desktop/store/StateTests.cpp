@@ -1,0 +1,195 @@
+#include <sys/resource.h>
+#include <sys/stat.h>
+#include <unistd.h>
+
+#include <csignal>
+
+#include "desktop/store/Fixture.h"
+#include "desktop/store/SQLiteAnalyticsPipeline.h"
+#include "desktop/store/SQLiteSharedSettings.h"
+
+namespace nimbo {
+
+namespace fs = std::filesystem;
+using testing::ElementsAre;
+using testing::HasSubstr;
+using Value = SharedSettingsStore::Value;
+
+class StateDatabaseTest : public StoreTest {
+ protected:
+  std::shared_ptr<SharedSettingsStore> makeSettings() { return SQLiteSharedSettings(makeDatabase()).groupStore(); }
+  fs::path setAside() const { return fs::path(file()).concat(".broken-2026-01-05T12-00-00"); }
+};
+
+TEST_F(StateDatabaseTest, SharesValuesOfEveryKindBetweenProcesses) {
+  const auto host = makeSettings(), widget = makeSettings();
+  for (const Value& value :
+       {Value(true), Value(false), Value(""), Value("Zür\0ich"), Value(Bytes()), Value(Bytes{0, 255, 0})}) {
+    EXPECT_EQ(host->setValue_forKey(value, "key"), nullptr);
+    EXPECT_EQ(widget->valueForKey("key"), value);
+  }
+  EXPECT_EQ(widget->removeValueForKey("key"), nullptr);
+  EXPECT_EQ(host->valueForKey("key"), std::nullopt);
+  EXPECT_EQ(host->removeValueForKey("key"), nullptr);
+}
+
+TEST_F(StateDatabaseTest, MakesFilesForItsOwnerOnlyAndNotBeforeTheFirstWrite) {
+  const auto settings = makeSettings();
+  EXPECT_EQ(settings->valueForKey("key"), std::nullopt);
+  EXPECT_FALSE(fs::exists(folder()));
+  EXPECT_EQ(settings->setValue_forKey(true, "key"), nullptr);
+  EXPECT_EQ(fs::status(folder()).permissions(), fs::perms::owner_all);
+  int files = 0;
+  for (const auto& entry : fs::directory_iterator(folder())) {
+    EXPECT_EQ(entry.status().permissions(), fs::perms::owner_read | fs::perms::owner_write) << entry.path();
+    ++files;
+  }
+  EXPECT_EQ(files, 3) << "the database, its write-ahead log and the log's index";
+}
+
+TEST_F(StateDatabaseTest, SetsADamagedFileAsideAndSaysSo) {
+  ASSERT_EQ(makeSettings()->setValue_forKey(std::string(20000, 'x'), "key"), nullptr);
+  const std::string whole = contentOf(file());
+  for (const std::string& damaged : {std::string("hello"), std::string(5000, 'x'), whole.substr(0, 5000)}) {
+    std::ofstream(file(), std::ios::binary | std::ios::trunc) << damaged;
+    EXPECT_EQ(makeSettings()->setValue_forKey(true, "new"), nullptr);
+    EXPECT_EQ(contentOf(setAside()), damaged);
+    EXPECT_THAT(notices, ElementsAre(HasSubstr(setAside().native())));
+    EXPECT_EQ(makeSettings()->valueForKey("new"), Value(true));
+    notices.clear();
+    fs::remove(setAside());
+  }
+}
+
+TEST_F(StateDatabaseTest, KeepsWhatCanBeReadOfADamagedFileInEveryProcess) {
+  const auto host = makeSettings(), widget = makeSettings();
+  ASSERT_EQ(host->setValue_forKey("kept", "first"), nullptr);
+  ASSERT_EQ(host->setValue_forKey(Bytes(20000, 'x'), "large"), nullptr);
+  ASSERT_EQ(widget->stringForKey("first"), "kept");
+  {
+    SQLiteConnection connection = connect();
+    connection.prepare("PRAGMA wal_checkpoint(TRUNCATE)").step();
+    // The analytics table's page becomes one of no known kind.
+    const auto page = connection.integer("SELECT rootpage FROM sqlite_schema WHERE name = 'analytics'");
+    overwrite(file(), (page - 1) * 4096, std::string(4096, '\xee'));
+  }
+  SQLiteAnalyticsPipeline analytics(makeDatabase());
+  const ErrorRef error = analytics.list().error();
+  ASSERT_NE(error, nullptr);
+  EXPECT_THAT(notices, ElementsAre(error->reason()));
+  EXPECT_THAT(error->reason(), testing::AllOf(HasSubstr(setAside().native()), HasSubstr("0 favorites and 2 settings")));
+  EXPECT_EQ(error->subject(), setAside().native());
+  EXPECT_TRUE(analytics.list());
+  // Those that had the damaged file open go over to the new one.
+  EXPECT_EQ(host->setValue_forKey("since", "second"), nullptr);
+  EXPECT_EQ(widget->stringForKey("second"), "since");
+  EXPECT_EQ(widget->stringForKey("first"), "kept");
+  EXPECT_EQ(notices.size(), 1u);
+}
+
+TEST_F(StateDatabaseTest, EndsAReplacementThatWasCutShort) {
+  ASSERT_EQ(makeSettings()->setValue_forKey("kept", "key"), nullptr);
+  // Half made beside the damaged one, or made and the damaged one set aside.
+  std::ofstream(file().string() + ".new") << "half";
+  EXPECT_EQ(makeSettings()->stringForKey("key"), "kept");
+  fs::rename(file(), file().string() + ".new");
+  std::ofstream(file().string() + "-wal") << "the damaged one's";
+  EXPECT_EQ(makeSettings()->stringForKey("key"), "kept");
+  EXPECT_EQ(contentOf(setAside().string() + "-wal"), "the damaged one's");
+  EXPECT_FALSE(fs::exists(file().string() + ".new"));
+}
+
+TEST_F(StateDatabaseTest, LeavesDatabasesOfOthersAsTheyAre) {
+  fs::create_directory(folder());
+  for (const char* statements : {"CREATE TABLE t(x); PRAGMA user_version = 2", "CREATE TABLE favorites(name)"}) {
+    std::ofstream(file(), std::ios::trunc).close();
+    connect().execute(statements);
+    const std::string before = contentOf(file());
+    const ErrorRef error = makeSettings()->setValue_forKey(true, "key");
+    ASSERT_NE(error, nullptr);
+    EXPECT_THAT(error->reason(), HasSubstr(file().native()));
+    EXPECT_EQ(error->subject(), file().native());
+    EXPECT_EQ(makeSettings()->valueForKey("key"), std::nullopt);
+    EXPECT_TRUE(platform.log.contains(error->reason()));
+    EXPECT_EQ(contentOf(file()), before);
+    EXPECT_EQ(std::distance(fs::directory_iterator(folder()), {}), 1);
+  }
+}
+
+TEST_F(StateDatabaseTest, KeepsTheOldValueWhenAWriteFails) {
+  const auto settings = makeSettings();
+  ASSERT_EQ(settings->setValue_forKey("old", "key"), nullptr);
+  rlimit before{};
+  ::getrlimit(RLIMIT_FSIZE, &before);
+  const auto handler = std::signal(SIGXFSZ, SIG_IGN);
+  rlimit small{64 * 1024, before.rlim_max};
+  ::setrlimit(RLIMIT_FSIZE, &small);
+  const ErrorRef full = settings->setValue_forKey(Bytes(1 << 20), "key");
+  ::setrlimit(RLIMIT_FSIZE, &before);
+  std::signal(SIGXFSZ, handler);
+  ASSERT_NE(full, nullptr);
+  EXPECT_THAT(full->reason(), HasSubstr("Cannot write " + file().native()));
+  EXPECT_EQ(settings->valueForKey("key"), Value("old"));
+  EXPECT_EQ(settings->setValue_forKey("new", "key"), nullptr);
+}
+
+TEST_F(StateDatabaseTest, ReadsAFolderThatLetsNothingBeWritten) {
+  ASSERT_EQ(makeSettings()->setValue_forKey("old", "key"), nullptr);
+  // Rights do not bind the superuser: another user tries then.
+  const uid_t user = ::geteuid() == 0 ? 65534 : ::geteuid();
+  for (const fs::path& path : {folder().parent_path(), folder(), file()})
+    ASSERT_EQ(::chown(path.c_str(), user, ::getegid()), 0);
+  fs::permissions(folder(), fs::perms::owner_read | fs::perms::owner_exec);
+  ASSERT_EQ(::setreuid(static_cast<uid_t>(-1), user), 0);
+  const auto settings = makeSettings();
+  const auto value = settings->valueForKey("key");
+  const ErrorRef error = settings->setValue_forKey("new", "key");
+  const auto later = settings->valueForKey("key");
+  ASSERT_EQ(::setreuid(static_cast<uid_t>(-1), ::getuid()), 0);
+  fs::permissions(folder(), fs::perms::owner_all);
+  EXPECT_EQ(value, Value("old"));
+  ASSERT_NE(error, nullptr);
+  EXPECT_THAT(error->reason(), HasSubstr("Check that you may read and write"));
+  EXPECT_EQ(later, Value("old"));
+}
+
+TEST_F(StateDatabaseTest, RefusesValuesThatAreTooLarge) {
+  const auto settings = makeSettings();
+  EXPECT_NE(settings->setValue_forKey(Bytes(kMaximumStateValueBytes + 1u), "key"), nullptr);
+  ASSERT_EQ(settings->setValue_forKey(true, "key"), nullptr);
+  connect().execute("UPDATE settings SET value = zeroblob(106000000)");
+  EXPECT_EQ(settings->valueForKey("key"), std::nullopt);
+  EXPECT_TRUE(platform.log.contains("100 MiB"));
+  EXPECT_FALSE(platform.log.lines().back().redacted.find("key") != std::string::npos);
+}
+
+TEST_F(StateDatabaseTest, KeepsTheNewestAnalyticsUnlessTurnedOff) {
+  const auto database = makeDatabase();
+  SQLiteAnalyticsPipeline analytics(database);
+  analytics.captureUserAction(9001, 706, std::nullopt);
+  for (int i = 1; i < SQLiteAnalyticsPipeline::kMaximumEntries; ++i) analytics.captureUserAction(i, 706, "v");
+  TransitWidgetAnalyticsRecord record{true, true, 3, {{"18446744073709551615", "Title \xff"}}, 2};
+  const Date start = *dateFromISOText("2026-01-05T11:59:30.5Z");
+  analytics.captureWidgetInteraction(2, 1, record, true, start, 29.5);
+  const auto settings = SQLiteSharedSettings(database).groupStore();
+  settings->setValue_forKey(true, kAnalyticsDisabledKey);
+  analytics.captureUserAction(10, 706, std::nullopt);
+  connect().execute("INSERT INTO analytics(content) VALUES ('{\"date\": \"tomorrow\"}'), ('[]'), ('')");
+
+  const auto listed = analytics.list();
+  ASSERT_TRUE(listed);
+  const std::vector<AnalyticsEntry>& entries = *listed;
+  ASSERT_EQ(entries.size(), 1000u);
+  EXPECT_EQ(std::get<AnalyticsUserAction>(entries.front().content).action, 1);
+  EXPECT_EQ(std::get<AnalyticsUserAction>(entries.front().content).value, "v");
+  EXPECT_EQ(entries.back().date, platform.time.now());
+  EXPECT_EQ(jsonOfAnalyticsEntry(entries.back()),
+            R"({"date":"2026-01-05T12:00:00Z","widgetType":2,"endState":1,"wasLocked":true,)"
+            R"("startDate":"2026-01-05T11:59:30.500000Z","duration":29.5,"initiallyExpanded":true,)"
+            R"("everExpanded":true,"transitMessageType":3,"tappedItemIndex":2,"incidentItems":[{"transitLineMuid":)"
+            "\"18446744073709551615\",\"transitIncidentTitle\":\"Title \uFFFD\"}]}");
+  EXPECT_EQ(analytics.clear(), nullptr);
+  EXPECT_TRUE(analytics.list()->empty());
+}
+
+}  // namespace nimbo

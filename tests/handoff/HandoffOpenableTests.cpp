@@ -1,0 +1,115 @@
+#include <gtest/gtest.h>
+
+#include "handoff/ApplicationRecord+NimboExtras.h"
+#include "handoff/NBOpenable.h"
+#include "handoff/NBUserActivityData.h"
+#include "platform/UserSession.h"
+#include "platform/ui/ViewController.h"
+#include "support/TestPlatform.h"
+#include "support/WidgetHostDouble.h"
+
+namespace nimbo {
+namespace {
+
+class Controller final : public ViewController {
+ public:
+  using ViewController::ViewController;
+  std::string_view className() const override { return "Controller"; }
+};
+
+class Openable : public testing::Test {
+ protected:
+  struct Answer {
+    bool opened;
+    ErrorRef error;
+  };
+
+  NBOpenable::Completion record() {
+    return [this](bool opened, const ErrorRef& error) { answers.push_back({opened, error}); };
+  }
+
+  static NBUserActivityDataRef data(std::optional<std::string> type, BoxedDictionary::Entries entries = {}) {
+    return NBUserActivityData::initWithActivityType_userInfo(
+        std::move(type), std::make_shared<const BoxedDictionary>(std::move(entries)));
+  }
+
+  TestPlatform platform;
+  std::vector<Answer> answers;
+};
+
+TEST_F(Openable, ActivityDataIsTaggedWhenMadeAndComparedByWhatItStores) {
+  const auto a = data("type", {{"key", box(1)}});
+  EXPECT_NE(a->userInfo()->objectForKey(kUserSessionTag), nullptr);
+  const struct {
+    ObjectRef other;
+    bool equal;
+  } cases[] = {{data("type", {{"key", box(1)}}), true},
+               {data("type", {{"key", box(2)}}), false},
+               {data("other", {{"key", box(1)}}), false},
+               {data(std::nullopt, {{"key", box(1)}}), false}};
+  for (const auto& test : cases) {
+    EXPECT_EQ(a->isEqual(test.other.get()), test.equal);
+    EXPECT_TRUE(!test.equal || a->hash() == test.other->hash());
+  }
+}
+
+TEST_F(Openable, AnActivityGoesToTheApplicationThatContainsTheProgram) {
+  const auto application = std::make_shared<const ApplicationRecord>("map");
+  const auto other = std::make_shared<const BundleRecord>("other");
+  const struct {
+    BundleRecordRef process;
+    ApplicationRecordRef expected;
+  } cases[] = {{application, application},
+               {std::make_shared<const ExtensionRecord>("widget", application), application},
+               {std::make_shared<const ExtensionRecord>("widget", other), nullptr},
+               {other, nullptr}};
+  const auto activity = data("type", {{"key", box(1)}});
+  for (const auto& test : cases) {
+    platform.activityLauncher.bundleRecord = test.process;
+    activity->openInContext_completionHandler(nullptr, record());
+    platform.loop.runUntilIdle();
+    const auto& opened = platform.activityLauncher.opened.back();
+    EXPECT_EQ(opened.application, test.expected);
+    EXPECT_EQ(opened.activity->activityType(), "type");
+    EXPECT_EQ(opened.activity->userInfo(), activity->userInfo());
+    EXPECT_TRUE(opened.requireUnlockPrompt);
+  }
+  EXPECT_EQ(answers.size(), std::size(cases));
+}
+
+TEST_F(Openable, AnActivityThatCannotBeOpenedSaysWhy) {
+  const auto activity = data("type");
+  activity->openInContext_completionHandler(nullptr, record());  // no bundle record
+  platform.activityLauncher.refusesToCreate = true;
+  activity->openInContext_completionHandler(nullptr, record());
+  ASSERT_EQ(answers.size(), 2u);
+  EXPECT_FALSE(answers[0].opened);
+  EXPECT_EQ(answers[0].error->domain(), "NimboActivityErrorDomain");
+  EXPECT_FALSE(answers[1].opened);
+  EXPECT_EQ(answers[1].error->domain(), "NBUserActivityErrorDomain");
+  EXPECT_TRUE(platform.activityLauncher.opened.empty());
+}
+
+TEST_F(Openable, AURLOpensThroughTheHostOfAViewController) {
+  WidgetHostDouble host;
+  const auto controller = std::make_shared<Controller>("", "", &host);
+  const NBURLOpenable openable(URL("nimbo://?t=r"));
+  const auto noController = std::make_shared<BoxedString>("context");
+  openable.openInContext_completionHandler(noController.get(), record());
+  openable.openInContext_completionHandler(nullptr, record());
+  EXPECT_TRUE(host.openedURLs.empty());
+
+  openable.openInContext_completionHandler(controller.get(), record());
+  host.opens = false;
+  openable.openInContext_completionHandler(controller.get(), record());
+  ASSERT_EQ(host.openedURLs.size(), 2u);
+  EXPECT_EQ(host.openedURLs[0].absoluteString().rfind("nimbo://?t=r&session=", 0), 0u);
+  ASSERT_EQ(answers.size(), 2u);
+  EXPECT_TRUE(answers[0].opened);
+  EXPECT_FALSE(answers[1].opened);
+  EXPECT_TRUE(openable.isEqual(std::make_shared<NBURLOpenable>(URL("nimbo://?t=r")).get()));
+  EXPECT_FALSE(openable.isEqual(std::make_shared<NBURLOpenable>(URL("nimbo://")).get()));
+}
+
+}  // namespace
+}  // namespace nimbo

@@ -1,0 +1,136 @@
+#include <gmock/gmock.h>
+
+#include "handoff/NBOpenable.h"
+#include "items/NBTransitIncidentDataSourceErrorBuilder.h"
+#include "items/NBTransitIncidentFilter.h"
+#include "items/NBTransitItemDataSourceBuilder.h"
+#include "items/NBTransitListItem.h"
+#include "items/NBTransitSummaryItem.h"
+#include "platform/artwork/ArtworkCache.h"
+#include "platform/artwork/ArtworkImageSource.h"
+#include "support/TestPlatform.h"
+#include "support/TransitFixtures.h"
+
+namespace nimbo {
+namespace {
+
+/// Checks that makers give objects equal to their own second making, with equal hashes, and to no other's.
+template <class Maker>
+void expectEachEqualOnlyToItself(const std::vector<Maker>& makers) {
+  for (std::size_t i = 0; i < makers.size(); ++i) {
+    for (std::size_t j = 0; j < makers.size(); ++j) {
+      const ObjectRef a = makers[i](), b = makers[j]();
+      EXPECT_EQ(a->isEqual(b.get()), i == j) << i << " " << j;
+      EXPECT_TRUE(i != j || a->hash() == b->hash()) << i;
+    }
+  }
+}
+
+using Maker = std::function<ObjectRef()>;
+
+NBConfiguredArtworkRef artworkNamed(const char* name, double alpha = kFullArtworkAlpha) {
+  return NBConfiguredArtwork::initWithArtworkSource_alpha(NamedImage::imageNamed(name), alpha);
+}
+
+NBTransitItemRef item(std::optional<std::string> primary, std::optional<std::string> secondary = {},
+                      NBConfiguredArtworkRef artwork = nullptr, bool hidden = false, const char* url = nullptr) {
+  return NBTransitItem::initWithPrimaryText_secondaryText_artwork_artworkHidden_openable(
+      std::move(primary), std::move(secondary), std::move(artwork), hidden,
+      url ? std::make_shared<const NBURLOpenable>(URL(url)) : nullptr);
+}
+
+TEST(ConfiguredArtwork, IsEqualByAlphaAndByWhatTheSourceArchivesTo) {
+  const TestPlatform platform;
+  const auto sized = [](const char* text, int size) {
+    return NBConfiguredArtwork::initWithArtworkSource_alpha(
+        SizedTransitArtwork::initWithArtwork_shieldSize_artworkCache(shieldArtwork(text), size, nullptr), 1.0);
+  };
+  expectEachEqualOnlyToItself<Maker>({[] { return artworkNamed("good"); }, [] { return artworkNamed("bad"); },
+                                      [] { return artworkNamed("good", kDimmedArtworkAlpha); },
+                                      [] { return NBConfiguredArtwork::initWithArtworkSource_alpha(nullptr, 1.0); },
+                                      [&] { return sized("A", 7); }, [&] { return sized("A", 6); },
+                                      [&] { return sized("B", 7); }});
+}
+
+TEST(TransitItem, IsEqualFieldByField) {
+  const TestPlatform platform;
+  expectEachEqualOnlyToItself<Maker>({[] { return item("a"); }, [] { return item(std::nullopt); },
+                                      [] { return item(""); }, [] { return item("a", "b"); },
+                                      [] { return item("a", std::nullopt, artworkNamed("good")); },
+                                      [] { return item("a", std::nullopt, nullptr, true); },
+                                      [] { return item("a", std::nullopt, nullptr, false, "nimbo://1"); },
+                                      [] { return item("a", std::nullopt, nullptr, false, "nimbo://2"); }});
+}
+
+TEST(SummaryItem, IsEqualByTextShieldsInOrderAndActivity) {
+  const TestPlatform platform;
+  const auto summary = [](const char* text, const std::vector<TransitArtworkRef>& shields, const char* activity) {
+    return NBTransitSummaryItem::initWithText_artworks_userActivityData(
+        text, shields, activity ? NBUserActivityData::initWithActivityType_userInfo(activity, nullptr) : nullptr);
+  };
+  const auto accessible = [](const char* text) {
+    auto fields = shieldArtwork("A")->fields();
+    fields.accessibilityText = text;
+    return std::make_shared<const TransitArtwork>(std::move(fields));
+  };
+  expectEachEqualOnlyToItself<Maker>({[&] {
+                                        return summary("2", {shieldArtwork("A"), shieldArtwork("B")}, nullptr);
+                                      },
+                                      [&] {
+                                        return summary("2", {shieldArtwork("B"), shieldArtwork("A")}, nullptr);
+                                      },
+                                      [&] { return summary("2", {shieldArtwork("A")}, nullptr); },
+                                      [&] { return summary("2", {accessible("Line A")}, nullptr); },
+                                      [&] { return summary("3", {shieldArtwork("A")}, nullptr); },
+                                      [&] { return summary("3", {shieldArtwork("A")}, "type"); }});
+}
+
+TEST(ListItem, IsEqualByItsRows) {
+  const auto list = [](ObjectRef summary, std::optional<NBTransitItems> items) {
+    return NBTransitListItem::initWithSummaryItem_expandedItems(std::move(summary), std::move(items));
+  };
+  expectEachEqualOnlyToItself<Maker>({[&] { return list(item("a"), NBTransitItems{}); },
+                                      [&] { return list(item("b"), NBTransitItems{}); },
+                                      [&] { return list(item("a"), std::nullopt); },
+                                      [&] {
+                                        return list(item("a"), NBTransitItems{item("x"), item("y")});
+                                      },
+                                      [&] {
+                                        return list(item("a"), NBTransitItems{item("y"), item("x")});
+                                      }});
+}
+
+TEST(IncidentFilter, ShowsWhatIsInForceNow) {
+  const TestPlatform platform;
+  const auto at = [](int seconds) { return std::optional(dateByAdding(TestPlatform::startDate(), seconds)); };
+  const struct {
+    std::optional<Date> start, end;
+    bool shown;
+  } cases[] = {{{}, {}, true},        {at(-1), {}, true},   {at(0), {}, true},   {at(1), {}, false},
+               {{}, at(1), true},     {{}, at(0), true},    {{}, at(-1), false}, {at(-2), at(-1), false},
+               {at(-1), at(1), true}, {at(1), at(2), false}};
+  for (const auto& [start, end, shown] : cases)
+    EXPECT_EQ(NBTransitIncidentFilter().shouldDisplayIncident(*incident(1, start, end)), shown)
+        << (start ? isoTextOfDate(*start) : "ever") << " to " << (end ? isoTextOfDate(*end) : "ever");
+}
+
+TEST(ErrorBuilder, NamesTheNetworkConditionWhateverTheErrorSays) {
+  TestPlatform platform;
+  const std::pair<int, std::optional<std::string>> cases[] = {
+      {0, "TransitWidgetLoadingError_Unknown"},          {1, "TransitWidgetLoadingError_AirplaneMode"},
+      {2, "TransitWidgetLoadingError_CellDataDisabled"}, {3, "TransitWidgetLoadingError_No_Internet"},
+      {4, "TransitWidgetLoadingError_Unknown"},          {5, std::nullopt}};
+  for (const auto& [code, text] : cases) {
+    platform.network.failure = static_cast<NetworkFailure>(code);
+    const auto builder = NBTransitDataSourceBuilderForResult(
+        Result::resultWithError(Error::errorWithDomain_code_reason("d", 1, "r")), 4, nullptr, nullptr);
+    const NBTransitListItemRef list = builder->listItem();
+    EXPECT_TRUE(list->summaryItem()->isEqual(item("TransitWidgetLoadingError_Title", text, nullptr, true).get()))
+        << list->summaryItem()->description();
+    EXPECT_TRUE(list->expandedItems() && list->expandedItems()->empty());
+    EXPECT_EQ(builder->listItem(), list);
+  }
+}
+
+}  // namespace
+}  // namespace nimbo

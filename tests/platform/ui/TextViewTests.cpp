@@ -1,0 +1,95 @@
+#include <gmock/gmock.h>
+
+#include "platform/ui/Color.h"
+#include "platform/ui/TransitInfoLabelView.h"
+#include "platform/ui/VisualEffectView.h"
+#include "support/RecordingPainter.h"
+#include "support/TestPlatform.h"
+#include "support/TransitFixtures.h"
+
+namespace nimbo {
+namespace {
+
+using testing::SizeIs;
+
+TEST(SystemColors, TextsAreReadableInBothAppearances) {
+  for (const Appearance appearance : {Appearance::light, Appearance::dark})
+    for (const SystemColor behind : {SystemColor::background, SystemColor::rowHighlight})
+      for (const Color& text : {colorOf(SystemColor::label, appearance), colorOf(SystemColor::systemGrey, appearance),
+                                VisualEffect(101).color(appearance), VisualEffect(102).color(appearance)})
+        EXPECT_GE(contrastRatio(text, colorOf(behind, appearance)), 4.5);
+}
+
+class TransitInfoLabel : public testing::Test {
+ protected:
+  TransitInfoLabel() {
+    // Shields of 28 points in a row, 5 apart: n of them end at 33 n - 5. The text takes 8.5 points a character.
+    for (int i = 0; i < 10; ++i) shields.push_back(shieldArtwork("L" + std::to_string(i)));
+    label->setUsesAutomaticConstraints(false);
+    label->setSpaceBetweenShields(5);
+    label->setArtworkCache(cache);
+    root->addSubview(label);
+    LayoutConstraint::activateConstraints({label->leadingAnchor().constraintEqualToAnchor(root->leadingAnchor()),
+                                           label->topAnchor().constraintEqualToAnchor(root->topAnchor())});
+  }
+  void setMaxWidth(double width) {
+    label->setMaxWidth_truncationTextGenerator(width, [](std::uint64_t count) { return "+" + std::to_string(count); });
+  }
+
+  TestPlatform platform;
+  std::shared_ptr<ArtworkCache> cache =
+      ArtworkCache::initWithArtworkManager(TransitArtworkManager::initWithIconManager(platform.shieldRenderer));
+  std::vector<TransitArtworkRef> shields;
+  std::shared_ptr<View> root = std::make_shared<View>();
+  std::shared_ptr<TransitInfoLabelView> label = std::make_shared<TransitInfoLabelView>();
+};
+
+TEST_F(TransitInfoLabel, KeepsAsManyShieldsAsFitWithTheirCount) {
+  struct Case {
+    std::size_t count;
+    double width;
+    std::size_t shown;
+    const char* text;
+  };
+  for (const Case& c : {Case{3, 94, 3, ""},
+                        {3, 93, 2, "+1"},
+                        {3, 82, 1, "+2"},
+                        {10, 325, 10, ""},
+                        {10, 40, 0, "+10"},
+                        {1, 10, 0, "+1"},
+                        {1, 0, 0, ""},
+                        {0, 50, 0, ""}}) {
+    label->setLabelItems({shields.begin(), shields.begin() + static_cast<std::ptrdiff_t>(c.count)});
+    setMaxWidth(c.width);
+    EXPECT_EQ(label->numberOfShownItems(), c.shown) << c.count << " in " << c.width;
+    EXPECT_EQ(label->truncationText(), c.text) << c.count << " in " << c.width;
+    root->layoutIfNeeded();
+    EXPECT_LE(label->frame().width, c.width);
+  }
+}
+
+TEST_F(TransitInfoLabel, DrawsShieldsOnTheMiddleOfItsCapitals) {
+  shields = {shieldArtwork("A"), std::make_shared<const TransitArtwork>(TransitArtwork::Fields{}),
+             modeArtwork(TransitMode::bus), shieldArtwork("B"), shieldArtwork("C")};
+  label->setIconSize(0);
+  label->setLabelItems(shields);
+  setMaxWidth(105);
+  for (const bool mirrored : {false, true}) {
+    root->setRightToLeft(mirrored);
+    root->setFrame({0, 0, 120, 60});
+    root->layoutIfNeeded();
+    // 28, a symbol of 14, 28, and the count of one in 17; what cannot be drawn takes no room.
+    EXPECT_EQ(label->frame(), (Rect{mirrored ? 18.0 : 0.0, 0, 102, 28}));
+    RecordingPainter painter;
+    root->draw(painter);
+    ASSERT_THAT(painter.pictures, SizeIs(3));
+    EXPECT_EQ(painter.pictures[0].rect, (Rect{mirrored ? 92.0 : 0.0, 0, 28, 28}));
+    EXPECT_EQ(painter.pictures[1].rect, (Rect{mirrored ? 73.0 : 33.0, 7, 14, 14}));
+    ASSERT_THAT(painter.texts, SizeIs(1));
+    EXPECT_NEAR(painter.texts[0].origin.y, 14 + 0.35 * 17 - 0.8 * 17, 1e-9);
+    EXPECT_EQ(painter.texts[0].color, colorOf(SystemColor::systemGrey, Appearance::light));
+  }
+}
+
+}  // namespace
+}  // namespace nimbo

@@ -1,0 +1,253 @@
+#include <gmock/gmock.h>
+
+#include "items/NBTransitSummaryItem.h"
+#include "platform/artwork/ArtworkCache.h"
+#include "support/RecordingPainter.h"
+#include "support/TestPlatform.h"
+#include "support/TransitFixtures.h"
+#include "ui/ArtworkCache+Nimbo.h"
+#include "ui/NBTransitItemFixedHeightCell.h"
+#include "ui/NBTransitSummaryCell.h"
+
+namespace nimbo {
+namespace {
+
+using testing::IsEmpty;
+using testing::SizeIs;
+
+/// The first view inside of a class, in the order of drawing; null when there is none.
+template <class T>
+T* firstInside(View& view) {
+  for (const auto& subview : view.subviews()) {
+    if (auto* found = dynamic_cast<T*>(subview.get())) return found;
+    if (auto* found = firstInside<T>(*subview)) return found;
+  }
+  return nullptr;
+}
+
+/// A view's frame in the coordinates of the cell that it is in.
+Rect frameInCell(const View& view) {
+  Rect frame = view.frame();
+  for (const View* around = view.superview(); around && !dynamic_cast<const StyledTableCell*>(around);
+       around = around->superview()) {
+    frame.x += around->frame().x;
+    frame.y += around->frame().y;
+  }
+  return frame;
+}
+
+// Metrics of the double at the default text size: the title is 17 points, its lines 17 tall and its capitals 12 (11.9,
+// on a pixel); its baseline is 13.6 below its top. The second text is 15 points, its baseline 12 below its top.
+class Cells : public testing::Test {
+ protected:
+  NBTransitItemRef item(std::optional<std::string> title, std::optional<std::string> text, double alpha = 1,
+                        bool artworkHidden = false) {
+    return NBTransitItem::initWithPrimaryText_secondaryText_artwork_artworkHidden_openable(
+        std::move(title), std::move(text), NBConfiguredArtwork::initWithArtworkSource_alpha(shield, alpha),
+        artworkHidden, nullptr);
+  }
+
+  /// As a table does.
+  static void layOut(StyledTableCell& row, double width) {
+    row.setFrame({0, 0, width, row.frame().height > 0 ? row.frame().height : 5});
+    row.setFrame({0, 0, width, row.fittingHeight(5)});
+    row.layoutIfNeeded();
+  }
+  void layOut(double width = 300) { layOut(*cell, width); }
+
+  TestPlatform platform;
+  std::shared_ptr<ArtworkCache> cache = memoryConstrainedImageViewCache();
+  std::shared_ptr<const SizedTransitArtwork> shield =
+      SizedTransitArtwork::initWithArtwork_shieldSize_artworkCache(shieldArtwork("M4"), 7, cache);
+  std::shared_ptr<NBTransitItemFixedHeightCell> cell =
+      NBTransitItemFixedHeightCell::initWithStyle_reuseIdentifier(TableCellStyle::standard, "cell");
+  ArtworkImageView& plainShield = *firstInside<ArtworkImageView>(*cell->contentView());
+  ArtworkImageView& vibrantShield = *firstInside<ArtworkImageView>(*cell->contentView()->subviews().back());
+};
+
+TEST_F(Cells, TextsStandCentredOnCapLineAndLastBaseline) {
+  struct Case {
+    const char* name;
+    std::optional<std::string> text;
+    double width;
+    Rect title, second;
+  };
+  // From the cap line to the last baseline is in the middle of 110 points, to the nearest pixel.
+  for (const Case& c : {Case{"two lines", "Until Friday", 300, {0, 37, 227, 17}, {0, 60, 227, 15}},
+                        {"no second text", std::nullopt, 300, {0, 47, 227, 17}, {}},
+                        {"title of two lines", "Until Friday", 173, {0, 28, 100, 34}, {0, 68, 100, 15}}}) {
+    SCOPED_TRACE(c.name);
+    cell->setTransitItem(item("Tram four late", c.text));
+    cell->setTrailingArtworkColumnWidth(73);
+    layOut(c.width);
+    EXPECT_EQ(cell->frame().height, 110);
+    EXPECT_EQ(frameInCell(*cell->primaryLabel()), c.title);
+    EXPECT_EQ(cell->secondaryLabel()->isHidden(), !c.text);
+    EXPECT_EQ(c.text ? frameInCell(*cell->secondaryLabel()) : Rect{}, c.second);
+    const double capLine = c.title.y + 13.6 - 12;
+    const double lastBaseline = c.text ? c.second.y + 12 : c.title.y + 13.6;
+    EXPECT_NEAR(capLine + lastBaseline, 110, 2);
+  }
+}
+
+TEST_F(Cells, ShieldEndsTheRowAndTextsEndAtItsColumn) {
+  cell->setTransitItem(item("Title", std::nullopt));
+  layOut();
+  EXPECT_EQ(cell->trailingArtworkColumnWidth(), 0);
+  EXPECT_EQ(cell->primaryLabel()->frame().width, 300);
+  cell->setTrailingArtworkColumnWidth(73);
+  layOut();
+  EXPECT_EQ(cell->primaryLabel()->frame().width, 227);
+  EXPECT_EQ(frameInCell(plainShield), (Rect{272, 41, 28, 28}));
+  cell->setTransitItem(item("Title", std::nullopt, 1, true));
+  layOut();
+  EXPECT_TRUE(plainShield.isHidden());
+  EXPECT_EQ(cell->primaryLabel()->frame().width, 300);
+  cell->setTransitItem(item("Title", "Text"));
+  layOut();
+  EXPECT_EQ(cell->primaryLabel()->frame().width, 227);
+  EXPECT_FALSE(cell->secondaryLabel()->isHidden());
+  // In 40 points the shield keeps 8 from above and below.
+  cell->setRowHeight(40);
+  layOut();
+  EXPECT_EQ(cell->frame().height, 40);
+  EXPECT_EQ(frameInCell(plainShield), (Rect{272, 8, 28, 24}));
+
+  platform.strings.rightToLeft = true;
+  cell->setRowHeight(110);
+  layOut();
+  EXPECT_EQ(frameInCell(plainShield).x, 0);
+  EXPECT_EQ(frameInCell(*cell->primaryLabel()).x, 73);
+}
+
+TEST_F(Cells, FadedShieldsAreVibrantAndFullOnesAreNot) {
+  const auto expectShown = [&](ArtworkImageView& shown, ArtworkImageView& cleared, double alpha) {
+    EXPECT_EQ(shown.imageSource(), shield);
+    EXPECT_EQ(shown.alpha(), alpha);
+    EXPECT_FALSE(shown.isHidden());
+    EXPECT_EQ(cleared.imageSource(), nullptr);
+    EXPECT_EQ(cleared.alpha(), 1);
+    EXPECT_TRUE(cleared.isHidden());
+  };
+  for (const double alpha : {kDimmedArtworkAlpha, kFullArtworkAlpha, 0.0}) {
+    cell->setTransitItem(item("Title", std::nullopt, alpha));
+    if (alpha < 1)
+      expectShown(vibrantShield, plainShield, alpha);
+    else
+      expectShown(plainShield, vibrantShield, alpha);
+    layOut();
+    RecordingPainter painter;
+    cell->draw(painter);
+    ASSERT_THAT(painter.pictures, SizeIs(1));
+    EXPECT_EQ(painter.pictures[0].alpha, alpha);
+    EXPECT_EQ(painter.pictures[0].tint.alpha, alpha < 1 ? 1 : 0);
+    ASSERT_THAT(painter.texts, SizeIs(1));
+    EXPECT_EQ(painter.texts[0].color, VisualEffect(101).color(Appearance::light));
+  }
+}
+
+TEST_F(Cells, StayInOrderWhateverTheyAreGiven) {
+  std::string words;
+  for (int i = 0; i < 2000; ++i) words += "word ";
+  for (const std::string& text : {std::string(), std::string(10'000, 'x'), words}) {
+    for (const double width : {0.0, 1.0, 50.0, 10'000.0}) {
+      for (const double height : {0.0, 1.0, 20.0, 110.0, 10'000.0}) {
+        SCOPED_TRACE(std::to_string(text.size()) + " in " + std::to_string(width) + "x" + std::to_string(height));
+        cell->setTransitItem(item(text, text));
+        cell->setTrailingArtworkColumnWidth(73);
+        cell->setRowHeight(height);
+        layOut(width);
+        EXPECT_EQ(cell->frame().height, height);
+        const Rect title = frameInCell(*cell->primaryLabel()), second = frameInCell(*cell->secondaryLabel());
+        EXPECT_LE(title.y, second.y);
+        if (height >= 110) {
+          EXPECT_GE(title.y, 0);
+          EXPECT_GE(title.height, text.empty() ? 0 : 17);
+          EXPECT_GE(second.height, text.empty() ? 0 : 15);
+          EXPECT_LE(second.maxY(), height + 3);  // what is below the last baseline may stand out
+        }
+      }
+    }
+  }
+}
+
+TEST_F(Cells, AMissingImageLeavesItsPlaceEmpty) {
+  shield = SizedTransitArtwork::initWithArtwork_shieldSize_artworkCache(
+      std::make_shared<const TransitArtwork>(TransitArtwork::Fields{}), 7, cache);
+  cell->setTransitItem(item("Title", "Text"));
+  cell->setTrailingArtworkColumnWidth(73);
+  layOut();
+  EXPECT_EQ(frameInCell(*cell->primaryLabel()).width, 227);
+  RecordingPainter painter;
+  cell->draw(painter);
+  EXPECT_THAT(painter.pictures, IsEmpty());
+  EXPECT_TRUE(platform.log.texts("Layout").empty());
+}
+
+class SummaryCell : public Cells {
+ protected:
+  NBTransitSummaryItemRef summary(int shields) {
+    TransitArtworks artworks;
+    for (int i = 0; i < shields; ++i) artworks.push_back(shieldArtwork("L" + std::to_string(i % 10)));
+    return NBTransitSummaryItem::initWithText_artworks_userActivityData("4 advisories", artworks, nullptr);
+  }
+  SummaryCell() {
+    platform.strings.texts["Transit_Incident_Not_Displayed_Incidents"] = "+";
+    summaryCell->setArtworkCache(cache);
+  }
+  std::shared_ptr<NBTransitSummaryCell> summaryCell =
+      NBTransitSummaryCell::initWithStyle_reuseIdentifier(TableCellStyle::standard, "summary");
+};
+
+TEST_F(SummaryCell, CountsTheShieldsThatDoNotFit) {
+  TransitInfoLabelView& shields = *summaryCell->artworksLabel();
+  struct Case {
+    int count;
+    double width;
+    std::size_t shown;
+    const char* text;
+  };
+  for (const Case& c : {Case{3, 200, 3, ""}, {30, 359, 9, "+(21)"}, {7, 200, 5, "+(2)"}, {30, 10, 0, "+(30)"}}) {
+    SCOPED_TRACE(std::to_string(c.count) + " in " + std::to_string(c.width));
+    summaryCell->setItem(summary(c.count));
+    layOut(*summaryCell, c.width);
+    EXPECT_EQ(summaryCell->frame().height, 110);
+    EXPECT_EQ(shields.numberOfShownItems(), c.shown);
+    EXPECT_EQ(shields.truncationText(), c.text);
+    // The cap line of the text and the bottom of the shields are as far from the edges, to a pixel.
+    const Rect title = frameInCell(*summaryCell->primaryLabel()), row = frameInCell(shields);
+    EXPECT_EQ(title, (Rect{0, 26, c.width, 17}));
+    EXPECT_EQ(row, (Rect{0, 55, c.width, 28}));
+  }
+}
+
+TEST_F(SummaryCell, HidesShieldsThatAreNotThere) {
+  summaryCell->setItem(summary(0));
+  layOut(*summaryCell, 300);
+  EXPECT_TRUE(summaryCell->artworksLabel()->isHidden());
+  EXPECT_EQ(frameInCell(*summaryCell->primaryLabel()), (Rect{0, 46, 300, 17}));
+  summaryCell->setItem(summary(2));
+  layOut(*summaryCell, 300);
+  EXPECT_FALSE(summaryCell->artworksLabel()->isHidden());
+  summaryCell->setItem(nullptr);
+  EXPECT_TRUE(summaryCell->artworksLabel()->isHidden());
+}
+
+TEST_F(SummaryCell, FollowsTheTextSize) {
+  summaryCell->setItem(summary(3));
+  cell->setTransitItem(item("Title", "Text"));
+  layOut(*summaryCell, 300);
+  layOut();
+  Environment::current().setContentSizeCategory(ContentSizeCategory::accessibilityMedium);
+  layOut(*summaryCell, 300);
+  layOut();
+  EXPECT_EQ(summaryCell->primaryLabel()->frame().height, 28);
+  EXPECT_EQ(summaryCell->artworksLabel()->font()->descriptor().pointSize, 17);  // keeps the size it was made with
+  // 21 points between baselines at the default size are 35 now.
+  const Rect title = frameInCell(*cell->primaryLabel()), second = frameInCell(*cell->secondaryLabel());
+  EXPECT_NEAR((second.y + 0.8 * 25) - (title.y + 0.8 * 28), 35, 1);
+  EXPECT_NEAR(title.y + 0.8 * 28 - 20 + second.y + 20, 110, 2);
+}
+
+}  // namespace
+}  // namespace nimbo
