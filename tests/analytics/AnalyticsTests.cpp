@@ -53,6 +53,11 @@ TEST_F(Analytics, RecordsTheModesOfASessionAndItsLength) {
   EXPECT_TRUE(closed().record.everExpanded);
   EXPECT_EQ(closed().record.tappedItemIndex, std::nullopt);
 
+  session->startSessionIfNeeded();
+  session->recordWidgetChangeDisplayMode(WidgetDisplayMode::Compact);
+  session->recordCloseSessionSwiping();
+  EXPECT_FALSE(closed().record.everExpanded);
+
   host.activeMode = WidgetDisplayMode::Expanded;
   session->startSessionIfNeeded();
   session->recordCloseSessionSwiping();

@@ -6,6 +6,7 @@
 #include "platform/UserSession.h"
 #include "platform/ui/ViewController.h"
 #include "support/TestPlatform.h"
+#include "support/TransitFixtures.h"
 #include "support/WidgetHostDouble.h"
 
 namespace nimbo {
@@ -38,8 +39,11 @@ class Openable : public testing::Test {
 };
 
 TEST_F(Openable, ActivityDataIsTaggedWhenMadeAndComparedByWhatItStores) {
+  platform.random.numbers = {1, 2, 3, 4, 5, 6, 7, 8};
   const auto a = data("type", {{"key", box(1)}});
-  EXPECT_NE(a->userInfo()->objectForKey(kUserSessionTag), nullptr);
+  const std::string session = "00000001000000020000000300000004";
+  EXPECT_TRUE(a->userInfo()->objectForKey(kUserSessionTag)->isEqual(box(session).get()));
+  EXPECT_EQ(platform.settings.groupStore()->stringForKey(kUserSessionIdentifierKey), session);
   const struct {
     ObjectRef other;
     bool equal;
@@ -51,6 +55,24 @@ TEST_F(Openable, ActivityDataIsTaggedWhenMadeAndComparedByWhatItStores) {
     EXPECT_EQ(a->isEqual(test.other.get()), test.equal);
     EXPECT_TRUE(!test.equal || a->hash() == test.other->hash());
   }
+}
+
+TEST_F(Openable, PayloadsAreMadeAgainForEveryOtherListAndKeptForTheSame) {
+  auto a = incident(1);
+  const auto b = incident(2);
+  const auto payloadOf = [](const TransitIncidents& incidents) {
+    return activityDataForIncidents(incidents)->userInfo()->objectForKey("incidentListKey");
+  };
+  const std::weak_ptr<const Object> payload = payloadOf({a});
+  EXPECT_EQ(payloadOf({a}), payload.lock());
+  for (const TransitIncidents& other : {TransitIncidents{a, b}, {b, a}, {b}, {}})
+    EXPECT_FALSE(payloadOf(other)->isEqual(payload.lock().get()));
+  a.reset();
+  payloadOf({b, b});
+  EXPECT_TRUE(payload.expired()) << "that of an incident that is gone";
+  platform.archive.fails = platform.compressor.fails = true;
+  EXPECT_EQ(activityDataForIncidents({b, b, b}), nullptr);
+  EXPECT_EQ(activityDataForLineItem(lineItem(1, "A")), nullptr);
 }
 
 TEST_F(Openable, AnActivityGoesToTheApplicationThatContainsTheProgram) {
@@ -85,12 +107,19 @@ TEST_F(Openable, AnActivityThatCannotBeOpenedSaysWhy) {
   ASSERT_EQ(answers.size(), 2u);
   EXPECT_FALSE(answers[0].opened);
   EXPECT_EQ(answers[0].error->domain(), "NimboActivityErrorDomain");
+  EXPECT_TRUE(answers[0]
+                  .error->userInfo()
+                  ->objectForKey(kErrorDebugDescriptionKey)
+                  ->isEqual(box("no appliction proxy object for current process").get()));
   EXPECT_FALSE(answers[1].opened);
   EXPECT_EQ(answers[1].error->domain(), "NBUserActivityErrorDomain");
+  EXPECT_EQ(answers[1].error->userInfo()->objectForKey("NBUserActivityErrorMissingActivityKey"), activity);
+  activity->openInContext_completionHandler(nullptr, nullptr);
   EXPECT_TRUE(platform.activityLauncher.opened.empty());
 }
 
 TEST_F(Openable, AURLOpensThroughTheHostOfAViewController) {
+  platform.random.numbers = {1, 2, 3, 4, 5, 6, 7, 8};
   WidgetHostDouble host;
   const auto controller = std::make_shared<Controller>("", "", &host);
   const NBURLOpenable openable(URL("nimbo://?t=r"));
@@ -103,7 +132,9 @@ TEST_F(Openable, AURLOpensThroughTheHostOfAViewController) {
   host.opens = false;
   openable.openInContext_completionHandler(controller.get(), record());
   ASSERT_EQ(host.openedURLs.size(), 2u);
-  EXPECT_EQ(host.openedURLs[0].absoluteString().rfind("nimbo://?t=r&session=", 0), 0u);
+  const auto session = platform.settings.groupStore()->stringForKey(kUserSessionIdentifierKey);
+  for (const URL& url : host.openedURLs)
+    EXPECT_EQ(url.absoluteString(), "nimbo://?t=r&session=" + session.value_or("?"));
   ASSERT_EQ(answers.size(), 2u);
   EXPECT_TRUE(answers[0].opened);
   EXPECT_FALSE(answers[1].opened);

@@ -52,6 +52,19 @@ TEST(ConfiguredArtwork, IsEqualByAlphaAndByWhatTheSourceArchivesTo) {
                                       [&] { return sized("B", 7); }});
 }
 
+TEST(TransitItem, CopiesItselfAndIsNoEqualOfADerivedItem) {
+  const TestPlatform platform;
+  const auto original = item("a", "b", artworkNamed("good", kDimmedArtworkAlpha), true, "nimbo://1");
+  const auto copy = original->copyWithZone();
+  EXPECT_TRUE(copy != original && copy->isEqual(original.get()) && copy->hash() == original->hash());
+  struct Derived final : NBTransitItem {
+    using NBTransitItem::NBTransitItem;
+  };
+  const Derived derived("a", "b", original->artwork(), true, original->openable());
+  EXPECT_FALSE(original->isEqual(&derived));
+  EXPECT_EQ(original->hash() ^ Derived("a", "b", original->artwork(), false, original->openable()).hash(), 2654435761u);
+}
+
 TEST(TransitItem, IsEqualFieldByField) {
   const TestPlatform platform;
   expectEachEqualOnlyToItself<Maker>({[] { return item("a"); }, [] { return item(std::nullopt); },

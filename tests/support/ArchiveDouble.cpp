@@ -45,10 +45,11 @@ class TextEncoder final : public KeyedEncoder {
 
 }  // namespace
 
-Outcome<Bytes> ArchiveDouble::archivedDataWithRootObject(const ObjectRef& root, bool) {
+Outcome<Bytes> ArchiveDouble::archivedDataWithRootObject(const ObjectRef& root, bool requiringSecureCoding) {
   TextEncoder encoder;
   encoder.encodeObject_forKey(root, kKeyedArchiveRootObjectKey);
-  if (fails) return Error::errorWithDomain_code_reason(std::string(kKeyedArchiveErrorDomain), 1, "cannot be archived");
+  if (fails || !requiringSecureCoding)
+    return Error::errorWithDomain_code_reason(std::string(kKeyedArchiveErrorDomain), 1, "cannot be archived");
   return Bytes(encoder.text.begin(), encoder.text.end());
 }
 

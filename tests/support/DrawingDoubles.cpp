@@ -8,26 +8,6 @@ namespace nimbo {
 
 namespace {
 
-class TextLayoutDouble final : public TextLayout {
- public:
-  TextLayoutDouble(double pointSize, std::size_t lines, std::size_t longest, bool truncated)
-      : _pointSize(pointSize), _lines(lines), _longest(longest), _truncated(truncated) {}
-  Size size() const override {
-    return {_pointSize / 2 * static_cast<double>(_longest), _pointSize * static_cast<double>(_lines)};
-  }
-  std::size_t lineCount() const override { return _lines; }
-  double firstBaseline() const override { return 0.8 * _pointSize; }
-  double lastBaseline() const override { return _pointSize * (static_cast<double>(_lines) - 0.2); }
-  bool isTruncated() const override { return _truncated; }
-  std::string_view className() const override { return "TextLayoutDouble"; }
-
- private:
-  double _pointSize;
-  std::size_t _lines;
-  std::size_t _longest;
-  bool _truncated;
-};
-
 /// Lengths of the words in characters; every byte that continues a UTF-8 character counts for nothing.
 std::vector<std::size_t> wordLengths(const std::string& text) {
   std::vector<std::size_t> lengths{0};
@@ -45,7 +25,7 @@ std::vector<std::size_t> wordLengths(const std::string& text) {
 ImageRef ShieldRendererDouble::render(const TransitArtwork& artwork, std::int64_t shieldSize, double screenScale,
                                       bool) {
   ++rendered;
-  const std::int64_t size = std::clamp<std::int64_t>(shieldSize, 0, 7);
+  const std::int64_t size = std::max<std::int64_t>(shieldSize, 0);
   const double height = 14 + 2 * static_cast<double>(size);
   if (artwork.shieldDataSource()) {
     const std::string text = artwork.shieldDataSource()->shieldText.value_or("");
@@ -84,8 +64,8 @@ TextLayoutRef TextSystemDouble::layOut(const std::string& text, const FontDescri
     lines.resize(maxLines);
     lines.back() = std::min(fits, lines.back() + 1);  // the ellipsis
   }
-  return std::make_shared<const TextLayoutDouble>(font.pointSize, lines.size(),
-                                                  *std::max_element(lines.begin(), lines.end()), truncated);
+  return std::make_shared<const TextLayoutDouble>(text, font, lines.size(), *std::ranges::max_element(lines),
+                                                  truncated);
 }
 
 }  // namespace nimbo

@@ -32,8 +32,8 @@ class ImageResourcesDouble final : public ImageResources {
   std::map<std::string, Size, std::less<>> sizes;
 };
 
-/// Shields of 14 to 28 points' height, each size step 2 points; as wide as `width` says. Icons are as wide as high;
-/// an artwork without either gives nothing.
+/// Shields of 14 points' height at size 0 and 28 at size 7, each step 2 points; as wide as `width` says. Icons are as
+/// wide as high; an artwork without either gives nothing.
 class ShieldRendererDouble final : public ShieldIconRenderer {
  public:
   ImageRef render(const TransitArtwork& artwork, std::int64_t shieldSize, double screenScale, bool) override;
@@ -43,6 +43,29 @@ class ShieldRendererDouble final : public ShieldIconRenderer {
   std::function<double(std::int64_t shieldSize, const std::string& text)> width;
   std::size_t rendered = 0;
   bool cachesIconAtlases = true;
+};
+
+/// A text with what it was laid out for.
+class TextLayoutDouble final : public TextLayout {
+ public:
+  TextLayoutDouble(std::string shown, FontDescriptor inFont, std::size_t lines, std::size_t longest, bool truncated)
+      : text(std::move(shown)), font(inFont), _lines(lines), _longest(longest), _truncated(truncated) {}
+  Size size() const override {
+    return {font.pointSize / 2 * static_cast<double>(_longest), font.pointSize * static_cast<double>(_lines)};
+  }
+  std::size_t lineCount() const override { return _lines; }
+  double firstBaseline() const override { return 0.8 * font.pointSize; }
+  double lastBaseline() const override { return font.pointSize * (static_cast<double>(_lines) - 0.2); }
+  bool isTruncated() const override { return _truncated; }
+  std::string_view className() const override { return "TextLayoutDouble"; }
+
+  const std::string text;
+  const FontDescriptor font;
+
+ private:
+  std::size_t _lines;
+  std::size_t _longest;
+  bool _truncated;
 };
 
 /// Text of exact made-up measures: each character is half the point size wide; ascent 0.8, descent 0.2 and capital

@@ -3,10 +3,11 @@
 #include <vector>
 
 #include "platform/ui/Painter.h"
+#include "support/DrawingDoubles.h"
 
 namespace nimbo {
 
-/// Keeps what was painted, in the coordinates of the whole picture.
+/// Keeps what was painted with the doubles' images and texts, in the coordinates of the whole picture.
 class RecordingPainter final : public Painter {
  public:
   struct Text {
@@ -14,6 +15,8 @@ class RecordingPainter final : public Painter {
     double width;
     Color color;
     std::size_t lines;
+    std::string text;
+    FontDescriptor font;
   };
   struct Picture {
     Rect rect;
@@ -27,12 +30,15 @@ class RecordingPainter final : public Painter {
 
   void fillRect(const Rect& rect, const Color& color) override { fills.push_back({moved(rect), color}); }
   void drawText(const TextLayout& layout, Point origin, double width, const Color& color) override {
-    texts.push_back({{_origin.x + origin.x, _origin.y + origin.y}, width, color, layout.lineCount()});
+    const auto& known = dynamic_cast<const TextLayoutDouble&>(layout);
+    texts.push_back(
+        {{_origin.x + origin.x, _origin.y + origin.y}, width, color, layout.lineCount(), known.text, known.font});
   }
   void drawImage(const Image&, const Rect& rect, double alpha, const Color& tint) override {
     pictures.push_back({moved(rect), alpha, tint});
   }
-  void save(Point offset, const Rect&) override {
+  void save(Point offset, const Rect& clip) override {
+    clips.push_back(clip);
     _saved.push_back(_origin);
     _origin = {_origin.x + offset.x, _origin.y + offset.y};
   }
@@ -44,6 +50,7 @@ class RecordingPainter final : public Painter {
   std::vector<Fill> fills;
   std::vector<Text> texts;
   std::vector<Picture> pictures;
+  std::vector<Rect> clips;  ///< of every `save`
 
  private:
   Rect moved(const Rect& rect) const { return {_origin.x + rect.x, _origin.y + rect.y, rect.width, rect.height}; }

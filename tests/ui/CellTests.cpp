@@ -6,12 +6,14 @@
 #include "support/TestPlatform.h"
 #include "support/TransitFixtures.h"
 #include "ui/ArtworkCache+Nimbo.h"
+#include "ui/DynamicTypeWizard.h"
 #include "ui/NBTransitItemFixedHeightCell.h"
 #include "ui/NBTransitSummaryCell.h"
 
 namespace nimbo {
 namespace {
 
+using testing::Field;
 using testing::IsEmpty;
 using testing::SizeIs;
 
@@ -221,6 +223,30 @@ TEST_F(SummaryCell, CountsTheShieldsThatDoNotFit) {
   }
 }
 
+TEST_F(SummaryCell, TextsHaveTheWeightsAndColoursOfTheirRoles) {
+  for (const Appearance appearance : {Appearance::light, Appearance::dark}) {
+    Environment::current().setAppearance(appearance);
+    cell->setTransitItem(item("Title", "Second"));
+    summaryCell->setItem(summary(30));
+    layOut();
+    layOut(*summaryCell, 200);
+    RecordingPainter painter;
+    cell->draw(painter);
+    summaryCell->draw(painter);
+    const auto isText = [](const char* text, double size, bool bold, Color color) {
+      using Text = RecordingPainter::Text;
+      return testing::AllOf(Field(&Text::text, text), Field(&Text::font, FontDescriptor{size, bold}),
+                            Field(&Text::color, color));
+    };
+    const Color primary = VisualEffect(101).color(appearance), secondary = VisualEffect(102).color(appearance);
+    EXPECT_THAT(painter.texts,
+                testing::ElementsAre(isText("Title", 17, true, primary), isText("Second", 15, false, secondary),
+                                     isText("4 advisories", 17, false, primary),
+                                     isText("+(26)", 17, false, colorOf(SystemColor::systemGrey, appearance))));
+  }
+  EXPECT_THAT(cell->layoutDump(), testing::HasSubstr("primaryLabel.firstBaseline = contentGuide.top + 12 @750"));
+}
+
 TEST_F(SummaryCell, HidesShieldsThatAreNotThere) {
   summaryCell->setItem(summary(0));
   layOut(*summaryCell, 300);
@@ -231,6 +257,7 @@ TEST_F(SummaryCell, HidesShieldsThatAreNotThere) {
   EXPECT_FALSE(summaryCell->artworksLabel()->isHidden());
   summaryCell->setItem(nullptr);
   EXPECT_TRUE(summaryCell->artworksLabel()->isHidden());
+  EXPECT_EQ(summaryCell->primaryLabel()->text(), std::nullopt);
 }
 
 TEST_F(SummaryCell, FollowsTheTextSize) {
@@ -238,6 +265,8 @@ TEST_F(SummaryCell, FollowsTheTextSize) {
   cell->setTransitItem(item("Title", "Text"));
   layOut(*summaryCell, 300);
   layOut();
+  const auto& lastOperations = DynamicTypeWizard::_singletonInstance()->objectToSelectorStringTables().at(1);
+  EXPECT_TRUE(lastOperations.objectForKey(cell.get()) && lastOperations.objectForKey(summaryCell.get()));
   Environment::current().setContentSizeCategory(ContentSizeCategory::accessibilityMedium);
   layOut(*summaryCell, 300);
   layOut();

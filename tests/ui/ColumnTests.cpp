@@ -74,6 +74,15 @@ TEST_F(Column, ShrinksTheWidestUntilItFits) {
       sizes.emplace_back(*given->artwork()->shieldDataSource()->shieldText, smaller->shieldSize());
     EXPECT_THAT(sizes, testing::UnorderedElementsAreArray(c.sizes));
   }
+  EXPECT_FALSE(platform.shieldRenderer->cachesIconAtlases);
+}
+
+TEST_F(Column, PutsABudgetRightThatMakesNoSense) {
+  using Parameter = ArtworkWidthCalculatorSizeParameter;
+  for (const auto& [given, used] : {std::pair{Parameter{-1, 30, {}}, Parameter{50, 50, {}}},
+                                    {{0, -5, {}}, {0, 0, {}}},
+                                    {{73, 60, {}}, {73, 73, {}}}})
+    EXPECT_EQ(TransitDirectionsListArtworkWidthCalculator({}, given).sizeParameter(), used);
 }
 
 TEST_F(Column, ReplacesTheRowOfAShrunkShieldAndNoOther) {

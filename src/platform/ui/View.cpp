@@ -78,6 +78,7 @@ void View::addFillingSubview(std::shared_ptr<View> view) {
 void View::removeFromSuperview() {
   if (!_superview) return;
   const auto self = std::static_pointer_cast<View>(shared_from_this());
+  bool keepsConstraints = false;
   if (!isLayoutRoot()) {
     for (View* view = _superview; view; view = view->_superview)
       for (const auto held = view->_constraints; const auto& constraint : held)
@@ -86,12 +87,14 @@ void View::removeFromSuperview() {
     if (root._engine) {
       root._engine.reset();
       root.requireConstraintLayout();
+      keepsConstraints = true;
     }
   }
   _superview->setNeedsLayout();
   std::erase(_superview->_subviews, self);
   _superview = nullptr;
   _fillsSuperview = false;
+  if (keepsConstraints) requireConstraintLayout();
 }
 
 bool View::isDescendantOf(const View& ancestor) const {

@@ -6,7 +6,10 @@
 #include "platform/ui/Environment.h"
 #include "platform/ui/StackView.h"
 #include "platform/ui/StyledLabel.h"
+#include "platform/ui/TransitInfoLabelView.h"
+#include "support/RecordingPainter.h"
 #include "support/TestPlatform.h"
+#include "support/TransitFixtures.h"
 
 namespace nimbo {
 namespace {
@@ -25,7 +28,6 @@ std::shared_ptr<View> constrainedView(View& parent, const std::string& name) {
 /// A label of one word a line at 17 points: 8.5 points a character, 17 a line.
 std::shared_ptr<StyledLabel> label(const std::string& text, std::size_t lines = 1) {
   auto view = std::make_shared<StyledLabel>();
-  view->setUsesAutomaticConstraints(false);
   view->setNumberOfLines(lines);
   view->setText(text);
   return view;
@@ -62,9 +64,20 @@ TEST_F(Layout, FollowsConstantsPrioritiesAndActiveFlags) {
   root->layoutIfNeeded();
   EXPECT_EQ(box->frame().width, 90);
   wide->setActive(false);
+  box->layoutIfNeeded();
+  EXPECT_EQ(box->frame().width, 40);
   root->setFrame({0, 0, 200, 60});
   root->layoutIfNeeded();
   EXPECT_EQ(box->frame(), (Rect{0, 0, 40, 40}));
+  const auto half = constrainedView(*box, "half");
+  LayoutConstraint::activateConstraints({half->bottomAnchor().constraintEqualToAnchor(half->centerYAnchor(), 9),
+                                         half->trailingAnchor().constraintEqualToAnchor(root->trailingAnchor(), -50),
+                                         half->leadingAnchor().constraintEqualToAnchor(box->leadingAnchor())});
+  for (const double width : {100, 110}) {
+    root->setFrame({0, 0, width, 60});
+    root->layoutIfNeeded();
+    EXPECT_EQ(half->frame().size(), (Size{width - 50, 18}));
+  }
   EXPECT_TRUE(platform.log.lines().empty());
 }
 
@@ -93,6 +106,11 @@ TEST_F(Layout, LogsAContradictionOnceAndLeavesTheBoundOutWhileItLasts) {
   height->setActive(false);
   root->layoutIfNeeded();
   EXPECT_EQ(box->frame().height, 60);
+  platform.log.clear();
+  box->heightAnchor().constraintLessThanOrEqualToConstant(20)->setActive(true);
+  root->layoutIfNeeded();
+  EXPECT_EQ(box->frame().height, 60) << "the bound that came last is left out";
+  EXPECT_THAT(platform.log.texts("Layout"), SizeIs(1));
 }
 
 TEST_F(Layout, ChangesThatFitOnlyTogetherAreNoContradiction) {
@@ -113,37 +131,42 @@ TEST_F(Layout, ChangesThatFitOnlyTogetherAreNoContradiction) {
   EXPECT_TRUE(platform.log.lines().empty());
 }
 
-TEST_F(Layout, RefusesNumbersThatAreNotFinite) {
+TEST_F(Layout, RefusesNumbersThatMakeNoSense) {
   const auto box = constrainedView(*root, "box");
   const auto width = box->widthAnchor().constraintEqualToConstant(30);
   for (const double bad : {std::nan(""), std::numeric_limits<double>::infinity()}) {
     width->setConstant(bad);
-    root->setFrame({0, 0, bad, 10});
+    for (const Rect& frame : {Rect{bad, 0, 1, 1}, {0, bad, 1, 1}, {0, 0, bad, 1}, {0, 0, 1, bad}})
+      root->setFrame(frame);
   }
+  for (const LayoutPriority bad : {0.99f, 1000.01f, std::nanf("")})
+    EXPECT_THROW(width->setPriority(bad), std::invalid_argument);
   EXPECT_EQ(width->constant(), 30);
   EXPECT_EQ(root->frame(), (Rect{0, 0, 200, 100}));
-  EXPECT_THAT(platform.log.texts("Layout", LogLevel::error), SizeIs(4));
+  EXPECT_THAT(platform.log.texts("Layout", LogLevel::error), SizeIs(10));
 }
 
 TEST_F(Layout, MirrorsLeadingAndTrailing) {
   const auto byHand = std::make_shared<View>();
-  byHand->setFrame({10, 0, 50, 20});
+  byHand->setFrame({10, 7, 50, 20});
   root->addSubview(byHand);
   const auto box = constrainedView(*root, "box");
   const auto guide = std::make_shared<LayoutGuide>();
   root->addLayoutGuide(guide);
   LayoutConstraint::activateConstraints({box->leadingAnchor().constraintEqualToAnchor(root->leadingAnchor(), 8),
                                          box->trailingAnchor().constraintEqualToAnchor(byHand->trailingAnchor(), -20),
+                                         box->topAnchor().constraintEqualToAnchor(byHand->topAnchor()),
+                                         box->bottomAnchor().constraintEqualToAnchor(byHand->bottomAnchor(), 1),
                                          guide->leadingAnchor().constraintEqualToAnchor(box->trailingAnchor()),
                                          guide->trailingAnchor().constraintEqualToAnchor(root->trailingAnchor())});
   root->layoutIfNeeded();
-  EXPECT_EQ(box->frame(), (Rect{8, 0, 32, 0}));
+  EXPECT_EQ(box->frame(), (Rect{8, 7, 32, 21}));
   EXPECT_EQ(guide->layoutFrame(), (Rect{40, 0, 160, 0}));
   // A frame set by hand stays where it is: its trailing edge is now the left one.
   root->setRightToLeft(true);
   root->layoutIfNeeded();
   EXPECT_EQ(byHand->frame().x, 10);
-  EXPECT_EQ(box->frame(), (Rect{30, 0, 162, 0}));
+  EXPECT_EQ(box->frame(), (Rect{30, 7, 162, 21}));
   EXPECT_EQ(guide->layoutFrame(), (Rect{0, 0, 30, 0}));
   root->setRightToLeft(std::nullopt);
   platform.strings.rightToLeft = true;
@@ -186,14 +209,42 @@ TEST_F(Layout, StackArrangesOnBaselinesAndClosesGaps) {
   root->layoutIfNeeded();
   EXPECT_EQ(stack->frame().height, 47);
   EXPECT_EQ(marker->frame().y, 44);
+  EXPECT_EQ(third->frame(), (Rect{0, 47, 120, 0}));
   first->setHidden(true);
-  stack->setSpacing(10);
   root->layoutIfNeeded();
   EXPECT_EQ(stack->frame().height, 17);
   first->setHidden(false);
+  stack->setSpacing(50);
+  root->layoutIfNeeded();
+  EXPECT_EQ(second->frame().y, 50);
   stack->setBaselineRelativeArrangement(false);
   root->layoutIfNeeded();
-  EXPECT_EQ(second->frame().y, 27);
+  EXPECT_EQ(second->frame().y, 67);
+}
+
+TEST_F(Layout, AStackByItselfIsLaidOutAndKeepsDrawingsOnBaselinesApart) {
+  const auto stack = std::make_shared<StackView>();
+  const auto first = label("one"), second = label("two");
+  const auto shields = std::make_shared<TransitInfoLabelView>();
+  shields->setLabelItems({shieldArtwork("A")});
+  shields->setArtworkCache(
+      ArtworkCache::initWithArtworkManager(TransitArtworkManager::initWithIconManager(platform.shieldRenderer)));
+  for (const std::shared_ptr<View>& view :
+       {std::shared_ptr<View>(first), std::shared_ptr<View>(shields), std::shared_ptr<View>(second)})
+    stack->addArrangedSubview(view);
+  const auto expectTops = [&](double height, double ofShields, double ofSecond) {
+    stack->setFrame({0, 0, 100, height});
+    stack->layoutIfNeeded();
+    EXPECT_EQ(shields->frame().y, ofShields);
+    EXPECT_EQ(second->frame().y, ofSecond);
+  };
+  expectTops(62, 17, 45);
+  // Descent 3.4 and shields of 28 to the first, shields and capitals of 11.9 to the next; baselines 13.6 and 19.95
+  // down.
+  stack->setBaselineRelativeArrangement(true);
+  expectTops(60, 17, 43);
+  shields->setFont(std::make_shared<const Font>(FontDescriptor{50, false}, 1));
+  expectTops(77, 12, 60);
 }
 
 TEST_F(Layout, LabelTakesTheLinesItsWidthNeeds) {
@@ -202,25 +253,40 @@ TEST_F(Layout, LabelTakesTheLinesItsWidthNeeds) {
     std::size_t lines;
     double width, height;  // of the box it is in; height 0: free
     double expectedHeight;
+    std::size_t drawnLines;
+    bool clipped = false;
   };
   const std::string tenThousand(10'000, 'x');
   const Case cases[] = {
-      {"aaaa bbbb cccc", 0, 40, 0, 51},     {"aaaa bbbb cccc", 2, 40, 0, 34},
-      {"aaaa bbbb cccc", 1, 40, 0, 17},     {"aaaa bbbb cccc", 0, 40, 40, 34},
-      {"aaaa bbbb cccc", 0, 40, 10, 10},    {"", 0, 40, 0, 17},
-      {tenThousand.c_str(), 0, 85, 60, 51}, {"\xcc\x88\xcc\x88\xcc\x88", 0, 40, 0, 17},
+      {"aaaa bbbb cccc", 0, 40, 0, 51, 3},
+      {"aaaa bbbb cccc", 2, 40, 0, 34, 2},
+      {"aaaa bbbb cccc", 1, 40, 0, 17, 1},
+      {"aaaa bbbb cccc", 0, 40, 40, 34, 2},
+      {"aaaa bbbb cccc", 4, 40, 40, 34, 2},
+      {"aaaa bbbb cccc", 1, 119, 0, 17, 1},
+      {"aaaa bbbb cccc", 0, 40, 14, 14, 1, true},
+      {"aaaa bbbb cccc", 0, 40, 13, 13, 0, true},
+      {"", 0, 40, 0, 17, 0},
+      {tenThousand.c_str(), 0, 85, 60, 51, 3},
+      {"\xcc\x88\xcc\x88\xcc\x88", 0, 40, 0, 17, 1},
   };
   for (const Case& c : cases) {
     const auto view = std::make_shared<View>();
     view->setFrame({0, 0, c.width, 500});
     const auto text = label(c.text, c.lines);
+    text->setUsesAutomaticConstraints(false);
     view->addSubview(text);
     LayoutConstraint::activateConstraints({text->leadingAnchor().constraintEqualToAnchor(view->leadingAnchor()),
                                            text->topAnchor().constraintEqualToAnchor(view->topAnchor()),
                                            text->trailingAnchor().constraintEqualToAnchor(view->trailingAnchor())});
     if (c.height > 0) text->heightAnchor().constraintLessThanOrEqualToConstant(c.height)->setActive(true);
     view->layoutIfNeeded();
-    EXPECT_EQ(text->frame(), (Rect{0, 0, c.width, c.expectedHeight})) << std::string(c.text).substr(0, 20) << c.width;
+    SCOPED_TRACE(std::string(c.text).substr(0, 20) + " in " + std::to_string(c.height));
+    EXPECT_EQ(text->frame(), (Rect{0, 0, c.width, c.expectedHeight}));
+    RecordingPainter painter;
+    view->draw(painter);
+    EXPECT_EQ(painter.texts.empty() ? 0 : painter.texts[0].lines, c.drawnLines);
+    EXPECT_EQ(painter.clips.at(0) == text->bounds(), c.clipped);
   }
 }
 
@@ -235,11 +301,12 @@ TEST_F(Layout, ShortOfRoomTheLastTextGivesWayButKeepsItsFirstLine) {
   const auto height = stack->heightAnchor().constraintLessThanOrEqualToConstant(90);
   LayoutConstraint::activateConstraints({height, stack->widthAnchor().constraintEqualToConstant(10)});
   for (const auto& [room, firstHeight, secondHeight] :
-       {std::array{200, 51, 102}, {90, 51, 34}, {70, 51, 17}, {40, 17, 17}, {90, 51, 34}}) {
+       {std::array{200, 51, 102}, {90, 51, 34}, {70, 51, 17}, {40, 17, 17}, {25, 17, 8}, {90, 51, 34}}) {
     height->setConstant(room);
     root->layoutIfNeeded();
     EXPECT_EQ(first->frame().height, firstHeight) << room;
-    EXPECT_EQ(second->frame().height, secondHeight) << room;
+    EXPECT_EQ(second->frame(), (Rect{0, static_cast<double>(firstHeight), 10, static_cast<double>(secondHeight)}))
+        << room;
   }
 }
 

@@ -51,7 +51,7 @@ class Rows final : public TableViewDataSource, public TableViewDelegate {
     cell->setSeparatorStyleOverride(path.row + 1 < static_cast<std::int64_t>(heights.size()) ? 1 : 0);
     return cell;
   }
-  double tableView_estimatedHeightForRowAtIndexPath(TableView&, IndexPath) override { return 5; }
+  double tableView_estimatedHeightForRowAtIndexPath(TableView&, IndexPath) override { return 25; }
   void tableView_didSelectRowAtIndexPath(TableView& tableView, IndexPath path) override {
     selected.push_back(path.row);
     EXPECT_EQ(tableView.highlightedRow(), path);
@@ -83,13 +83,25 @@ TEST_F(Table, RowsAreAsTallAsTheirConstraintsWant) {
   EXPECT_EQ(rectOf(1), (Rect{0, 28, 300, 44}));
   EXPECT_EQ(rectOf(2), (Rect{0, 72, 300, 48}));
   EXPECT_EQ(footer->frame(), (Rect{0, 120, 300, 12}));
-  EXPECT_EQ(table->indexPathForRowAtPoint({5, 71.9}), (IndexPath{0, 1}));
-  EXPECT_EQ(table->indexPathForRowAtPoint({5, 121}), std::nullopt);
+  for (const Point inside : {Point{0, 28}, {299, 71.9}})
+    EXPECT_EQ(table->indexPathForRowAtPoint(inside), (IndexPath{0, 1}));
+  for (const Point outside : {Point{-0.1, 30}, {300, 30}, {5, 120}, {5, -0.1}})
+    EXPECT_EQ(table->indexPathForRowAtPoint(outside), std::nullopt);
 
-  std::static_pointer_cast<TallCell>(table->cellForRowAtIndexPath({0, 0}))->height->setConstant(50);
+  const auto first = std::static_pointer_cast<TallCell>(table->cellForRowAtIndexPath({0, 0}));
+  first->height->setPriority(500);  // stronger than the estimate
+  first->height->setConstant(50);
   EXPECT_EQ(rectOf(2).y, 102);
   table->setFrame({0, 0, 100, 200});
   EXPECT_EQ(rectOf(2), (Rect{0, 102, 100, 48}));
+  first->height->setPriority(40);  // weaker
+  EXPECT_EQ(rectOf(0).height, 25);
+  const auto plain = table->cellForRowAtIndexPath({0, 1});
+  const auto others = std::make_shared<Rows>();
+  others->heights = {30};
+  table->setDataSource(others);
+  EXPECT_EQ(table->numberOfRows(), 1);
+  EXPECT_EQ(plain->superview(), nullptr);
 }
 
 TEST_F(Table, CellsThatFallOutAreUsedAgain) {
@@ -118,6 +130,7 @@ TEST_F(Table, TapsOnlyWhatMayBeHighlighted) {
   EXPECT_EQ(table->highlightedRow(), std::nullopt);
 
   table->highlightRowAtIndexPath(IndexPath{0, 0});
+  table->deselectRowAtIndexPath_animated({0, 2}, true);
   EXPECT_TRUE(table->cellForRowAtIndexPath({0, 0})->isHighlighted());
   table->highlightRowAtIndexPath(IndexPath{0, 1});
   EXPECT_EQ(table->highlightedRow(), std::nullopt);
@@ -133,8 +146,11 @@ TEST_F(Table, DrawsSeparatorsBetweenRowsAndTheTouchedRow) {
   table->setSeparatorEffect(effect);
   table->layoutIfNeeded();
   table->highlightRowAtIndexPath(IndexPath{0, 1});
+  const auto root = std::make_shared<View>();
+  root->addSubview(table);
   RecordingPainter painter;
-  table->draw(painter);
+  root->draw(painter);
+  EXPECT_EQ(painter.clips.at(0), table->bounds());
   ASSERT_THAT(painter.fills, SizeIs(3));
   EXPECT_EQ(painter.fills[0].rect, (Rect{0, 27.5, 300, 0.5}));
   EXPECT_EQ(painter.fills[0].color, effect->color(Appearance::light));

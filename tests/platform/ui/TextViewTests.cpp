@@ -1,6 +1,8 @@
 #include <gmock/gmock.h>
 
 #include "platform/ui/Color.h"
+#include "platform/ui/Environment.h"
+#include "platform/ui/Font.h"
 #include "platform/ui/TransitInfoLabelView.h"
 #include "platform/ui/VisualEffectView.h"
 #include "support/RecordingPainter.h"
@@ -18,6 +20,39 @@ TEST(SystemColors, TextsAreReadableInBothAppearances) {
       for (const Color& text : {colorOf(SystemColor::label, appearance), colorOf(SystemColor::systemGrey, appearance),
                                 VisualEffect(101).color(appearance), VisualEffect(102).color(appearance)})
         EXPECT_GE(contrastRatio(text, colorOf(behind, appearance)), 4.5);
+}
+
+TEST(SystemColors, AreThoseOfThePalette) {
+  const std::tuple<SystemColor, const char*, const char*> colors[] = {{SystemColor::background, "f6f6f8", "1e1e20"},
+                                                                      {SystemColor::label, "000000", "ffffff"},
+                                                                      {SystemColor::systemGrey, "606066", "a6a6ac"},
+                                                                      {SystemColor::rowHighlight, "e2e2e6", "343438"}};
+  for (const auto& [color, light, dark] : colors) {
+    EXPECT_EQ(colorOf(color, Appearance::light), colorFromHexText(light));
+    EXPECT_EQ(colorOf(color, Appearance::dark), colorFromHexText(dark));
+  }
+  for (const auto& [style, light, dark] :
+       {std::tuple{101, "141414", "fafafa"}, {102, "565656", "b4b4b4"}, {103, "c8c8c8", "4a4a4a"}}) {
+    EXPECT_EQ(VisualEffect(style).color(Appearance::light), colorFromHexText(light));
+    EXPECT_EQ(VisualEffect(style).color(Appearance::dark), colorFromHexText(dark));
+  }
+}
+
+TEST(Font, HasTheSizeOfItsStyleAtEachTextSize) {
+  const TestPlatform platform;
+  constexpr double kBody[] = {14, 15, 16, 17, 19, 21, 23, 28, 33, 40, 47, 53};
+  constexpr double kSubheadline[] = {12, 13, 14, 15, 17, 19, 21, 25, 30, 36, 42, 49};
+  for (std::size_t size = 0; size < std::size(kBody); ++size) {
+    const auto category = static_cast<ContentSizeCategory>(size);
+    Environment::current().setContentSizeCategory(category);
+    const auto font = Font::preferredFont(TextStyle::subheadline);
+    const auto bold = Font::preferredFont(TextStyle::body, FontTraits::bold);
+    EXPECT_EQ(font->descriptor(), (FontDescriptor{kSubheadline[size], false}));
+    EXPECT_EQ(bold->descriptor(), (FontDescriptor{kBody[size], true}));
+    EXPECT_DOUBLE_EQ(font->_scaledValueForValue(15), kSubheadline[size]);
+    EXPECT_TRUE(font->isEqual(Font::preferredFont(TextStyle::subheadline).get()));
+    EXPECT_FALSE(bold->isEqual(Font::preferredFont(TextStyle::body).get()));
+  }
 }
 
 class TransitInfoLabel : public testing::Test {
@@ -75,6 +110,8 @@ TEST_F(TransitInfoLabel, DrawsShieldsOnTheMiddleOfItsCapitals) {
   label->setLabelItems(shields);
   setMaxWidth(105);
   for (const bool mirrored : {false, true}) {
+    const Appearance appearance = mirrored ? Appearance::dark : Appearance::light;
+    Environment::current().setAppearance(appearance);
     root->setRightToLeft(mirrored);
     root->setFrame({0, 0, 120, 60});
     root->layoutIfNeeded();
@@ -83,12 +120,45 @@ TEST_F(TransitInfoLabel, DrawsShieldsOnTheMiddleOfItsCapitals) {
     RecordingPainter painter;
     root->draw(painter);
     ASSERT_THAT(painter.pictures, SizeIs(3));
+    EXPECT_EQ(painter.pictures[0].alpha, 1);
     EXPECT_EQ(painter.pictures[0].rect, (Rect{mirrored ? 92.0 : 0.0, 0, 28, 28}));
     EXPECT_EQ(painter.pictures[1].rect, (Rect{mirrored ? 73.0 : 33.0, 7, 14, 14}));
     ASSERT_THAT(painter.texts, SizeIs(1));
     EXPECT_NEAR(painter.texts[0].origin.y, 14 + 0.35 * 17 - 0.8 * 17, 1e-9);
-    EXPECT_EQ(painter.texts[0].color, colorOf(SystemColor::systemGrey, Appearance::light));
+    EXPECT_EQ(painter.texts[0].color, colorOf(SystemColor::systemGrey, appearance));
   }
+}
+
+TEST_F(TransitInfoLabel, MeasuresAnewWhateverIsChanged) {
+  root->setFrame({0, 0, 400, 100});
+  label->setLabelItems({shields[0], modeArtwork(TransitMode::bus), shields[1]});
+  const auto marker = std::make_shared<View>();
+  marker->setUsesAutomaticConstraints(false);
+  root->addSubview(marker);
+  LayoutConstraint::activateConstraints({marker->topAnchor().constraintEqualToAnchor(label->firstBaselineAnchor()),
+                                         marker->bottomAnchor().constraintEqualToAnchor(label->bottomAnchor())});
+  const auto expectMeasured = [&](Size size, double baseline) {
+    root->layoutIfNeeded();
+    EXPECT_EQ(label->frame().size(), size);
+    EXPECT_NEAR(marker->frame().y, baseline, 0.5);
+  };
+  expectMeasured({94, 28}, 20);
+  label->setSpaceBetweenShields(1);
+  expectMeasured({86, 28}, 20);
+  label->setIconSize(0);
+  expectMeasured({72, 28}, 20);
+  label->setShieldSize(1);
+  expectMeasured({48, 18}, 14);
+  Environment::current().setScreenScale(2);
+  expectMeasured({48, 17.5}, 14);
+  label->setFont(std::make_shared<const Font>(FontDescriptor{50, false}, 1));
+  expectMeasured({48, 50}, 40);
+  setMaxWidth(47);
+  expectMeasured({25, 50}, 40);  // "+3", cut off
+  label->setLabelItems({shields[0]});
+  expectMeasured({16, 50}, 40);
+  label->setArtworkCache(nullptr);
+  expectMeasured({0, 50}, 40);
 }
 
 }  // namespace

@@ -4,7 +4,9 @@
 #include <gtest/gtest.h>
 #include <nimbo-activity.pb.h>
 
+#include <functional>
 #include <limits>
+#include <memory>
 
 #include "handoff/NimboActivity.h"
 
@@ -22,50 +24,54 @@ T extreme(Fill fill) {
   return fill == Fill::smallest ? std::numeric_limits<T>::lowest() : std::numeric_limits<T>::max();
 }
 
-/// Sets every field, nested ones and two elements of each repeated one included.
-void fillFields(Message& message, Fill fill) {
+void fillFields(Message& message, Fill fill);
+
+/// Sets a field with all that is in it, two elements of a repeated one.
+void fillField(Message& message, const FieldDescriptor* field, Fill fill) {
   const auto* reflection = message.GetReflection();
-  for (int index = 0; index < message.GetDescriptor()->field_count(); ++index) {
-    const FieldDescriptor* field = message.GetDescriptor()->field(index);
-    for (int count = field->is_repeated() ? 2 : 1; count > 0; --count) {
-      const auto set = [&](auto setter, auto adder, auto value) {
-        if (field->is_repeated())
-          (reflection->*adder)(&message, field, value);
-        else
-          (reflection->*setter)(&message, field, value);
-      };
-      using R = google::protobuf::Reflection;
-      switch (field->cpp_type()) {
-        case FieldDescriptor::CPPTYPE_INT32:
-          set(&R::SetInt32, &R::AddInt32, extreme<std::int32_t>(fill));
-          break;
-        case FieldDescriptor::CPPTYPE_INT64:
-          set(&R::SetInt64, &R::AddInt64, extreme<std::int64_t>(fill));
-          break;
-        case FieldDescriptor::CPPTYPE_UINT32:
-          set(&R::SetUInt32, &R::AddUInt32, extreme<std::uint32_t>(fill));
-          break;
-        case FieldDescriptor::CPPTYPE_UINT64:
-          // The least unsigned value but 0, which `zero` gives.
-          set(&R::SetUInt64, &R::AddUInt64, fill == Fill::smallest ? 1 : extreme<std::uint64_t>(fill));
-          break;
-        case FieldDescriptor::CPPTYPE_DOUBLE:
-          set(&R::SetDouble, &R::AddDouble, extreme<double>(fill));
-          break;
-        case FieldDescriptor::CPPTYPE_BOOL:
-          set(&R::SetBool, &R::AddBool, fill != Fill::zero);
-          break;
-        case FieldDescriptor::CPPTYPE_STRING:
-          reflection->SetString(&message, field,
-                                fill == Fill::zero ? "" : std::string(fill == Fill::largest ? 300 : 1, 'x'));
-          break;
-        default:
-          fillFields(field->is_repeated() ? *reflection->AddMessage(&message, field)
-                                          : *reflection->MutableMessage(&message, field),
-                     fill);
-      }
+  for (int count = field->is_repeated() ? 2 : 1; count > 0; --count) {
+    const auto set = [&](auto setter, auto adder, auto value) {
+      if (field->is_repeated())
+        (reflection->*adder)(&message, field, value);
+      else
+        (reflection->*setter)(&message, field, value);
+    };
+    using R = google::protobuf::Reflection;
+    switch (field->cpp_type()) {
+      case FieldDescriptor::CPPTYPE_INT32:
+        set(&R::SetInt32, &R::AddInt32, extreme<std::int32_t>(fill));
+        break;
+      case FieldDescriptor::CPPTYPE_INT64:
+        set(&R::SetInt64, &R::AddInt64, extreme<std::int64_t>(fill));
+        break;
+      case FieldDescriptor::CPPTYPE_UINT32:
+        set(&R::SetUInt32, &R::AddUInt32, extreme<std::uint32_t>(fill));
+        break;
+      case FieldDescriptor::CPPTYPE_UINT64:
+        // The least unsigned value but 0, which `zero` gives.
+        set(&R::SetUInt64, &R::AddUInt64, fill == Fill::smallest ? 1 : extreme<std::uint64_t>(fill));
+        break;
+      case FieldDescriptor::CPPTYPE_DOUBLE:
+        set(&R::SetDouble, &R::AddDouble, extreme<double>(fill));
+        break;
+      case FieldDescriptor::CPPTYPE_BOOL:
+        set(&R::SetBool, &R::AddBool, fill != Fill::zero);
+        break;
+      case FieldDescriptor::CPPTYPE_STRING:
+        reflection->SetString(&message, field,
+                              fill == Fill::zero ? "" : std::string(fill == Fill::largest ? 300 : 1, 'x'));
+        break;
+      default:
+        fillFields(field->is_repeated() ? *reflection->AddMessage(&message, field)
+                                        : *reflection->MutableMessage(&message, field),
+                   fill);
     }
   }
+}
+
+void fillFields(Message& message, Fill fill) {
+  for (int index = 0; index < message.GetDescriptor()->field_count(); ++index)
+    fillField(message, message.GetDescriptor()->field(index), fill);
 }
 
 proto::NimboActivity filled(Fill fill) {
@@ -117,6 +123,124 @@ TEST(Wire, EveryFieldIsReadAndWrittenAsTheGeneratedCodeDoes) {
     EXPECT_EQ(asText(ours.copyWithZone()->data()), theirs);
     EXPECT_TRUE(ours.isEqual(ours.copyWithZone().get()));
   }
+}
+
+/// Calls `visit` with one field after the other, at any depth, first left out and then 0 or empty.
+void forEachChange(Message& message, const std::function<void(const FieldDescriptor&)>& visit) {
+  std::vector<const FieldDescriptor*> fields;
+  const auto* reflection = message.GetReflection();
+  reflection->ListFields(message, &fields);
+  for (const FieldDescriptor* field : fields) {
+    const std::unique_ptr<Message> before(message.New());
+    before->CopyFrom(message);
+    reflection->ClearField(&message, field);
+    visit(*field);
+    if (!field->message_type()) {
+      fillField(message, field, Fill::zero);
+      visit(*field);
+    }
+    message.CopyFrom(*before);
+    if (field->is_repeated() && field->message_type())
+      forEachChange(*reflection->MutableRepeatedMessage(&message, field, 1), visit);
+    else if (field->message_type())
+      forEachChange(*reflection->MutableMessage(&message, field), visit);
+  }
+}
+
+TEST(Wire, RecordsAndArtworksAreEqualWhereEveryFieldIs) {
+  proto::NimboActivity theirs = filled(Fill::largest);
+  const std::string artwork = theirs.lineitem().artwork().SerializeAsString();
+  NimboActivity ours;
+  ASSERT_TRUE(readInto(ours, theirs.SerializeAsString()));
+  int changes = 0;
+  forEachChange(theirs, [&](const FieldDescriptor& field) {
+    ++changes;
+    NimboActivity changed;
+    ASSERT_TRUE(readInto(changed, theirs.SerializeAsString()));
+    EXPECT_FALSE(ours.isEqual(&changed)) << field.full_name();
+    EXPECT_FALSE(changed.isEqual(&ours)) << field.full_name();
+    if (!theirs.has_lineitem()) return;
+    // The colour of a shield's text follows from that of the shield.
+    const bool sameArtwork =
+        theirs.lineitem().artwork().SerializeAsString() == artwork || field.name() == "shieldTextColorString";
+    const TransitArtwork* one = ours.lineItem()->artwork().get();
+    const TransitArtwork* other = changed.lineItem()->artwork().get();
+    EXPECT_EQ(artworksAreEquivalent(one, other), sameArtwork) << field.full_name();
+    EXPECT_EQ(artworksAreEquivalent(other, one), sameArtwork) << field.full_name();
+  });
+  EXPECT_GT(changes, 200);
+  const auto& plan = *ours.directionsPlan();
+  EXPECT_TRUE(ours.hasDisplayOptions() && ours.hasDirectionsPlan() && ours.hasDroppedPin() &&
+              ours.hasPresentedMapItem() && ours.hasSearchCategoryStorage() && ours.hasLineItem() &&
+              plan.hasRouteRequestStorage() && plan.hasTransitPreferences() &&
+              plan.routeRequestStorage()->hasOrigin() && plan.routeRequestStorage()->hasDestination());
+  EXPECT_TRUE(artworksAreEquivalent(nullptr, nullptr));
+  EXPECT_FALSE(ours.isEqual(nullptr));
+  EXPECT_FALSE(DroppedPin().isEqual(std::make_shared<StoredMapItem>().get()));
+}
+
+TEST(Wire, TheHashOfARecordIsThatOfItsFields) {
+  NimboActivity activity;
+  activity.setCollectionsMode(-2);
+  activity.setIsDroppedPinSelected(true);
+  activity.setSearchString("a");
+  activity.setDroppedPin(std::make_shared<DroppedPin>());
+  activity.droppedPin()->setLatitude(-2.25);
+  activity.droppedPin()->setLongitude(2.75);  // 3 less a quarter: what is negative counts for nothing
+  activity.addSearchPlaces(std::make_shared<StoredMapItem>());
+  constexpr std::uint64_t kMultiplier = 2654435761, kQuarter = std::uint64_t{1} << 62, kHashOfA = 0xaf63dc4c8601ec8c;
+  EXPECT_EQ(activity.hash(),
+            (0 - 2 * kMultiplier) ^ kMultiplier ^ kHashOfA ^ (2 * kMultiplier + kQuarter) ^ (3 * kMultiplier) ^ 1);
+}
+
+TEST(Wire, ADeepCopySharesNoRecordAndACopyOverARecordSharesAllButTheList) {
+  NimboActivity ours, over;
+  ASSERT_TRUE(readInto(ours, filled(Fill::largest).SerializeAsString()));
+  ours.copyTo(over);
+  const auto deep = ours.copyWithZone();
+  const auto expectShared = [&](auto recordOf) {
+    EXPECT_EQ(recordOf(over), recordOf(ours));
+    EXPECT_NE(recordOf(*deep), recordOf(ours));
+  };
+  expectShared([](const NimboActivity& activity) { return activity.searchPlacesAtIndex(1); });
+  expectShared([](const NimboActivity& activity) { return activity.lineItem(); });
+  expectShared(
+      [](const NimboActivity& activity) { return activity.directionsPlan()->routeRequestStorage()->origin(); });
+  over.clearSearchPlaces();
+  deep->addSearchPlaces(std::make_shared<StoredMapItem>());
+  EXPECT_EQ(ours.searchPlacesCount(), 2u);
+}
+
+TEST(Wire, ALineItemIsKeptWithWhatItLacks) {
+  for (const bool hasIncidents : {true, false}) {
+    StoredTransitLineItemFields fields;
+    fields.hasIncidentComponent.set(hasIncidents);
+    const auto stored = StoredTransitLineItem::initWithLineItem(std::make_shared<StoredTransitLineItem>(fields));
+    EXPECT_EQ(stored->hasIncidentComponent(), hasIncidents);
+    EXPECT_EQ(stored->muid(), 0u);
+  }
+}
+
+TEST(Wire, EnumerationsHaveTheirNamesInOrderAndAreZeroWhenAbsent) {
+  for (std::int32_t value = -1; value < 5; ++value) {
+    const std::string unknown = "(unknown: " + std::to_string(value) + ")";
+    const auto expectName = [&](auto nameOf, auto valueOf, const std::vector<std::string>& names) {
+      const bool known = value >= 0 && value < static_cast<std::int32_t>(names.size());
+      EXPECT_EQ(nameOf(value), known ? names[static_cast<std::size_t>(value)] : unknown);
+      EXPECT_EQ(valueOf(nameOf(value)), known ? value : 0);
+    };
+    expectName(&NimboActivity::collectionsModeAsString, &NimboActivity::StringAsCollectionsMode,
+               {"None", "Bookmarks", "Recents", "Contacts"});
+    expectName(&DirectionsPlan::displayMethodAsString, &DirectionsPlan::StringAsDisplayMethod,
+               {"DirectionsSearch", "RoutePicking", "DirectionsStarted"});
+    expectName(&DirectionsPlan::transitPrioritizationAsString, &DirectionsPlan::StringAsTransitPrioritization,
+               {"TRANSIT_PRIORITIZE_DEFAULT", "TRANSIT_PRIORITIZE_BY_TRAVEL_TIME",
+                "TRANSIT_PRIORITIZE_BY_TRANSFER_COUNT", "TRANSIT_PRIORITIZE_BY_WALKING_DISTANCE"});
+  }
+  NimboActivity activity;
+  activity.setCollectionsMode(3);
+  activity.setHasCollectionsMode(false);
+  EXPECT_EQ(activity.collectionsMode(), 0);
 }
 
 TEST(Wire, NamesOfFieldsAreThoseOfTheSchema) {
