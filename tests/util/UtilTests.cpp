@@ -35,7 +35,7 @@ TEST(IncidentStringProvider, FillsBothTextsWithWhatIsThereAndShowsNoneTwice) {
                {{}, "S", "D", "S", ""},   {"", "S", "D", "S", ""},  {"S", "S", "D", "S", ""},
                {"T", {}, "T", "T", ""},   {{}, {}, "D", "", "D"},   {{}, {}, {}, "", ""}};
   for (const auto& test : cases) {
-    BasicTransitIncident::Fields fields;
+    TransitIncidentFields fields;
     fields.title = test.title;
     fields.summary = test.summary;
     fields.fullDescription = test.description;
