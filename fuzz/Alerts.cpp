@@ -28,11 +28,11 @@ const StaticFeed& city() {
   return feed;
 }
 
-std::vector<TransitIncidents> incidentsOf(const AlertsFeed& alerts, std::span<const std::uint32_t> lines) {
+std::vector<Verdict> verdictsOf(const AlertsFeed& alerts, std::span<const std::uint32_t> lines) {
   IncidentQuery query{"city", {}, {"de-AT", "en"}, true, Date(std::chrono::seconds(1'750'000'000)), {}, true};
   for (const std::uint32_t line : lines) query.lines.push_back({line, city().line(line).muid});
   query.trips = [](std::string_view trip) { return trip == "t" ? std::optional(1u) : std::nullopt; };
-  return readIncidents(alerts, city(), query).incidents;
+  return readIncidents(alerts, city(), query).verdicts;
 }
 
 void requireSound(const TransitIncident& incident) {
@@ -60,11 +60,13 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size
   const auto alerts = AlertsFeed::read(std::string(textOf(data, size)), "fuzz");
   if (!alerts) return 0;
   const std::uint32_t all[] = {0, 1, 2};
-  const auto incidents = incidentsOf(*alerts, all);
+  const auto verdicts = verdictsOf(*alerts, all);
   for (const std::uint32_t line : all) {
-    for (const auto& incident : incidents[line]) requireSound(*incident);
-    require(whatIsToldBy(incidentsOf(*alerts, std::array{line}).front()) == whatIsToldBy(incidents[line]),
+    for (const auto& incident : verdicts[line].incidents()) requireSound(*incident);
+    const Verdict alone = verdictsOf(*alerts, std::array{line}).front();
+    require(whatIsToldBy(alone.incidents()) == whatIsToldBy(verdicts[line].incidents()),
             "a line has the same incidents whatever else is asked for");
+    require(!alone.unknownReason() == !verdicts[line].unknownReason(), "a line is known whatever else is asked for");
   }
   return 0;
 }

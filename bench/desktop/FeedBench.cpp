@@ -92,6 +92,7 @@ void alerts(benchmark::State& state) {
   query.feed = "metro";
   query.language = {"en", "en"};
   query.now = currentDate();
+  query.trips = loaded->trips;
   for (std::uint32_t i = 0; i < kFavorites; ++i)
     query.lines.push_back({i * 200, lineMuid("metro", "R" + std::to_string(i * 200))});
   const std::string bytes = madeUpAlerts(secondsNow());
@@ -102,7 +103,7 @@ void alerts(benchmark::State& state) {
     {
       const auto feed = AlertsFeed::read(std::move(fetched), "bench");
       const IncidentReading reading = readIncidents(*feed, loaded->feed, query);
-      if (reading.incidents.front().empty()) state.SkipWithError("there are no incidents");
+      if (reading.verdicts.front().incidents().empty()) state.SkipWithError("there are no incidents");
     }
     state.SetIterationTime(processorSeconds() - begin);
   }

@@ -46,6 +46,19 @@ def alert_feeds():
     for mark in "<", "&", "<a", "&#", "\u200f", "\n", "</", "<!--":
         yield f"texts of {json.dumps(mark)}", lambda mark=mark: filled(
             lambda n: entity(str(n), titled(f"{n}" + mark * (60000 // len(mark.encode())))))
+    r0 = field(5, field(2, "r0"))
+    by_trip = text(10, ("T", "")) + field(5, field(4, field(1, "trip")))
+    yield "an alert by trip alone, without trips", lambda: header() + entity("a", by_trip)
+    yield "an alert that breaks off in a selector", lambda: header() + entity("a", text(10, ("T", "")) + b"\x2a\x7f\x12\x02r0")
+    yield "an alert that breaks off behind its line", lambda: header() + entity("a", r0 + b"\x52\x7f")
+    yield "an entity that breaks off", lambda: header() + field(2, b"\x0a\x7fa")
+    yield "positions of vehicles", lambda: header() + field(2, field(1, "v") + field(4, b""))
+    yield "times of trips", lambda: header() + field(2, field(1, "u") + field(3, b""))
+    yield "alerts of another city", lambda: header() + entity(
+        "a", text(10, ("T", "")) + b"".join(field(5, field(2, f"x{n}")) for n in range(3)))
+    yield "a proxy's \\r\\n404", lambda: b"\r\n404"
+    yield "header without a version", lambda: field(1, field(3, now))
+    yield "timestamp of another type", lambda: field(1, field(1, "2.0") + b"\x19" + bytes(8))
     yield "header that goes 100 days back", lambda: header(now - 8640000) + entity("a", titled("T"))
 
 
@@ -82,6 +95,9 @@ def transports(good):
     yield "never-ending header", lambda: endless(ok + b"X: ", b"y" * 65536)
     yield "never-ending interim answers", lambda: endless(b"", b"HTTP/1.1 100 Continue\r\n\r\n" * 1000)
     yield "gzip bomb of 10 GiB", lambda: gzip_bomb(10240 * MIB)
+    packed = zlib.compress(header(), 9, 31)
+    for name, body in ("without its trailer", packed[:-8]), ("with another sum", packed[:-8] + bytes(8)):
+        yield "gzip " + name, lambda body=body: plain(body, "200 OK\r\nContent-Encoding: gzip")
     yield "cut off", lambda: lambda send: send(ok + b"Content-Length: 999999\r\n\r\n" + good)
     yield "length too short", lambda: lambda send: send(ok + b"Content-Length: %d\r\n\r\n" % (len(good) - 3) + good)
     yield "redirect loop", lambda: plain(b"", "302 Found\r\nLocation: /bad")

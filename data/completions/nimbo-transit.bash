@@ -50,7 +50,7 @@ _nimbo_transit() {
     script) options+=" --virtual-time" ;;
     analytics) options+=" --json" ;;
     feed) names="add remove list check" ;;
-    "feed add") options+=" --static --alerts" ;;
+    "feed add") options+=" --static --alerts --combined" ;;
     "feed remove" | "feed check") names=$(_nimbo_transit_names feed list | sed -n 's/^\([^ ]*\)$/\1/p') ;;
     favorite) names="add remove move list" ;;
     "favorite add") names=$(_nimbo_transit_names lines | cut -d ' ' -f 1) ;;

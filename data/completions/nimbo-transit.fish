@@ -89,6 +89,7 @@ complete -c nimbo-transit -n '__nimbo_transit_at analytics' -l json -d 'One JSON
 complete -c nimbo-transit -n '__nimbo_transit_at feed' -a 'add remove list check'
 complete -c nimbo-transit -n '__nimbo_transit_at feed add' -l static -r -F -d 'GTFS: folder, zip file or address'
 complete -c nimbo-transit -n '__nimbo_transit_at feed add' -l alerts -r -F -d 'Alerts: file or address'
+complete -c nimbo-transit -n '__nimbo_transit_at feed add' -l combined -d 'Alerts come beside other data'
 complete -c nimbo-transit -n '__nimbo_transit_at feed remove' -a '(__nimbo_transit_feeds)'
 complete -c nimbo-transit -n '__nimbo_transit_at feed check' -a '(__nimbo_transit_feeds)'
 

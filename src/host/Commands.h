@@ -51,10 +51,13 @@ int runFavoriteList(const CommandContext& context);
 
 struct FeedOptions {
   std::string name;
-  std::string staticFeed;  ///< folder, zip file or http(s) address
-  std::string alerts;      ///< file or http(s) address
+  std::string staticFeed;   ///< folder, zip file or http(s) address
+  std::string alerts;       ///< file or http(s) address
+  bool isCombined = false;  ///< other entities may come without alerts
 };
 
+/// Reads the feed, and sets it up even when it cannot be used now, which it says; but for alerts that are another
+/// feed's.
 int runFeedAdd(const CommandContext& context, const FeedOptions& options);
 int runFeedRemove(const CommandContext& context, const std::string& name);
 int runFeedList(const CommandContext& context);

@@ -50,11 +50,10 @@ bool printCheck(const FeedCheckReport& report) {
     }
     printReport("skipped in the alerts", alerts->skipped);
     printReport("fits nothing", alerts->unfit);
-    if (alerts->staleness) printLine("too old: " + alerts->staleness->reason());
   }
-  for (const ErrorRef& error : {report.staticError, report.alertsError})
-    if (error) printLine("error: " + error->reason());
-  return !report.staticError && !report.alertsError && !(report.alerts && report.alerts->staleness);
+  const auto faults = report.faults();
+  for (const ErrorRef& fault : faults) printLine("error: " + fault->reason());
+  return faults.empty();
 }
 
 /// The parts of a line as columns: how it is written, its shield's text, its name, its agency.
@@ -91,7 +90,18 @@ int runFeedAdd(const CommandContext& context, const FeedOptions& options) {
   Feed feed{.name = options.name,
             .staticFeed = require(FeedAddress::parse(options.staticFeed)),
             .alerts = require(FeedAddress::parse(options.alerts))};
-  require(FeedConfiguration(context.paths.config).add(feed));
+  feed.isCombined = options.isCombined;
+  FeedConfiguration configuration(context.paths.config);
+  if (const ErrorRef error = configuration.checkNewName(feed.name)) throw CommandFailure(error->reason());
+  const FeedCache cache(context.paths.cache);
+  const FeedCheckReport report = checkFeed(feed, cache);
+  if (report.isOtherFeed()) {
+    cache.remove(feed.name);
+    throw CommandFailure(report.alertsError->reason() + " \"--combined\" does so.");
+  }
+  if (report.alerts && report.alerts->hasOthers) feed.isCombined = true;
+  if (const ErrorRef error = configuration.add(feed)) throw CommandFailure(error->reason());
+  for (const ErrorRef& fault : report.faults()) printMessage(fault->reason());
   return kExitSuccess;
 }
 

@@ -7,6 +7,7 @@
 #include <csignal>
 #include <iostream>
 #include <nlohmann/json.hpp>
+#include <vector>
 
 #include "host/OnScreenWidget.h"
 #include "host/StatusWatch.h"
@@ -19,6 +20,8 @@ using nlohmann::json;
 namespace {
 
 constexpr const char* kErrorWord = "error";
+constexpr const char* kGoneWord = "gone";
+constexpr const char* kOldWord = "old";
 
 /// A line without a line end, which a bar has no room for.
 std::string inOneLine(std::string text) {
@@ -26,8 +29,10 @@ std::string inOneLine(std::string text) {
   return text;
 }
 
-std::string lineOf(const std::string& text, const std::string& word, const std::string& tooltip) {
-  return printableJSON(json{{"text", inOneLine(text)}, {"alt", word}, {"class", word}, {"tooltip", tooltip}}.dump());
+std::string lineOf(const std::string& text, const std::vector<std::string>& words, const std::string& tooltip) {
+  json line{{"text", inOneLine(text)}, {"alt", words.front()}, {"class", words.front()}, {"tooltip", tooltip}};
+  if (words.size() > 1) line["class"] = words;
+  return printableJSON(line.dump());
 }
 
 const std::string& titleOf(const protocol::TransitItem& item) {
@@ -65,6 +70,7 @@ std::string tooltipOf(const protocol::Snapshot& snapshot) {
   if (rows.empty() && snapshot.listItem.summaryItem) rows.push_back(*snapshot.listItem.summaryItem);
   std::string tooltip;
   const auto addLine = [&](const std::string& markup) { tooltip += (tooltip.empty() ? "" : "\n") + markup; };
+  if (!snapshot.result) addLine("<i>as it was the last time; asking now</i>");
   for (const protocol::Item& row : rows) {
     addLine("<b>" + headingOf(row) + "</b>");
     const std::string text = std::visit([](const auto& item) { return secondaryTextOf(item); }, row);
@@ -85,11 +91,23 @@ std::optional<std::string> statusBarLine(const protocol::Snapshot& snapshot) {
   const std::string word =
       hasFailed ? kErrorWord : std::visit([&](const auto& item) { return wordOf(item, isFetched); }, *row);
   if (!isFetched && word != "good" && word != "advisories") return std::nullopt;
-  return lineOf(headingOf(*row), word, tooltipOf(snapshot));
+  std::string text = headingOf(*row);
+  std::vector<std::string> words{word};
+  if (!isFetched) {
+    words = {kOldWord};
+    text += " (old)";
+  }
+  if (!snapshot.goneLines.empty()) {
+    // Good service of the others is no good service of all.
+    words = word == "good" && isFetched ? std::vector<std::string>{kGoneWord}
+                                        : std::vector{words.front(), std::string(kGoneWord)};
+    text += " · " + goneLinesTitle(snapshot.goneLines);
+  }
+  return lineOf(text, words, tooltipOf(snapshot));
 }
 
 std::string statusBarErrorLine(const std::string& reason) {
-  return lineOf("⚠", kErrorWord, "<b>Nimbo Transit</b>\n" + markupText(reason));
+  return lineOf("⚠", {kErrorWord}, "<b>Nimbo Transit</b>\n" + markupText(reason));
 }
 
 namespace {

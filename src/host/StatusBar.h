@@ -9,8 +9,10 @@
 namespace nimbo {
 
 // Lines for status bars that take one JSON object a line, as Waybar's custom modules do (waybar-custom(5)):
-// {"text", "alt", "tooltip", "class"}. Text and tooltip are Pango markup. "alt" and "class" are one word each: "good",
-// "advisories", "none" (no favourite lines) or "error".
+// {"text", "alt", "tooltip", "class"}. Text and tooltip are Pango markup. "alt" is one word: "good", "advisories",
+// "none" (no favourite lines), "error", "old" (rows of an earlier session, until the first answer) or "gone" (the feeds
+// do not know some lines any more, and the others run well). "class" is that word, with "gone" beside another where
+// lines are gone.
 
 /// The line for a snapshot: the compact row's title, with every row in the tooltip. Absent while
 /// the widget has nothing to show: before its first fetch, without rows of the last time.

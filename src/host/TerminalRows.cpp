@@ -117,6 +117,12 @@ std::string rowsAsText(const protocol::Snapshot& snapshot, const TerminalStyle& 
   std::string text;
   for (const protocol::Row& row : snapshot.rows)
     if (row.item) text += std::visit([&](const auto& item) { return textOfItem(item, style); }, *row.item);
+  if (!snapshot.goneLines.empty()) {
+    text += titleText(goneLinesTitle(snapshot.goneLines), styled("⚠", kBold, style), style);
+    for (const std::string& line : snapshot.goneLines)
+      for (const std::string& part : foldedText(printableText(line), style.columns - kIndent))
+        text += std::string(kIndent, ' ') + part + "\n";
+  }
   return text;
 }
 

@@ -16,7 +16,8 @@ struct TerminalStyle {
   static TerminalStyle ofStandardOutput();
 };
 
-/// The rows of a snapshot as lines of text: title and shield on one line, the secondary text below.
+/// The rows of a snapshot as lines of text: title and shield on one line, the secondary text below; and a row for lines
+/// that are gone from their feeds.
 std::string rowsAsText(const protocol::Snapshot& snapshot, const TerminalStyle& style);
 
 }  // namespace nimbo

@@ -14,6 +14,13 @@ inline std::string goneLineText(const std::string& line) {
          line + "\".";
 }
 
+/// The same in few words, for a row of its own; empty where no line is gone.
+inline std::string goneLinesTitle(const std::vector<std::string>& lines) {
+  return lines.empty()       ? std::string()
+         : lines.size() == 1 ? "1 line gone"
+                             : std::to_string(lines.size()) + " lines gone";
+}
+
 /// `text` for a terminal: every control character (escape sequences of a hostile feed among them) is a blank, line ends
 /// stay, and characters that set a direction go: few terminals know them, and they turn what stands around. Bad UTF-8
 /// becomes U+FFFD.

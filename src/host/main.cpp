@@ -124,6 +124,7 @@ void CommandLine::addFeedCommands() {
   addFeed->add_option("--alerts", _feed.alerts, "GTFS-Realtime Service Alerts: a file or an http(s) address")
       ->required()
       ->check(checkFeedAddress);
+  addFeed->add_flag("--combined", _feed.isCombined, "The alerts come beside positions of vehicles or times of trips");
   CLI::App* remove = add(*feed, "remove", "Forget a feed",
                          [this](const CommandContext& context) { return runFeedRemove(context, _feed.name); });
   remove->add_option("NAME", _feed.name, "Name of the feed")->required();

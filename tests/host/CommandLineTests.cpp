@@ -37,6 +37,9 @@ TEST(CommandLine, SetsUpFeedsAndFavorites) {
   programs.setUpCity({"m2", "b10"}, {{"a", {"m2"}, "Works", "Slow."}, {"x", {"gone"}, "Old", "Line."}});
   EXPECT_THAT(programs.run({"lines", "har"}).output, AllOf(HasSubstr("city:m1"), Not(HasSubstr("city:m2"))));
   EXPECT_THAT(programs.run({"feed", "list"}).output, HasSubstr("city"));
+  EXPECT_THAT(programs.run({"feed", "check"}).output, HasSubstr("error: ")) << "a file of January";
+  programs.publishBytes(AlertsBuilder::feed(std::chrono::floor<Date::duration>(std::chrono::system_clock::now()),
+                                            {{"a", {"m2"}, "Works", "Slow."}, {"x", {"gone"}, "Old", "Line."}}));
   const ProgramRun check = programs.run({"feed", "check"});
   EXPECT_EQ(check.status, 0) << check.errors;
   EXPECT_THAT(check.output, AllOf(HasSubstr("  2 alerts\n"), HasSubstr("  1 incident in force")));
@@ -49,7 +52,32 @@ TEST(CommandLine, SetsUpFeedsAndFavorites) {
   EXPECT_GT(order().find("city:m2"), order().find("city:b10"));
   EXPECT_EQ(programs.run({"favorite", "remove", "city:b10"}).status, 0);
   EXPECT_THAT(order(), Not(HasSubstr("city:b10")));
+  programs.publish({{"a", {"m2"}, "Works", "Slow."}});
   EXPECT_THAT(programs.run({"status", kNow}).output, HasSubstr("Works"));
+}
+
+TEST(CommandLine, AsksWhetherAFeedOfOtherThingsHoldsAlertsToo) {
+  const Programs programs;
+  const std::string vehicle("\x12\x05\x0A\x01v\x22\x00", 7), feed = programs.folder.path() / "feed";
+  const auto add = [&](const std::string& name, const std::vector<std::string>& more) {
+    std::vector<std::string> arguments{"feed", "add", name, "--static", feed, "--alerts", programs.alertsFile()};
+    arguments.insert(arguments.end(), more.begin(), more.end());
+    return programs.run(arguments);
+  };
+  const auto isCombined = [&] {
+    return programs.folder.read("config/feeds.json").find("combined") != std::string::npos;
+  };
+  programs.publishBytes(AlertsBuilder::feed(Programs::now(), {}) + vehicle);
+  const ProgramRun refused = add("a", {});
+  EXPECT_EQ(refused.status, 1);
+  EXPECT_THAT(refused.errors, AllOf(HasSubstr("positions of vehicles"), HasSubstr("--combined")));
+  EXPECT_EQ(programs.folder.read("config/feeds.json"), "");
+  EXPECT_EQ(add("b", {"--combined"}).status, 0);
+  EXPECT_TRUE(isCombined());
+  programs.run({"feed", "remove", "b"});
+  programs.publishBytes(AlertsBuilder::feed(Programs::now(), {{"a", {"m2"}, "Works", "Slow."}}) + vehicle);
+  EXPECT_EQ(add("c", {}).status, 0);
+  EXPECT_TRUE(isCombined());
 }
 
 TEST(CommandLine, RefusesWhatItCannotDoAndSaysWhy) {
@@ -256,6 +284,9 @@ TEST(CommandLine, TellsOfGoneLinesAndOfADatabaseSetAside) {
     const ProgramRun run = programs.run(command);
     EXPECT_EQ(run.status, 0) << run.errors;
     EXPECT_THAT(run.errors, AllOf(HasSubstr("favorite remove city:m1"), Not(HasSubstr("city:m2"))));
+    if (command.front() == "status") {
+      EXPECT_THAT(run.output, HasSubstr("1 line gone"));
+    }
   }
 
   const std::string database = programs.folder.path() / "state" / "state.sqlite";
@@ -281,8 +312,15 @@ TEST(CommandLine, PrintsALineForAStatusBar) {
                          {"alt", "advisories"},
                          {"text", "[1] Lift &lt;&amp;&gt; &quot;stairs&quot;"},
                          {"tooltip", "<b>[1] Lift &lt;&amp;&gt; &quot;stairs&quot;</b>\nOn two lines"}}));
+  programs.folder.write("feed/routes.txt", "route_id,agency_id,route_short_name,route_type\nm2,M,2,1\n");
+  programs.run({"favorite", "add", "city:m2"});
+  programs.publish({});
+  EXPECT_EQ(bar()["class"], "gone");
+  EXPECT_THAT(bar()["text"].get<std::string>(), HasSubstr("1 line gone"));
+  programs.publish({{"a", {"m2"}, "Works", "Slow."}});
+  EXPECT_EQ(bar()["class"], (json{"advisories", "gone"}));
   programs.publishBytes("<no feed>");
-  EXPECT_EQ(bar()["class"], "error");
+  EXPECT_EQ(bar()["alt"], "error");
   EXPECT_THAT(bar()["tooltip"].get<std::string>(), AllOf(HasSubstr("alerts.pb"), Not(HasSubstr("<no"))));
 }
 

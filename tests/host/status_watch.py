@@ -69,7 +69,8 @@ with tempfile.TemporaryDirectory() as folder:
 
     bar = watch()
     with open(fifo, "wb"):
-        bar.stdout.readline()
+        first = json.loads(bar.stdout.readline())
+        assert first["class"] == first["alt"] == "old" and first["text"].endswith("(old)"), first
         bar.stdout.close()
         assert bar.wait() == 0, "a bar without a reader ends by itself"
 print("watched")

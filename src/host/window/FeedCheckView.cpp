@@ -86,10 +86,8 @@ void FeedCheckView::show(const FeedCheckReport& report) {
       addText(LocalizedFormat(LocalizedString("Window_Incident_Updated"),
                               {DateText(_context.preferences.locale()).textOf(*alerts->timestamp)}),
               "item-caption");
-    if (alerts->staleness) addText(textOfError(*alerts->staleness), "failed");
   }
-  for (const ErrorRef& error : {report.staticError, report.alertsError})
-    if (error) addText(textOfError(*error), "failed");
+  for (const ErrorRef& fault : report.faults()) addText(textOfError(*fault), "failed");
   addSkipped(report);
 }
 

@@ -19,6 +19,10 @@ FeedForm::FeedForm(const PageContext& context, Added added)
   addEntry(_name, "Window_Feed_Name", "Window_Feed_NamePrompt");
   addEntry(_static, "Window_Feed_Static", "Window_Feed_StaticPrompt");
   addEntry(_alerts, "Window_Feed_Alerts", "Window_Feed_AlertsPrompt");
+  // Asked only where the answer does not tell.
+  _combined.set_label(LocalizedString("Window_Feed_Combined"));
+  _combined.hide();
+  append(_combined);
   _problem.add_css_class("failed");
   _problem.set_xalign(0);
   _problem.hide();
@@ -102,7 +106,7 @@ std::optional<Feed> FeedForm::feed() {
     }
     addresses[i] = *address;
   }
-  return Feed{.name = name, .staticFeed = *addresses[0], .alerts = *addresses[1]};
+  return Feed{.name = name, .staticFeed = *addresses[0], .alerts = *addresses[1], .isCombined = _combined.get_active()};
 }
 
 void FeedForm::showProblem(const std::string& text) {
@@ -111,8 +115,9 @@ void FeedForm::showProblem(const std::string& text) {
 }
 
 void FeedForm::setBusy(bool busy) {
-  for (Gtk::Widget* widget : {static_cast<Gtk::Widget*>(&_name), static_cast<Gtk::Widget*>(&_static),
-                              static_cast<Gtk::Widget*>(&_alerts), static_cast<Gtk::Widget*>(&_add)})
+  for (Gtk::Widget* widget :
+       {static_cast<Gtk::Widget*>(&_name), static_cast<Gtk::Widget*>(&_static), static_cast<Gtk::Widget*>(&_alerts),
+        static_cast<Gtk::Widget*>(&_combined), static_cast<Gtk::Widget*>(&_add)})
     widget->set_sensitive(!busy);
 }
 
@@ -124,22 +129,23 @@ void FeedForm::check() {
     setBusy(false);
     _add.grab_focus();
     if (!report) return;
-    const bool isStale = report->alerts && report->alerts->staleness;
-    if (!report->staticError && !report->alertsError && !isStale)
-      keep(entered, report);
-    else
-      _addAnyway.show();
+    if (report->faults().empty()) return keep(entered, report);
+    if (report->isOtherFeed()) return _combined.show();
+    _addAnyway.show();
   });
   // The keyboard is with the check by now.
   setBusy(true);
 }
 
-void FeedForm::keep(const Feed& feed, const FeedCheckReport* report) {
+void FeedForm::keep(Feed feed, const FeedCheckReport* report) {
+  if (report && report->alerts && report->alerts->hasOthers) feed.isCombined = true;
   if (const ErrorRef failure = FeedConfiguration(_context.command.paths.config).add(feed))
     return showProblem(textOfError(*failure));
   for (Gtk::Entry* entry : {&_name, &_static, &_alerts}) entry->set_text("");
   _check.cancel();
   _addAnyway.hide();
+  _combined.hide();
+  _combined.set_active(false);
   _added(report);
 }
 

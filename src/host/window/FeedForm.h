@@ -1,6 +1,7 @@
 #pragma once
 
 #include <gtkmm/button.h>
+#include <gtkmm/checkbutton.h>
 #include <gtkmm/entry.h>
 #include <gtkmm/filechoosernative.h>
 #include <gtkmm/label.h>
@@ -25,13 +26,14 @@ class FeedForm final : public Gtk::Box {
   /// What the entries say; absent, and the user is told, when that is no feed.
   std::optional<Feed> feed();
   void check();
-  void keep(const Feed& feed, const FeedCheckReport* report);
+  void keep(Feed feed, const FeedCheckReport* report);
   void showProblem(const std::string& text);
   void setBusy(bool busy);
 
   const PageContext& _context;
   Added _added;
   Gtk::Entry _name, _static, _alerts;
+  Gtk::CheckButton _combined;
   Gtk::Label _problem;
   FeedCheckView _check;
   Gtk::Button _add, _addAnyway;

@@ -117,6 +117,10 @@ const char* keyOfCode(TransitLineServiceError code) {
       return "Window_Error_TooLarge";
     case notKept:
       return "Window_Error_NotKept";
+    case otherFeed:
+      return "Window_Error_OtherFeed";
+    case foreignAlerts:
+      return "Window_Error_ForeignAlerts";
     case unknownLine:
     case internal:
       break;

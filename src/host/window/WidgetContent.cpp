@@ -43,6 +43,7 @@ WidgetContent WidgetContent::ofSnapshot(const protocol::Snapshot& snapshot) {
   for (const protocol::Row& row : snapshot.rows) content.rows.push_back(rowOf(row));
   content.canExpand = snapshot.largestAvailableDisplayMode == WidgetDisplayMode::Expanded;
   content.isExpanded = snapshot.expanded;
+  content.goneLines = snapshot.goneLines;
   content.asOf = snapshot.asOf;
   return content;
 }

@@ -24,7 +24,8 @@ struct WidgetContent {
   std::vector<WidgetRow> rows;
   bool canExpand = false;
   bool isExpanded = false;
-  std::map<std::string, Date> asOf;  ///< when the publishers made their alerts, by the names of the feeds
+  std::vector<std::string> goneLines;  ///< "FEED:ROUTE_ID", of favorites that their feeds do not know any more
+  std::map<std::string, Date> asOf;    ///< when the publishers made their alerts, by the names of the feeds
 
   /// Takes rows and modes from a snapshot.
   static WidgetContent ofSnapshot(const protocol::Snapshot& snapshot);

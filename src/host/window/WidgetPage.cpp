@@ -48,6 +48,7 @@ WidgetPage::WidgetPage(const PageContext& context)
       _context(context),
       _process(context.command.runLoop, Platform::current().clock(), context.command.widgetArguments, *this),
       _wantsExpanded(Platform::current().sharedSettings().groupStore()->boolForKey(kExpandedKey)) {
+  buildGone();
   buildCard();
   buildPlaces();
   _process.setPresentation(presentation());
@@ -60,6 +61,17 @@ WidgetPage::WidgetPage(const PageContext& context)
 
 WidgetPage::~WidgetPage() {
   for (sigc::connection& connection : _connections) connection.disconnect();
+}
+
+void WidgetPage::buildGone() {
+  _gone.add_css_class("notice");
+  _goneText.set_xalign(0);
+  auto* button = Gtk::make_managed<Gtk::Button>(LocalizedString("Window_Favorites_Title"));
+  button->set_halign(Gtk::Align::START);
+  button->signal_clicked().connect([this] { _context.navigator.open(ShowFavorites()); });
+  _gone.append(_goneText);
+  _gone.append(*button);
+  _gone.hide();
 }
 
 void WidgetPage::buildCard() {
@@ -106,8 +118,9 @@ void WidgetPage::buildCard() {
 
   _card.add_css_class("card");
   _card.set_overflow(Gtk::Overflow::HIDDEN);
-  for (Gtk::Widget* child : {static_cast<Gtk::Widget*>(header), static_cast<Gtk::Widget*>(&_failure),
-                             static_cast<Gtk::Widget*>(&_waiting), static_cast<Gtk::Widget*>(&_view)})
+  for (Gtk::Widget* child :
+       {static_cast<Gtk::Widget*>(header), static_cast<Gtk::Widget*>(&_failure), static_cast<Gtk::Widget*>(&_waiting),
+        static_cast<Gtk::Widget*>(&_view), static_cast<Gtk::Widget*>(&_gone)})
     _card.append(*child);
   content().append(_card);
   showExpandButton();
@@ -194,6 +207,8 @@ void WidgetPage::widgetDidChange(const WidgetContentRef& content) {
   _view.setContent(content);
   _waiting.hide();
   _failure.hide();
+  _goneText.set_text(LocalizedFormat(LocalizedString("Window_Widget_Gone"), {CommaDelimitedList(content->goneLines)}));
+  _gone.set_visible(!content->goneLines.empty());
   showExpandButton();
 }
 

@@ -27,6 +27,7 @@ class WidgetPage final : public Page, private WidgetHostProcess::Delegate {
 
  private:
   void buildCard();
+  void buildGone();
   void buildPlaces();
   void watchVisibility();
   void updateVisibility();
@@ -53,6 +54,8 @@ class WidgetPage final : public Page, private WidgetHostProcess::Delegate {
   Gtk::Spinner _waiting;
   Gtk::Box _failure{Gtk::Orientation::VERTICAL, 8};
   Gtk::Label _failureReason;
+  Gtk::Box _gone{Gtk::Orientation::VERTICAL, 8};
+  Gtk::Label _goneText;
   Gtk::Box _sampleNotice{Gtk::Orientation::VERTICAL, 8};
   Gtk::ListBox _places;
   std::vector<sigc::connection> _connections;

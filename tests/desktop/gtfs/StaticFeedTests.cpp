@@ -206,8 +206,8 @@ TEST_F(StaticFeedStoreTest, KeepsTripsBesideTheLines) {
     if (isDamaged) std::ofstream(FeedCache(folder.path() / "cache").trips("city")) << "damaged";
     const auto loaded = store.load(feed, {});
     ASSERT_TRUE(loaded);
-    EXPECT_EQ(loaded->trips("x"), 1u);
-    EXPECT_EQ(loaded->trips("y"), std::nullopt);
+    EXPECT_EQ(*loaded->trips("x"), 1u);
+    EXPECT_EQ(*loaded->trips("y"), std::nullopt);
   }
 }
 
@@ -250,7 +250,7 @@ class FeedConfigurationTest : public testing::Test {
 TEST_F(FeedConfigurationTest, KeepsFeedsInOrderAndEverythingElse) {
   EXPECT_TRUE(configuration.feeds()->empty());
   Feed second = feed("zweite-Linie.2", "alerts.pb");
-  second.minorAlerts = true;
+  second.minorAlerts = second.isCombined = true;
   second.maximumAlertsAge = std::chrono::minutes(90);
   ASSERT_FALSE(configuration.add(feed("metro")));
   ASSERT_FALSE(configuration.add(second));
@@ -292,7 +292,12 @@ TEST_F(FeedConfigurationTest, SaysWhatIsWrongWithTheFile) {
       {R"({"feeds": [{"name": "a", "static": "/x"}]})", "feed 1 in it has no text \"alerts\""},
       {R"({"feeds": [{"name": "a:b", "static": "/x", "alerts": "/y"}]})", "cannot be named \"a:b\""},
       {R"({"feeds": [{"name": "a", "static": "ftp://x", "alerts": "/y"}]})", "ftp://"},
-      {R"({"feeds": [{"name": "a", "static": "/x", "alerts": "/y", "maximumAlertsAgeMinutes": 0}]})", "no number from"},
+      {R"({"feeds": [{"name": "a", "static": "/x", "alerts": "/y", "maximumAlertsAgeMinutes": -1}]})",
+       "no number from 0"},
+      {R"({"feeds": [{"name": "a", "static": "/x", "alerts": "http://y", "maximumAlertsAgeMinutes": 0}]})",
+       "no number from 1"},
+      {R"({"feeds": [{"name": "a", "static": "/x", "alerts": "/y", "combined": "yes"}]})",
+       "\"combined\" that is neither"},
       {R"({"feeds": [{"name": "a", "static": "/x", "alerts": "/y"}, {"name": "a", "static": "/x", "alerts": "/y"}]})",
        "two feeds in it are named \"a\""},
   };

@@ -30,17 +30,21 @@ std::size_t rankOf(AlertField field) {
 
 AlertPeriod readPeriod(std::string_view body) {
   AlertPeriod period;
-  for (auto range = messageIn<TimeRangeField>(body); range.next();) {
-    switch (range.tag()) {
-      case TimeRangeField::start:
-        period.start = dateOfFeedTime(takeNumber(range));
-        break;
-      case TimeRangeField::end:
-        period.end = dateOfFeedTime(takeNumber(range));
-        break;
-      default:
-        range.skip();
+  try {
+    for (auto range = messageIn<TimeRangeField>(body); range.next();) {
+      switch (range.tag()) {
+        case TimeRangeField::start:
+          period.start = dateOfFeedTime(takeNumber(range));
+          break;
+        case TimeRangeField::end:
+          period.end = dateOfFeedTime(takeNumber(range));
+          break;
+        default:
+          range.skip();
+      }
     }
+  } catch (const protozero::exception&) {
+    return period;
   }
   return period;
 }

@@ -28,7 +28,8 @@ std::optional<Date> dateOfFeedTime(std::uint64_t time);
 
 /// Reads the periods of an Alert message: those of its impact, else of its communication, else its active periods. An
 /// alert that has none is always in force: one period without start and end. A period that ends at or before its start
-/// is dropped; an alert of which none is left is never in force. Throws protozero::exception for damaged bytes.
+/// is dropped; an alert of which none is left is never in force. What of a period is damaged is open. Throws
+/// protozero::exception for a message that breaks off.
 AlertPeriods alertPeriodsIn(std::string_view alert);
 
 /// The same time as periods that neither overlap nor touch, the earliest first: an incident is in force once at a time.

@@ -16,40 +16,62 @@ AlertEffect effectOf(std::uint64_t number) {
   return number >= kLeast && number <= kGreatest ? static_cast<AlertEffect>(number) : AlertEffect::unknownEffect;
 }
 
+/// Reads the next field; false at the end.
+bool readField(protozero::pbf_message<AlertField>& message, std::string_view alert, AlertView& view,
+               const std::function<void(const EntitySelector&)>& onSelector) {
+  const auto take = [&](std::string_view& text, std::string_view part) { text = text.empty() ? part : alert; };
+  if (!message.next()) return false;
+  switch (message.tag()) {
+    case AlertField::informedEntity: {
+      const std::string_view body = takeRequiredView(message);
+      EntitySelector selector;
+      try {
+        selector = readEntitySelector(body);
+      } catch (const protozero::exception&) {
+        view.isDamaged = true;
+        break;
+      }
+      ++view.selectors;
+      onSelector(selector);
+      break;
+    }
+    case AlertField::cause:
+      view.content.cause = causeOf(takeNumber(message));
+      break;
+    case AlertField::effect:
+      view.content.effect = effectOf(takeNumber(message));
+      break;
+    case AlertField::url:
+      take(view.content.url, takeView(message));
+      break;
+    case AlertField::headerText:
+      take(view.content.header, takeView(message));
+      break;
+    case AlertField::descriptionText:
+      take(view.content.description, takeView(message));
+      break;
+    case AlertField::effectDetail:
+      take(view.content.effectDetail, takeView(message));
+      break;
+    case AlertField::severityLevel:
+      view.isSevere = takeNumber(message) == kSeveritySevere;
+      break;
+    default:
+      message.skip();
+  }
+  return true;
+}
+
 }  // namespace
 
 AlertView readAlertView(std::string_view alert, const std::function<void(const EntitySelector&)>& onSelector) {
   AlertView view;
-  const auto take = [&](std::string_view& text, std::string_view message) { text = text.empty() ? message : alert; };
-  for (auto message = messageIn<AlertField>(alert); message.next();) {
-    switch (message.tag()) {
-      case AlertField::informedEntity:
-        onSelector(readEntitySelector(takeView(message)));
-        break;
-      case AlertField::cause:
-        view.content.cause = causeOf(takeNumber(message));
-        break;
-      case AlertField::effect:
-        view.content.effect = effectOf(takeNumber(message));
-        break;
-      case AlertField::url:
-        take(view.content.url, takeView(message));
-        break;
-      case AlertField::headerText:
-        take(view.content.header, takeView(message));
-        break;
-      case AlertField::descriptionText:
-        take(view.content.description, takeView(message));
-        break;
-      case AlertField::effectDetail:
-        take(view.content.effectDetail, takeView(message));
-        break;
-      case AlertField::severityLevel:
-        view.isSevere = takeNumber(message) == kSeveritySevere;
-        break;
-      default:
-        message.skip();
-    }
+  auto message = messageIn<AlertField>(alert);
+  try {
+    do view.body = alert.substr(0, alert.size() - message.length());
+    while (readField(message, alert, view, onSelector));
+  } catch (const protozero::exception&) {
+    view.isDamaged = true;
   }
   return view;
 }

@@ -36,17 +36,22 @@ struct AlertContent {
 
 /// What one pass over an Alert message tells about it.
 struct AlertView {
+  std::string_view body;  ///< the message, up to where it breaks off
   AlertContent content;
+  std::size_t selectors = 0;
   bool isSevere = false;
+  bool isDamaged = false;  ///< it breaks off, or one of its selectors does
 
-  /// Whether the alert changes nothing for most riders: it has no effect or is about accessibility, and is not severe.
+  /// Whether the alert changes nothing for most riders: it has no effect or is about accessibility, and is not severe,
+  /// which is not known of one that breaks off.
   bool isMinor() const {
-    return !isSevere && (content.effect == AlertEffect::noEffect || content.effect == AlertEffect::accessibilityIssue);
+    return !isSevere && !isDamaged &&
+           (content.effect == AlertEffect::noEffect || content.effect == AlertEffect::accessibilityIssue);
   }
 };
 
 /// Reads an Alert message and gives each of its selectors to `onSelector`. Causes and effects that are not known here
-/// count as the unknown one. Throws protozero::exception for damaged bytes.
+/// count as the unknown one. What is damaged is left out, and all behind it where the message breaks off.
 AlertView readAlertView(std::string_view alert, const std::function<void(const EntitySelector&)>& onSelector);
 
 }  // namespace nimbo

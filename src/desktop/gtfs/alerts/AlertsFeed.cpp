@@ -59,18 +59,22 @@ bool areApart(const Languages& languages, const Languages& others) {
 
 }  // namespace
 
+ErrorRef alertBreaksOff(const std::string& place) {
+  return badAlerts(
+      place, "one of its alerts breaks off before it says what it is about. Try again later, or tell the publisher.");
+}
+
 void AlertsFeed::readHeader(std::string_view body) {
-  _hasHeader = true;
   for (auto header = messageIn<FeedHeaderField>(body); header.next();) {
     switch (header.tag()) {
       case FeedHeaderField::gtfsRealtimeVersion:
-        _version = takeView(header);
+        _version = takeRequiredView(header);
         break;
       case FeedHeaderField::incrementality:
-        _isDifferential = takeNumber(header) == kIncrementalityDifferential;
+        _isDifferential = takeRequiredNumber(header) == kIncrementalityDifferential;
         break;
       case FeedHeaderField::timestamp:
-        _timestamp = dateOfFeedTime(takeNumber(header));
+        _timestamp = dateOfFeedTime(takeRequiredNumber(header));
         break;
       default:
         header.skip();
@@ -80,34 +84,61 @@ void AlertsFeed::readHeader(std::string_view body) {
 
 void AlertsFeed::readEntity(std::string_view body) {
   AlertEntity alert;
-  bool isDeleted = false, hasAlert = false, hasOther = false;
-  for (auto entity = messageIn<FeedEntityField>(body); entity.next();) {
-    switch (entity.tag()) {
-      case FeedEntityField::id:
-        alert.id = takeView(entity);
-        break;
-      case FeedEntityField::isDeleted:
-        isDeleted = takeNumber(entity) != 0;
-        break;
-      case FeedEntityField::alert:
-        alert.body = takeView(entity);
-        hasAlert = true;
-        break;
-      default:
-        hasOther = true;
-        entity.skip();
+  bool isDeleted = false, hasAlert = false;
+  std::size_t* other = nullptr;
+  auto entity = messageIn<FeedEntityField>(body);
+  try {
+    while (entity.next()) {
+      switch (entity.tag()) {
+        case FeedEntityField::id:
+          alert.id = takeView(entity);
+          break;
+        case FeedEntityField::isDeleted:
+          isDeleted = takeNumber(entity) != 0;
+          break;
+        case FeedEntityField::alert:
+          alert.body = takeRequiredView(entity);
+          hasAlert = true;
+          break;
+        default:
+          other = entity.tag() == FeedEntityField::vehicle      ? &_vehicles
+                  : entity.tag() == FeedEntityField::tripUpdate ? &_tripUpdates
+                                                                : &_others;
+          entity.skip();
+      }
+    }
+  } catch (const protozero::exception&) {
+    // What was read of an alert counts, whatever is wrong behind it.
+    if (!hasAlert && entity.tag() == FeedEntityField::alert &&
+        entity.wire_type() == protozero::pbf_wire_type::length_delimited) {
+      alert.body = body.substr(body.size() - entity.length());
+      hasAlert = alert.breaksOff = true;
+    }
+    if (!hasAlert) {
+      _skipped.add("entity that is damaged", alert.id);
+      _gap = alertBreaksOff(_place);
+      return;
     }
   }
+  if (hasAlert)
+    ++_alertEntities;
+  else if (other)
+    ++*other;
   if (isDeleted)
     _skipped.add("deleted entity", alert.id);
-  else if (!hasAlert && hasOther)
-    _skipped.add("entity that is no alert", alert.id);
   else if (!hasAlert)
-    _skipped.add("entity without content", alert.id);
-  else if (alert.id.empty())
-    _skipped.add("entity without id", {});
+    _skipped.add(other ? "entity that is no alert" : "entity without content", alert.id);
   else
     _alerts.push_back(alert);
+}
+
+std::string AlertsFeed::otherContent() const {
+  const std::string what = _vehicles > 0 && _tripUpdates > 0 ? "positions of vehicles and times of trips"
+                           : _vehicles > 0                   ? "positions of vehicles"
+                           : _tripUpdates > 0                ? "times of trips"
+                                                             : "something else";
+  return "it tells " + what +
+         " and holds no alert. Give the address of the alerts; where it is this one, set \"combined\" for it.";
 }
 
 void AlertsFeed::joinLanguages() {
@@ -121,13 +152,17 @@ void AlertsFeed::joinLanguages() {
   places.reserve(_alerts.size());
   std::size_t count = 0;
   for (AlertEntity alert : _alerts) {  // a copy: those that stay move up in place
+    if (alert.id.empty()) {
+      _alerts[count++] = alert;
+      continue;
+    }
     const auto [place, isNew] = places.try_emplace(alert.id, count);
     if (!isNew) {
       AlertEntity& other = _alerts[place->second];
       const auto [found, isSecond] = repeated.try_emplace(place->second);
       Repeated& first = found->second;
-      if (isSecond) first.languages = languagesOf(other.body);
-      if (auto languages = first.languages ? languagesOf(alert.body) : std::nullopt;
+      if (isSecond && !other.breaksOff) first.languages = languagesOf(other.body);
+      if (auto languages = first.languages && !alert.breaksOff ? languagesOf(alert.body) : std::nullopt;
           languages && areApart(*first.languages, *languages)) {
         // Messages one after the other are one message with the fields of both.
         if (!first.joined) first.joined = &_joined->emplace_back(other.body);
@@ -142,8 +177,9 @@ void AlertsFeed::joinLanguages() {
   _alerts.resize(count);
 }
 
-Outcome<AlertsFeed> AlertsFeed::read(std::string bytes, const std::string& place) {
+Outcome<AlertsFeed> AlertsFeed::read(std::string bytes, const std::string& place, bool isCombined) {
   AlertsFeed feed;
+  feed._place = place;
   feed._bytes = std::make_shared<const std::string>(std::move(bytes));
   if (feed._bytes->empty()) return badAlerts(place, whatElse({}));
   std::size_t entities = 0;
@@ -151,20 +187,16 @@ Outcome<AlertsFeed> AlertsFeed::read(std::string bytes, const std::string& place
     for (auto message = messageIn<FeedMessageField>(*feed._bytes); message.next();) {
       switch (message.tag()) {
         case FeedMessageField::header:
-          feed.readHeader(takeView(message));
+          feed.readHeader(takeRequiredView(message));
           break;
         case FeedMessageField::entity: {
-          const std::string_view body = takeView(message);
+          const std::string_view body = takeRequiredView(message);
           if (++entities > kMostEntities)
             return transitLineServiceError(TransitLineServiceError::tooLarge,
                                            "The alerts feed " + place + " holds more than " +
                                                std::to_string(kMostEntities) + " entities. Check the address.",
                                            place);
-          try {
-            feed.readEntity(body);
-          } catch (const protozero::exception&) {
-            feed._skipped.add("entity that is damaged", {});
-          }
+          feed.readEntity(body);
           break;
         }
         default:
@@ -174,10 +206,13 @@ Outcome<AlertsFeed> AlertsFeed::read(std::string bytes, const std::string& place
   } catch (const protozero::exception&) {
     return badAlerts(place, whatElse(*feed._bytes));
   }
-  if (!feed._hasHeader) return badAlerts(place, whatElse(*feed._bytes));
+  if (feed._version.empty()) return badAlerts(place, whatElse(*feed._bytes));
   if (feed._isDifferential)
     return badAlerts(place,
                      "it tells only what changed (incrementality DIFFERENTIAL). Ask the publisher for a whole feed.");
+  if (feed.hasOthers() && feed._alertEntities == 0 && !isCombined)
+    return transitLineServiceError(TransitLineServiceError::otherFeed,
+                                   "The alerts feed " + place + " is another one: " + feed.otherContent(), place);
   feed.joinLanguages();
   return feed;
 }

@@ -1,8 +1,13 @@
 #include "desktop/gtfs/alerts/AlertsStore.h"
 
+#include <algorithm>
 #include <array>
 #include <charconv>
 #include <cmath>
+#include <ctime>
+#include <iomanip>
+#include <locale>
+#include <sstream>
 
 #include "desktop/gtfs/feeds/TransitLineServiceError.h"
 #include "desktop/gtfs/net/FileReading.h"
@@ -15,9 +20,9 @@ namespace nimbo {
 namespace {
 
 // Lines, then an empty one, then the body: what the file is, the address, ETag, Last-Modified, microseconds since 1970
-// of the answer, the body's checksum.
-constexpr std::string_view kFirstLine = "nimbo-alerts 1";
-constexpr std::size_t kLines = 6;
+// of the answer and of the first one with this body, the body's checksum.
+constexpr std::string_view kFirstLine = "nimbo-alerts 2";
+constexpr std::size_t kLines = 7;
 constexpr std::uint64_t kLargestFile = 65 << 20;
 
 template <class T>
@@ -42,14 +47,17 @@ std::optional<KeptAlerts> KeptAlerts::read(const std::filesystem::path& path, co
     rest.remove_prefix(end + 1);
   }
   const auto fetchedAt = numberIn<std::int64_t>(lines[4]);
-  const auto checksum = numberIn<std::uint64_t>(lines[5]);
-  if (lines[0] != kFirstLine || lines[1] != address.text() || !fetchedAt || !checksum || !rest.starts_with('\n'))
+  const auto changedAt = numberIn<std::int64_t>(lines[5]);
+  const auto checksum = numberIn<std::uint64_t>(lines[6]);
+  if (lines[0] != kFirstLine || lines[1] != address.text() || !fetchedAt || !changedAt || !checksum ||
+      !rest.starts_with('\n'))
     return std::nullopt;
   rest.remove_prefix(1);
   if (flatChecksum(rest) != *checksum) return std::nullopt;
   return KeptAlerts{std::string(lines[1]),
                     {std::string(lines[2]), std::string(lines[3])},
                     Date(std::chrono::microseconds(*fetchedAt)),
+                    Date(std::chrono::microseconds(*changedAt)),
                     std::string(rest)};
 }
 
@@ -57,7 +65,7 @@ ErrorRef KeptAlerts::write(const std::filesystem::path& path) const {
   std::string bytes(kFirstLine);
   for (const std::string& line :
        {address, validators.etag, validators.lastModified, std::to_string(fetchedAt.time_since_epoch().count()),
-        std::to_string(flatChecksum(body))})
+        std::to_string(changedAt.time_since_epoch().count()), std::to_string(flatChecksum(body))})
     bytes.append(1, '\n').append(line);
   return writeFileAtomically(path, bytes.append("\n\n").append(body));
 }
@@ -67,6 +75,7 @@ namespace {
 constexpr std::uint64_t kLargestAlerts = 64 << 20;
 constexpr std::chrono::seconds kFetchTimeLimit{30};
 constexpr TimeInterval kLongestStandIn = 15 * 60;
+constexpr TimeInterval kLongestUndated = 7 * 86400;  // of a server whose feed does not say when it was made
 constexpr TimeInterval kClockTolerance = 60;  // a little into the future is a clock being set, a lot is a wrong clock
 
 TimeInterval ageOf(Date date) { return -intervalFromNow(date); }
@@ -79,10 +88,47 @@ std::string ageText(TimeInterval seconds) {
   return std::to_string(minutes / (24 * 60)) + " days";
 }
 
+/// Absent for a file that counts for ever.
+std::optional<TimeInterval> longestAgeOf(const Feed& feed, const AlertsFeed& alerts) {
+  const bool isRemote = feed.alerts.isRemote();
+  const auto limit = feed.maximumAlertsAge.value_or(isRemote ? kDefaultMaximumAlertsAge : kDefaultMaximumFileAge);
+  if (limit.count() == 0) return std::nullopt;
+  const auto seconds = static_cast<TimeInterval>(std::chrono::seconds(limit).count());
+  return isRemote && !alerts.timestamp() ? std::max(seconds, kLongestUndated) : seconds;
+}
+
+/// The date of a Last-Modified field; absent for one that is none. Source: RFC 9110, section 5.6.7.
+std::optional<Date> dateOfHTTPText(const std::string& text) {
+  std::tm parts{};
+  std::istringstream in(text);
+  in.imbue(std::locale::classic());
+  in >> std::get_time(&parts, "%a, %d %b %Y %H:%M:%S GMT");
+  if (in.fail()) return std::nullopt;
+  return dateFromUnixTime(static_cast<TimeInterval>(::timegm(&parts)));
+}
+
+/// The alerts in a body; `undated` is when they were made where they do not say.
+Outcome<FetchedAlerts> readBody(const Feed& feed, std::string body, std::optional<Date> undated) {
+  auto alerts = AlertsFeed::read(std::move(body), feed.alerts.publicText(), feed.isCombined);
+  if (!alerts) return alerts.error();
+  const Date date = alerts->timestamp().value_or(undated.value_or(Date()));
+  return FetchedAlerts{std::move(*alerts), date};
+}
+
+std::optional<Date> undatedOf(const KeptAlerts& kept) {
+  return dateOfHTTPText(kept.validators.lastModified).value_or(kept.changedAt);
+}
+
 /// Whether an answer that was good once may stand in for one that does not come.
-bool canStandIn(const Feed& feed, const KeptAlerts& kept, const AlertsFeed& alerts) {
+bool canStandIn(const Feed& feed, const KeptAlerts& kept, const FetchedAlerts& alerts) {
   const TimeInterval age = ageOf(kept.fetchedAt);
   return age > -kClockTolerance && age <= kLongestStandIn && !AlertsStore::staleness(feed, alerts);
+}
+
+/// Whether the publisher went back. A held stamp that is ahead of the clock was a wrong one.
+bool isOlder(const AlertsFeed& alerts, const AlertsFeed& held) {
+  return alerts.timestamp() && held.timestamp() && *alerts.timestamp() < *held.timestamp() &&
+         *held.timestamp() <= currentDate();
 }
 
 void keep(const KeptAlerts& kept, const std::filesystem::path& path) {
@@ -91,12 +137,12 @@ void keep(const KeptAlerts& kept, const std::filesystem::path& path) {
 
 }  // namespace
 
-ErrorRef AlertsStore::staleness(const Feed& feed, const AlertsFeed& alerts) {
-  if (!feed.alerts.isRemote() || !alerts.timestamp()) return nullptr;
-  const TimeInterval age = ageOf(*alerts.timestamp());
-  if (std::abs(age) <= static_cast<TimeInterval>(std::chrono::seconds(feed.maximumAlertsAge).count())) return nullptr;
+ErrorRef AlertsStore::staleness(const Feed& feed, const FetchedAlerts& alerts) {
+  const auto longest = longestAgeOf(feed, alerts.feed);
+  const TimeInterval age = ageOf(alerts.madeAt);
+  if (!longest || std::abs(age) <= *longest) return nullptr;
   const std::string what = age > 0
-                               ? " was last renewed by its publisher " + ageText(age) + " ago. Try again later"
+                               ? " was last renewed " + ageText(age) + " ago. Try again later"
                                : " is " + ageText(-age) + " ahead of the clock of this machine. Set the clock right";
   return transitLineServiceError(TransitLineServiceError::staleAlerts,
                                  "The alerts feed " + feed.alerts.publicText() + what +
@@ -105,12 +151,16 @@ ErrorRef AlertsStore::staleness(const Feed& feed, const AlertsFeed& alerts) {
                                  feed.alerts.publicText());
 }
 
-Outcome<AlertsFeed> AlertsStore::fetch(const Feed& feed, const std::stop_token& stop) const {
+Outcome<FetchedAlerts> AlertsStore::readLocal(const Feed& feed) const {
+  // Before the bytes: a file that is written meanwhile is no younger than it seems.
+  const auto changedAt = fileChangeDate(feed.alerts.path());
+  auto bytes = readFile(feed.alerts.path(), kLargestAlerts);
+  return bytes ? readBody(feed, std::move(*bytes), changedAt) : bytes.error();
+}
+
+Outcome<FetchedAlerts> AlertsStore::fetch(const Feed& feed, const std::stop_token& stop) const {
+  if (!feed.alerts.isRemote()) return readLocal(feed);
   const std::string place = feed.alerts.publicText();
-  if (!feed.alerts.isRemote()) {
-    auto bytes = readFile(feed.alerts.path(), kLargestAlerts);
-    return bytes ? AlertsFeed::read(std::move(*bytes), place) : bytes.error();
-  }
   const std::filesystem::path path = _cache.alerts(feed.name);
   auto kept = KeptAlerts::read(path, feed.alerts);
   std::string body;
@@ -121,30 +171,33 @@ Outcome<AlertsFeed> AlertsStore::fetch(const Feed& feed, const std::stop_token& 
   });
   if (!answer) return answer.error();
   if (answer->isUnchanged) body = kept->body;
-  auto alerts = AlertsFeed::read(body, place);
+  const bool isSame = kept && body == kept->body;
+  KeptAlerts present{feed.alerts.text(), answer->validators, currentDate(), isSame ? kept->changedAt : currentDate(),
+                     std::move(body)};
+  auto alerts = readBody(feed, present.body, undatedOf(present));
   if (!alerts) return alerts;
-  if (kept && !answer->isUnchanged) {
-    const auto held = AlertsFeed::read(std::move(kept->body), place);
-    if (held && canStandIn(feed, *kept, *held) && alerts->timestamp() < held->timestamp())
+  if (kept && !isSame) {
+    const auto held = readBody(feed, std::move(kept->body), undatedOf(*kept));
+    if (held && isOlder(alerts->feed, held->feed))
       return transitLineServiceError(TransitLineServiceError::staleAlerts,
                                      "The alerts feed " + place + " went back to an older state. Try again later.",
                                      place);
   }
-  keep({feed.alerts.text(), answer->validators, currentDate(), std::move(body)}, path);
+  keep(present, path);
   return alerts;
 }
 
 Outcome<AlertsFeed> AlertsStore::load(const Feed& feed, const std::stop_token& stop) const {
   auto fetched = fetch(feed, stop);
-  ErrorRef error = fetched ? staleness(feed, *fetched) : fetched.error();
-  if (!error || !feed.alerts.isRemote()) return fetched;
-  if (!fetched) {
+  const ErrorRef error = fetched ? staleness(feed, *fetched) : fetched.error();
+  if (!error) return std::move(fetched->feed);
+  if (feed.alerts.isRemote() && !fetched) {
     if (auto kept = KeptAlerts::read(_cache.alerts(feed.name), feed.alerts)) {
-      auto held = AlertsFeed::read(std::move(kept->body), feed.alerts.publicText());
+      auto held = readBody(feed, std::move(kept->body), undatedOf(*kept));
       if (held && canStandIn(feed, *kept, *held)) {
         writeLog(kFeedLogFacility, LogLevel::error, "The last alerts of %{private}@ stand in: %{private}@",
                  {feed.name, error->reason()});
-        return held;
+        return std::move(held->feed);
       }
     }
   }

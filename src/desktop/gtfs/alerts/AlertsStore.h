@@ -20,6 +20,7 @@ struct KeptAlerts {
   std::string address;
   HTTPValidators validators;
   Date fetchedAt;  ///< when the server last said that this is the present state
+  Date changedAt;  ///< when the body was first seen
   std::string body;
 
   /// Absent when there is none at `path`, it is damaged, or of another address.
@@ -28,9 +29,18 @@ struct KeptAlerts {
   ErrorRef write(const std::filesystem::path& path) const;
 };
 
-/// Gets the present alerts of a feed. A file counts as present whenever it can be read: it is what the user gave. An
-/// answer of a server counts for as long after its own timestamp as the feed's setting says, and is never older than
-/// the one held. Blocks its thread; any thread.
+/// The alerts of a feed, and how old they are.
+struct FetchedAlerts {
+  AlertsFeed feed;
+  /// By the header; where that says nothing, by Last-Modified or the file's own time, else by when the bytes were first
+  /// seen.
+  Date madeAt;
+};
+
+/// Gets the present alerts of a feed. They count for as long after they were made as the feed's setting says: by
+/// default a quarter of an hour for an answer of a server, and a day for a file, which somebody has to put there. An
+/// answer whose header does not say when it was made counts for seven days. None is older than the one held. Blocks its
+/// thread; any thread.
 class AlertsStore {
  public:
   explicit AlertsStore(FeedCache cache) : _cache(std::move(cache)) {}
@@ -39,13 +49,15 @@ class AlertsStore {
   Outcome<AlertsFeed> load(const Feed& feed, const std::stop_token& stop) const;
 
   /// What the source says now, however old.
-  Outcome<AlertsFeed> fetch(const Feed& feed, const std::stop_token& stop) const;
+  Outcome<FetchedAlerts> fetch(const Feed& feed, const std::stop_token& stop) const;
 
-  /// Null when the feed's own timestamp is near enough for its setting, or missing; also for a file. One that is as far
-  /// ahead is no better than an old one: by a clock that is wrong, an incident in force counts as one to come.
-  static ErrorRef staleness(const Feed& feed, const AlertsFeed& alerts);
+  /// Null when the alerts are near enough to now for the feed's setting. Ones that are as far ahead are no better than
+  /// old ones: by a clock that is wrong, an incident in force counts as one to come.
+  static ErrorRef staleness(const Feed& feed, const FetchedAlerts& alerts);
 
  private:
+  Outcome<FetchedAlerts> readLocal(const Feed& feed) const;
+
   FeedCache _cache;
 };
 

@@ -2,7 +2,7 @@
 
 #include <algorithm>
 #include <map>
-#include <protozero/exception.hpp>
+#include <set>
 #include <tuple>
 #include <unordered_map>
 #include <unordered_set>
@@ -11,12 +11,15 @@
 #include "desktop/gtfs/alerts/AlertTexts.h"
 #include "desktop/gtfs/alerts/AlertView.h"
 #include "desktop/gtfs/feeds/FeedMuid.h"
+#include "desktop/gtfs/feeds/TransitLineServiceError.h"
+#include "desktop/gtfs/text/Identifier.h"
 
 namespace nimbo {
 
 namespace {
 
-constexpr std::size_t kMostIncidents = 5000;  // whole countries have fewer; each costs memory on every line
+constexpr std::size_t kFewestForeignRoutes = 3;  // fewer may be lines that the static feed does not have yet
+constexpr std::size_t kMostIncidents = 5000;     // whole countries have fewer; each costs memory on every line
 
 /// An alert, or several of one content.
 struct Incident {
@@ -49,6 +52,8 @@ std::string_view reasonFor(SelectorFit fit) {
       return "agency that the static feed does not have";
     case SelectorFit::unknownTrip:
       return "trip without a route, not in the static feed";
+    case SelectorFit::tripsMissing:
+      return "trip without a route (the trips cannot be read)";
     case SelectorFit::noLineOfType:
       return "route type that no line has";
     case SelectorFit::contradiction:
@@ -75,21 +80,29 @@ std::string exampleOf(const EntitySelector& selector) {
 class IncidentBuilder {
  public:
   IncidentBuilder(const AlertsFeed& alerts, const StaticFeed& feed, const IncidentQuery& query)
-      : _alerts(alerts), _query(query), _matcher(feed, indicesOf(query), query.trips) {
-    _reading.incidents.resize(query.lines.size());
+      : _alerts(alerts),
+        _feed(feed),
+        _query(query),
+        _matcher(feed, indicesOf(query), query.trips),
+        _gap(alerts.gap()),
+        _incidentsOfLines(query.lines.size()) {
+    for (std::size_t i = 0; i < query.lines.size(); ++i)
+      for (const std::string& former : query.lines[i].formerRouteIDs) _matcher.addRoute(former, i);
     _sizes.reserve(alerts.alerts().size());
   }
 
   IncidentReading build() {
-    for (const AlertEntity& alert : _alerts.alerts()) {
-      try {
-        take(alert);
-      } catch (const protozero::exception&) {
-        _reading.skipped.add("alert that is damaged", alert.id);
-      }
-    }
+    for (const AlertEntity& alert : _alerts.alerts()) take(alert);
+    if (!_belongs && _foreignRoutes.size() >= kFewestForeignRoutes)
+      lacks(transitLineServiceError(
+          TransitLineServiceError::foreignAlerts,
+          "The alerts feed " + _alerts.place() + " names routes that its static feed does not have, such as " +
+              *_foreignRoutes.begin() + ", and none that it has. Check that the two belong together.",
+          _alerts.place()));
     if (!_incidents.empty()) takeLeastKeys();
     for (const Incident& incident : _incidents) emit(incident);
+    for (TransitIncidents& incidents : _incidentsOfLines)
+      _reading.verdicts.push_back(Verdict::of(std::move(incidents), _gap));
     return std::move(_reading);
   }
 
@@ -100,36 +113,52 @@ class IncidentBuilder {
     return indices;
   }
 
-  /// The identifier; where alerts share one, with the content, since the number may not depend on positions.
+  /// The identifier; where alerts share one, or have none, with the content, since the number may not depend on
+  /// positions.
   static std::string keyOf(const AlertEntity& alert) {
     std::string key(alert.id);
-    if (alert.isRepeated) key.append(1, '\0').append(std::to_string(hashOfBytes(alert.body)));
+    if (alert.isRepeated || alert.id.empty()) key.append(1, '\0').append(std::to_string(hashOfBytes(alert.body)));
     return key;
   }
 
   void take(const AlertEntity& alert) {
     _lines.clear();
-    const AlertView view = readAlertView(alert.body, [&](const EntitySelector& selector) { takeSelector(selector); });
+    _hasTrips = _hasRoutes = false;
+    AlertView view = readAlertView(alert.body, [&](const EntitySelector& selector) { takeSelector(selector); });
+    view.isDamaged = view.isDamaged || alert.breaksOff;
+    if (view.isDamaged && view.selectors == 0) {
+      _reading.skipped.add("alert that is damaged", alert.id);
+      return lacks(alertBreaksOff(_alerts.place()));
+    }
     _sizes.emplace_back(&alert, view.content.sizeHash());
+    if (_lines.empty() && !_hasTrips && (_belongs || !_hasRoutes)) return;
+    AlertPeriods periods = alertPeriodsIn(view.body);
+    const std::size_t published = periods.published;
+    const bool isNever = periods.periods.empty();
+    // Before each line gets its copy: an alert may have millions.
+    const auto mattering = periodsThatMatter(joinedPeriods(std::move(periods.periods)), _query.now);
+    if (_hasRoutes && !_belongs && isInForce(mattering)) takeRoutes(view);
+    const bool isLeftOut = view.isMinor() && !_query.minorAlerts;
+    if (_hasTrips && !isLeftOut && !mattering.empty()) takeTrips(view, isInForce(mattering));
     if (_lines.empty()) return;
-    if (view.isMinor() && !_query.minorAlerts) {
+    if (isLeftOut) {
       _reading.skipped.add("alert without effect on the service, or about accessibility", alert.id);
       return;
     }
-    AlertPeriods periods = alertPeriodsIn(alert.body);
-    _reading.periods += periods.published;
-    if (periods.periods.empty()) {
+    _reading.periods += published;
+    if (isNever) {
       _reading.skipped.add("alert whose periods end before they start", alert.id);
       return;
     }
-    // Before each line gets its copy: an alert may have millions.
-    const auto mattering = periodsThatMatter(joinedPeriods(std::move(periods.periods)), _query.now);
     if (_incidents.size() == kMostIncidents) {
-      _reading.isCutShort = true;
       _reading.skipped.add("alert after the first 5000 incidents", alert.id);
-      return;
+      return lacks(
+          transitLineServiceError(TransitLineServiceError::tooLarge,
+                                  "The alerts feed " + _alerts.place() +
+                                      " has more incidents on these lines than any network has. Check the address.",
+                                  _alerts.place()));
     }
-    const auto index = incidentOf(alert, view.content);
+    const auto index = incidentOf(alert, view);
     if (!index) {
       _reading.skipped.add("alert that says nothing", alert.id);
       return;
@@ -142,19 +171,102 @@ class IncidentBuilder {
     }
   }
 
+  void lacks(ErrorRef gap) {
+    if (!_gap) _gap = std::move(gap);
+  }
+
+  bool isInForce(const std::vector<AlertPeriod>& periods) const {
+    return std::any_of(periods.begin(), periods.end(), [&](const AlertPeriod& period) {
+      return (!period.start || *period.start <= _query.now) && (!period.end || *period.end >= _query.now);
+    });
+  }
+
+  static std::string_view routeOf(const EntitySelector& selector) {
+    return selector.routeID.empty() ? selector.tripRouteID : selector.routeID;
+  }
+  static bool isByTripAlone(const EntitySelector& selector) {
+    return routeOf(selector).empty() && !selector.tripID.empty();
+  }
+
   void takeSelector(const EntitySelector& selector) {
     ++_reading.selectors;
-    const SelectorFit fit = _matcher.match(selector, [&](std::size_t place, bool isWholeLine) {
+    // Trips are a table of their own, which only alerts that would be shown are worth.
+    if (isByTripAlone(selector) && !_query.countsUnfit)
+      _hasTrips = true;
+    else if (match(selector) == SelectorFit::tripsMissing)
+      _hasTrips = true;
+    _hasRoutes = _hasRoutes || !routeOf(selector).empty();
+  }
+
+  SelectorFit match(const EntitySelector& selector) {
+    const auto take = [&](std::size_t place, bool isWholeLine) {
       bool& flag = _lines[place];
       flag = flag || isWholeLine;
-    });
+    };
+    SelectorFit fit = _matcher.match(selector, take);
+    if (fit == SelectorFit::unknownAgency && isOnlyAgencyMeant()) {
+      EntitySelector meant = selector;
+      meant.agencyID = _feed.agency(0).id;
+      fit = _matcher.match(meant, take);
+    }
     if (_query.countsUnfit && fit != SelectorFit::lines) _reading.unfit.add(reasonFor(fit), exampleOf(selector));
+    return fit;
+  }
+
+  /// Whether the static feed's only agency is the one that all selectors name, by another identifier.
+  bool isOnlyAgencyMeant() {
+    if (!_isOnlyAgencyMeant) {
+      _isOnlyAgencyMeant = _feed.agencyCount() == 1;
+      std::string_view agency;
+      for (const AlertEntity& alert : _alerts.alerts()) {
+        if (!*_isOnlyAgencyMeant) break;
+        readAlertView(alert.body, [&](const EntitySelector& selector) {
+          if (agency.empty()) agency = selector.agencyID;
+          if (selector.agencyID.empty() || selector.agencyID != agency) _isOnlyAgencyMeant = false;
+        });
+      }
+    }
+    return *_isOnlyAgencyMeant;
+  }
+
+  // What follows goes through the selectors again, which few alerts need: there may be millions to remember.
+
+  /// The routes of an alert in force, until one shows that the alerts are about the static feed's lines.
+  void takeRoutes(const AlertView& view) {
+    if (_knownRoutes.empty()) {
+      for (std::size_t i = 0; i < _feed.lineCount(); ++i) _knownRoutes.insert(_feed.line(i).routeID);
+      for (const IncidentQuery::Line& line : _query.lines)
+        _knownRoutes.insert(line.formerRouteIDs.begin(), line.formerRouteIDs.end());
+    }
+    readAlertView(view.body, [&](const EntitySelector& selector) {
+      const Identifier route(routeOf(selector));
+      if (_belongs || route.text().empty()) return;
+      _belongs = _knownRoutes.contains(route.text());
+      if (_foreignRoutes.size() < kFewestForeignRoutes) _foreignRoutes.emplace(route.text());
+    });
+  }
+
+  /// The selectors by trip alone, once it is known that their alert would be shown.
+  void takeTrips(const AlertView& view, bool isInForce) {
+    bool isMissing = _query.countsUnfit;  // else there would be none left
+    readAlertView(view.body, [&](const EntitySelector& selector) {
+      if (!isMissing && isByTripAlone(selector)) isMissing = match(selector) == SelectorFit::tripsMissing;
+    });
+    if (isMissing && isInForce && textsOf(view)) lacks(_matcher.tripsError());
+  }
+
+  /// Absent for an alert that says nothing. One that breaks off always says something.
+  std::optional<AlertTexts> textsOf(const AlertView& view) const {
+    auto texts = alertTextsIn(view.body, view.content.effect, _query.language);
+    if (!texts && view.isDamaged) texts = alertTextsIn(view.body, AlertEffect::otherEffect, _query.language);
+    return texts;
   }
 
   /// The incident that the alert is, or is one of; absent for one that says nothing. Texts are read once a content.
-  std::optional<std::size_t> incidentOf(const AlertEntity& alert, const AlertContent& content) {
+  std::optional<std::size_t> incidentOf(const AlertEntity& alert, const AlertView& view) {
+    const AlertContent& content = view.content;
     if (const auto known = _incidentOfContent.find(content); known != _incidentOfContent.end()) return known->second;
-    const auto texts = alertTextsIn(alert.body, content.effect, _query.language);
+    const auto texts = textsOf(view);
     if (!texts) return std::nullopt;
     // Texts of one language may agree where those of others differ.
     const auto [place, isNew] = _incidentOfTexts.try_emplace(
@@ -197,15 +309,24 @@ class IncidentBuilder {
       for (const AlertPeriod& period : periodsThatMatter(joinedPeriods(onLine.periods), _query.now)) {
         TransitIncidentRef& object = made[{period.start, period.end, isBlocking}];
         if (!object) object = std::make_shared<const AlertIncident>(shared, period.start, period.end, isBlocking);
-        _reading.incidents[place].push_back(object);
+        _incidentsOfLines[place].push_back(object);
       }
     }
   }
 
   const AlertsFeed& _alerts;
+  const StaticFeed& _feed;
   const IncidentQuery& _query;
   SelectorMatcher _matcher;
+  ErrorRef _gap;  // the first
+  std::vector<TransitIncidents> _incidentsOfLines;
   IncidentReading _reading;
+  bool _hasTrips = false;                // the alert at hand has selectors by trip alone that were not matched
+  bool _hasRoutes = false;               // the alert at hand names routes
+  bool _belongs = false;                 // an alert in force names a route of the static feed
+  std::set<std::string> _foreignRoutes;  // named by alerts in force; the first few
+  std::unordered_set<std::string_view> _knownRoutes;
+  std::optional<bool> _isOnlyAgencyMeant;  // absent until asked
   std::map<std::size_t, bool> _lines;  // of the alert at hand: place in the query, whether it is about the whole line
   std::vector<std::pair<const AlertEntity*, std::size_t>> _sizes;  // `sizeHash` of all alerts
   std::vector<Incident> _incidents;

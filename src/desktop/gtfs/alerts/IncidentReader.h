@@ -6,6 +6,7 @@
 
 #include "desktop/gtfs/alerts/AlertsFeed.h"
 #include "desktop/gtfs/alerts/SelectorMatcher.h"
+#include "desktop/gtfs/alerts/Verdict.h"
 #include "desktop/gtfs/feeds/SkipReport.h"
 #include "desktop/gtfs/text/Translation.h"
 #include "platform/transit/TransitIncident.h"
@@ -41,6 +42,8 @@ struct IncidentQuery {
   struct Line {
     std::uint32_t index;  ///< in the static feed; once in the query
     std::uint64_t muid;   ///< the number under which incidents name it
+    /// Identifiers that the line had before, which no line of the static feed has now: alerts may still name them.
+    std::vector<std::string> formerRouteIDs = {};
   };
 
   std::string feed;  ///< the feed's name
@@ -54,15 +57,17 @@ struct IncidentQuery {
 
 /// The alerts of a feed as incidents of lines, and what was found on the way.
 struct IncidentReading {
-  std::vector<TransitIncidents> incidents;  ///< for each line of the query, in the feed's order and then by date
-  std::size_t periods = 0;                  ///< published ones of the alerts that concern the lines
-  std::size_t selectors = 0;                ///< of all alerts
-  SkipReport skipped;                       ///< alerts that make no incident, by reason
-  bool isCutShort = false;                  ///< the lines have more incidents than any network has: no verdict
-  SkipReport unfit;                         ///< selectors that fit no line, by reason
+  /// For each line of the query; incidents in the feed's order and then by date. Unknown, all of them, where alerts
+  /// break off before they say what they are about, need trips that cannot be had, belong to another static feed, or
+  /// are more than any network has.
+  std::vector<Verdict> verdicts;
+  std::size_t periods = 0;    ///< published ones of the alerts that concern the lines
+  std::size_t selectors = 0;  ///< of all alerts
+  SkipReport skipped;         ///< alerts that make no incident, by reason
+  SkipReport unfit;           ///< selectors that fit no line, by reason
 };
 
-/// Turns alerts into the incidents of the lines asked for; other alerts are only looked at. Alerts of one content
+/// Turns alerts into verdicts on the lines asked for; other alerts are only looked at. Alerts of one content
 /// (texts, address, cause, effect) are one incident, with one number, on the lines of all of them: each line has it in
 /// the periods of the alerts that name the line. The number is made from the least of their identifiers, those of
 /// other lines among them, so that it does not depend on what is asked for, and stays when a text changes. Of alerts

@@ -71,7 +71,8 @@ inline constexpr std::int32_t kUnknownCause = 1;
 /// Alert.SeverityLevel.
 inline constexpr std::int32_t kSeveritySevere = 4;
 
-// How GTFS-Realtime messages are gone through: fields of an unexpected wire type are passed over like unknown ones.
+// How GTFS-Realtime messages are gone through: fields of an unexpected wire type are passed over like unknown ones, but
+// for those that say good service where they are missing.
 
 /// The present field as a text, bytes or a message; empty, and the field passed over, when it is of another wire type.
 template <class Message>
@@ -92,6 +93,21 @@ std::uint64_t takeNumber(Message& message) {
     return 0;
   }
   return message.get_uint64();
+}
+
+/// The present field as a text, bytes or a message. Throws protozero::exception when it is of another wire type.
+template <class Message>
+std::string_view takeRequiredView(Message& message) {
+  if (message.wire_type() != protozero::pbf_wire_type::length_delimited)
+    throw protozero::unknown_pbf_wire_type_exception();
+  return takeView(message);
+}
+
+/// The present field as a number. Throws protozero::exception when it is of another wire type.
+template <class Message>
+std::uint64_t takeRequiredNumber(Message& message) {
+  if (message.wire_type() != protozero::pbf_wire_type::varint) throw protozero::unknown_pbf_wire_type_exception();
+  return takeNumber(message);
 }
 
 /// A reader of the message in these bytes by its field enumeration.

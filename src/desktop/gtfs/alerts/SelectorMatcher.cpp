@@ -1,6 +1,7 @@
 #include "desktop/gtfs/alerts/SelectorMatcher.h"
 
 #include "desktop/gtfs/alerts/RealtimeFields.h"
+#include "desktop/gtfs/text/Identifier.h"
 
 namespace nimbo {
 
@@ -11,10 +12,10 @@ void readTrip(std::string_view body, EntitySelector& selector) {
   for (auto trip = messageIn<TripDescriptorField>(body); trip.next();) {
     switch (trip.tag()) {
       case TripDescriptorField::tripID:
-        selector.tripID = takeView(trip);
+        selector.tripID = takeRequiredView(trip);
         break;
       case TripDescriptorField::routeID:
-        selector.tripRouteID = takeView(trip);
+        selector.tripRouteID = takeRequiredView(trip);
         break;
       default:
         trip.skip();
@@ -29,19 +30,19 @@ EntitySelector readEntitySelector(std::string_view body) {
   for (auto selector = messageIn<EntitySelectorField>(body); selector.next();) {
     switch (selector.tag()) {
       case EntitySelectorField::agencyID:
-        result.agencyID = takeView(selector);
+        result.agencyID = takeRequiredView(selector);
         break;
       case EntitySelectorField::routeID:
-        result.routeID = takeView(selector);
+        result.routeID = takeRequiredView(selector);
         break;
       case EntitySelectorField::routeType:
-        result.routeType = static_cast<RouteType>(takeNumber(selector));
+        result.routeType = static_cast<RouteType>(takeRequiredNumber(selector));
         break;
       case EntitySelectorField::trip:
-        readTrip(takeView(selector), result);
+        readTrip(takeRequiredView(selector), result);
         break;
       case EntitySelectorField::stopID:
-        result.hasStop = !takeView(selector).empty();
+        result.hasStop = !takeRequiredView(selector).empty();
         break;
       case EntitySelectorField::directionID:
         result.hasDirection = true;
@@ -74,7 +75,20 @@ SelectorMatcher::SelectorMatcher(const StaticFeed& feed, std::span<const std::ui
   }
 }
 
+void SelectorMatcher::addRoute(std::string_view id, std::size_t place) { _placeOfRoute.emplace(id, place); }
+
 SelectorFit SelectorMatcher::match(const EntitySelector& selector, const Handler& handler) const {
+  const Identifier agency(selector.agencyID), route(selector.routeID), trip(selector.tripID),
+      tripRoute(selector.tripRouteID);
+  EntitySelector clean = selector;
+  clean.agencyID = agency.text();
+  clean.routeID = route.text();
+  clean.tripID = trip.text();
+  clean.tripRouteID = tripRoute.text();
+  return matchClean(clean, handler);
+}
+
+SelectorFit SelectorMatcher::matchClean(const EntitySelector& selector, const Handler& handler) const {
   std::string_view route = selector.routeID;
   if (route.empty())
     route = selector.tripRouteID;
@@ -101,9 +115,13 @@ SelectorFit SelectorMatcher::matchOne(std::size_t place, const EntitySelector& s
 }
 
 SelectorFit SelectorMatcher::matchTrip(const EntitySelector& selector, const Handler& handler) const {
-  const auto line = _trips ? _trips(selector.tripID) : std::nullopt;
-  if (!line) return SelectorFit::unknownTrip;
-  const auto place = _placeOfLine.find(*line);
+  const auto line = _trips(selector.tripID);
+  if (!line) {
+    _tripsError = line.error();
+    return SelectorFit::tripsMissing;
+  }
+  if (!*line) return SelectorFit::unknownTrip;
+  const auto place = _placeOfLine.find(**line);
   return place == _placeOfLine.end() ? SelectorFit::unknownRoute : matchOne(place->second, selector, handler);
 }
 

@@ -9,6 +9,7 @@
 #include <vector>
 
 #include "desktop/gtfs/static/StaticFeed.h"
+#include "platform/foundation/Outcome.h"
 
 namespace nimbo {
 
@@ -34,19 +35,21 @@ enum class SelectorFit {
   unknownRoute,
   unknownAgency,
   unknownTrip,
+  tripsMissing,  ///< the trips that would tell cannot be had
   noLineOfType,
   contradiction,  ///< a route that is not of the agency or trip beside it
   nothingNamed,
 };
 
-/// Finds the lines that selectors of alerts concern. The fields of a selector hold together: a route of an agency is
-/// that route. An agency that the static feed does not know, or any route type, takes nothing away from a route that it
-/// does know.
-/// Source: https://gtfs.org/documentation/realtime/reference/#message-entityselector
+/// Finds the lines that selectors of alerts concern, by identifiers that are cleaned as those of the static feed are.
+/// The fields of a selector hold together: a route of an agency is that route. An agency that the static feed does not
+/// know, or any route type, takes nothing away from a route that it does know. Source:
+/// https://gtfs.org/documentation/realtime/reference/#message-entityselector
 class SelectorMatcher {
  public:
-  /// The index of a trip's line in the static feed.
-  using TripLookup = std::function<std::optional<std::uint32_t>(std::string_view tripID)>;
+  /// The index of a trip's line in the static feed, absent where its table has no such trip; an error when there is no
+  /// table, or it cannot be read to its end.
+  using TripLookup = std::function<Outcome<std::optional<std::uint32_t>>(std::string_view tripID)>;
   /// Takes the place of a line among those given, and whether the selector is about all of the line rather than about
   /// a stop, a trip or a direction of it.
   using Handler = std::function<void(std::size_t place, bool isWholeLine)>;
@@ -55,10 +58,16 @@ class SelectorMatcher {
   /// come without a route.
   SelectorMatcher(const StaticFeed& feed, std::span<const std::uint32_t> lines, TripLookup trips);
 
+  /// Another identifier under which alerts name the line at this place.
+  void addRoute(std::string_view id, std::size_t place);
+
   /// Calls `handler` for each line that the selector concerns.
   SelectorFit match(const EntitySelector& selector, const Handler& handler) const;
+  /// Why the trips could not be had when they were needed.
+  const ErrorRef& tripsError() const { return _tripsError; }
 
  private:
+  SelectorFit matchClean(const EntitySelector& selector, const Handler& handler) const;
   SelectorFit matchOne(std::size_t place, const EntitySelector& selector, const Handler& handler) const;
   SelectorFit matchTrip(const EntitySelector& selector, const Handler& handler) const;
   SelectorFit matchAll(const EntitySelector& selector, const Handler& handler) const;
@@ -70,6 +79,7 @@ class SelectorMatcher {
   std::unordered_map<std::uint32_t, std::size_t> _placeOfLine;
   std::unordered_map<std::string_view, std::size_t> _agencies;
   TripLookup _trips;
+  mutable ErrorRef _tripsError;
 };
 
 }  // namespace nimbo

@@ -2,6 +2,7 @@
 
 #include <chrono>
 #include <filesystem>
+#include <optional>
 #include <string>
 #include <string_view>
 
@@ -33,8 +34,9 @@ class FeedAddress {
   bool _isRemote;
 };
 
-/// How old what a publisher says, or how far ahead its date, may be before it is no more taken for the present state.
-inline constexpr std::chrono::minutes kDefaultMaximumAlertsAge{15};
+/// How old what a publisher says, or how far ahead its date, may be before it is no more taken for the present state:
+/// an answer of a server, and a file, which somebody has to put there.
+inline constexpr std::chrono::minutes kDefaultMaximumAlertsAge{15}, kDefaultMaximumFileAge{24 * 60};
 
 /// A feed as the user set it up.
 struct Feed {
@@ -43,8 +45,10 @@ struct Feed {
   FeedAddress alerts;      ///< a file or an address
   /// Whether alerts without effect on the service, and those about accessibility alone, are incidents too.
   bool minorAlerts = false;
-  /// How long after its header's timestamp an answer of a server counts; a file counts as long as it can be read.
-  std::chrono::minutes maximumAlertsAge = kDefaultMaximumAlertsAge;
+  /// How long after they were made the alerts count; absent for the default. 0, for a file alone, is for ever.
+  std::optional<std::chrono::minutes> maximumAlertsAge = {};
+  /// Whether the answer may have other entities alone: positions of vehicles and times of trips come beside the alerts.
+  bool isCombined = false;
 
   bool operator==(const Feed&) const = default;
 };

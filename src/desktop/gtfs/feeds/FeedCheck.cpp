@@ -4,17 +4,13 @@
 
 #include "desktop/gtfs/alerts/AlertsStore.h"
 #include "desktop/gtfs/alerts/IncidentReader.h"
+#include "desktop/gtfs/feeds/TransitLineServiceError.h"
 #include "desktop/gtfs/static/StaticFeedStore.h"
 #include "platform/SystemServices.h"
 
 namespace nimbo {
 
 namespace {
-
-bool isInForce(const TransitIncident& incident, Date now) {
-  const auto start = incident.startDate(), end = incident.endDate();
-  return (!start || *start <= now) && (!end || *end >= now);
-}
 
 void checkAgainst(const FreshStaticFeed& fresh, const AlertsFeed& alerts, const Feed& feed,
                   FeedCheckReport::Alerts& report) {
@@ -23,19 +19,16 @@ void checkAgainst(const FreshStaticFeed& fresh, const AlertsFeed& alerts, const 
   query.language = {"", fresh.feed.language()};
   query.minorAlerts = feed.minorAlerts;
   query.now = currentDate();
-  query.trips = [&](std::string_view tripID) { return fresh.trips.lineOfTrip(tripID); };
+  query.trips = StaticFeedStore::lookupIn(feed, fresh.trips);
   query.countsUnfit = true;
   for (std::size_t i = 0; i < fresh.feed.lineCount(); ++i)
     query.lines.push_back({static_cast<std::uint32_t>(i), fresh.feed.line(i).muid});
   const IncidentReading reading = readIncidents(alerts, fresh.feed, query);
   std::set<std::uint64_t> incidents;
-  for (const TransitIncidents& ofLine : reading.incidents) {
-    bool isAffected = false;
-    for (const TransitIncidentRef& incident : ofLine) {
-      incidents.insert(incident->muid());
-      isAffected = isAffected || isInForce(*incident, query.now);
-    }
-    report.affectedLines += isAffected ? 1 : 0;
+  for (const Verdict& verdict : reading.verdicts) {
+    for (const TransitIncidentRef& incident : verdict.incidents()) incidents.insert(incident->muid());
+    report.affectedLines += verdict.isAffected(query.now) ? 1 : 0;
+    if (!report.gap) report.gap = verdict.unknownReason();
   }
   report.incidents = incidents.size();
   report.periods = reading.periods;
@@ -45,6 +38,18 @@ void checkAgainst(const FreshStaticFeed& fresh, const AlertsFeed& alerts, const 
 }
 
 }  // namespace
+
+std::vector<ErrorRef> FeedCheckReport::faults() const {
+  std::vector<ErrorRef> faults{staticError, alertsError};
+  if (alerts) faults.insert(faults.end(), {alerts->staleness, alerts->gap});
+  std::erase(faults, nullptr);
+  return faults;
+}
+
+bool FeedCheckReport::isOtherFeed() const {
+  return alertsError && alertsError->code() == static_cast<std::int64_t>(TransitLineServiceError::otherFeed) &&
+         alertsError->domain() == kTransitLineServiceErrorDomain;
+}
 
 FeedCheckReport checkFeed(const Feed& feed, const FeedCache& cache, const std::stop_token& stop) {
   FeedCheckReport report;
@@ -58,12 +63,13 @@ FeedCheckReport checkFeed(const Feed& feed, const FeedCache& cache, const std::s
   report.alertsError = alerts.error();
   if (!alerts) return report;
   report.alerts.emplace();
-  report.alerts->version = alerts->version();
-  report.alerts->timestamp = alerts->timestamp();
+  report.alerts->version = alerts->feed.version();
+  report.alerts->timestamp = alerts->feed.timestamp();
   report.alerts->staleness = AlertsStore::staleness(feed, *alerts);
-  report.alerts->alerts = alerts->alerts().size();
-  report.alerts->skipped = alerts->skipped();
-  if (fresh) checkAgainst(*fresh, *alerts, feed, *report.alerts);
+  report.alerts->alerts = alerts->feed.alerts().size();
+  report.alerts->skipped = alerts->feed.skipped();
+  report.alerts->hasOthers = alerts->feed.hasOthers();
+  if (fresh) checkAgainst(*fresh, alerts->feed, feed, *report.alerts);
   return report;
 }
 

@@ -28,13 +28,15 @@ struct CheckedAlerts {
   std::optional<Date> timestamp;
   ErrorRef staleness;  ///< not null when the feed is too old to be used
   std::size_t alerts = 0;
-  SkipReport skipped;  ///< entities and alerts that make no incident
+  SkipReport skipped;      ///< entities and alerts that make no incident
+  bool hasOthers = false;  ///< positions of vehicles or times of trips come beside the alerts
   // Against the static feed; 0 and empty where that cannot be read.
   std::size_t periods = 0;  ///< of alerts that concern a line
   std::size_t selectors = 0;
   std::size_t incidents = 0;      ///< different ones, in force or to come
   std::size_t affectedLines = 0;  ///< with an incident in force now
   SkipReport unfit;               ///< selectors that fit no line: how a false "good service" comes about
+  ErrorRef gap;                   ///< not null when no verdict on a line can be had from the alerts
 };
 
 /// What a feed holds and how well its two halves fit together.
@@ -47,6 +49,11 @@ struct FeedCheckReport {
   ErrorRef staticError;  ///< not null when the static feed cannot be read
   std::optional<Alerts> alerts;
   ErrorRef alertsError;  ///< not null when the alerts cannot be read
+
+  /// What keeps lines from a verdict; empty for a feed that can be used.
+  std::vector<ErrorRef> faults() const;
+  /// Whether the alerts are another kind of feed, which may hold some at other times.
+  bool isOtherFeed() const;
 };
 
 /// Reads both halves of a feed from their sources, whatever the cache holds, and checks them. Blocks its thread.

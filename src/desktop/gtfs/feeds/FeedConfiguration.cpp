@@ -66,14 +66,17 @@ Outcome<Feed> readFeed(const JSON& entry, std::size_t index, const std::filesyst
   for (const auto* address : {&staticFeed, &alerts})
     if (!*address) return fault(place + ": " + address->error()->reason());
   Feed feed{*name, *staticFeed, *alerts};
-  if (const auto minor = entry.find("minorAlerts"); minor != entry.end()) {
-    if (!minor->is_boolean()) return fault(place + " has a \"minorAlerts\" that is neither true nor false.");
-    feed.minorAlerts = minor->get<bool>();
+  for (const auto& [key, flag] : {std::pair("minorAlerts", &feed.minorAlerts), {"combined", &feed.isCombined}}) {
+    const auto value = entry.find(key);
+    if (value == entry.end()) continue;
+    if (!value->is_boolean()) return fault(place + " has a \"" + key + "\" that is neither true nor false.");
+    *flag = value->get<bool>();
   }
   if (const auto age = entry.find("maximumAlertsAgeMinutes"); age != entry.end()) {
-    if (!age->is_number_integer() || *age < 1 || *age > kLongestAlertsAgeMinutes)
-      return fault(place + " has a \"maximumAlertsAgeMinutes\" that is no number from 1 to " +
-                   std::to_string(kLongestAlertsAgeMinutes) + ".");
+    const int least = feed.alerts.isRemote() ? 1 : 0;
+    if (!age->is_number_integer() || *age < least || *age > kLongestAlertsAgeMinutes)
+      return fault(place + " has a \"maximumAlertsAgeMinutes\" that is no number from " + std::to_string(least) +
+                   " to " + std::to_string(kLongestAlertsAgeMinutes) + ".");
     feed.maximumAlertsAge = std::chrono::minutes(age->get<int>());
   }
   return feed;
@@ -96,6 +99,15 @@ ErrorRef unknownFeed(std::string_view name, const std::vector<Feed>& present) {
   for (const Feed& feed : present) names += " " + feed.name;
   return transitLineServiceError(TransitLineServiceError::unknownFeed,
                                  "No feed is named \"" + std::string(name) + "\". " + names + ".", std::string(name));
+}
+
+ErrorRef takenName(std::string_view name, const std::vector<Feed>& present) {
+  if (std::none_of(present.begin(), present.end(), [&](const Feed& other) { return other.name == name; }))
+    return nullptr;
+  return transitLineServiceError(
+      TransitLineServiceError::feedNameTaken,
+      "A feed named \"" + std::string(name) + "\" is set up already. Choose another name, or remove that one first.",
+      std::string(name));
 }
 
 ErrorRef writeDocument(const std::filesystem::path& file, const JSON& document) {
@@ -135,6 +147,12 @@ Outcome<Feed> FeedConfiguration::feedNamed(std::string_view name) const {
   return unknownFeed(name, *all);
 }
 
+ErrorRef FeedConfiguration::checkNewName(std::string_view name) const {
+  if (ErrorRef error = checkName(name)) return error;
+  const auto present = feeds();
+  return present ? takenName(name, *present) : present.error();
+}
+
 ErrorRef FeedConfiguration::add(const Feed& feed) {
   if (ErrorRef error = checkName(feed.name)) return error;
   if (ErrorRef error = makeFolders(_folder)) return error;
@@ -143,15 +161,11 @@ ErrorRef FeedConfiguration::add(const Feed& feed) {
   if (!document) return document.error();
   const auto present = readFeeds(*document, _file);
   if (!present) return present.error();
-  if (std::any_of(present->begin(), present->end(), [&](const Feed& other) { return other.name == feed.name; }))
-    return transitLineServiceError(
-        TransitLineServiceError::feedNameTaken,
-        "A feed named \"" + feed.name + "\" is set up already. Choose another name, or remove that one first.",
-        feed.name);
+  if (ErrorRef error = takenName(feed.name, *present)) return error;
   JSON entry{{"name", feed.name}, {"static", feed.staticFeed.text()}, {"alerts", feed.alerts.text()}};
   if (feed.minorAlerts) entry["minorAlerts"] = true;
-  if (feed.maximumAlertsAge != kDefaultMaximumAlertsAge)
-    entry["maximumAlertsAgeMinutes"] = feed.maximumAlertsAge.count();
+  if (feed.isCombined) entry["combined"] = true;
+  if (feed.maximumAlertsAge) entry["maximumAlertsAgeMinutes"] = feed.maximumAlertsAge->count();
   (*document)["feeds"].push_back(std::move(entry));
   return writeDocument(_file, *document);
 }

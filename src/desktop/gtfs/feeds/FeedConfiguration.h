@@ -16,10 +16,10 @@ inline constexpr std::string_view kSampleFeedName = "sample";
 /// The feeds that the user set up, in `feeds.json`:
 ///
 ///     {"feeds": [{"name": "metro", "static": "/data/metro.zip", "alerts": "https://example.org/alerts.pb",
-///                 "minorAlerts": false, "maximumAlertsAgeMinutes": 15}]}
+///                 "minorAlerts": false, "maximumAlertsAgeMinutes": 15, "combined": false}]}
 ///
-/// The last two may be left out. Keys that are not known here are kept. Nothing is held in memory: each call reads the
-/// file, and changes of several processes at once come one after the other. Any thread.
+/// The last three may be left out. Keys that are not known here are kept. Nothing is held in memory: each call reads
+/// the file, and changes of several processes at once come one after the other. Any thread.
 class FeedConfiguration {
  public:
   explicit FeedConfiguration(const std::filesystem::path& configFolder)
@@ -32,6 +32,8 @@ class FeedConfiguration {
   /// The feed of this name, or an error that lists the names there are.
   Outcome<Feed> feedNamed(std::string_view name) const;
 
+  /// Null for a feed that could be added now, by its name.
+  ErrorRef checkNewName(std::string_view name) const;
   /// Adds a feed at the end. Null on success; nothing is written otherwise.
   ErrorRef add(const Feed& feed);
   /// Takes a feed out. Null on success; nothing is written otherwise.

@@ -27,21 +27,29 @@ std::optional<std::uint32_t> lineLike(const StaticFeed& feed, const TransitLineL
   return found;
 }
 
+bool hasRoute(const StaticFeed& feed, std::string_view routeID) {
+  for (std::size_t i = 0; i < feed.lineCount(); ++i)
+    if (feed.line(i).routeID == routeID) return true;
+  return false;
+}
+
 }  // namespace
 
-std::vector<std::optional<std::uint32_t>> findLines(const StaticFeed& feed, const std::string& feedName,
-                                                    std::span<const MapItemIdentifierRef> identifiers) {
+std::vector<std::optional<FoundLine>> findLines(const StaticFeed& feed, const std::string& feedName,
+                                                std::span<const MapItemIdentifierRef> identifiers) {
   std::unordered_map<std::uint64_t, std::optional<std::uint32_t>> lineOfMuid;
   for (const MapItemIdentifierRef& identifier : identifiers) lineOfMuid.try_emplace(identifier->muid());
   for (std::size_t i = 0; i < feed.lineCount(); ++i)
     if (const auto found = lineOfMuid.find(feed.line(i).muid); found != lineOfMuid.end())
       found->second = static_cast<std::uint32_t>(i);
-  std::vector<std::optional<std::uint32_t>> lines;
+  std::vector<std::optional<FoundLine>> lines;
   for (const MapItemIdentifierRef& identifier : identifiers) {
-    std::optional<std::uint32_t> line = lineOfMuid[identifier->muid()];
+    std::optional<FoundLine>& found = lines.emplace_back();
     const auto& locator = identifier->locator();
-    if (!line && locator && locator->feed == feedName) line = lineLike(feed, *locator);
-    lines.push_back(line);
+    if (const auto line = lineOfMuid[identifier->muid()])
+      found = {*line, {}};
+    else if (const auto like = locator && locator->feed == feedName ? lineLike(feed, *locator) : std::nullopt)
+      found = {*like, hasRoute(feed, locator->routeID) ? std::string() : locator->routeID};
   }
   return lines;
 }
@@ -65,18 +73,20 @@ Outcome<FeedAnswer> lookUpInFeed(const FeedSource& source, std::span<const MapIt
   query.now = currentDate();
   query.trips = loaded->trips;
   std::unordered_map<std::uint32_t, std::size_t> placeOfLine;  // two identifiers may have become one line
-  for (std::size_t i = 0; i < lines.size(); ++i)
-    if (lines[i] && placeOfLine.try_emplace(*lines[i], query.lines.size()).second)
-      query.lines.push_back({*lines[i], identifiers[i]->muid()});
+  for (std::size_t i = 0; i < lines.size(); ++i) {
+    if (!lines[i]) continue;
+    const auto [place, isNew] = placeOfLine.try_emplace(lines[i]->index, query.lines.size());
+    if (isNew) query.lines.push_back({lines[i]->index, identifiers[i]->muid()});
+    if (!lines[i]->formerRouteID.empty()) query.lines[place->second].formerRouteIDs.push_back(lines[i]->formerRouteID);
+  }
   const IncidentReading reading = readIncidents(*alerts, feed, query);
-  if (reading.isCutShort)
-    return transitLineServiceError(TransitLineServiceError::tooLarge,
-                                   "The alerts feed of \"" + source.name() +
-                                       "\" has more incidents on these lines than any network has. Check the address.");
   LineItems makeItems(source.name(), feed);
-  for (std::size_t i = 0; i < lines.size(); ++i)
-    if (lines[i])
-      answer.items[i] = makeItems.item(*lines[i], identifiers[i]->muid(), reading.incidents[placeOfLine.at(*lines[i])]);
+  for (std::size_t i = 0; i < lines.size(); ++i) {
+    if (!lines[i]) continue;
+    const Verdict& verdict = reading.verdicts[placeOfLine.at(lines[i]->index)];
+    if (verdict.unknownReason()) return verdict.unknownReason();
+    answer.items[i] = makeItems.item(lines[i]->index, identifiers[i]->muid(), verdict.incidents());
+  }
   return answer;
 }
 

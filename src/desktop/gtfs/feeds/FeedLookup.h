@@ -11,10 +11,16 @@
 
 namespace nimbo {
 
-/// The index of each identifier's line in a feed; absent for one that the feed does not know: neither by its number nor
+/// A line of a feed as somebody asked for it.
+struct FoundLine {
+  std::uint32_t index;        ///< in the static feed
+  std::string formerRouteID;  ///< under which it was asked for, where no line of the feed has that any more; else empty
+};
+
+/// Each identifier's line in a feed; absent for one that the feed does not know: neither by its number nor
 /// by an agency, short name and mode that only one line has.
-std::vector<std::optional<std::uint32_t>> findLines(const StaticFeed& feed, const std::string& feedName,
-                                                    std::span<const MapItemIdentifierRef> identifiers);
+std::vector<std::optional<FoundLine>> findLines(const StaticFeed& feed, const std::string& feedName,
+                                                std::span<const MapItemIdentifierRef> identifiers);
 
 /// What one feed says of lines.
 struct FeedAnswer {
@@ -22,8 +28,9 @@ struct FeedAnswer {
   std::optional<Date> asOf;  ///< when the publisher made the alerts; absent when he does not say, or none were needed
 };
 
-/// Looks lines up in one feed: their static data and their incidents by the alerts as they are now, texts in `language`
-/// (a BCP 47 tag). Blocks its thread.
+/// Looks lines up in one feed: an answer when there is a verdict on every line, else the reason why there is none:
+/// their static data and their incidents by the alerts as they are now, texts in `language` (a BCP 47 tag). Blocks its
+/// thread.
 Outcome<FeedAnswer> lookUpInFeed(const FeedSource& source, std::span<const MapItemIdentifierRef> identifiers,
                                  std::string_view language, const std::stop_token& stop);
 

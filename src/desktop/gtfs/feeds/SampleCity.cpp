@@ -111,7 +111,8 @@ StaticFeed readSampleFeed(Date date) {
 SampleCity::SampleCity(Date now) : _name(kSampleFeedName), _anchor(std::chrono::floor<std::chrono::minutes>(now)) {}
 
 Outcome<LoadedStaticFeed> SampleCity::staticFeed(const std::stop_token&) const {
-  return LoadedStaticFeed{readSampleFeed(_anchor), nullptr};
+  // It has no trips, and its alerts name none.
+  return LoadedStaticFeed{readSampleFeed(_anchor), [](auto) { return std::optional<std::uint32_t>(); }};
 }
 
 Outcome<AlertsFeed> SampleCity::alerts(const std::stop_token&) const {

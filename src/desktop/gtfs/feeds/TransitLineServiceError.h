@@ -34,6 +34,8 @@ enum class TransitLineServiceError : std::int64_t {
   feedNameTaken = 16,    ///< another feed has this name
   keyNeeded = 17,        ///< the server lets nobody in without a key
   notKept = 18,          ///< no room for what the server sends
+  otherFeed = 19,        ///< a GTFS-Realtime feed that holds no alerts but something else
+  foreignAlerts = 20,    ///< the alerts name routes of another static feed
 };
 
 /// An error of `kTransitLineServiceErrorDomain`. The subject is the feed's name, or its place without secrets.

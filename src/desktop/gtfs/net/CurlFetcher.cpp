@@ -1,8 +1,10 @@
 #include "desktop/gtfs/net/CurlFetcher.h"
 
+#include <memory>
 #include <new>
 
 #include "desktop/gtfs/feeds/TransitLineServiceError.h"
+#include "desktop/gtfs/net/GzipReader.h"
 #include "desktop/gtfs/text/Utf8.h"
 #include "desktop/raii/CurlHandle.h"
 #include "platform/foundation/Version.h"
@@ -25,6 +27,9 @@ struct Transfer {
   const HTTPFetcher::Sink& sink;
   CURL* handle;
   HTTPValidators validators;
+  std::string encoding;  // as the answer's header says, in lower case; may be empty
+  // libcurl takes a packed answer without its end for a whole one.
+  std::unique_ptr<GzipReader> packed;
   std::uint64_t received = 0;
   bool isTooLarge = false;
   bool isUnkept = false;
@@ -35,22 +40,43 @@ struct Transfer {
     return status == 200;
   }
 
+  bool isPlain() const { return encoding.empty() || encoding == "identity"; }
+  bool isGzip() const { return encoding == "gzip" || encoding == "x-gzip"; }
+  /// Whether a packed answer has come to its end, as far as it has.
+  bool isCutOff() const { return isGzip() && (!packed || !packed->isWhole()); }
+
   std::size_t takePiece(std::string_view piece) {
     if (!hasDocument()) return piece.size();  // the page of a redirect or an error
+    bool isTaken = false;
+    if (isPlain()) {
+      isTaken = keep(piece);
+    } else if (isGzip()) {
+      if (!packed) packed = std::make_unique<GzipReader>();
+      isTaken = packed->take(piece, [this](std::string_view unpacked) { return keep(unpacked); });
+    }
+    return isTaken ? piece.size() : 0;
+  }
+
+  bool keep(std::string_view piece) {
     received += piece.size();
     isTooLarge = received > request.limit;
     isUnkept = !isTooLarge && !sink(piece);
-    return isTooLarge || isUnkept ? 0 : piece.size();
+    return !isTooLarge && !isUnkept;
   }
 
   void takeHeader(std::string_view line) {
-    if (line.starts_with("HTTP/")) validators = {};  // of the answer before a redirect
+    if (line.starts_with("HTTP/")) {  // those were of the answer before a redirect
+      validators = {};
+      encoding.clear();
+    }
     const std::size_t colon = line.find(':');
     if (colon == std::string_view::npos) return;
     const std::string name = asciiLowerCase(line.substr(0, colon));
     const std::string_view value = trimmed(line.substr(colon + 1));
     if (value.size() > kLongestValidator || value.find('\0') != std::string_view::npos) return;
-    if (name == "etag")
+    if (name == "content-encoding")
+      encoding = asciiLowerCase(value);
+    else if (name == "etag")
       validators.etag = value;
     else if (name == "last-modified")
       validators.lastModified = value;
@@ -75,7 +101,7 @@ CurlHandle makeHandle() {
   return handle;
 }
 
-CurlHeaders conditionsOf(const HTTPValidators& validators) {
+CurlHeaders headersFor(const HTTPValidators& validators) {
   CurlHeaders headers;
   const auto add = [&](const std::string& line) {
     curl_slist* longer = curl_slist_append(headers.get(), line.c_str());
@@ -83,6 +109,7 @@ CurlHeaders conditionsOf(const HTTPValidators& validators) {
     (void)headers.release();
     headers.reset(longer);
   };
+  add("Accept-Encoding: gzip");
   if (!validators.etag.empty()) add("If-None-Match: " + validators.etag);
   if (!validators.lastModified.empty()) add("If-Modified-Since: " + validators.lastModified);
   return headers;
@@ -96,7 +123,6 @@ void setOptions(CURL* handle, Transfer& transfer, const CurlHeaders& headers) {
   set(CURLOPT_FOLLOWLOCATION, 1L);
   set(CURLOPT_MAXREDIRS, kMostRedirects);
   set(CURLOPT_USERAGENT, (std::string("nimbo-transit/") + kVersion).c_str());
-  set(CURLOPT_ACCEPT_ENCODING, "gzip");
   set(CURLOPT_CONNECTTIMEOUT, kConnectSeconds);
   set(CURLOPT_TIMEOUT, static_cast<long>(transfer.request.timeLimit.count()));
   set(CURLOPT_MAXFILESIZE_LARGE, static_cast<curl_off_t>(transfer.request.limit));
@@ -119,9 +145,14 @@ struct Failure {
   std::string what;
 };
 
+Failure cutOff() { return {Code::unreachable, "the connection broke before everything had come. Try again later."}; }
+
 Failure failureOf(CURLcode result, const Transfer& transfer) {
   const std::string limit = std::to_string(transfer.request.limit >> 20) + " MiB";
   if (transfer.isTooLarge) return {Code::tooLarge, "it sends more than " + limit + ". Check the address."};
+  if (transfer.packed && transfer.packed->isDamaged()) return cutOff();
+  if (!transfer.isPlain() && !transfer.isGzip() && result == CURLE_WRITE_ERROR)
+    return {Code::serverFailure, "its server packs it in a way that was not asked for. Check the address."};
   if (transfer.isUnkept) return {Code::notKept, "what it sends cannot be kept. Free some space on the disk."};
   switch (result) {
     case CURLE_COULDNT_RESOLVE_HOST:
@@ -147,7 +178,7 @@ Failure failureOf(CURLcode result, const Transfer& transfer) {
     case CURLE_RECV_ERROR:
     case CURLE_SEND_ERROR:
     case CURLE_HTTP2_STREAM:
-      return {Code::unreachable, "the connection broke before everything had come. Try again later."};
+      return cutOff();
     case CURLE_OUT_OF_MEMORY:  // which is also what libcurl calls a header of more than 100 KB
       return {Code::serverFailure, "its server sends a header that is too long. Check the address."};
     case CURLE_FILESIZE_EXCEEDED:
@@ -172,9 +203,9 @@ Failure failureOfStatus(long status) {
 Outcome<HTTPAnswer> fetchWithCurl(const HTTPRequest& request, const std::stop_token& stop,
                                   const HTTPFetcher::Sink& sink) {
   const CurlHandle handle = makeHandle();
-  const CurlHeaders headers = conditionsOf(request.validators);
-  const bool isConditional = headers != nullptr;
-  Transfer transfer{request, stop, sink, handle.get(), {}};
+  const CurlHeaders headers = headersFor(request.validators);
+  const bool isConditional = request.validators != HTTPValidators();
+  Transfer transfer{request, stop, sink, handle.get(), {}, {}, {}};
   setOptions(handle.get(), transfer, headers);
   const auto failed = [&](const Failure& failure) {
     return transitLineServiceError(failure.code, "Cannot fetch " + request.address.publicText() + ": " + failure.what,
@@ -194,6 +225,7 @@ Outcome<HTTPAnswer> fetchWithCurl(const HTTPRequest& request, const std::stop_to
     return HTTPAnswer{true, std::move(transfer.validators)};
   }
   if (status != 200) return failed(failureOfStatus(status));
+  if (transfer.isCutOff()) return failed(cutOff());
   return HTTPAnswer{false, std::move(transfer.validators)};
 }
 

@@ -66,4 +66,11 @@ std::string fileFingerprint(const std::filesystem::path& path) {
          std::to_string(status.st_mtim.tv_nsec);
 }
 
+std::optional<Date> fileChangeDate(const std::filesystem::path& path) {
+  struct stat status {};
+  if (::stat(path.c_str(), &status) != 0) return std::nullopt;
+  return Date(std::chrono::floor<Date::duration>(std::chrono::seconds(status.st_mtim.tv_sec) +
+                                                 std::chrono::nanoseconds(status.st_mtim.tv_nsec)));
+}
+
 }  // namespace nimbo

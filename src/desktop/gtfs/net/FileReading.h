@@ -2,8 +2,10 @@
 
 #include <cstdint>
 #include <filesystem>
+#include <optional>
 #include <string>
 
+#include "platform/foundation/Date.h"
 #include "platform/foundation/Outcome.h"
 
 namespace nimbo {
@@ -15,5 +17,8 @@ Outcome<std::string> readFile(const std::filesystem::path& path, std::uint64_t l
 /// What tells one state of a file from another without reading it: its size and when it was last written. Empty when
 /// there is none.
 std::string fileFingerprint(const std::filesystem::path& path);
+
+/// When the file was last written; absent when there is none.
+std::optional<Date> fileChangeDate(const std::filesystem::path& path);
 
 }  // namespace nimbo

@@ -6,6 +6,7 @@
 #include "desktop/gtfs/feeds/FeedMuid.h"
 #include "desktop/gtfs/feeds/TransitLineServiceError.h"
 #include "desktop/gtfs/static/CsvTable.h"
+#include "desktop/gtfs/text/Identifier.h"
 #include "desktop/gtfs/text/Utf8.h"
 
 namespace nimbo {
@@ -28,27 +29,30 @@ void appendRecord(std::string& bytes, const T& record) {
 
 FlatText StaticFeedBuilder::add(std::string_view text) { return appendText(_texts, validUtf8(text)); }
 
-bool StaticFeedBuilder::addAgency(std::string_view id, std::string_view name) {
+bool StaticFeedBuilder::addAgency(std::string_view publishedID, std::string_view name) {
+  const Identifier id(publishedID);
   const auto index = static_cast<std::uint32_t>(_agencies.size());
-  if (!_agencyByID.emplace(id, index).second) return false;
-  _agencies.push_back({add(id), add(name), static_cast<std::int64_t>(TransitMode::unknown)});
+  if (!_agencyByID.emplace(id.text(), index).second) return false;
+  _agencies.push_back({add(id.text()), add(name), static_cast<std::int64_t>(TransitMode::unknown)});
   return true;
 }
 
-bool StaticFeedBuilder::addLine(std::string_view agencyID, const StaticLine& line) {
-  if (!_lineByRoute.emplace(line.routeID, static_cast<std::uint32_t>(_lines.size())).second) return false;
+bool StaticFeedBuilder::addLine(std::string_view publishedAgencyID, const StaticLine& line) {
+  const Identifier routeID(line.routeID), agencyID(publishedAgencyID);
+  if (!_lineByRoute.emplace(routeID.text(), static_cast<std::uint32_t>(_lines.size())).second) return false;
   std::uint32_t agency = 0;
-  if (!agencyID.empty() || _agencies.size() != 1) {
-    addAgency(agencyID, {});
-    agency = _agencyByID.at(std::string(agencyID));
+  if (!agencyID.text().empty() || _agencies.size() != 1) {
+    addAgency(agencyID.text(), {});
+    agency = _agencyByID.at(std::string(agencyID.text()));
   }
-  _lines.push_back({lineMuid(_feed, line.routeID), add(line.routeID), add(line.shortName), add(line.longName),
+  // The number is that of the identifier as it was ever since: favorites hold it.
+  _lines.push_back({lineMuid(_feed, line.routeID), add(routeID.text()), add(line.shortName), add(line.longName),
                     line.color.value_or(kNoColor), line.textColor.value_or(kNoColor), line.type, agency});
   return true;
 }
 
 std::optional<std::uint32_t> StaticFeedBuilder::lineOfRoute(std::string_view routeID) const {
-  const auto found = _lineByRoute.find(std::string(routeID));
+  const auto found = _lineByRoute.find(std::string(Identifier(routeID).text()));
   if (found == _lineByRoute.end()) return std::nullopt;
   return found->second;
 }
@@ -185,7 +189,7 @@ ErrorRef readRoutes(StaticFeedFiles& files, ParsedStaticFeed& parsed) {
   return nullptr;
 }
 
-/// Trips only help with selectors that name nothing else: a table that cannot be read costs no more than those.
+/// Trips only help with selectors that name nothing else: a table that cannot be read makes no bad feed.
 void readTrips(StaticFeedFiles& files, ParsedStaticFeed& parsed) {
   bool tooMany = false;
   CsvTable table({"trip_id", "route_id"}, [&](Values row) {
@@ -194,12 +198,15 @@ void readTrips(StaticFeedFiles& files, ParsedStaticFeed& parsed) {
     if (row[0].empty() || !line)
       parsed.skipped.add("trip without trip_id or of an unknown route", row[0]);
     else if (!tooMany)
-      parsed.trips.add(row[0], *line);
+      parsed.trips.add(Identifier(row[0]).text(), *line);
   });
   const auto found = readTable(files, "trips.txt", kLargestTripsTable, table);
-  if (!found || tooMany) {
+  const bool isTable = found && *found && table.hasColumn(0) && table.hasColumn(1);
+  if (found && !*found)
+    parsed.trips.giveUp();
+  else if (!isTable || tooMany) {
     parsed.skipped.add("trips.txt as a whole, since it is too large or cannot be read", {});
-    parsed.trips = {};
+    parsed.trips.giveUp();
   }
   parsed.trips.finish();
 }

@@ -14,7 +14,7 @@
 
 namespace nimbo {
 
-/// Gathers agencies and lines into a StaticFeed. Texts become valid UTF-8.
+/// Gathers agencies and lines into a StaticFeed. Texts become valid UTF-8, identifiers as `Identifier` says.
 class StaticFeedBuilder {
  public:
   /// `feed` is the name under which the user set the feed up: the numbers of lines are made from it.
@@ -23,10 +23,10 @@ class StaticFeedBuilder {
   void setLanguage(std::string_view tag) { _language = tag; }
 
   /// False, and nothing added, when there is an agency of this identifier.
-  bool addAgency(std::string_view id, std::string_view name);
+  bool addAgency(std::string_view publishedID, std::string_view name);
   /// False, and nothing added, when there is a line of this route. An agency that was not added is added without a
   /// name; an empty one means the only agency there is.
-  bool addLine(std::string_view agencyID, const StaticLine& line);
+  bool addLine(std::string_view publishedAgencyID, const StaticLine& line);
   /// The index of a route's line.
   std::optional<std::uint32_t> lineOfRoute(std::string_view routeID) const;
   std::size_t lineCount() const { return _lines.size(); }
@@ -48,7 +48,7 @@ class StaticFeedBuilder {
 /// A static feed as read from its files.
 struct ParsedStaticFeed {
   StaticFeedBuilder feed;
-  TripRoutes trips;    ///< empty where the feed has no trips.txt
+  TripRoutes trips;    ///< not whole where the feed has no trips.txt, or it cannot be read to its end
   SkipReport skipped;  ///< rows, by reason
 };
 

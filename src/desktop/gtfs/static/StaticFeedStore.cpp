@@ -82,6 +82,18 @@ bool writeAll(const FileDescriptor& file, std::string_view bytes) {
   return true;
 }
 
+ErrorRef noTrips(const Feed& feed, const std::string& why) {
+  const std::string place = feed.staticFeed.publicText();
+  return transitLineServiceError(
+      TransitLineServiceError::badStaticFeed,
+      "An alert names a trip alone, and the trips of the static feed " + place + " cannot be had: " + why + ".", place);
+}
+
+Outcome<TripRoutes> wholeTrips(const Feed& feed, TripRoutes trips) {
+  if (trips.isWhole()) return trips;
+  return noTrips(feed, "its trips.txt is missing or damaged. Ask the publisher for a whole feed");
+}
+
 std::uint64_t tripsKey(const StaticFeed& feed) { return hashOfBytes(feed.fingerprint()); }
 
 void keep(const std::filesystem::path& path, std::string_view bytes) {
@@ -95,22 +107,36 @@ std::optional<StaticFeed> StaticFeedStore::readCache(const Feed& feed) const {
   return bytes ? StaticFeed::fromBytes(std::move(*bytes)) : std::nullopt;
 }
 
+SelectorMatcher::TripLookup StaticFeedStore::lookupIn(const Feed& feed, const TripRoutes& trips) {
+  return [routes = wholeTrips(feed, trips)](std::string_view tripID) -> Outcome<std::optional<std::uint32_t>> {
+    if (!routes) return routes.error();
+    return routes->lineOfTrip(tripID);
+  };
+}
+
 LoadedStaticFeed StaticFeedStore::withTrips(const Feed& feed, StaticFeed staticFeed, std::optional<TripRoutes> trips,
                                             const std::stop_token& stop) const {
-  const auto held = std::make_shared<std::optional<TripRoutes>>(std::move(trips));
-  const auto lookup = [store = *this, feed, staticFeed, stop, held](std::string_view tripID) {
-    if (!*held) {
-      if (const auto bytes = readFile(store._cache.trips(feed.name), kLargestCacheFile))
-        *held = TripRoutes::fromBytes(*bytes, tripsKey(staticFeed), staticFeed.lineCount());
-      if (!*held) {
-        auto fresh = store.readAnew(feed, stop);
-        const bool isSame = fresh && fresh->feed.fingerprint() == staticFeed.fingerprint();
-        *held = isSame ? std::move(fresh->trips) : TripRoutes();
-      }
-    }
-    return (*held)->lineOfTrip(tripID);
+  const auto held = std::make_shared<std::optional<Outcome<TripRoutes>>>();
+  if (trips) *held = wholeTrips(feed, std::move(*trips));
+  const auto lookup = [store = *this, feed, staticFeed, stop,
+                       held](std::string_view tripID) -> Outcome<std::optional<std::uint32_t>> {
+    if (!*held) *held = store.readTrips(feed, staticFeed, stop);
+    if (!**held) return (*held)->error();
+    return (**held)->lineOfTrip(tripID);
   };
   return {std::move(staticFeed), lookup};
+}
+
+Outcome<TripRoutes> StaticFeedStore::readTrips(const Feed& feed, const StaticFeed& staticFeed,
+                                               const std::stop_token& stop) const {
+  if (const auto bytes = readFile(_cache.trips(feed.name), kLargestCacheFile))
+    if (auto kept = TripRoutes::fromBytes(*bytes, tripsKey(staticFeed), staticFeed.lineCount()))
+      return wholeTrips(feed, std::move(*kept));
+  auto fresh = readAnew(feed, stop);
+  if (!fresh) return fresh.error();
+  if (fresh->feed.fingerprint() != staticFeed.fingerprint())
+    return noTrips(feed, "it has changed while it was read. Try again");
+  return wholeTrips(feed, std::move(fresh->trips));
 }
 
 Outcome<FreshStaticFeed> StaticFeedStore::parse(StaticFeedFiles& files, const Feed& feed,

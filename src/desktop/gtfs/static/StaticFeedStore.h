@@ -33,6 +33,9 @@ class StaticFeedStore {
   /// cache has an older state. `stop` also ends a reading of the trips that comes later.
   Outcome<LoadedStaticFeed> load(const Feed& feed, const std::stop_token& stop) const;
 
+  /// How trips of this table are looked up.
+  static SelectorMatcher::TripLookup lookupIn(const Feed& feed, const TripRoutes& trips);
+
   /// From the source.
   Outcome<FreshStaticFeed> readAnew(const Feed& feed, const std::stop_token& stop) const;
 
@@ -43,6 +46,7 @@ class StaticFeedStore {
   Outcome<std::optional<FreshStaticFeed>> fetch(const Feed& feed, const HTTPValidators& validators,
                                                 const std::stop_token& stop) const;
   Outcome<FreshStaticFeed> parse(StaticFeedFiles& files, const Feed& feed, const std::string& fingerprint) const;
+  Outcome<TripRoutes> readTrips(const Feed& feed, const StaticFeed& staticFeed, const std::stop_token& stop) const;
   LoadedStaticFeed withTrips(const Feed& feed, StaticFeed staticFeed, std::optional<TripRoutes> trips,
                              const std::stop_token& stop) const;
 

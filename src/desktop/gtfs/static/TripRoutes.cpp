@@ -9,10 +9,10 @@ namespace nimbo {
 
 namespace {
 
-constexpr std::uint64_t kMagic = 0x00015350495254;  // version 1
+constexpr std::uint64_t kMagic = 0x00025350495254;  // version 2
 
 struct Header {
-  std::uint64_t magic, key, count, checksum;
+  std::uint64_t magic, key, count, isWhole, checksum;
 };
 
 bool isEarlier(const TripRoutes::Entry& a, const TripRoutes::Entry& b) { return a.trip < b.trip; }
@@ -25,6 +25,11 @@ std::string_view bytesOf(const std::vector<TripRoutes::Entry>& entries) {
 
 void TripRoutes::add(std::string_view tripID, std::uint32_t line) { _entries.push_back({hashOfBytes(tripID), line}); }
 
+void TripRoutes::giveUp() {
+  _entries = {};
+  _isWhole = false;
+}
+
 void TripRoutes::finish() { std::stable_sort(_entries.begin(), _entries.end(), isEarlier); }
 
 std::optional<std::uint32_t> TripRoutes::lineOfTrip(std::string_view tripID) const {
@@ -36,7 +41,7 @@ std::optional<std::uint32_t> TripRoutes::lineOfTrip(std::string_view tripID) con
 
 std::string TripRoutes::bytes(std::uint64_t key) const {
   const std::string_view entries = bytesOf(_entries);
-  const Header header{kMagic, key, _entries.size(), flatChecksum(entries)};
+  const Header header{kMagic, key, _entries.size(), _isWhole ? 1u : 0u, flatChecksum(entries)};
   std::string bytes(reinterpret_cast<const char*>(&header), sizeof header);
   bytes.append(entries);
   return bytes;
@@ -50,6 +55,7 @@ std::optional<TripRoutes> TripRoutes::fromBytes(std::string_view bytes, std::uin
       header.count != content.size() / sizeof(Entry) || header.checksum != flatChecksum(content))
     return std::nullopt;
   TripRoutes routes;
+  routes._isWhole = header.isWhole == 1;
   routes._entries.resize(header.count);
   if (!content.empty()) std::memcpy(routes._entries.data(), content.data(), content.size());
   const bool sound = std::all_of(routes._entries.begin(), routes._entries.end(),

@@ -85,9 +85,13 @@ std::vector<Translation> translationsIn(std::string_view alert, AlertField field
   auto message = messageIn<AlertField>(alert);
   while (result.size() < kMostTranslations && message.next(field)) {
     auto text = messageIn<TranslatedStringField>(takeView(message));
-    while (result.size() < kMostTranslations && text.next(TranslatedStringField::translation)) {
-      const Translation translation = readTranslation(takeView(text));
-      if (!translation.text.empty()) result.push_back(translation);
+    try {
+      while (result.size() < kMostTranslations && text.next(TranslatedStringField::translation)) {
+        const Translation translation = readTranslation(takeView(text));
+        if (!translation.text.empty()) result.push_back(translation);
+      }
+    } catch (const protozero::exception&) {
+      continue;
     }
   }
   return result;

@@ -29,7 +29,8 @@ std::string_view chooseTranslation(std::span<const Translation> translations, co
 bool isSameLanguage(std::string_view a, std::string_view b);
 
 /// The translations of a text of an alert, those without text left out, 1000 at most. `alert` is the Alert message,
-/// `field` one that holds a TranslatedString. Throws protozero::exception for damaged bytes.
+/// `field` one that holds a TranslatedString. Of a damaged text what was read. Throws protozero::exception for a
+/// message that breaks off.
 std::vector<Translation> translationsIn(std::string_view alert, AlertField field);
 
 }  // namespace nimbo
