@@ -4,9 +4,9 @@
 #include <filesystem>
 #include <limits>
 
-#include "DrawingInk.h"
 #include "desktop/drawing/CairoImage.h"
 #include "desktop/drawing/CairoSurface.h"
+#include "desktop/drawing/Ink.h"
 #include "support/TemporaryFolder.h"
 #include "support/TestPlatform.h"
 

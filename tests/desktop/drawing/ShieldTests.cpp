@@ -4,8 +4,8 @@
 #include <string>
 #include <vector>
 
-#include "DrawingInk.h"
 #include "desktop/drawing/CairoShieldRenderer.h"
+#include "desktop/drawing/Ink.h"
 #include "desktop/drawing/PangoTextSystem.h"
 #include "support/TestPlatform.h"
 

@@ -8,8 +8,8 @@
 #include <limits>
 #include <string>
 
-#include "DrawingInk.h"
 #include "desktop/drawing/CairoSurface.h"
+#include "desktop/drawing/Ink.h"
 #include "desktop/drawing/PangoTextSystem.h"
 #include "support/TestPlatform.h"
 

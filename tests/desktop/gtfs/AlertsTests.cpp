@@ -1,4 +1,4 @@
-#include "GtfsFixtures.h"
+#include "desktop/gtfs/Fixtures.h"
 #include "desktop/gtfs/alerts/AlertTexts.h"
 #include "desktop/gtfs/feeds/TransitLineServiceError.h"
 

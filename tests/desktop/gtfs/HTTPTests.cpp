@@ -2,9 +2,9 @@
 #include <openssl/x509.h>
 #include <zip.h>
 
-#include "GtfsFixtures.h"
-#include "GtfsGzip.h"
-#include "GtfsLoopbackServer.h"
+#include "desktop/gtfs/Fixtures.h"
+#include "desktop/gtfs/Gzip.h"
+#include "desktop/gtfs/LoopbackServer.h"
 #include "desktop/gtfs/alerts/AlertsStore.h"
 #include "desktop/gtfs/feeds/TransitLineServiceError.h"
 #include "desktop/gtfs/net/FileReading.h"

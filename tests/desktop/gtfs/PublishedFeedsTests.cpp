@@ -3,7 +3,7 @@
 #include <set>
 #include <sstream>
 
-#include "GtfsFixtures.h"
+#include "desktop/gtfs/Fixtures.h"
 #include "desktop/gtfs/feeds/FeedCatalog.h"
 #include "desktop/gtfs/feeds/GTFSTransitLineService.h"
 #include "desktop/gtfs/net/FileReading.h"

@@ -1,7 +1,7 @@
 #include <condition_variable>
 
-#include "GtfsFixtures.h"
-#include "GtfsLoopbackServer.h"
+#include "desktop/gtfs/Fixtures.h"
+#include "desktop/gtfs/LoopbackServer.h"
 #include "desktop/gtfs/feeds/FeedCatalog.h"
 #include "desktop/gtfs/feeds/FeedCheck.h"
 #include "desktop/gtfs/feeds/FeedMuid.h"

@@ -1,6 +1,6 @@
 #include <zip.h>
 
-#include "GtfsFixtures.h"
+#include "desktop/gtfs/Fixtures.h"
 #include "desktop/gtfs/feeds/FeedConfiguration.h"
 #include "desktop/gtfs/feeds/TransitLineServiceError.h"
 #include "desktop/gtfs/net/FileReading.h"

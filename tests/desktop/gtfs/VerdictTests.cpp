@@ -2,9 +2,9 @@
 
 #include <zip.h>
 
-#include "GtfsFixtures.h"
-#include "GtfsGzip.h"
-#include "GtfsLoopbackServer.h"
+#include "desktop/gtfs/Fixtures.h"
+#include "desktop/gtfs/Gzip.h"
+#include "desktop/gtfs/LoopbackServer.h"
 #include "desktop/gtfs/feeds/FeedCheck.h"
 #include "desktop/gtfs/feeds/FeedMuid.h"
 #include "desktop/gtfs/feeds/GTFSTransitLineService.h"
