@@ -15,14 +15,15 @@ function(nimbo_test name)
   gtest_discover_tests(${name} DISCOVERY_TIMEOUT 60)
 endfunction()
 
+# Where programs look for their parts.
+set(NIMBO_PARTS_FOLDER ${PROJECT_BINARY_DIR}/src/process)
+set(CMAKE_BUILD_RPATH ${NIMBO_PARTS_FOLDER})
+set(CMAKE_INSTALL_RPATH $ORIGIN/../${CMAKE_INSTALL_LIBDIR}/nimbo-transit)
+
 # nimbo_part(NAME SOURCES ... LIBRARIES ...): libnimbo-NAME.so, which the programs open with its first use
 # (src/desktop/system/LatePart.h), through its one function nimbo_NAME. It is linked against LIBRARIES; what else of the
 # project it needs stays open, and every program that links nimbo_desktop exports that and no more. The objects are also
 # a library nimbo_NAME, for tests of what is inside.
-set(NIMBO_PARTS_FOLDER ${PROJECT_BINARY_DIR}/src/process)
-set(CMAKE_BUILD_RPATH ${NIMBO_PARTS_FOLDER})
-set(CMAKE_BUILD_RPATH_USE_ORIGIN ON)
-set(CMAKE_INSTALL_RPATH $ORIGIN/../${CMAKE_INSTALL_LIBDIR}/nimbo-transit)
 function(nimbo_part name)
   cmake_parse_arguments(PARSE_ARGV 1 arg "" "" "SOURCES;LIBRARIES")
   add_library(nimbo_${name} OBJECT ${arg_SOURCES})
@@ -32,7 +33,7 @@ function(nimbo_part name)
 
   set(part nimbo_${name}_part)
   set(interface ${CMAKE_CURRENT_BINARY_DIR}/${part}.map)
-  file(WRITE ${interface} "{ global: nimbo_${name}; local: *; };\n")
+  file(CONFIGURE OUTPUT ${interface} CONTENT "{ global: nimbo_${name}; local: *; };\n")
   add_library(${part} SHARED)
   set_target_properties(${part} PROPERTIES
     OUTPUT_NAME nimbo-${name} LIBRARY_OUTPUT_DIRECTORY ${NIMBO_PARTS_FOLDER} BUILD_RPATH "" INSTALL_RPATH ""
