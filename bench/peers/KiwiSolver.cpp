@@ -73,6 +73,8 @@ KiwiSolver::KiwiSolver(const CellConstraints& cell) {
   }
 }
 
+KiwiSolver::~KiwiSolver() = default;
+
 void KiwiSolver::solveAnew() {
   const auto solver = owned(PyObject_CallNoArgs(_objects->solverType.get()));
   for (const PythonRef& constraint : _objects->constraints)

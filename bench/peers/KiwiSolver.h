@@ -13,6 +13,7 @@ class KiwiSolver {
  public:
   /// Throws std::runtime_error with what the interpreter says.
   explicit KiwiSolver(const CellConstraints& cell);
+  ~KiwiSolver();
 
   /// A new solver with all the constraints, and the values of the variables.
   void solveAnew();
