@@ -153,13 +153,15 @@ class Bench:
         return messages
 
     def rows(self):
-        first, drawn = self.requests("first", ("loadView", {}), ("render", {"surface": "@PICTURE@"}))
-        start = ["--input", first, "--until", drawn, "--", self.widget, *self.arguments]
+        first, drawn = self.requests("first", ("loadView", {}), ("render", {}))
+        # The descriptor of the memory that the measuring program hands on.
+        draws = [self.widget, "--pictures", 3]
+        start = ["--input", first, "--until", drawn, "--", *draws, *self.arguments]
         bare = ["--until", "drawn", "--", self.build / "bench/nimbo-bare-widget", self.folder / "bare.sqlite",
                 "@PICTURE@"]
         update, updated = self.requests("update", ("loadView", {}), ("performUpdate", {}),
-                                        ("render", {"surface": "@PICTURE@"}))
-        loaded = ["--input", update, "--until", updated.replace("4", "3", 1), "--", self.widget]
+                                        ("render", {}))
+        loaded = ["--input", update, "--until", updated.replace("4", "3", 1), "--", *draws]
         window = ["--frame", "--", self.build / "src/host/window/nimbo-transit-desktop", *self.arguments]
         bare_window = ["--frame", "--", self.build / "bench/nimbo-bare-window"]
         mib = 1 / 1024

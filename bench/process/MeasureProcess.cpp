@@ -3,9 +3,10 @@
 //   nimbo-bench-process [--input FILE] (--until TEXT | --frame) -- PROGRAM [ARGUMENT...]
 //
 // The program gets FILE on its standard input, which stays open. The measurement ends with the first line of its output
-// that holds TEXT, or, with --frame, when a window's worth of pixels has changed on the X display. "@PICTURE@" in FILE
-// and in arguments becomes the path of shared memory to draw into. Prints one line of JSON: seconds, and at that moment
-// the resident and private dirty memory, and the peak of resident memory until the end, in KiB.
+// that holds TEXT, or, with --frame, when a window's worth of pixels has changed on the X display. "@PICTURE@" in
+// arguments becomes the path of shared memory to draw into, which is also descriptor 3. Prints one line of JSON:
+// seconds, and at that moment the resident and private dirty memory, and the peak of resident memory until the end, in
+// KiB.
 
 #include <X11/Xlib.h>
 #include <X11/extensions/Xdamage.h>
@@ -30,6 +31,8 @@ namespace {
 
 constexpr int kPatience = 120;          // seconds
 constexpr int kWindowPixels = 100'000;  // fewer are a cursor or a tooltip
+constexpr int kPictureDescriptor = 3;
+constexpr off_t kPictureBytes = 256'000'000;
 
 [[noreturn]] void fail(const std::string& what) {
   std::fprintf(stderr, "nimbo-bench-process: %s\n", what.c_str());
@@ -77,7 +80,8 @@ void waitForFrame(Display* display, int damageEvents) {
 int main(int argc, char** argv) {
   std::string input, until;
   bool untilFrame = false;
-  const int memory = memfd_create("picture", 0);
+  const int memory = memfd_create("picture", MFD_CLOEXEC);
+  if (memory < 0 || ftruncate(memory, kPictureBytes) != 0) fail(std::strerror(errno));
   const std::string picture = "/proc/" + std::to_string(getpid()) + "/fd/" + std::to_string(memory);
   int index = 1;
   for (; index < argc && std::strcmp(argv[index], "--") != 0; ++index) {
@@ -96,7 +100,7 @@ int main(int argc, char** argv) {
   if (words.empty() || until.empty() != untilFrame) fail("give --until TEXT or --frame, and a program after --");
   std::ostringstream text;
   if (!input.empty()) text << std::ifstream(input).rdbuf();
-  const std::string requests = withPicture(text.str(), picture);
+  const std::string requests = text.str();
 
   Display* display = nullptr;
   int damageEvents = 0, damageErrors = 0;
@@ -113,6 +117,7 @@ int main(int argc, char** argv) {
   posix_spawn_file_actions_init(&actions);
   posix_spawn_file_actions_adddup2(&actions, toProgram[0], STDIN_FILENO);
   posix_spawn_file_actions_adddup2(&actions, fromProgram[1], STDOUT_FILENO);
+  posix_spawn_file_actions_adddup2(&actions, memory, kPictureDescriptor);
   std::vector<char*> arguments;
   arguments.reserve(words.size() + 1);
   for (std::string& word : words) arguments.push_back(word.data());

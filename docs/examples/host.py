@@ -2,13 +2,18 @@
 """A host of the transit widget: shows its rows, opens the first one, and takes its leave.
 usage: host.py [WIDGET [ARGUMENTS OF THE WIDGET...]]"""
 import json
+import os
 import subprocess
 import sys
 
 
 class Widget:
     def __init__(self, command):
-        self.process = subprocess.Popen(command, stdin=subprocess.PIPE, stdout=subprocess.PIPE, encoding="utf-8")
+        # Room for the largest picture; the memory is taken as it is drawn into.
+        self.pictures = os.memfd_create("pictures")
+        os.ftruncate(self.pictures, 256_000_000)
+        self.process = subprocess.Popen([*command, "--pictures", str(self.pictures)], pass_fds=[self.pictures],
+                                        stdin=subprocess.PIPE, stdout=subprocess.PIPE, encoding="utf-8")
         self.last_id = 0
 
     def send(self, message):
@@ -45,6 +50,9 @@ for step in ("loadView", "viewWillAppear", "viewDidAppear", "performUpdate"):
 for row in widget.call("snapshot")["rows"]:
     print(row["primaryText"], "-", row.get("secondaryText") or "")
 widget.call("selectRow", section=0, row=0)
+drawn = widget.call("render")
+blue, green, red, _ = os.pread(widget.pictures, 4, 0)
+print(f"A picture of {drawn['width']} by {drawn['height']} pixels, the first is #{red:02x}{green:02x}{blue:02x}")
 for step in ("viewWillDisappear", "viewDidDisappear", "shutdown"):
     widget.call(step)
 print("The widget ended with status", widget.process.wait())

@@ -45,8 +45,9 @@ std::optional<std::string> failureOfUpdate(const protocol::UpdateResult& answer)
   return answer.reason.value_or("the update failed");
 }
 
-OnScreenWidget::OnScreenWidget(const CommandContext& context, const WidgetPresentation& presentation)
-    : _client(context.runLoop, arguments(context, presentation)) {
+OnScreenWidget::OnScreenWidget(const CommandContext& context, const WidgetPresentation& presentation,
+                               const PictureMemory* pictures)
+    : _client(context.runLoop, arguments(context, presentation), pictures) {
   _client.setNoticeHandler(context.tell);
   _client.call(protocol::kInitialize, initializationOf(presentation));
   for (const auto& step : {protocol::kLoadView, protocol::kViewWillAppear, protocol::kViewDidAppear})

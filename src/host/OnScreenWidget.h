@@ -41,14 +41,16 @@ std::optional<std::string> failureOfUpdate(const protocol::UpdateResult& answer)
 /// its rows, on `close`. Operations throw WidgetClientFailure.
 class OnScreenWidget {
  public:
-  OnScreenWidget(const CommandContext& context, const WidgetPresentation& presentation);
+  /// `pictures` is for `render`.
+  OnScreenWidget(const CommandContext& context, const WidgetPresentation& presentation,
+                 const PictureMemory* pictures = nullptr);
 
   /// Waits for the fetch that runs. Absent when it succeeded, else why it failed.
   std::optional<std::string> update();
   /// Switches to the expanded mode where the widget offers it; else the compact row says it all.
   void expand();
   protocol::Snapshot snapshot() { return _client.call(protocol::kSnapshot); }
-  void render(const std::string& path) { _client.call(protocol::kRender, {.path = path}); }
+  protocol::Rendered render() { return _client.call(protocol::kRender); }
   void close();
 
  private:

@@ -1,6 +1,7 @@
 #include <unistd.h>
 
 #include <cerrno>
+#include <cstdio>
 #include <cstring>
 #include <fstream>
 #include <iostream>
@@ -130,7 +131,7 @@ int runDecode(const CommandContext& context, const std::string& file) {
   }
   std::istream& input = file == "-" ? std::cin : opened;
   const Bytes bytes{std::istreambuf_iterator<char>(input), std::istreambuf_iterator<char>()};
-  if (input.bad()) throw CommandFailure("cannot read " + file + ": " + std::strerror(errno));
+  if (input.bad() || std::ferror(stdin)) throw CommandFailure("cannot read " + file + ": " + std::strerror(errno));
   WidgetClient client(context.runLoop, context.widgetArguments);
   try {
     std::cout << printableJSON(client.call(protocol::kDecode, {base64(bytes)}).text) << "\n";

@@ -12,8 +12,8 @@ constexpr std::size_t kLinesPerSecond = 1000;
 }  // namespace
 
 WatchedWidget::WatchedWidget(GLibRunLoop& runLoop, const std::vector<std::string>& arguments, TimeInterval patience,
-                             FailureHandler failed)
-    : _runLoop(runLoop), _patience(patience), _failed(std::move(failed)), _client(runLoop, arguments) {
+                             FailureHandler failed, const PictureMemory* pictures)
+    : _runLoop(runLoop), _patience(patience), _failed(std::move(failed)), _client(runLoop, arguments, pictures) {
   JSONRPCConnection& connection = _client.connection();
   connection.setLineObserver([this](std::string_view) { countLine(); });
   _client.setNonsenseHandler([this](const std::string& problem) { fail("it speaks nonsense: " + problem); });

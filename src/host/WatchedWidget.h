@@ -36,11 +36,12 @@ class WatchedWidget {
  public:
   using FailureHandler = std::function<void(const std::string& reason)>;
 
-  /// Starts the widget with these arguments. `patience` is the time, in seconds, in which it answers anything but an
-  /// update, which takes as long as its feeds. `failed` hears once, in a call of its own in which it may destroy this,
-  /// why the process is no more ("it ended"). Throws WidgetClientFailure when it cannot be started.
+  /// Starts the widget with these arguments, and with memory to draw into when it is to draw. `patience` is the time,
+  /// in seconds, in which it answers anything but an update, which takes as long as its feeds. `failed` hears once, in
+  /// a call of its own in which it may destroy this, why the process is no more ("it ended"). Throws
+  /// WidgetClientFailure when it cannot be started.
   WatchedWidget(GLibRunLoop& runLoop, const std::vector<std::string>& arguments, TimeInterval patience,
-                FailureHandler failed);
+                FailureHandler failed, const PictureMemory* pictures = nullptr);
   ~WatchedWidget();
 
   WidgetClient& client() { return _client; }

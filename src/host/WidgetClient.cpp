@@ -21,6 +21,9 @@ namespace {
 
 constexpr const char* kProgramName = "nimbo-transit-widget";
 
+/// The first after the standard ones.
+constexpr int kPicturesDescriptor = 3;
+
 struct Pipe {
   FileDescriptor reading, writing;
 };
@@ -48,17 +51,23 @@ std::filesystem::path WidgetClient::widgetProgram() {
   return folder / kProgramName;
 }
 
-WidgetClient::WidgetClient(GLibRunLoop& runLoop, const std::vector<std::string>& arguments) : _runLoop(runLoop) {
+WidgetClient::WidgetClient(GLibRunLoop& runLoop, const std::vector<std::string>& arguments,
+                           const PictureMemory* pictures)
+    : _runLoop(runLoop) {
   Pipe toWidget = makePipe(), fromWidget = makePipe();
   const std::string program = widgetProgram();
   std::vector<char*> argv{const_cast<char*>(kProgramName)};
   for (const std::string& argument : arguments) argv.push_back(const_cast<char*>(argument.c_str()));
+  const std::string picturesDescriptor = std::to_string(kPicturesDescriptor);
+  if (pictures)
+    argv.insert(argv.end(), {const_cast<char*>("--pictures"), const_cast<char*>(picturesDescriptor.c_str())});
   argv.push_back(nullptr);
 
   posix_spawn_file_actions_t actions;
   posix_spawn_file_actions_init(&actions);
   posix_spawn_file_actions_adddup2(&actions, toWidget.reading.get(), STDIN_FILENO);
   posix_spawn_file_actions_adddup2(&actions, fromWidget.writing.get(), STDOUT_FILENO);
+  if (pictures) posix_spawn_file_actions_adddup2(&actions, pictures->descriptor(), kPicturesDescriptor);
   // A group of its own: Ctrl+C in the terminal is for the host, which takes its leave of the widget.
   posix_spawnattr_t attributes;
   posix_spawnattr_init(&attributes);

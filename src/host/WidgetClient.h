@@ -15,6 +15,7 @@
 #include "desktop/raii/FileDescriptor.h"
 #include "desktop/rpc/JSONRPCConnection.h"
 #include "desktop/system/GLibRunLoop.h"
+#include "host/PictureMemory.h"
 #include "protocol/Coding.h"
 #include "protocol/Methods.h"
 
@@ -48,8 +49,10 @@ class WidgetClient {
   /// Hears what the user must be told.
   using NoticeHandler = std::function<void(const std::string& message)>;
 
-  /// Starts the widget with these arguments. Throws WidgetClientFailure when it cannot be started.
-  WidgetClient(GLibRunLoop& runLoop, const std::vector<std::string>& arguments);
+  /// Starts the widget with these arguments, and with memory to draw into when it is to draw. Throws
+  /// WidgetClientFailure when it cannot be started.
+  WidgetClient(GLibRunLoop& runLoop, const std::vector<std::string>& arguments,
+               const PictureMemory* pictures = nullptr);
   /// Closes the connection and waits for the process; one that does not end within a second is killed.
   ~WidgetClient();
   WidgetClient(const WidgetClient&) = delete;

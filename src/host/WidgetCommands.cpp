@@ -1,9 +1,10 @@
 #include <cerrno>
+#include <cstdio>
 #include <cstring>
-#include <filesystem>
 #include <fstream>
 #include <iostream>
 
+#include "desktop/drawing/DrawingPart.h"
 #include "host/Commands.h"
 #include "host/OnScreenWidget.h"
 #include "host/ScriptPlayer.h"
@@ -65,11 +66,15 @@ int runRender(const CommandContext& context, const RenderOptions& options) {
   presentation.appearance = options.dark ? Appearance::dark : Appearance::light;
   presentation.locale = options.locale;
   presentation.virtualTime = options.now;
-  OnScreenWidget widget(context, presentation);
+  const PictureMemory memory;
+  OnScreenWidget widget(context, presentation, &memory);
   const std::optional<std::string> failure = widget.update();
   if (options.expanded) widget.expand();
-  // The widget process has a working folder of its own to come.
-  widget.render(std::filesystem::absolute(options.output));
+  const std::optional<WidgetPicture> picture = memory.take(widget.render());
+  if (!picture) throw CommandFailure("the widget process has not drawn what it says");
+  const protocol::Rendered& layout = picture->layout;
+  if (const ErrorRef error = drawingPart().writePNG(picture->pixels, layout.width, layout.stride, options.output))
+    throw CommandFailure(error->reason());
   widget.close();
   if (failure) throw CommandFailure(*failure);
   return kExitSuccess;
@@ -83,8 +88,11 @@ int runScript(const CommandContext& context, const std::string& file, const std:
   }
   std::vector<std::string> arguments = context.widgetArguments;
   if (virtualTime) arguments.insert(arguments.end(), {"--virtual-time", *virtualTime});
-  WidgetClient client(context.runLoop, arguments);
-  ScriptPlayer(client, std::cout).play(file == "-" ? std::cin : opened);
+  const PictureMemory memory;
+  WidgetClient client(context.runLoop, arguments, &memory);
+  std::istream& input = file == "-" ? std::cin : opened;
+  ScriptPlayer(client, std::cout).play(input);
+  if (input.bad() || std::ferror(stdin)) throw CommandFailure("cannot read " + file + ": " + std::strerror(errno));
   return kExitSuccess;
 }
 

@@ -5,7 +5,6 @@
 
 #include <CLI/CLI.hpp>
 #include <cerrno>
-#include <csignal>
 #include <cstdio>
 #include <cstring>
 #include <iostream>
@@ -13,6 +12,7 @@
 
 #include "host/Arguments.h"
 #include "host/Commands.h"
+#include "host/StandardDescriptors.h"
 #include "host/StatusBar.h"
 #include "platform/foundation/Version.h"
 
@@ -223,6 +223,6 @@ int CommandLine::outputStatus() {
 }  // namespace nimbo
 
 int main(int argc, char** argv) {
-  std::signal(SIGPIPE, SIG_IGN);
+  nimbo::prepareStandardDescriptors();
   return nimbo::CommandLine().run(argc, argv);
 }

@@ -6,6 +6,7 @@
 #include "desktop/archive/ArchiveFormat.h"
 #include "desktop/archive/Bzip2.h"
 #include "desktop/archive/CBORKeyedArchive.h"
+#include "desktop/gtfs/text/Utf8.h"
 #include "handoff/NBUserActivityData.h"
 #include "handoff/NimboActivity.h"
 #include "platform/wire/StoredTransitIncident.h"
@@ -19,7 +20,10 @@ namespace {
 
 using nlohmann::json;
 
-constexpr std::size_t kMaximumRecordSize = std::size_t{16} << 20;
+// As feeds are bounded, so that a page shows no more of one than of the other.
+constexpr std::size_t kMaximumHandoffSize = std::size_t{1} << 20;
+constexpr std::size_t kMostIncidents = 5000;
+constexpr std::size_t kLongestTitle = 500, kLongestText = 10'000;  // characters
 
 std::string hexadecimal(const Bytes& bytes) {
   std::string text;
@@ -71,6 +75,10 @@ std::optional<protocol::Shield> shieldOf(const TransitArtworkRef& artwork) {
   return artwork ? std::optional(shieldOf(*artwork)) : std::nullopt;
 }
 
+std::optional<std::string> within(const std::optional<std::string>& text, std::size_t limit) {
+  return text ? std::optional<std::string>(firstCharacters(*text, limit)) : std::nullopt;
+}
+
 /// A date that can be written; a payload may hold any.
 std::optional<Date> writableDate(std::optional<Date> date) {
   return date && dateFromISOText(isoTextOfDate(*date)) ? date : std::nullopt;
@@ -78,9 +86,9 @@ std::optional<Date> writableDate(std::optional<Date> date) {
 
 protocol::Incident incidentOf(const TransitIncident& incident) {
   protocol::Incident result{.muid = incident.muid(),
-                            .title = incident.title(),
-                            .summary = incident.summary(),
-                            .fullDescription = incident.fullDescription(),
+                            .title = within(incident.title(), kLongestTitle),
+                            .summary = within(incident.summary(), kLongestText),
+                            .fullDescription = within(incident.fullDescription(), kLongestText),
                             .startDate = writableDate(incident.startDate()),
                             .endDate = writableDate(incident.endDate()),
                             .lastUpdated = writableDate(incident.lastUpdated()),
@@ -92,10 +100,11 @@ protocol::Incident incidentOf(const TransitIncident& incident) {
 
 protocol::Line lineOf(const TransitLineItem& line) {
   protocol::Line result{.muid = line.muid(),
-                        .name = line.name(),
+                        .name = within(line.name(), kLongestTitle),
                         .artwork = shieldOf(line.artwork()),
                         .alternateArtwork = shieldOf(line.alternateArtwork())};
-  if (const auto& system = line.system()) result.system = protocol::System{system->name(), shieldOf(system->artwork())};
+  if (const auto& system = line.system())
+    result.system = protocol::System{within(system->name(), kLongestTitle), shieldOf(system->artwork())};
   for (const TransitIncidentRef& incident : line.incidents()) result.incidents.push_back(incidentOf(*incident));
   return result;
 }
@@ -106,8 +115,8 @@ ErrorRef failure(std::string reason) {
 
 /// A NimboActivity.
 Outcome<ObjectRef> readRecord(std::span<const std::uint8_t> bytes) {
-  if (bytes.size() > kMaximumRecordSize)
-    return failure("the activity record has more than " + std::to_string(kMaximumRecordSize) + " bytes");
+  if (bytes.size() > kMaximumHandoffSize)
+    return failure("the activity record has more than " + std::to_string(kMaximumHandoffSize) + " bytes");
   ProtobufReader reader(bytes);
   const auto activity = std::make_shared<NimboActivity>();
   if (!activity->readFrom(reader)) return failure("the activity record is broken: " + reader.failureText());
@@ -136,6 +145,11 @@ Outcome<ObjectRef> readArchive(std::span<const std::uint8_t> bytes) {
   return root;
 }
 
+ErrorRef tooManyIncidents(std::size_t count) {
+  if (count <= kMostIncidents) return nullptr;
+  return failure("there are " + std::to_string(count) + " incidents, more than " + std::to_string(kMostIncidents));
+}
+
 bool isBzip2Stream(std::span<const std::uint8_t> bytes) {
   return bytes.size() >= 4 && bytes[0] == 'B' && bytes[1] == 'Z' && bytes[2] == 'h' && bytes[3] >= '1' &&
          bytes[3] <= '9';
@@ -151,7 +165,7 @@ Outcome<ObjectRef> readHandoff(std::span<const std::uint8_t> bytes) {
   if (bytes.empty()) return failure("there are no bytes");
   if (isMap(bytes)) return readArchive(bytes);
   if (!isBzip2Stream(bytes)) return readRecord(bytes);
-  const auto record = bzip2DecompressedData(bytes, kMaximumRecordSize);
+  const auto record = bzip2DecompressedData(bytes, kMaximumHandoffSize);
   return record ? readRecord(*record) : record.error();
 }
 
@@ -163,8 +177,14 @@ Outcome<protocol::Handoff> decodeHandoff(std::span<const std::uint8_t> bytes) {
   protocol::Handoff handoff;
   std::string name((*content)->className());
   if (const auto* activity = dynamic_cast<const NimboActivity*>(content->get())) {
-    if (activity->hasLineItem()) handoff.line = lineOf(*activity->lineItem());
+    if (activity->hasLineItem()) {
+      if (ErrorRef error = tooManyIncidents(activity->lineItem()->incidents().size())) return error;
+      handoff.line = lineOf(*activity->lineItem());
+    }
   } else if (const auto* list = dynamic_cast<const BoxedArray*>(content->get())) {
+    if (bytes.size() > kMaximumHandoffSize)
+      return failure("the list of incidents has more than " + std::to_string(kMaximumHandoffSize) + " bytes");
+    if (ErrorRef error = tooManyIncidents(list->elements().size())) return error;
     name = kNimboTransitWidgetIncidentSummaryActivityUserInfoKey;
     handoff.incidents.emplace();
     for (const auto& incident : list->elementsOfClass<StoredTransitIncident>())

@@ -1,5 +1,6 @@
 #include "process/RemoteHost.h"
 
+#include "process/HandoffDecoder.h"
 #include "process/Snapshot.h"
 
 namespace nimbo {
@@ -24,6 +25,15 @@ ErrorRef hostError(const protocol::Opened& answer, const std::optional<JSONRPCEr
   if (failure) return Error::errorWithDomain_code_reason(kHostErrorDomain, failure->code, failure->message);
   if (answer.opened) return nullptr;
   return Error::errorWithDomain_code_reason(kHostErrorDomain, 0, answer.error.value_or("the host did not open it"));
+}
+
+/// Why nobody would take what is handed over; null when all of it is within bounds.
+ErrorRef problemOfHandoff(const BoxedDictionary* userInfo) {
+  if (!userInfo) return nullptr;
+  for (const auto& [key, value] : userInfo->entries())
+    if (const auto* data = dynamic_cast<const BoxedData*>(value.get()))
+      if (const auto handoff = decodeHandoff(data->value()); !handoff) return handoff.error();
+  return nullptr;
 }
 
 }  // namespace
@@ -59,14 +69,22 @@ std::shared_ptr<UserActivity> RemoteHost::createUserActivity(const std::string& 
 void RemoteHost::openUserActivity(const std::shared_ptr<const UserActivity>& activity,
                                   const ApplicationRecordRef& application, bool requireUnlockPrompt,
                                   Completion completion) {
+  // Such as when there are too many incidents to hand over: the tap would seem to do nothing.
+  const auto fail = [this](const std::string& why) {
+    notify(_connection, protocol::kNotice, {"Cannot open it: " + why + "."});
+  };
+  if (const auto error = problemOfHandoff(activity->userInfo().get())) {
+    fail(error->reason());
+    if (completion) completion(false, error);
+    return;
+  }
   protocol::OpenUserActivityParams params{.activityType = activity->activityType(),
                                           .userInfo = writtenUserInfo(activity->userInfo().get()),
                                           .requireUnlockPrompt = requireUnlockPrompt};
   if (application) params.application = application->identifier();
   _connection.call(protocol::kOpenUserActivity.name, protocol::write(params),
-                   [this, completion = std::move(completion)](const json& result, const auto& failure) {
-                     // Such as when there are too many incidents to hand over: the tap would seem to do nothing.
-                     if (failure) notify(_connection, protocol::kNotice, {"Cannot open it: " + failure->message + "."});
+                   [fail, completion = std::move(completion)](const json& result, const auto& failure) {
+                     if (failure) fail(failure->message);
                      const protocol::Opened answer = openedOf(result, failure);
                      if (completion) completion(answer.opened, hostError(answer, failure));
                    });

@@ -1,10 +1,17 @@
 #include "process/Sandbox.h"
 
+#include <fcntl.h>
+#include <linux/landlock.h>
+#include <linux/sockios.h>
 #include <sched.h>
 #include <seccomp.h>
 #include <sys/ioctl.h>
+#include <sys/mman.h>
 #include <sys/prctl.h>
+#include <sys/shm.h>
 #include <sys/socket.h>
+#include <sys/stat.h>
+#include <sys/syscall.h>
 #include <unistd.h>
 
 #include <algorithm>
@@ -12,6 +19,8 @@
 #include <memory>
 #include <string>
 #include <system_error>
+
+#include "desktop/raii/FileDescriptor.h"
 
 namespace nimbo {
 
@@ -123,11 +132,31 @@ int installFilter() {
   filter.refuse({SCMP_SYS(umount), SCMP_SYS(setuid32), SCMP_SYS(setgid32), SCMP_SYS(setreuid32), SCMP_SYS(setregid32),
                  SCMP_SYS(setresuid32), SCMP_SYS(setresgid32), SCMP_SYS(setgroups32), SCMP_SYS(setfsuid32),
                  SCMP_SYS(setfsgid32), SCMP_SYS(stime), SCMP_SYS(clock_settime64), SCMP_SYS(clock_adjtime64)});
-  // connections from outside
-  filter.refuse({SCMP_SYS(listen), SCMP_SYS(accept), SCMP_SYS(accept4)});
+  // connections and messages from outside
+  filter.refuse({SCMP_SYS(bind), SCMP_SYS(listen), SCMP_SYS(accept), SCMP_SYS(accept4)});
+  // files cut short by their path, or opened for reading, which Landlock learned late to see
+  filter.refuse({SCMP_SYS(truncate), SCMP_SYS(truncate64), SCMP_SYS(creat)});
+  filter.refuse({SCMP_SYS(openat2)}, ENOSYS);
+  filter.refuseWhereBitsAre(SCMP_SYS(open), 1, O_TRUNC | O_ACCMODE, O_TRUNC);
+  filter.refuseWhereBitsAre(SCMP_SYS(openat), 2, O_TRUNC | O_ACCMODE, O_TRUNC);
+  // signals to others that a descriptor sends, and what limits or slows others
+  for (const int call : {SCMP_SYS(fcntl), SCMP_SYS(fcntl64)})
+    for (const int command : {F_SETOWN, F_SETOWN_EX, F_SETSIG, F_SETLEASE, F_NOTIFY})
+      filter.refuseWhereEqual(call, 1, static_cast<std::uint32_t>(command));
+  for (const int call : {SCMP_SYS(prlimit64), SCMP_SYS(sched_setaffinity), SCMP_SYS(sched_setattr),
+                         SCMP_SYS(sched_setparam), SCMP_SYS(sched_setscheduler)})
+    filter.refuseUnlessEqual(call, 0, 0);
+  filter.refuse({SCMP_SYS(setpriority), SCMP_SYS(ioprio_set), SCMP_SYS(migrate_pages), SCMP_SYS(move_pages)});
+  // code that is written and run
+  for (const int call : {SCMP_SYS(mmap), SCMP_SYS(mmap2)})
+    filter.refuseWhereBitsAre(call, 2, PROT_WRITE | PROT_EXEC, PROT_WRITE | PROT_EXEC);
+  for (const int call : {SCMP_SYS(mprotect), SCMP_SYS(pkey_mprotect)})
+    filter.refuseWhereBitsAre(call, 2, PROT_EXEC, PROT_EXEC);
+  filter.refuseWhereBitsAre(SCMP_SYS(shmat), 2, SHM_EXEC, SHM_EXEC);
   filter.refuseUnlessEqual(SCMP_SYS(tgkill), 0, static_cast<std::uint32_t>(::getpid()));
   filter.refuseUnlessAmong(SCMP_SYS(socket), 0, {AF_UNIX, AF_INET, AF_INET6, AF_NETLINK});
-  filter.refuseWhereEqual(SCMP_SYS(ioctl), 1, TIOCSTI);
+  for (const unsigned request : {TIOCSTI, TIOCLINUX, FIOSETOWN, SIOCSPGRP})
+    filter.refuseWhereEqual(SCMP_SYS(ioctl), 1, request);
   if (!kIsTraced) {
     filter.refuse({SCMP_SYS(ptrace)});
     // Threads may come, processes may not. Where clone3 is missing, the C library makes its threads with clone.
@@ -135,6 +164,38 @@ int installFilter() {
     filter.refuseWhereBitsAre(SCMP_SYS(clone), kCloneFlags, CLONE_THREAD, 0);
   }
   return filter.install();
+}
+
+/// All that changes files and folders, and running them.
+constexpr std::uint64_t kChangesOfFiles = LANDLOCK_ACCESS_FS_WRITE_FILE;
+constexpr std::uint64_t kChanges =
+    kChangesOfFiles | LANDLOCK_ACCESS_FS_EXECUTE | LANDLOCK_ACCESS_FS_REMOVE_DIR | LANDLOCK_ACCESS_FS_REMOVE_FILE |
+    LANDLOCK_ACCESS_FS_MAKE_CHAR | LANDLOCK_ACCESS_FS_MAKE_DIR | LANDLOCK_ACCESS_FS_MAKE_REG |
+    LANDLOCK_ACCESS_FS_MAKE_SOCK | LANDLOCK_ACCESS_FS_MAKE_FIFO | LANDLOCK_ACCESS_FS_MAKE_BLOCK |
+    LANDLOCK_ACCESS_FS_MAKE_SYM | LANDLOCK_ACCESS_FS_REFER;
+/// What the widget does in its folders.
+constexpr std::uint64_t kOwnChanges = kChangesOfFiles | LANDLOCK_ACCESS_FS_REMOVE_DIR | LANDLOCK_ACCESS_FS_REMOVE_FILE |
+                                      LANDLOCK_ACCESS_FS_MAKE_DIR | LANDLOCK_ACCESS_FS_MAKE_REG |
+                                      LANDLOCK_ACCESS_FS_REFER;
+
+/// The errno value of what went wrong; 0 when the kernel refuses what changes anything but `writable`.
+int restrictWriting(std::span<const std::filesystem::path> writable) {
+  constexpr long kLeastVersion = 2;
+  const long version = ::syscall(SYS_landlock_create_ruleset, nullptr, 0, LANDLOCK_CREATE_RULESET_VERSION);
+  if (version < 0) return errno;
+  if (version < kLeastVersion) return EOPNOTSUPP;
+  const landlock_ruleset_attr changes{.handled_access_fs = kChanges};
+  const FileDescriptor rules(static_cast<int>(::syscall(SYS_landlock_create_ruleset, &changes, sizeof changes, 0)));
+  if (!rules) return errno;
+  for (const std::filesystem::path& path : writable) {
+    const FileDescriptor place(::open(path.c_str(), O_PATH | O_CLOEXEC));
+    struct stat status {};
+    if (!place || ::fstat(place.get(), &status) != 0) continue;
+    const landlock_path_beneath_attr allowed{.allowed_access = S_ISDIR(status.st_mode) ? kOwnChanges : kChangesOfFiles,
+                                             .parent_fd = place.get()};
+    if (::syscall(SYS_landlock_add_rule, rules.get(), LANDLOCK_RULE_PATH_BENEATH, &allowed, 0) != 0) return errno;
+  }
+  return ::syscall(SYS_landlock_restrict_self, rules.get(), 0) == 0 ? 0 : errno;
 }
 
 ErrorRef refusal(const char* what, int code) {
@@ -145,10 +206,20 @@ ErrorRef refusal(const char* what, int code) {
 
 }  // namespace
 
-ErrorRef giveUpPrivileges() {
-  ::close_range(STDERR_FILENO + 1, ~0u, 0);  // an older kernel closes nothing
+void closeInheritedDescriptors(int kept) {
+  // An older kernel closes nothing.
+  constexpr unsigned kFirst = STDERR_FILENO + 1;
+  const unsigned spared = kept < 0 ? 0 : static_cast<unsigned>(kept);
+  if (spared > kFirst) ::close_range(kFirst, spared - 1, 0);
+  ::close_range(std::max(spared + 1, kFirst), ~0u, 0);
+}
+
+ErrorRef giveUpPrivileges(std::span<const std::filesystem::path> writable) {
   if (::prctl(PR_SET_NO_NEW_PRIVS, 1, 0, 0, 0) != 0) return refusal("gaining privileges", errno);
+  // Without the one the other still holds.
+  const int unrestricted = restrictWriting(writable);
   if (const int code = installFilter()) return refusal("system calls", code);
+  if (unrestricted != 0) return refusal("changing the user's files", unrestricted);
   return nullptr;
 }
 

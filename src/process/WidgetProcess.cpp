@@ -10,7 +10,7 @@
 #include "platform/ui/Color.h"
 #include "process/HandoffDecoder.h"
 #include "process/HostLogSink.h"
-#include "process/SharedSurface.h"
+#include "process/PictureOutput.h"
 #include "process/Snapshot.h"
 #include "protocol/Coding.h"
 
@@ -263,8 +263,14 @@ protocol::Snapshot WidgetProcess::snapshot(const Nothing&) {
 }
 
 protocol::Rendered WidgetProcess::render(const protocol::RenderParams& params) {
-  if (!params.surface && !params.path)
-    throw JSONRPCFailure(JSONRPCError::kInvalidParams, "parameter \"path\" or \"surface\" must be given");
+  if (params.surface || params.path)
+    throw JSONRPCFailure(JSONRPCError::kInvalidParams,
+                         std::string("parameter \"") + (params.path ? "path" : "surface") +
+                             "\" is not taken any more: the widget draws into the memory that it was started with "
+                             "(--pictures), and the host writes files");
+  if (_options.pictures < 0)
+    throw JSONRPCFailure(JSONRPCError::kDrawingFailed,
+                         "there is no memory to draw into: start the widget with --pictures DESCRIPTOR");
   _frameAnnounced = false;
   View& view = *_controller->view();
   view.layoutIfNeeded();
@@ -273,8 +279,7 @@ protocol::Rendered WidgetProcess::render(const protocol::RenderParams& params) {
   const auto picture = drawingPart().render(draw, view.bounds().size(), environment.screenScale(),
                                             colorOf(SystemColor::background, environment.appearance()));
   ErrorRef error = picture.error();
-  if (!error)
-    error = params.surface ? writeSharedSurface(**picture, *params.surface) : (*picture)->writePNG(*params.path);
+  if (!error) error = writePicture(**picture, _options.pictures);
   if (error) throw JSONRPCFailure(JSONRPCError::kDrawingFailed, error->reason());
   const Picture& drawn = **picture;
   return {drawn.pixelWidth(), drawn.pixelHeight(), drawn.stride(), drawn.scale()};

@@ -21,6 +21,8 @@ class WidgetProcess {
     Paths paths;
     /// The date at which time stands still until it is advanced; absent: the machine's clock.
     std::optional<Date> virtualTime;
+    /// The host's memory that pictures are drawn into; -1: it has given none.
+    int pictures = -1;
   };
 
   /// Speaks over the descriptors, which stay open as long as this lives.

@@ -96,7 +96,7 @@ struct Highlighted {
   bool highlighted = false;
 };
 
-/// One of the two.
+/// Neither of them is taken any more.
 struct RenderParams {
   std::optional<std::string> path;
   std::optional<std::string> surface;

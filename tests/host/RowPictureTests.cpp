@@ -8,6 +8,7 @@
 
 #include "desktop/drawing/Ink.h"
 #include "host/Programs.h"
+#include "host/ScriptPlayer.h"
 
 namespace nimbo {
 namespace {
@@ -38,8 +39,11 @@ void collect(const json& views, double x, double y, Parts& parts) {
 
 class Picture {
  public:
-  explicit Picture(const std::string& file)
-      : _ink(CairoSurface(CairoSurfaceHandle(cairo_image_surface_create_from_png(file.c_str())), {}, kScale)) {}
+  explicit Picture(WidgetPicture drawn)
+      : _ink(CairoSurface(CairoSurfaceHandle(cairo_image_surface_create_for_data(
+                              drawn.pixels.data(), CAIRO_FORMAT_ARGB32, drawn.layout.width, drawn.layout.height,
+                              drawn.layout.stride)),
+                          {}, kScale)) {}
 
   int width() const { return _ink.width(); }
   Ink::Found drawnIn(const PixelBox& box) const {
@@ -100,7 +104,6 @@ class RowPictures : public testing::Test {
 
   /// The rows as drawn with these parameters of `initialize` over the ordinary ones.
   std::pair<json, Picture> draw(const json& parameters, bool isExpanded) {
-    const std::string file = programs.folder.path() / "rows.png";
     std::vector<json> events = appearing();
     json& all = events[0]["params"];
     all["scale"] = kScale;
@@ -108,8 +111,21 @@ class RowPictures : public testing::Test {
     events.push_back(request("performUpdate"));
     if (isExpanded) events.push_back(request("setActiveDisplayMode", {{"mode", "expanded"}}));
     events.push_back(request("snapshot"));
-    events.push_back(request("render", {{"path", file}}));
-    return {snapshots(programs.play(events)).at(0), Picture(file)};
+    events.push_back(request("render"));
+    std::stringstream script, output;
+    for (const json& event : events) script << event << "\n";
+    GLibRunLoop runLoop;
+    const PictureMemory memory;
+    ::setenv("NIMBO_TRANSIT_WIDGET", NIMBO_TRANSIT_WIDGET, 1);
+    WidgetClient client(runLoop,
+                        {"--config", programs.folder.path() / "config", "--state", programs.folder.path() / "state",
+                         "--virtual-time", isoTextOfDate(Programs::now())},
+                        &memory);
+    ScriptPlayer(client, output).play(script);
+    std::vector<json> lines;
+    for (std::string line; std::getline(output, line);) lines.push_back(json::parse(line));
+    const auto drawn = protocol::read<protocol::Rendered>(lines.back()["result"]);
+    return {snapshots(lines).at(0), Picture(memory.take(drawn).value())};
   }
 
   Programs programs;

@@ -24,6 +24,14 @@ class HandoffPayload : public testing::Test {
     return dynamic_cast<const BoxedData&>(*data->userInfo()->objectForKey(key)).value();
   }
 
+  /// One whose texts all have so many characters.
+  static TransitIncidentRef wordyIncident(std::size_t length) {
+    BasicTransitIncident::Fields fields;
+    fields.muid = 1;
+    fields.title = fields.summary = fields.fullDescription = std::string(length, 'x');
+    return std::make_shared<const BasicTransitIncident>(std::move(fields));
+  }
+
   CBORKeyedArchive archive;
   Bzip2Compressor compressor;
   TestPlatform platform{&archive, &compressor};
@@ -70,6 +78,7 @@ TEST_F(HandoffPayload, ThatIsBrokenIsToldWithItsPlace) {
   Bytes damaged = whole;
   damaged[damaged.size() / 2] ^= 0x10;
   const auto text = [](std::string_view content) { return Bytes(content.begin(), content.end()); };
+  const TransitIncidents many(5001, incident(1));
   const struct {
     Bytes bytes;
     std::string reason;
@@ -77,7 +86,12 @@ TEST_F(HandoffPayload, ThatIsBrokenIsToldWithItsPlace) {
       {{}, "there are no bytes"},
       {longer, "other bytes follow the bzip2 stream, at byte " + std::to_string(whole.size())},
       {damaged, "the bzip2 stream is broken, at byte "},
-      {*compressor.Bzip2Compress(Bytes(std::size_t{17} << 20)), "holds more than 16777216 bytes"},
+      {*compressor.Bzip2Compress(Bytes((std::size_t{1} << 20) + 1)), "holds more than 1048576 bytes"},
+      {Bytes((std::size_t{1} << 20) + 1), "more than 1048576 bytes"},
+      {payload(activityDataForIncidents(many), "incidentListKey"), "there are 5001 incidents, more than 5000"},
+      {payload(activityDataForLineItem(lineItem(1, "A", many)), "bs"), "there are 5001 incidents, more than 5000"},
+      {payload(activityDataForIncidents({wordyIncident(std::size_t{1} << 20)}), "incidentListKey"),
+       "the list of incidents has more than 1048576 bytes"},
       {*compressor.Bzip2Compress(text("\x7a\x02\x12\x09")),
        "lineItem.name: the length exceeds the bytes that follow, at byte 3"},
       {text("{}"), "lineItem: the length exceeds the bytes that follow, at byte 1"},
@@ -97,6 +111,21 @@ TEST_F(HandoffPayload, ThatIsBrokenIsToldWithItsPlace) {
   for (std::size_t length = 4; length < whole.size(); ++length)
     EXPECT_NE(decodeHandoff(std::span(whole).first(length)).error()->reason().find("bzip2"), std::string::npos)
         << length;
+}
+
+TEST_F(HandoffPayload, IsShownWithinTheBoundsOfFeeds) {
+  const TransitLineItemRef line = lineItem(1, std::string(501, 'n'), TransitIncidents(5000, wordyIncident(11)));
+  const auto whole = decodeHandoff(payload(activityDataForLineItem(line), "bs"));
+  ASSERT_TRUE(whole) << whole.error()->reason();
+  EXPECT_EQ(whole->line->incidents.size(), 5000u);
+  EXPECT_EQ(whole->line->incidents[0].title, std::string(11, 'x'));
+  EXPECT_EQ(whole->line->name, std::string(500, 'n'));
+  const auto list = decodeHandoff(payload(activityDataForIncidents({wordyIncident(10'001)}), "incidentListKey"));
+  ASSERT_TRUE(list) << list.error()->reason();
+  const protocol::Incident& shown = list->incidents->at(0);
+  EXPECT_EQ(shown.title->size(), 500u);
+  EXPECT_EQ(shown.summary->size(), 10'000u);
+  EXPECT_EQ(shown.fullDescription->size(), 10'000u);
 }
 
 TEST_F(HandoffPayload, OfALineIsMadeOnceWhileTheLineLives) {

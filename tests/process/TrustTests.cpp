@@ -2,13 +2,23 @@
 
 #include <fcntl.h>
 #include <gmock/gmock.h>
+#include <linux/landlock.h>
+#include <linux/sockios.h>
+#include <netdb.h>
+#include <netinet/in.h>
 #include <sched.h>
 #include <signal.h>
 #include <spawn.h>
 #include <sys/ioctl.h>
+#include <sys/mman.h>
+#include <sys/personality.h>
+#include <sys/prctl.h>
+#include <sys/resource.h>
+#include <sys/shm.h>
 #include <sys/socket.h>
 #include <sys/stat.h>
 #include <sys/syscall.h>
+#include <sys/uio.h>
 #include <sys/wait.h>
 #include <unistd.h>
 
@@ -16,7 +26,9 @@
 #include <fstream>
 #include <thread>
 
+#include "desktop/drawing/DrawingPart.h"
 #include "desktop/gtfs/feeds/FeedMuid.h"
+#include "desktop/system/LinuxMemoryPressure.h"
 #include "host/Programs.h"
 #include "process/Sandbox.h"
 
@@ -75,26 +87,213 @@ constexpr bool kMayFork = true;  // the sanitizer looks for leaks from a process
 constexpr bool kMayFork = false;
 #endif
 
-TEST(Trust, OfTheWidgetProcessIsGivenUp) {
-  EXPECT_EXIT(
-      {
-        const auto isRefused = [](long result) { return result == -1 && errno == EPERM; };
-        const int inherited = ::dup(0);
-        bool holds = giveUpPrivileges() == nullptr && ::fcntl(inherited, F_GETFD) == -1;
-        char* const none[] = {nullptr};
-        holds = holds && isRefused(::execv("/bin/true", none)) && isRefused(::kill(1, 0)) &&
-                isRefused(::socket(AF_PACKET, SOCK_RAW, 0)) && isRefused(::unshare(CLONE_NEWUSER)) &&
-                isRefused(::ioctl(0, TIOCSTI, "x")) && (kMayFork || isRefused(::fork()));
-        // The kernel reads the lower half of these arguments alone.
-        constexpr long kUpperHalf = 1L << 32;
-        holds = holds && ::raise(0) == 0 && ::syscall(SYS_socket, kUpperHalf | AF_UNIX, SOCK_STREAM, 0) >= 0 &&
-                isRefused(::syscall(SYS_socket, kUpperHalf | AF_PACKET, SOCK_RAW, 0)) &&
-                isRefused(::syscall(SYS_socket, AF_VSOCK, SOCK_STREAM, 0)) &&
-                isRefused(::syscall(SYS_ioctl, 0, kUpperHalf | TIOCSTI, "x"));
-        std::thread([] {}).join();
-        ::_exit(holds ? 0 : 1);
-      },
-      testing::ExitedWithCode(0), "");
+/// What is tried from inside, and whether it ended as it should.
+struct Probe {
+  const char* what;
+  std::function<bool()> holds;
+};
+
+bool isRefused(long result) { return result == -1 && errno == EPERM; }
+/// As Landlock does.
+bool isOutOfReach(long result) { return result == -1 && (errno == EACCES || errno == EPERM || errno == EXDEV); }
+template <class... Arguments>
+long call(long number, Arguments... arguments) {
+  return ::syscall(number, arguments...);
+}
+
+/// Ends the process: with 0 when all probes hold, else saying which do not.
+[[noreturn]] void endWith(const std::vector<Probe>& probes) {
+  int status = 0;
+  for (const Probe& probe : probes) {
+    if (probe.holds()) continue;
+    std::fprintf(stderr, "does not hold: %s (%s)\n", probe.what, std::strerror(errno));
+    status = 1;
+  }
+  ::_exit(status);
+}
+
+/// A process of the same user that waits, and ends with the one that made it.
+pid_t otherProcess() {
+  const pid_t process = ::fork();
+  if (process != 0) return process;
+  ::prctl(PR_SET_PDEATHSIG, SIGKILL);
+  for (;;) ::pause();
+}
+
+bool hasLandlock() { return call(SYS_landlock_create_ruleset, nullptr, 0, LANDLOCK_CREATE_RULESET_VERSION) >= 2; }
+
+// The kernel reads the lower half of these arguments alone.
+constexpr long kUpperHalf = 1L << 32;
+constexpr std::size_t kPage = 4096;
+
+[[noreturn]] void tryWhatIsGivenUp() {
+  const pid_t other = otherProcess();
+  const int inherited = ::dup(0), kept = ::dup(0), later = ::dup(0);
+  closeInheritedDescriptors(kept);
+  const bool closed = ::fcntl(inherited, F_GETFD) == -1 && ::fcntl(later, F_GETFD) == -1;
+  const int shared = ::shmget(IPC_PRIVATE, kPage, 0600);
+  void* const memory = ::mmap(nullptr, kPage, PROT_READ | PROT_WRITE, MAP_PRIVATE | MAP_ANONYMOUS, -1, 0);
+  const int udp = ::socket(AF_INET, SOCK_DGRAM | SOCK_CLOEXEC, 0);
+  const ErrorRef refused = giveUpPrivileges({});
+  const auto control = [](long request) { return isRefused(call(SYS_ioctl, 0, request, "x")); };
+  const auto command = [&](int what) { return isRefused(call(SYS_fcntl, udp, what, ::getpid())); };
+  char* const none[] = {nullptr};
+  const rlimit limit{1, 1};
+  const sockaddr_in anywhere{.sin_family = AF_INET, .sin_port = 0, .sin_addr = {}, .sin_zero = {}};
+  const auto* const address = reinterpret_cast<const sockaddr*>(&anywhere);
+  const auto mapped = [](int protection) {
+    return call(SYS_mmap, nullptr, kPage, protection, MAP_PRIVATE | MAP_ANONYMOUS, -1, 0L);
+  };
+  endWith({
+      {"the filter is in force", [&] { return !refused || !hasLandlock(); }},
+      {"inherited descriptors are closed", [&] { return closed && ::fcntl(kept, F_GETFD) != -1; }},
+      {"starting programs", [&] { return isRefused(::execv("/bin/true", none)); }},
+      {"starting processes", [] { return kMayFork || isRefused(::fork()); }},
+      {"name spaces", [] { return isRefused(::unshare(CLONE_NEWUSER)); }},
+      {"signals", [&] { return isRefused(::kill(other, 0)) && ::raise(0) == 0; }},
+      {"signals by a descriptor",
+       [&] {
+         return command(F_SETOWN) && command(F_SETOWN_EX) && command(F_SETSIG) && command(F_SETLEASE) &&
+                command(F_NOTIFY) && control(FIOSETOWN) && control(SIOCSPGRP) && control(kUpperHalf | FIOSETOWN) &&
+                isRefused(call(SYS_fcntl, udp, kUpperHalf | F_SETOWN, ::getpid()));
+       }},
+      {"limits and order of other processes",
+       [&] {
+         return isRefused(::prlimit(other, RLIMIT_NOFILE, &limit, nullptr)) &&
+                isRefused(::setpriority(PRIO_PROCESS, static_cast<id_t>(other), 1)) &&
+                isRefused(call(SYS_sched_setaffinity, other, 0, nullptr)) &&
+                ::getrlimit(RLIMIT_NOFILE, std::make_unique<rlimit>().get()) == 0;
+       }},
+      {"memory of other processes", [&] { return isRefused(::process_vm_writev(other, nullptr, 0, nullptr, 0, 0)); }},
+      {"typing into the terminal",
+       [&] {
+         return control(TIOCSTI) && control(TIOCLINUX) && control(kUpperHalf | TIOCSTI) &&
+                control(kUpperHalf << 20 | TIOCLINUX) && control(kUpperHalf << 30 | TIOCSTI);
+       }},
+      {"sockets",
+       [] {
+         return isRefused(::socket(AF_PACKET, SOCK_RAW, 0)) &&
+                call(SYS_socket, kUpperHalf | AF_UNIX, SOCK_STREAM, 0) >= 0 &&
+                isRefused(call(SYS_socket, kUpperHalf | AF_PACKET, SOCK_RAW, 0)) &&
+                isRefused(::socket(AF_VSOCK, SOCK_STREAM, 0));
+       }},
+      {"serving", [&] { return isRefused(::bind(udp, address, sizeof anywhere)) && isRefused(::listen(udp, 1)); }},
+      {"memory written and executed",
+       [&] {
+         constexpr int kAll = PROT_READ | PROT_WRITE | PROT_EXEC;
+         return isRefused(mapped(kAll)) && isRefused(mapped(PROT_WRITE | PROT_EXEC)) &&
+                isRefused(::mprotect(memory, kPage, kAll)) &&
+                isRefused(::mprotect(memory, kPage, PROT_READ | PROT_EXEC)) &&
+                isRefused(call(SYS_pkey_mprotect, memory, kPage, PROT_EXEC, -1)) &&
+                isRefused(call(SYS_shmat, shared, nullptr, SHM_EXEC)) && isRefused(::personality(READ_IMPLIES_EXEC)) &&
+                ::shmctl(shared, IPC_RMID, nullptr) == 0;
+       }},
+      // what it needs
+      {"threads", [] { return std::thread([] {}).join(), true; }},
+      {"outgoing messages", [&] { return ::connect(udp, address, sizeof anywhere) == 0 || errno != EPERM; }},
+      {"names of servers",
+       [] {
+         addrinfo* found = nullptr;
+         const addrinfo hints{.ai_flags = AI_ADDRCONFIG, .ai_family = AF_UNSPEC, .ai_socktype = SOCK_STREAM};
+         return ::getaddrinfo("localhost", "80", &hints, &found) == 0 && found;
+       }},
+      {"late libraries and fonts",
+       [] {
+         drawingPart().lookForFonts();
+         const auto text = drawingPart().makeTextSystem("en");
+         return text->layOut("Harbour", {.pointSize = 12}, 1000, 1, TextAlignment::natural, false)->size().width > 0;
+       }},
+  });
+}
+
+TEST(Trust, OfTheWidgetProcessIsGivenUp) { EXPECT_EXIT(tryWhatIsGivenUp(), testing::ExitedWithCode(0), ""); }
+
+[[noreturn]] void tryBeyondTheFolder(const fs::path& folder) {
+  const pid_t other = otherProcess();
+  const std::string top = folder, own = top + "/own", file = top + "/file";
+  const std::string process = "/proc/" + std::to_string(other);
+  const std::string pressure = LinuxMemoryPressure::Files::ofThisProcess().pressure;
+  const bool hasPressure = ::access(pressure.c_str(), W_OK) == 0;
+  const fs::path writable[] = {own, pressure, top + "/missing"};
+  const ErrorRef refused = giveUpPrivileges(writable);
+  const auto open = [](const std::string& path, int flags) { return ::open(path.c_str(), flags, 0600); };
+  const auto inside = [&](const char* name) { return own + "/" + name; };
+  endWith({
+      {"all is in force", [&] { return !refused; }},
+      {"reading", [&] { return open(file, O_RDONLY) >= 0 && open("/etc/passwd", O_RDONLY) >= 0; }},
+      {"writing", [&] { return isOutOfReach(open(file, O_WRONLY)) && isOutOfReach(open(file, O_RDWR)); }},
+      {"cutting short",
+       [&] {
+         return isOutOfReach(open(file, O_RDONLY | O_TRUNC)) && isOutOfReach(open(file, O_WRONLY | O_TRUNC)) &&
+                isOutOfReach(::truncate(file.c_str(), 0));
+       }},
+      {"making",
+       [&] {
+         return isOutOfReach(open(top + "/new", O_WRONLY | O_CREAT)) &&
+                isOutOfReach(::mkdir((top + "/missing").c_str(), 0700)) &&
+                isOutOfReach(::symlink("file", (top + "/link").c_str())) &&
+                isOutOfReach(::link(inside("file").c_str(), (top + "/link").c_str())) &&
+                isOutOfReach(::mkfifo((top + "/pipe").c_str(), 0600)) &&
+                isOutOfReach(::rename(inside("file").c_str(), (top + "/moved").c_str()));
+       }},
+      {"removing", [&] { return isOutOfReach(::unlink(file.c_str())) && isOutOfReach(::rmdir(own.c_str())); }},
+      {"memory and descriptors of other processes",
+       [&] {
+         char target[16];
+         return isOutOfReach(open(process + "/mem", O_RDWR)) && isOutOfReach(open(process + "/mem", O_RDONLY)) &&
+                isOutOfReach(open(process + "/environ", O_RDONLY)) &&
+                isOutOfReach(::readlink((process + "/fd/0").c_str(), target, sizeof target)) &&
+                isOutOfReach(open(process + "/fd/0", O_RDONLY));
+       }},
+      {"its own folder",
+       [&] {
+         return open(inside("new"), O_RDWR | O_CREAT) >= 0 && ::mkdir(inside("folder").c_str(), 0700) == 0 &&
+                ::rename(inside("new").c_str(), inside("folder/new").c_str()) == 0 &&
+                ::unlink(inside("folder/new").c_str()) == 0 && ::rmdir(inside("folder").c_str()) == 0;
+       }},
+      {"memory pressure", [&] { return !hasPressure || open(pressure, O_RDWR) >= 0; }},
+  });
+}
+
+TEST(Trust, OfTheWidgetProcessEndsAtItsFolders) {
+  if (!hasLandlock()) GTEST_SKIP() << "this kernel has no Landlock, or only its first version";
+  const TemporaryFolder folder;
+  folder.write("file", "kept");
+  folder.write("own/file", "kept");
+  EXPECT_EXIT(tryBeyondTheFolder(folder.path()), testing::ExitedWithCode(0), "");
+  EXPECT_EQ(folder.read("file"), "kept");
+}
+
+TEST(Trust, ProgramsEndWithAMessageWhereTheyCannotReadOrWrite) {
+  const Programs programs;
+  programs.setUpCity({"m1"}, {});
+  const std::string host = NIMBO_TRANSIT, widget = NIMBO_TRANSIT_WIDGET, folders = " --config config --state state";
+  const struct {
+    std::string command;
+    const char* message;
+  } cases[] = {
+      {widget + folders + " <&-", "standard input is closed"},
+      {widget + folders + " 0>/dev/null", "standard input is closed"},
+      {widget + folders + " >&-", "standard output is closed"},
+      {widget + folders + " --pictures 7", "--pictures: descriptor 7"},
+      {widget + folders + " --pictures 7 7</dev/null", "--pictures: descriptor 7"},
+      {host + folders + " script - <&-", "cannot read -: Bad file descriptor"},
+      {host + folders + " script /", "cannot read /: Is a directory"},
+      {host + folders + " decode - <&-", "cannot read -: Bad file descriptor"},
+      {host + folders + " status >&-", "cannot write to the standard output: Bad file descriptor"},
+      {"ulimit -f 1; " + host + folders + " render x.png", "no memory for the widget's pictures: File too large"},
+      {"ulimit -f 1; " + host + folders + " update", "state.sqlite: disk I/O error"},
+  };
+  for (const auto& [command, message] : cases) {
+    const std::string within = "cd " + programs.folder.path().string() + " && exec 2>errors && ";
+    // Not SIGKILL: a process that is stopped so is in the test's hand.
+    const int status = std::system((within + "(" + command +
+                                    ") & p=$!; (sleep 30; kill $p) & w=$!; wait $p; s=$?; "
+                                    "kill $w; exit $s")
+                                       .c_str());
+    EXPECT_TRUE(WIFEXITED(status) && (WEXITSTATUS(status) == 1 || WEXITSTATUS(status) == 2)) << command << status;
+    EXPECT_THAT(programs.folder.read("errors"), HasSubstr(message)) << command;
+  }
 }
 
 TEST(Trust, OfTheWidgetProcessIsGivenUpBeforeItSpeaks) {

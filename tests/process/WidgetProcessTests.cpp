@@ -161,8 +161,7 @@ TEST(WidgetProcess, StartsInTheModeOfTheHostOrElseOfItsLastRows) {
     for (const char* told : {"", "compact", "expanded"}) {
       json initialize = appearing()[0];
       if (*told) initialize["params"]["activeDisplayMode"] = told;
-      const auto lines = programs.play({initialize, request("loadView"), request("snapshot"),
-                                        request("render", {{"path", programs.folder.path() / "widget.png"}})});
+      const auto lines = programs.play({initialize, request("loadView"), request("snapshot"), request("render")});
       const std::string mode = *told ? told : saved;
       const json size = {359.0, mode == "expanded" ? 220.0 : 110.0};
       const json seen = snapshots(lines).at(0);
@@ -278,7 +277,7 @@ TEST(WidgetProcess, ShowsIncidentsThatAreTooManyToHandOver) {
   EXPECT_THAT(lines,
               Contains(json{{"jsonrpc", "2.0"},
                             {"method", "notice"},
-                            {"params", {{"message", "Cannot open it: the request is longer than 4194304 bytes."}}}}));
+                            {"params", {{"message", "Cannot open it: the list of incidents has more than 1048576 bytes."}}}}));
   EXPECT_THAT(snapshots(lines), SizeIs(2));
   for (const json& seen : snapshots(lines)) EXPECT_THAT(titles(seen), ElementsAre("600 Advisories"));
 }
@@ -310,7 +309,8 @@ TEST(WidgetProcess, OutlivesEveryMessage) {
       {request("selectRow", {{"section", 1}, {"row", 0}}), -32602},
       {request("selectRow", {{"section", 0}}), -32602},
       {request("advanceTime", {{"seconds", -1}}), -32602},
-      {request("render", {{"path", "/nonexistent/folder/x.png"}}), -32002},
+      {request("render", {{"path", "/nonexistent/folder/x.png"}}), -32602},
+      {request("render", {{"surface", "/proc/self/fd/0"}}), -32602},
   };
   std::vector<json> events = appearing() + kUpdateAndLook;
   for (const auto& c : cases) events.push_back(c.line);

@@ -1,5 +1,6 @@
 #pragma once
 
+#include <filesystem>
 #include <utility>
 
 #include "desktop/drawing/DrawingPart.h"
@@ -33,7 +34,8 @@ class CairoSurface final : public Picture {
   int pixelHeight() const override;
   int stride() const override;
   std::span<const std::uint8_t> pixels() const override;
-  ErrorRef writePNG(const std::filesystem::path& path) const override;
+  /// As a PNG file, replaced whole or not at all. Null on success.
+  ErrorRef writePNG(const std::filesystem::path& path) const;
 
   /// Its user unit is the point. Never null.
   cairo_surface_t* get() const { return _surface.get(); }

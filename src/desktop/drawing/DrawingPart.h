@@ -35,8 +35,6 @@ class Picture {
   /// Rows from the top; a pixel is 32 bits of the machine's byte order, alpha in the highest eight, then red, green and
   /// blue, multiplied by alpha. Drawing that is under way is finished first. As long as the picture lives.
   virtual std::span<const std::uint8_t> pixels() const = 0;
-  /// As a PNG file, replaced whole or not at all. Null on success.
-  virtual ErrorRef writePNG(const std::filesystem::path& path) const = 0;
 };
 
 using PictureRef = std::shared_ptr<const Picture>;
@@ -60,6 +58,10 @@ class DrawingPart {
   /// A picture of `size` points at `scale` device pixels a point, over `background`, which shows what the services of
   /// this part made.
   virtual Outcome<PictureRef> render(const DrawOperation& draw, Size size, double scale, const Color& background) = 0;
+  /// Pixels such as those of a Picture, `width` in a row and `stride` bytes, a multiple of four, from a row to the
+  /// next, as a PNG file, which is replaced whole or not at all. Null on success.
+  virtual ErrorRef writePNG(std::span<const std::uint8_t> pixels, int width, int stride,
+                            const std::filesystem::path& path) = 0;
 };
 
 /// Opens the part with the first call. Throws LatePartMissing.

@@ -1,5 +1,7 @@
 // libnimbo-drawing.so: what DrawingPart.h declares.
 
+#include <cairo.h>
+
 #include "desktop/drawing/CairoImage.h"
 #include "desktop/drawing/CairoShieldRenderer.h"
 #include "desktop/drawing/CairoSurface.h"
@@ -23,6 +25,14 @@ class PangoAndCairo final : public DrawingPart {
     const auto surface = renderToSurface(draw, size, scale, background);
     if (!surface) return surface.error();
     return PictureRef(*surface);
+  }
+  ErrorRef writePNG(std::span<const std::uint8_t> pixels, int width, int stride,
+                    const std::filesystem::path& path) override {
+    // Cairo takes memory to draw on, and only reads it here.
+    auto* const data = const_cast<std::uint8_t*>(pixels.data());
+    const int height = static_cast<int>(pixels.size() / static_cast<std::size_t>(stride));
+    CairoSurfaceHandle surface(cairo_image_surface_create_for_data(data, CAIRO_FORMAT_ARGB32, width, height, stride));
+    return CairoSurface(std::move(surface), {}, 1).writePNG(path);
   }
 };
 

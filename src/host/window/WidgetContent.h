@@ -5,7 +5,7 @@
 #include <string>
 #include <vector>
 
-#include "host/window/SharedPicture.h"
+#include "host/PictureMemory.h"
 #include "platform/foundation/Date.h"
 #include "protocol/Snapshot.h"
 
@@ -20,7 +20,7 @@ struct WidgetRow {
 
 /// What the widget shows at one moment.
 struct WidgetContent {
-  std::shared_ptr<const SharedPicture> picture;
+  std::shared_ptr<const WidgetPicture> picture;
   std::vector<WidgetRow> rows;
   bool canExpand = false;
   bool isExpanded = false;

@@ -1,7 +1,7 @@
 #include "host/window/WidgetHostProcess.h"
 
 #include <algorithm>
-#include <system_error>
+#include <stdexcept>
 
 #include "desktop/rpc/Base64.h"
 #include "platform/foundation/Log.h"
@@ -14,10 +14,6 @@ namespace {
 constexpr std::string_view kProcessErrorDomain = "org.nimbo.WidgetHostProcess";
 
 constexpr LogFacility kLog{kDefaultLogSubsystem, "WidgetHostProcess"};
-
-SharedPicture::Layout layoutOf(const protocol::Rendered& answer) {
-  return {answer.width, answer.height, answer.stride, answer.scale};
-}
 
 }  // namespace
 
@@ -98,9 +94,11 @@ void WidgetHostProcess::setExpandedMode(bool expanded) {
 
 void WidgetHostProcess::start() {
   try {
-    _widget = std::make_unique<WatchedWidget>(_runLoop, _arguments, kAnswerPatience,
-                                              [this](const std::string& reason) { replace(reason); });
-  } catch (const WidgetClientFailure& failure) {
+    // What an earlier process still has a hand on is not drawn into again.
+    _pictures.emplace();
+    _widget = std::make_unique<WatchedWidget>(
+        _runLoop, _arguments, kAnswerPatience, [this](const std::string& reason) { replace(reason); }, &*_pictures);
+  } catch (const std::runtime_error& failure) {
     return giveUp(failure.what());
   }
   _told = _presentation;
@@ -184,28 +182,26 @@ void WidgetHostProcess::askForContent() {
     _contentIsStale = true;
     return;
   }
-  std::shared_ptr<SharedPicture> picture;
-  try {
-    picture = std::make_shared<SharedPicture>();
-  } catch (const std::system_error& failure) {
-    return _widget->fail(failure.what());
-  }
   _awaitsContent = true;
   _contentIsStale = false;
-  _widget->ask(protocol::kRender, {.surface = picture->path()}, [this, picture](const protocol::Rendered& answer) {
-    if (!picture->map(layoutOf(answer))) _widget->fail("it has not drawn what it says");
+  const auto picture = std::make_shared<WidgetPicture>();
+  _widget->ask(protocol::kRender, {}, [this, picture](const protocol::Rendered& answer) {
+    if (auto taken = _pictures->take(answer))
+      *picture = *std::move(taken);
+    else
+      _widget->fail("it has not drawn what it says");
   });
   _widget->ask(protocol::kSnapshot, {}, [this, picture](const protocol::Snapshot& snapshot) {
     _awaitsContent = false;
-    if (!picture->pixels().empty()) show(picture, snapshot);
+    if (!picture->pixels.empty()) show(picture, snapshot);
     if (_contentIsStale) askForContent();
   });
 }
 
-void WidgetHostProcess::show(const std::shared_ptr<SharedPicture>& picture, const protocol::Snapshot& snapshot) {
+void WidgetHostProcess::show(const std::shared_ptr<const WidgetPicture>& picture, const protocol::Snapshot& snapshot) {
   auto content = std::make_shared<WidgetContent>(WidgetContent::ofSnapshot(snapshot));
   content->picture = picture;
-  _contentHeight = picture->layout().height / picture->layout().scale;
+  _contentHeight = picture->layout.height / picture->layout.scale;
   tellPresentation();
   // The expanded mode ends with the rows that need it, and comes back with them; rows that could not take it are
   // compact without being told. What was asked for before the last mode was told decides nothing.

@@ -85,7 +85,7 @@ class WidgetHostProcess {
   void askOfRow(const protocol::Method<Params, Result>& method, const Params& params);
   /// Tells the process what it does not know of the presentation.
   void tellPresentation();
-  void show(const std::shared_ptr<SharedPicture>& picture, const protocol::Snapshot& snapshot);
+  void show(const std::shared_ptr<const WidgetPicture>& picture, const protocol::Snapshot& snapshot);
   void setExpandedMode(bool expanded);
   void setUpdating(bool updating);
 
@@ -102,6 +102,7 @@ class WidgetHostProcess {
   std::shared_ptr<Timer> _hiddenTimer;
 
   // Of the process that runs.
+  std::optional<PictureMemory> _pictures;
   std::unique_ptr<WatchedWidget> _widget;
   bool _appeared = false;
   bool _isExpanded = false;  // as last told or shown

@@ -18,12 +18,12 @@ namespace {
 constexpr double kAnimationSeconds = 0.25;
 
 /// The picture's own memory as a texture.
-Glib::RefPtr<Gdk::Texture> textureOf(const std::shared_ptr<const SharedPicture>& picture) {
-  const auto keep = new std::shared_ptr<const SharedPicture>(picture);
+Glib::RefPtr<Gdk::Texture> textureOf(const std::shared_ptr<const WidgetPicture>& picture) {
+  const auto keep = new std::shared_ptr<const WidgetPicture>(picture);
   GBytes* bytes = g_bytes_new_with_free_func(
-      picture->pixels().data(), picture->pixels().size(),
-      [](gpointer kept) { delete static_cast<std::shared_ptr<const SharedPicture>*>(kept); }, keep);
-  const SharedPicture::Layout& layout = picture->layout();
+      picture->pixels.data(), picture->pixels.size(),
+      [](gpointer kept) { delete static_cast<std::shared_ptr<const WidgetPicture>*>(kept); }, keep);
+  const protocol::Rendered& layout = picture->layout;
   const auto format = G_BYTE_ORDER == G_LITTLE_ENDIAN ? Gdk::MemoryTexture::Format::B8G8R8A8_PREMULTIPLIED
                                                       : Gdk::MemoryTexture::Format::A8R8G8B8_PREMULTIPLIED;
   return Gdk::MemoryTexture::create(layout.width, layout.height, format, Glib::wrap(bytes),
@@ -67,7 +67,7 @@ void WidgetView::setContent(const WidgetContentRef& content) {
   makeRows(content ? content->rows.size() : 0);
   for (std::size_t i = 0; i < _rows.size(); ++i) setAccessibleLabel(*_rows[i], content->rows[i].name);
   if (content) {
-    const SharedPicture::Layout& layout = content->picture->layout();
+    const protocol::Rendered& layout = content->picture->layout;
     animateHeightTo(layout.height / layout.scale);
   }
   queue_resize();
@@ -127,7 +127,7 @@ void WidgetView::size_allocate_vfunc(int width, int, int) {
 
 void WidgetView::snapshot_vfunc(const Glib::RefPtr<Gtk::Snapshot>& snapshot) {
   if (_picture) {
-    const SharedPicture::Layout& layout = _content->picture->layout();
+    const protocol::Rendered& layout = _content->picture->layout;
     const graphene_rect_t bounds = GRAPHENE_RECT_INIT(0, 0, static_cast<float>(layout.width / layout.scale),
                                                       static_cast<float>(layout.height / layout.scale));
     snapshot->append_texture(_picture, &bounds);

@@ -3,11 +3,11 @@
 #include <gtk/gtk.h>
 
 #include <CLI/CLI.hpp>
-#include <csignal>
 #include <cstdio>
 #include <cstdlib>
 
 #include "desktop/system/SmallMemory.h"
+#include "host/StandardDescriptors.h"
 #include "host/window/WindowApplication.h"
 #include "platform/foundation/Version.h"
 
@@ -24,6 +24,7 @@ void drawWithoutDriver() {
 
 int main(int argc, char** argv) {
   nimbo::keepHeapSmall();
+  nimbo::prepareStandardDescriptors();
   CLI::App app{"How your transit lines run, in a window."};
   std::optional<std::filesystem::path> config, state;
   std::vector<std::string> urls;
@@ -33,7 +34,6 @@ int main(int argc, char** argv) {
   app.set_version_flag("--version", nimbo::kVersion);
   CLI11_PARSE(app, argc, argv);
 
-  std::signal(SIGPIPE, SIG_IGN);
   drawWithoutDriver();
   if (!gtk_init_check()) {
     std::fprintf(

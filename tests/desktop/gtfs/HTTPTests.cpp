@@ -1,5 +1,10 @@
+#include <openssl/pem.h>
 #include <openssl/ssl.h>
 #include <openssl/x509.h>
+#include <openssl/x509v3.h>
+#include <sched.h>
+#include <sys/mount.h>
+#include <sys/wait.h>
 #include <zip.h>
 
 #include "desktop/gtfs/Fixtures.h"
@@ -88,31 +93,105 @@ TEST(HTTPFetcher, GivesUpOnServersThatDoNotAnswer) {
   }
 }
 
-TEST(HTTPFetcher, TrustsNoCertificateThatNobodyVouchesFor) {
-  const std::unique_ptr<EVP_PKEY, decltype(&EVP_PKEY_free)> key(EVP_EC_gen("P-256"), EVP_PKEY_free);
-  const std::unique_ptr<X509, decltype(&X509_free)> certificate(X509_new(), X509_free);
-  X509_NAME* const name = X509_get_subject_name(certificate.get());
-  X509_NAME_add_entry_by_txt(name, "CN", MBSTRING_ASC, reinterpret_cast<const unsigned char*>("127.0.0.1"), -1, -1, 0);
-  X509_set_issuer_name(certificate.get(), name);
-  X509_gmtime_adj(X509_getm_notBefore(certificate.get()), 0);
-  X509_gmtime_adj(X509_getm_notAfter(certificate.get()), 3600);
-  X509_set_pubkey(certificate.get(), key.get());
-  ASSERT_NE(X509_sign(certificate.get(), key.get(), EVP_sha256()), 0);
-  const std::unique_ptr<SSL_CTX, decltype(&SSL_CTX_free)> context(SSL_CTX_new(TLS_server_method()), SSL_CTX_free);
-  SSL_CTX_use_certificate(context.get(), certificate.get());
-  SSL_CTX_use_PrivateKey(context.get(), key.get());
-  LoopbackServer server([](const std::string&) { return Answer{}; });
-  server.speakTLS([&](int connection) {
-    const std::unique_ptr<SSL, decltype(&SSL_free)> tls(SSL_new(context.get()), SSL_free);
+/// What a server with a certificate of its own making speaks over TLS.
+class OwnCertificate {
+ public:
+  OwnCertificate() {
+    X509_NAME* const name = X509_get_subject_name(_certificate.get());
+    X509_NAME_add_entry_by_txt(name, "CN", MBSTRING_ASC, reinterpret_cast<const unsigned char*>("127.0.0.1"), -1, -1,
+                               0);
+    X509_set_issuer_name(_certificate.get(), name);
+    const std::unique_ptr<X509_EXTENSION, decltype(&X509_EXTENSION_free)> address(
+        X509V3_EXT_conf_nid(nullptr, nullptr, NID_subject_alt_name, "IP:127.0.0.1"), X509_EXTENSION_free);
+    X509_set_version(_certificate.get(), X509_VERSION_3);
+    X509_add_ext(_certificate.get(), address.get(), -1);
+    X509_gmtime_adj(X509_getm_notBefore(_certificate.get()), 0);
+    X509_gmtime_adj(X509_getm_notAfter(_certificate.get()), 3600);
+    X509_set_pubkey(_certificate.get(), _key.get());
+    X509_sign(_certificate.get(), _key.get(), EVP_sha256());
+    SSL_CTX_use_certificate(_context.get(), _certificate.get());
+    SSL_CTX_use_PrivateKey(_context.get(), _key.get());
+  }
+
+  void answer(int connection, const std::string& answer) const {
+    const std::unique_ptr<SSL, decltype(&SSL_free)> tls(SSL_new(_context.get()), SSL_free);
     SSL_set_fd(tls.get(), connection);
     char request[4096];
     if (SSL_accept(tls.get()) != 1 || SSL_read(tls.get(), request, sizeof request) <= 0) return;
-    const std::string answer = LoopbackServer::answer("200 OK", "believed");
     SSL_write(tls.get(), answer.data(), static_cast<int>(answer.size()));
-  });
-  const auto outcome =
-      HTTPFetcher::fetch({*FeedAddress::parse("https" + server.address().substr(4)), {}, 10, std::chrono::seconds(20)},
-                         {}, [](auto) { return true; });
+  }
+  void writeTo(const std::filesystem::path& path) const {
+    const std::unique_ptr<BIO, decltype(&BIO_free)> file(BIO_new_file(path.c_str(), "w"), BIO_free);
+    PEM_write_bio_X509(file.get(), _certificate.get());
+  }
+
+ private:
+  std::unique_ptr<EVP_PKEY, decltype(&EVP_PKEY_free)> _key{EVP_EC_gen("P-256"), EVP_PKEY_free};
+  std::unique_ptr<X509, decltype(&X509_free)> _certificate{X509_new(), X509_free};
+  std::unique_ptr<SSL_CTX, decltype(&SSL_CTX_free)> _context{SSL_CTX_new(TLS_server_method()), SSL_CTX_free};
+};
+
+TEST(HTTPFetcher, TakesNoKeyToAnotherHost) {
+  const LoopbackServer other([](const std::string&) { return Answer{LoopbackServer::answer("200 OK", "other")}; });
+  const std::string there = "http://localhost" + other.address("/other").substr(std::string("http://127.0.0.1").size());
+  const LoopbackServer server(
+      [&](const std::string&) { return Answer{LoopbackServer::answer("302 Found\r\nLocation: " + there, "")}; });
+  const std::string address = "http://user:word@" + server.address("/?key=secret").substr(7);
+  std::string body;
+  const auto outcome = HTTPFetcher::fetch({*FeedAddress::parse(address), {}, 100, std::chrono::seconds(20)}, {},
+                                          [&](std::string_view piece) { return !body.append(piece).empty(); });
+  ASSERT_TRUE(outcome) << outcome.error()->reason();
+  EXPECT_EQ(body, "other");
+  ASSERT_EQ(server.requests().size(), 1u);
+  EXPECT_NE(server.requests()[0].find("Authorization: "), std::string::npos);
+  ASSERT_EQ(other.requests().size(), 1u);
+  for (const char* secret : {"Authorization", "secret", "user", "Referer"})
+    EXPECT_EQ(other.requests()[0].find(secret), std::string::npos) << other.requests()[0];
+}
+
+/// What comes of an answer over TLS.
+Outcome<HTTPAnswer> fetchOverTLS(const OwnCertificate& certificate, const std::string& answer) {
+  LoopbackServer server([](const std::string&) { return Answer{}; });
+  server.speakTLS([&](int connection) { certificate.answer(connection, answer); });
+  return HTTPFetcher::fetch(
+      {*FeedAddress::parse("https" + server.address().substr(4)), {}, 10, std::chrono::seconds(20)}, {},
+      [](auto) { return true; });
+}
+
+constexpr const char* kSystemCertificates = "/etc/ssl/certs/ca-certificates.crt";
+
+/// Whether this process now has files of the system of its own, and these certificates are the ones that it trusts.
+bool trustIn(const std::filesystem::path& certificates) {
+  return ::unshare(CLONE_NEWUSER | CLONE_NEWNS) == 0 &&
+         ::mount(certificates.c_str(), kSystemCertificates, nullptr, MS_BIND, nullptr) == 0;
+}
+
+TEST(HTTPFetcher, IsNotLedOffHTTPS) {
+  const OwnCertificate certificate;
+  const TemporaryFolder folder;
+  certificate.writeTo(folder.path() / "trusted.pem");
+  const pid_t attempt = ::fork();
+  if (attempt == 0) ::_exit(trustIn(folder.path() / "trusted.pem") ? 0 : 1);
+  int status = 0;
+  ::waitpid(attempt, &status, 0);
+  if (status != 0) GTEST_SKIP() << "no name space of one's own in which a certificate could be trusted";
+  EXPECT_EXIT(
+      {
+        const bool isTrusted = trustIn(folder.path() / "trusted.pem");
+        const LoopbackServer plain(
+            [](const std::string&) { return Answer{LoopbackServer::answer("200 OK", "plain")}; });
+        const auto stayed = fetchOverTLS(certificate, LoopbackServer::answer("200 OK", "there"));
+        const auto led =
+            fetchOverTLS(certificate, LoopbackServer::answer("302 Found\r\nLocation: " + plain.address(), "moved"));
+        std::fprintf(stderr, "%s %s\n", stayed ? "stayed" : stayed.error()->reason().c_str(),
+                     led ? "led" : led.error()->reason().c_str());
+        ::_exit(isTrusted && plain.requests().empty() ? 0 : 1);
+      },
+      testing::ExitedWithCode(0), "stayed Cannot fetch .*: it leads from https to an address that is not");
+}
+
+TEST(HTTPFetcher, TrustsNoCertificateThatNobodyVouchesFor) {
+  const auto outcome = fetchOverTLS(OwnCertificate(), LoopbackServer::answer("200 OK", "believed"));
   ASSERT_FALSE(outcome);
   EXPECT_EQ(outcome.error()->code(), static_cast<std::int64_t>(Code::untrustedServer)) << outcome.error()->reason();
   EXPECT_NE(outcome.error()->reason().find("certificate cannot be trusted"), std::string::npos);

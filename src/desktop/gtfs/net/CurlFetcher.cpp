@@ -115,11 +115,15 @@ CurlHeaders headersFor(const HTTPValidators& validators) {
   return headers;
 }
 
+bool isEncrypted(const HTTPRequest& request) { return asciiLowerCase(request.address.text()).starts_with("https:"); }
+
 void setOptions(CURL* handle, Transfer& transfer, const CurlHeaders& headers) {
   const auto set = [&](CURLoption option, auto value) { curl_easy_setopt(handle, option, value); };
   set(CURLOPT_URL, transfer.request.address.text().c_str());
   set(CURLOPT_PROTOCOLS_STR, "http,https");
-  set(CURLOPT_REDIR_PROTOCOLS_STR, "http,https");
+  // Whoever chose https is not led off it; a key in the address stays with the server that it is for.
+  set(CURLOPT_REDIR_PROTOCOLS_STR, isEncrypted(transfer.request) ? "https" : "http,https");
+  set(CURLOPT_UNRESTRICTED_AUTH, 0L);
   set(CURLOPT_FOLLOWLOCATION, 1L);
   set(CURLOPT_MAXREDIRS, kMostRedirects);
   set(CURLOPT_USERAGENT, (std::string("nimbo-transit/") + kVersion).c_str());
@@ -172,6 +176,9 @@ Failure failureOf(CURLcode result, const Transfer& transfer) {
       return {Code::serverFailure, "its server redirects without end. Ask the publisher for the right address."};
     case CURLE_UNSUPPORTED_PROTOCOL:
     case CURLE_URL_MALFORMAT:
+      if (isEncrypted(transfer.request))
+        return {Code::badAddress,
+                "it leads from https to an address that is not. Ask the publisher for the right one."};
       return {Code::badAddress, "it is no http or https address, or leads to one that is not. Check the address."};
     case CURLE_PARTIAL_FILE:
     case CURLE_GOT_NOTHING:

@@ -1,0 +1,37 @@
+#pragma once
+
+#include <cstddef>
+#include <cstdint>
+#include <optional>
+#include <vector>
+
+#include "desktop/raii/FileDescriptor.h"
+#include "protocol/Messages.h"
+
+namespace nimbo {
+
+/// A picture of the widget: rows from the top, each pixel four bytes as CAIRO_FORMAT_ARGB32 has them.
+struct WidgetPicture {
+  protocol::Rendered layout;
+  std::vector<std::uint8_t> pixels;  ///< `stride` times `height`
+};
+
+/// Memory that a host shares with its widget process, which draws into it. It has room for the largest picture that
+/// the widget draws and takes what was drawn; nobody can change its size. Any thread.
+class PictureMemory {
+ public:
+  /// Throws std::system_error when the system gives none.
+  PictureMemory();
+
+  int descriptor() const { return _memory.get(); }
+  /// A copy of what the process says it drew; absent when it says what no picture is.
+  std::optional<WidgetPicture> take(const protocol::Rendered& drawn) const;
+
+  /// Bytes: 64 million pixels.
+  static constexpr std::size_t kSize = 256'000'000;
+
+ private:
+  FileDescriptor _memory;
+};
+
+}  // namespace nimbo
