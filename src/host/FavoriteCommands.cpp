@@ -23,8 +23,9 @@ void tellGoneLines(const CommandContext& context, const std::vector<TransitLineR
   for (const ErrorRef& error : gone->errors) printMessage(error->reason());
 }
 
+/// Of a damaged database those that are left.
 std::vector<TransitLineRef> favoriteLines(HostPlatform& platform) {
-  const auto favorites = platform->favoritesEditor().list();
+  const auto favorites = platform->favoritesEditor().left();
   require(favorites.error());
   std::vector<TransitLineRef> lines;
   for (const FavoriteRef& favorite : *favorites)
@@ -74,6 +75,7 @@ int runFavoriteList(const CommandContext& context) {
   HostPlatform platform(context);
   const auto lines = favoriteLines(platform);
   printLines(lines);
+  require(platform->favoritesEditor().list().error());
   if (lines.empty()) std::cout << "No favorite lines. Add some with \"favorite add FEED:ROUTE_ID\".\n";
   tellGoneLines(context, lines);
   return kExitSuccess;

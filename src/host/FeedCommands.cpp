@@ -108,6 +108,7 @@ int runFeedAdd(const CommandContext& context, const FeedOptions& options) {
 int runFeedRemove(const CommandContext& context, const std::string& name) {
   const HostPlatform platform(context);
   require(FeedConfiguration(context.paths.config).remove(name));
+  FeedCache(context.paths.cache).remove(name);
   return kExitSuccess;
 }
 

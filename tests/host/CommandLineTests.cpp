@@ -243,7 +243,13 @@ TEST(CommandLine, ShowsTheErrorRowForAFeedThatFails) {
 
   // A favourite whose feed is not set up any more is no good service either.
   programs.publish({});
+  const auto cache = programs.folder.path() / "state/cache";
+  std::vector<std::filesystem::path> kept;
+  for (const auto& entry : std::filesystem::directory_iterator(cache)) kept.push_back(entry.path());
+  EXPECT_FALSE(kept.empty());
+  for (const auto& path : kept) std::filesystem::copy_file(path, path.string() + ".kil1ed.nimbo-part");
   programs.run({"feed", "remove", "city"});
+  EXPECT_TRUE(std::filesystem::is_empty(cache));
   const ProgramRun orphaned = programs.run({"status", kNow});
   EXPECT_EQ(orphaned.status, 1);
   EXPECT_THAT(orphaned.output, Not(HasSubstr("Good Service")));

@@ -4,7 +4,10 @@
 
 namespace nimbo {
 
-bool SQLiteFailure::meansDamage() const { return _code == SQLITE_CORRUPT || _code == SQLITE_NOTADB; }
+bool SQLiteFailure::meansDamage() const {
+  // The program's statements are right: where one finds no table or column, the file's schema is damaged.
+  return _code == SQLITE_CORRUPT || _code == SQLITE_NOTADB || _code == SQLITE_ERROR;
+}
 
 void SQLiteStatement::Finalizer::operator()(sqlite3_stmt* statement) const { sqlite3_finalize(statement); }
 
@@ -83,11 +86,18 @@ namespace {
 
 constexpr int kBusyTimeoutMilliseconds = 5000;
 
+/// The same file with no link on the way to it; SQLite, told to follow none, would refuse linked folders too.
+std::filesystem::path inResolvedFolder(const std::filesystem::path& file) {
+  std::error_code ignored;
+  const std::filesystem::path whole = std::filesystem::absolute(file);
+  const std::filesystem::path folder = std::filesystem::canonical(whole.parent_path(), ignored);
+  return ignored ? whole : folder / whole.filename();
+}
+
 /// A file name as URI. Source: https://www.sqlite.org/uri.html
 std::string uriOfFile(const std::filesystem::path& file, std::string_view query) {
   std::string uri = "file:";
-  const std::filesystem::path whole = std::filesystem::absolute(file);
-  for (const char c : whole.native()) {
+  for (const char c : file.native()) {
     if (c == '?')
       uri += "%3f";
     else if (c == '#')
@@ -105,16 +115,20 @@ std::string uriOfFile(const std::filesystem::path& file, std::string_view query)
 void SQLiteConnection::Closer::operator()(sqlite3* database) const { sqlite3_close_v2(database); }
 
 SQLiteConnection::SQLiteConnection(const std::filesystem::path& file, Access access, int maximumValueBytes) {
-  constexpr int kShared = SQLITE_OPEN_NOMUTEX | SQLITE_OPEN_EXRESCODE;
+  constexpr int kShared = SQLITE_OPEN_NOMUTEX | SQLITE_OPEN_EXRESCODE | SQLITE_OPEN_NOFOLLOW;
   sqlite3* database = nullptr;
-  const int code = access == Access::readWrite
-                       ? sqlite3_open_v2(file.c_str(), &database, kShared | SQLITE_OPEN_READWRITE, nullptr)
-                       : sqlite3_open_v2(uriOfFile(file, "immutable=1").c_str(), &database,
-                                         kShared | SQLITE_OPEN_READONLY | SQLITE_OPEN_URI, nullptr);
+  const std::filesystem::path path = inResolvedFolder(file);
+  const int code = access == Access::immutable
+                       ? sqlite3_open_v2(uriOfFile(path, "immutable=1").c_str(), &database,
+                                         kShared | SQLITE_OPEN_READONLY | SQLITE_OPEN_URI, nullptr)
+                       : sqlite3_open_v2(path.c_str(), &database, kShared | SQLITE_OPEN_READWRITE, nullptr);
   _database.reset(database);
   check(code);
   sqlite3_busy_timeout(database, kBusyTimeoutMilliseconds);
   sqlite3_limit(database, SQLITE_LIMIT_LENGTH, maximumValueBytes);
+  if (access != Access::alone) return;
+  keepLogOnClose();
+  prepare("PRAGMA locking_mode = EXCLUSIVE").step();  // the log's index is in memory then
 }
 
 void SQLiteConnection::check(int code) const {
@@ -140,6 +154,10 @@ bool SQLiteConnection::hasMoved() const {
   int moved = 0;
   sqlite3_file_control(_database.get(), "main", SQLITE_FCNTL_HAS_MOVED, &moved);
   return moved != 0;
+}
+
+void SQLiteConnection::writeBackLog() {
+  sqlite3_wal_checkpoint_v2(_database.get(), nullptr, SQLITE_CHECKPOINT_TRUNCATE, nullptr, nullptr);
 }
 
 void SQLiteConnection::keepLogOnClose() {

@@ -74,10 +74,11 @@ class SQLiteConnection final {
   enum class Access {
     readWrite,  ///< reads only where the file does not let itself be written
     immutable,  ///< reads a file that nobody changes, leaving no file beside it
+    alone,      ///< reads while nobody else has it open, making no file beside it, as a full disk asks for
   };
 
-  /// Opens a file that exists. Values longer than `maximumValueBytes` are neither read nor written; another
-  /// connection's lock is waited for up to 5 seconds.
+  /// Opens a file that exists, and is reached through no link but of its folders. Values longer than
+  /// `maximumValueBytes` are neither read nor written; another connection's lock is waited for up to 5 seconds.
   SQLiteConnection(const std::filesystem::path& file, Access access, int maximumValueBytes);
 
   /// Runs statements that give no rows.
@@ -88,6 +89,8 @@ class SQLiteConnection final {
 
   /// Whether the file was renamed, replaced or deleted since it was opened.
   bool hasMoved() const;
+  /// Writes the write-ahead log back into the file and empties it. What cannot be written back now stays in the log.
+  void writeBackLog();
   /// Leaves the write-ahead log as it is when the connection closes.
   void keepLogOnClose();
 

@@ -4,7 +4,8 @@
 #include <nlohmann/json.hpp>
 #include <stdexcept>
 
-#include "desktop/store/StateDatabaseFile.h"
+#include "desktop/gtfs/static/LineItems.h"
+#include "desktop/store/FavoritesSeal.h"
 #include "platform/transit/BasicTransitLineItem.h"
 
 namespace nimbo {
@@ -142,24 +143,41 @@ ErrorRef unknownLine(std::uint64_t muid) {
   return refusal(FavoritesError::unknown, "The line " + std::to_string(muid) + " is no favorite.");
 }
 
-/// An error while favourites are missing that a damaged database had.
-ErrorRef lossOf(SQLiteConnection& connection) {
-  SQLiteStatement query = connection.prepare("SELECT value FROM settings WHERE key = ?");
-  query.bind(1, kFavoritesLostKey);
+/// As the user writes them, so many that a message stays short.
+std::string textOfLines(const Favorites& favorites) {
+  constexpr std::size_t kMostNamed = 20;
+  std::string text;
+  std::size_t count = 0;
+  for (const FavoriteRef& favorite : favorites)
+    if (const auto* line = dynamic_cast<const FavoriteTransitLine*>(favorite.get()); line && line->transitLine())
+      if (++count <= kMostNamed)
+        text.append(text.empty() ? "" : ", ").append(writtenNameOfLine(*line->transitLine()->identifier()));
+  return count > kMostNamed ? text + " and others" : text;
+}
+
+/// An error while favourites are missing that a damaged database had; `left` are those that it still had.
+ErrorRef lossOf(SQLiteConnection& connection, const Favorites& left) {
+  SQLiteStatement query =
+      connection.prepare("SELECT lostWith FROM favorites_seal WHERE id = 1 AND lostWith IS NOT NULL");
   if (!query.step()) return nullptr;
-  const std::int64_t left = connection.integer("SELECT count(*) FROM favorites");
+  const std::string names = textOfLines(left);
   return refusal(FavoritesError::lost,
                  "Not all favorites could be read in a damaged database, which is kept as " + query.text(0) + ": " +
-                     std::to_string(left) + (left == 1 ? " of them is" : " of them are") +
-                     " left. Add those that you miss; that ends this message.",
+                     std::to_string(left.size()) + (left.size() == 1 ? " of them is" : " of them are") + " left" +
+                     (names.empty() ? "" : " (" + names + ")") +
+                     ". Add those that you miss; that, or any other change of the favorites, ends this message.",
                  query.text(0));
 }
 
 bool wereSet(SQLiteConnection& connection) {
-  SQLiteStatement query = connection.prepare(
-      "SELECT EXISTS (SELECT 1 FROM favorites) OR EXISTS (SELECT 1 FROM settings WHERE key = ? AND value)");
-  query.bind(1, kFavoritesWereSetKey);
-  return query.step() && query.integer(0) != 0;
+  return connection.integer(
+             "SELECT EXISTS (SELECT 1 FROM favorites) OR EXISTS (SELECT 1 FROM favorites_seal WHERE wereSet)") != 0;
+}
+
+/// Whether a damaged database has just been replaced: what was asked for can be asked again.
+bool isOfReplacement(const ErrorRef& error) {
+  return error && error->domain() == kStateDatabaseErrorDomain &&
+         error->code() == static_cast<std::int64_t>(StateDatabaseError::setAside);
 }
 
 std::vector<LineRow> lineRows(SQLiteConnection& connection) {
@@ -188,12 +206,7 @@ void append(SQLiteConnection& connection, const TransitLine& line) {
 }
 
 void markAsSet(SQLiteConnection& connection) {
-  SQLiteStatement remove = connection.prepare("DELETE FROM settings WHERE key = ?");
-  remove.bind(1, kFavoritesLostKey);
-  remove.step();
-  SQLiteStatement insert = connection.prepare("INSERT OR REPLACE INTO settings(key, value) VALUES (?, 1)");
-  insert.bind(1, kFavoritesWereSetKey);
-  insert.step();
+  connection.execute("UPDATE favorites_seal SET wereSet = 1, lostWith = NULL");
 }
 
 Favorites storedFavorites(SQLiteConnection& connection) {
@@ -218,12 +231,21 @@ FavoritesEditor::FavoritesEditor(std::shared_ptr<StateDatabase> database, FirstF
   if (!_firstFavorites) _firstFavorites = [] { return std::vector<TransitLineRef>(); };
 }
 
-Outcome<Favorites> FavoritesEditor::list() const {
+Outcome<Favorites> FavoritesEditor::list() const { return read(Loss::isError); }
+
+Outcome<Favorites> FavoritesEditor::left() const { return read(Loss::isPassedOver); }
+
+Outcome<Favorites> FavoritesEditor::read(Loss loss) const {
   std::optional<Favorites> stored;
-  const ErrorRef error = _database->read([&](SQLiteConnection& connection) -> ErrorRef {
-    if (wereSet(connection)) stored = storedFavorites(connection);
-    return lossOf(connection);
-  });
+  const auto readOnce = [&] {
+    return _database->read([&](SQLiteConnection& connection) -> ErrorRef {
+      requireFittingFavorites(connection);
+      if (wereSet(connection)) stored = storedFavorites(connection);
+      return loss == Loss::isError ? lossOf(connection, stored.value_or(Favorites())) : nullptr;
+    });
+  };
+  ErrorRef error = readOnce();
+  if (isOfReplacement(error)) error = readOnce();
   if (error) return error;
   if (!stored) {
     stored.emplace();
@@ -234,14 +256,21 @@ Outcome<Favorites> FavoritesEditor::list() const {
 }
 
 ErrorRef FavoritesEditor::change(const StateDatabase::Work& work) {
-  return _database->write(
-      [&](SQLiteConnection& connection) {
-        if (!wereSet(connection))
-          for (const TransitLineRef& line : _firstFavorites()) append(connection, *line);
-        markAsSet(connection);
-        return work(connection);
-      },
-      StateDatabase::Durability::power);
+  const auto changeOnce = [&] {
+    return _database->write(
+        [&](SQLiteConnection& connection) -> ErrorRef {
+          requireFittingFavorites(connection);
+          if (!wereSet(connection))
+            for (const TransitLineRef& line : _firstFavorites()) append(connection, *line);
+          markAsSet(connection);
+          if (ErrorRef error = work(connection)) return error;
+          sealFavorites(connection);
+          return nullptr;
+        },
+        StateDatabase::Durability::power);
+  };
+  const ErrorRef error = changeOnce();
+  return isOfReplacement(error) ? changeOnce() : error;
 }
 
 ErrorRef FavoritesEditor::add(const std::vector<TransitLineRef>& lines) {

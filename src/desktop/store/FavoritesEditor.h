@@ -23,9 +23,6 @@ inline constexpr std::string_view kFavoritesErrorDomain = "org.nimbo.Favorites";
 
 enum class FavoritesError : std::int64_t { duplicate = 1, unknown = 2, position = 3, lost = 4 };
 
-/// Setting that tells an emptied list of favourites from one that was never begun.
-inline constexpr std::string_view kFavoritesWereSetKey = "Nimbo.Favorites.wereSet";
-
 /// The favourites in the state database, as the host application changes them. Each change is one transaction: hosts
 /// that change at once lose nothing, and a change that is refused changes nothing. Favourites of other kinds keep
 /// their places in the order and their content. Any thread.
@@ -42,6 +39,8 @@ class FavoritesEditor final {
   /// content cannot be read is a favourite without a line. Null on success, otherwise `favorites` stays: also after
   /// damage that took some of them, until the next change.
   Outcome<Favorites> list() const;
+  /// The same, but after such damage those that are left.
+  Outcome<Favorites> left() const;
 
   // The first change begins from the first favourites. Each answers null on success.
 
@@ -54,6 +53,8 @@ class FavoritesEditor final {
   ErrorRef move(std::uint64_t muid, std::size_t position);
 
  private:
+  enum class Loss { isError, isPassedOver };
+  Outcome<Favorites> read(Loss loss) const;
   ErrorRef change(const StateDatabase::Work& work);
 
   std::shared_ptr<StateDatabase> _database;

@@ -21,10 +21,13 @@ ErrorRef StateDatabase::read(const Work& work) {
 ErrorRef StateDatabase::write(const Work& work, Durability durability) {
   return run(Purpose::writing, [&](SQLiteConnection& connection) {
     connection.execute(durability == Durability::power ? "PRAGMA synchronous = FULL" : "PRAGMA synchronous = NORMAL");
-    SQLiteTransaction transaction(connection, SQLiteTransaction::Kind::writing);
-    ErrorRef error = work(connection);
-    if (!error) transaction.commit();
-    return error;
+    {
+      SQLiteTransaction transaction(connection, SQLiteTransaction::Kind::writing);
+      if (ErrorRef error = work(connection)) return error;
+      transaction.commit();
+    }
+    if (durability == Durability::power) connection.writeBackLog();
+    return ErrorRef();
   });
 }
 

@@ -20,7 +20,7 @@ class StateDatabase final {
 
   enum class Durability {
     process,  ///< outlives the process, not always a power failure of the next seconds
-    power,    ///< outlives a power failure too
+    power,    ///< outlives a power failure too, and what rots in the log
   };
 
   /// Touches nothing yet. `folder` need not exist; `clock` outlives the database.

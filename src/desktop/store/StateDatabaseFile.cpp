@@ -5,28 +5,70 @@
 #include <algorithm>
 
 #include "desktop/raii/SQLite.h"
+#include "desktop/store/FavoritesSeal.h"
 #include "desktop/system/AtomicFile.h"
 
 namespace nimbo {
 
 namespace {
 
-/// Copies the rows of a table up to the first that cannot be read, and counts them. Whether that was all of them.
-bool copyReadableRows(SQLiteConnection& from, SQLiteConnection& into, const std::string& table, std::size_t& count) {
+/// The next row; NO also where the rest cannot be read, which `isWhole` tells.
+bool stepReadable(SQLiteStatement& rows, bool& isWhole) {
   try {
-    SQLiteStatement rows = from.prepare("SELECT * FROM " + table);
-    std::string parameters = "?";
-    for (int i = 1; i < rows.columnCount(); ++i) parameters += ", ?";
-    SQLiteStatement insert = into.prepare("INSERT INTO " + table + " VALUES (" + parameters + ")");
-    for (; rows.step(); ++count) {
-      for (int i = 0; i < rows.columnCount(); ++i) insert.bindColumn(i + 1, rows, i);
-      insert.step();
-      insert.reset();
-    }
-    return true;
+    return rows.step();
   } catch (const SQLiteFailure&) {
-    return false;  // the rest of the table is lost; the count says what is not
+    isWhole = false;
+    return false;
   }
+}
+
+void insertColumns(SQLiteStatement& insert, const SQLiteStatement& row, int count) {
+  for (int i = 0; i < count; ++i) insert.bindColumn(i + 1, row, i);
+  insert.step();
+  insert.reset();
+}
+
+void copySettings(SQLiteConnection& from, SQLiteConnection& into, std::size_t& count) {
+  SQLiteStatement rows = from.prepare("SELECT key, value FROM settings");
+  SQLiteStatement insert = into.prepare("INSERT OR IGNORE INTO settings VALUES (?, ?)");
+  for (bool isWhole = true; stepReadable(rows, isWhole); ++count) insertColumns(insert, rows, 2);
+}
+
+/// Version 1 kept among the settings what the seal says now.
+void sealSettingsOfVersion1(SQLiteConnection& connection) {
+  connection.execute(
+      "UPDATE favorites_seal SET"
+      " wereSet = EXISTS (SELECT 1 FROM settings WHERE key = 'Nimbo.Favorites.wereSet' AND value),"
+      " lostWith = (SELECT value FROM settings WHERE key = 'Nimbo.Favorites.lostWith')");
+}
+
+/// Whether these were all of them.
+bool copyFavorites(SQLiteConnection& from, SQLiteConnection& into, std::size_t& count) {
+  const bool isSealed = from.integer("PRAGMA user_version") != 1;
+  bool isWhole = true;
+  SQLiteStatement rows =
+      from.prepare(std::string("SELECT ") + (isSealed ? kSealedFavoriteColumns : "id, position, kind, muid, content") +
+                   " FROM favorites");
+  SQLiteStatement insert = into.prepare(
+      "INSERT OR IGNORE INTO favorites(id, position, kind, muid, content)"
+      " VALUES (?, ?, ?, ?, ?)");
+  while (stepReadable(rows, isWhole)) {
+    if (isSealed && !favoriteFits(rows)) {
+      isWhole = false;
+      continue;
+    }
+    insertColumns(insert, rows, 5);
+    ++count;
+  }
+  if (!isSealed) {
+    sealSettingsOfVersion1(into);
+    return isWhole;
+  }
+  SQLiteStatement said = from.prepare("SELECT wereSet, lostWith FROM favorites_seal WHERE id = 1");
+  if (!said.step()) return false;
+  SQLiteStatement keep = into.prepare("UPDATE favorites_seal SET wereSet = ?, lostWith = ?");
+  insertColumns(keep, said, 2);
+  return isWhole && favoritesFit(from);
 }
 
 }  // namespace
@@ -39,11 +81,41 @@ void createStateSchema(SQLiteConnection& connection) {
       "CREATE TABLE settings(key TEXT NOT NULL PRIMARY KEY, value NOT NULL);"
       // In the order of position; muid and content as JSON are a line's, other kinds hold what their owners please.
       "CREATE TABLE favorites(id INTEGER PRIMARY KEY, position INTEGER NOT NULL, kind TEXT NOT NULL, muid INTEGER,"
-      "                       content);"
+      "                       content, checksum INTEGER NOT NULL DEFAULT 0);"
+      "CREATE TABLE favorites_seal(id INTEGER PRIMARY KEY, count INTEGER, digest INTEGER, wereSet INTEGER, lostWith);"
+      "INSERT INTO favorites_seal VALUES (1, 0, 0, 0, NULL);"
       // One entry a row as JSON, the newest last.
       "CREATE TABLE analytics(id INTEGER PRIMARY KEY, content TEXT NOT NULL);");
+  sealFavorites(connection);
   connection.execute(("PRAGMA user_version = " + std::to_string(kStateSchemaVersion)).c_str());
   transaction.commit();
+}
+
+void upgradeStateSchema(SQLiteConnection& connection, Upgrade upgrade) {
+  if (upgrade == Upgrade::shown) {
+    // Temporary tables stand before those of the file.
+    connection.execute(
+        "PRAGMA temp_store = MEMORY;"
+        "CREATE TEMP TABLE favorites AS SELECT id, position, kind, muid, content, 0 AS checksum FROM main.favorites;"
+        "CREATE TEMP TABLE favorites_seal(id, count, digest, wereSet, lostWith);"
+        "INSERT INTO favorites_seal VALUES (1, 0, 0, 0, NULL);");
+    sealSettingsOfVersion1(connection);
+    sealFavorites(connection);
+    return;
+  }
+  {
+    SQLiteTransaction transaction(connection, SQLiteTransaction::Kind::writing);
+    connection.execute(
+        "ALTER TABLE favorites ADD COLUMN checksum INTEGER NOT NULL DEFAULT 0;"
+        "CREATE TABLE favorites_seal(id INTEGER PRIMARY KEY, count INTEGER, digest INTEGER, wereSet INTEGER, lostWith);"
+        "INSERT INTO favorites_seal VALUES (1, 0, 0, 0, NULL);");
+    sealSettingsOfVersion1(connection);
+    connection.execute("DELETE FROM settings WHERE key IN ('Nimbo.Favorites.wereSet', 'Nimbo.Favorites.lostWith')");
+    sealFavorites(connection);
+    connection.execute(("PRAGMA user_version = " + std::to_string(kStateSchemaVersion)).c_str());
+    transaction.commit();
+  }
+  connection.writeBackLog();
 }
 
 SalvagedCounts salvageState(const std::filesystem::path& damaged, const std::filesystem::path& aside,
@@ -51,20 +123,29 @@ SalvagedCounts salvageState(const std::filesystem::path& damaged, const std::fil
   SQLiteTransaction transaction(into, SQLiteTransaction::Kind::writing);
   SalvagedCounts counts;
   bool hasAllFavorites = false;
-  try {
-    SQLiteConnection from(damaged, SQLiteConnection::Access::readWrite, kMaximumStateValueBytes);
-    from.keepLogOnClose();
-    copyReadableRows(from, into, "settings", counts.settings);
-    hasAllFavorites = copyReadableRows(from, into, "favorites", counts.favorites);
-  } catch (const SQLiteFailure&) {
-    // It cannot be opened at all.
+  std::unique_ptr<SQLiteConnection> from;
+  const auto ifReadable = [](const auto& copy) {
+    try {
+      copy();
+    } catch (const SQLiteFailure& failure) {
+      if (failure.code() == SQLITE_FULL) throw;  // of the copy
+    }
+  };
+  ifReadable([&] {
+    from = std::make_unique<SQLiteConnection>(damaged, SQLiteConnection::Access::readWrite, kMaximumStateValueBytes);
+    from->keepLogOnClose();
+  });
+  if (from) {
+    ifReadable([&] { copySettings(*from, into, counts.settings); });
+    ifReadable([&] { hasAllFavorites = copyFavorites(*from, into, counts.favorites); });
   }
   if (!hasAllFavorites) {
-    SQLiteStatement insert = into.prepare("INSERT OR REPLACE INTO settings(key, value) VALUES (?, ?)");
-    insert.bind(1, kFavoritesLostKey);
-    insert.bind(2, aside.native());
-    insert.step();
+    SQLiteStatement mark = into.prepare("UPDATE favorites_seal SET lostWith = ?");
+    mark.bind(1, aside.native());
+    mark.step();
   }
+  into.execute("DELETE FROM settings WHERE key IN ('Nimbo.Favorites.wereSet', 'Nimbo.Favorites.lostWith')");
+  sealFavorites(into);
   transaction.commit();
   return counts;
 }
@@ -96,16 +177,23 @@ std::string_view adviceFor(int sqliteCode) {
 
 fs::path withSuffix(const fs::path& path, std::string_view suffix) { return fs::path(path).concat(suffix); }
 
-bool isMissing(const fs::path& path) {
-  std::error_code failure;
-  return fs::status(path, failure).type() == fs::file_type::not_found;
+fs::file_type typeOf(const fs::path& path) {
+  std::error_code ignored;
+  return fs::symlink_status(path, ignored).type();
 }
+
+bool isMissing(const fs::path& path) { return typeOf(path) == fs::file_type::not_found; }
 
 /// Makes the file where it is missing, for its owner only; SQLite gives the files that it makes beside it the same
 /// mode. One that exists is not touched: closing it would drop the locks that this process may hold on it.
 ErrorRef makeFile(const fs::path& path) {
   const FileDescriptor made(::open(path.c_str(), O_RDWR | O_CREAT | O_EXCL | O_CLOEXEC, 0600));
   return !made && errno != EEXIST ? fileError("make", path, errno) : nullptr;
+}
+
+/// Removes a database and what SQLite keeps beside it.
+void removeDatabase(const fs::path& path) {
+  for (const char* suffix : {"", "-wal", "-shm"}) ::unlink(withSuffix(path, suffix).c_str());
 }
 
 bool mayWriteTo(const fs::path& folder) { return ::faccessat(AT_FDCWD, folder.c_str(), W_OK, AT_EACCESS) == 0; }
@@ -149,7 +237,15 @@ StateDatabaseFile::Opened StateDatabaseFile::open(Purpose purpose) {
     return {};
   }
   const FolderLock lock(_folder);
-  if (isMissing(_path) && !isMissing(pathOfNew())) putNewInPlace(nameForDamaged());
+  if (isMissing(_path) && !isMissing(pathOfNew())) putInPlace(pathOfNew(), nameForDamaged());
+  for (const fs::path& left : {pathOfNew(), pathOfFirst()}) removeDatabase(left);  // by a killed process
+  if (const fs::file_type type = typeOf(_path);
+      type != fs::file_type::regular && type != fs::file_type::not_found && type != fs::file_type::none)
+    return failed(error(StateDatabaseError::cannotRead,
+                        "Cannot read " + _path.native() + ": it is " +
+                            (type == fs::file_type::symlink ? "a link" : "no file") +
+                            ". Move it away, or choose another state folder.",
+                        _path));
   try {
     return openLocked(purpose);
   } catch (const SQLiteFailure& failure) {
@@ -159,8 +255,11 @@ StateDatabaseFile::Opened StateDatabaseFile::open(Purpose purpose) {
 }
 
 StateDatabaseFile::Opened StateDatabaseFile::openLocked(Purpose purpose) {
-  if (purpose == Purpose::writing)
-    if (ErrorRef error = makeFile(_path)) return failed(std::move(error));
+  if (purpose == Purpose::writing && isMissing(_path)) {
+    // Whole before it has its name: an empty file is one that lost everything, not one that was never written to.
+    if (ErrorRef error = makeNew(pathOfFirst(), [](SQLiteConnection&) {})) return failed(std::move(error));
+    putInPlace(pathOfFirst(), nameForDamaged());
+  }
   Opened opened;
   opened.connection = connect(opened.isSnapshot);
   const std::int64_t version = opened.connection->integer("PRAGMA user_version");
@@ -170,13 +269,26 @@ StateDatabaseFile::Opened StateDatabaseFile::openLocked(Purpose purpose) {
                                          "choose another state folder.",
                         _path));
   if (version == kStateSchemaVersion) return opened;
-  if (version < 0 || opened.connection->integer("SELECT count(*) FROM sqlite_schema") != 0)
-    return failed(error(StateDatabaseError::foreign,
-                        _path.native() + " is a database of another program. Move it away, or choose another state "
-                                         "folder.",
-                        _path));
-  createStateSchema(*opened.connection);
-  return opened;
+  if (version == 1) {
+    upgrade(opened, purpose);
+    return opened;
+  }
+  if (opened.connection->integer("SELECT count(*) FROM sqlite_schema") == 0)
+    throw SQLiteFailure(SQLITE_NOTADB, "it is empty");
+  return failed(error(StateDatabaseError::foreign,
+                      _path.native() + " is a database of another program. Move it away, or choose another state "
+                                       "folder.",
+                      _path));
+}
+
+void StateDatabaseFile::upgrade(Opened& opened, Purpose purpose) const {
+  try {
+    if (!opened.isSnapshot) return upgradeStateSchema(*opened.connection, Upgrade::kept);
+  } catch (const SQLiteFailure& failure) {
+    if (purpose == Purpose::writing || failure.meansDamage()) throw;
+    opened.isSnapshot = true;  // the next access tries again
+  }
+  upgradeStateSchema(*opened.connection, Upgrade::shown);
 }
 
 std::unique_ptr<SQLiteConnection> StateDatabaseFile::connect(bool& isSnapshot) const {
@@ -188,12 +300,15 @@ std::unique_ptr<SQLiteConnection> StateDatabaseFile::connect(bool& isSnapshot) c
   } catch (const SQLiteFailure& failure) {
     // A database in WAL mode cannot be read where no file can be made, unless as one that never changes; that one
     // leaves the log out, so that a log with something in it must not be there.
-    if (failure.code() != SQLITE_CANTOPEN && failure.code() != SQLITE_READONLY) throw;
+    const bool isDiskFull = failure.code() == SQLITE_IOERR || failure.code() == SQLITE_FULL;
+    if (!isDiskFull && failure.code() != SQLITE_CANTOPEN && failure.code() != SQLITE_READONLY) throw;
+    isSnapshot = true;
+    if (isDiskFull)
+      return std::make_unique<SQLiteConnection>(_path, SQLiteConnection::Access::alone, kMaximumStateValueBytes);
     std::error_code noLog;
     const std::uintmax_t logBytes = fs::file_size(withSuffix(_path, "-wal"), noLog);
     if (mayWriteTo(_folder) || (!noLog && logBytes > 0)) throw;
   }
-  isSnapshot = true;
   return std::make_unique<SQLiteConnection>(_path, SQLiteConnection::Access::immutable, kMaximumStateValueBytes);
 }
 
@@ -222,11 +337,22 @@ StateDatabaseFile::Opened StateDatabaseFile::replaceDamaged(std::unique_ptr<SQLi
 
 fs::path StateDatabaseFile::pathOfNew() const { return withSuffix(_path, ".new"); }
 
-void StateDatabaseFile::putNewInPlace(const fs::path& aside) const {
-  // The log belongs to the damaged file; its index is made anew wherever it is missing.
+fs::path StateDatabaseFile::pathOfFirst() const { return withSuffix(_path, ".first"); }
+
+ErrorRef StateDatabaseFile::makeNew(const fs::path& path, const std::function<void(SQLiteConnection&)>& fill) const {
+  removeDatabase(path);
+  if (ErrorRef error = makeFile(path)) return error;
+  SQLiteConnection connection(path, SQLiteConnection::Access::readWrite, kMaximumStateValueBytes);
+  createStateSchema(connection);
+  fill(connection);
+  return nullptr;
+}
+
+void StateDatabaseFile::putInPlace(const fs::path& made, const fs::path& aside) const {
+  // A log there is belongs to the file before; its index is made anew wherever it is missing.
   ::rename(withSuffix(_path, "-wal").c_str(), withSuffix(aside, "-wal").c_str());
   ::unlink(withSuffix(_path, "-shm").c_str());
-  ::rename(pathOfNew().c_str(), _path.c_str());
+  ::rename(made.c_str(), _path.c_str());
 }
 
 StateDatabaseFile::Opened StateDatabaseFile::replaceLocked() {
@@ -236,15 +362,11 @@ StateDatabaseFile::Opened StateDatabaseFile::replaceLocked() {
   SalvagedCounts counts;
   Opened opened;
   try {
-    for (const char* suffix : {"", "-wal", "-shm"}) ::unlink(withSuffix(pathOfNew(), suffix).c_str());
-    if (ErrorRef error = makeFile(pathOfNew())) return failed(std::move(error));
-    {
-      SQLiteConnection fresh(pathOfNew(), SQLiteConnection::Access::readWrite, kMaximumStateValueBytes);
-      createStateSchema(fresh);
-      counts = salvageState(_path, aside, fresh);
-    }
+    if (ErrorRef error =
+            makeNew(pathOfNew(), [&](SQLiteConnection& fresh) { counts = salvageState(_path, aside, fresh); }))
+      return failed(std::move(error));
     if (::rename(_path.c_str(), aside.c_str()) != 0) return failed(fileError("set aside the damaged", _path, errno));
-    putNewInPlace(aside);
+    putInPlace(pathOfNew(), aside);
     opened = openLocked(Purpose::writing);
   } catch (const SQLiteFailure& failure) {
     return failed(errorOfFailure(failure, Purpose::writing));

@@ -5,6 +5,7 @@
 
 #include <cerrno>
 #include <filesystem>
+#include <functional>
 
 #include "desktop/raii/FileDescriptor.h"
 #include "desktop/raii/SQLite.h"
@@ -28,24 +29,29 @@ class FolderLock final {
   FileDescriptor _folder;
 };
 
-/// Version of the tables, kept as the database's user_version.
-inline constexpr std::int64_t kStateSchemaVersion = 1;
+/// Version of the tables, kept as the database's user_version. Version 1 had no checksums.
+inline constexpr std::int64_t kStateSchemaVersion = 2;
 
 /// Puts the tables into an empty database, which from then on keeps a write-ahead log: all or nothing. Throws
 /// SQLiteFailure.
 void createStateSchema(SQLiteConnection& connection);
+
+enum class Upgrade {
+  kept,
+  shown,  ///< for this connection alone: the file lets nothing be written
+};
+
+/// Gives the tables of version 1 their checksums: all or nothing. Throws SQLiteFailure.
+void upgradeStateSchema(SQLiteConnection& connection, Upgrade upgrade);
 
 struct SalvagedCounts {
   std::size_t favorites = 0;
   std::size_t settings = 0;
 };
 
-/// Setting with the path of a damaged database whose favourites could not all be read; there until the user changes his
-/// favourites.
-inline constexpr std::string_view kFavoritesLostKey = "Nimbo.Favorites.lostWith";
-
-/// Copies the favourites and settings that can still be read in a damaged file, which stays as it is, and whose tables
-/// may be missing; `aside` is the name that it will have. Throws SQLiteFailure when the copies cannot be kept.
+/// Copies the favourites and settings that can still be read, and fit their checksums, in a damaged file, which stays
+/// as it is, and whose tables may be missing; `aside` is the name that it will have, and that the copy names as where
+/// favourites were lost, unless all were copied. Throws SQLiteFailure when the copies cannot be kept.
 SalvagedCounts salvageState(const std::filesystem::path& damaged, const std::filesystem::path& aside,
                             SQLiteConnection& into);
 
@@ -95,17 +101,21 @@ class StateDatabaseFile final {
   ErrorRef errorOfFailure(const SQLiteFailure& failure, Purpose purpose) const;
 
  private:
-  // Each of these needs the folder's lock. The first two throw SQLiteFailure.
+  // Each of these needs the folder's lock, and may throw SQLiteFailure.
   Opened openLocked(Purpose purpose);
   std::unique_ptr<SQLiteConnection> connect(bool& isSnapshot) const;
+  void upgrade(Opened& opened, Purpose purpose) const;
   Opened replaceLocked();
-  /// Ends a replacement once the damaged file is set aside: its log goes after it, to this name, and the new file
-  /// comes.
-  void putNewInPlace(const std::filesystem::path& aside) const;
+  /// Makes a database at `path`, in place of what is there.
+  ErrorRef makeNew(const std::filesystem::path& path, const std::function<void(SQLiteConnection&)>& fill) const;
+  /// Gives the file at `made` its name, once there is none of that name; the log of one before goes to `aside`.
+  void putInPlace(const std::filesystem::path& made, const std::filesystem::path& aside) const;
 
   ErrorRef error(StateDatabaseError code, std::string reason, const std::filesystem::path& subject) const;
   /// Where a new file is made while the damaged one is still there.
   std::filesystem::path pathOfNew() const;
+  /// Where the very first one is made.
+  std::filesystem::path pathOfFirst() const;
   /// A name for a damaged file that nothing has yet: "state.sqlite.broken-2026-01-05T12-00-00".
   std::filesystem::path nameForDamaged() const;
 

@@ -1,6 +1,7 @@
 #include "desktop/system/AtomicFile.h"
 
 #include <fcntl.h>
+#include <sys/file.h>
 #include <sys/stat.h>
 
 #include <cerrno>
@@ -29,6 +30,7 @@ std::string_view adviceFor(int errnoValue) {
     case EISDIR:
     case ENOTDIR:
     case EEXIST:
+    case ELOOP:
       return "Something else stands at this path: move it away or choose another path.";
     case EMFILE:
     case ENFILE:
@@ -47,6 +49,46 @@ int writeWhole(int fd, std::string_view bytes) {
     bytes.remove_prefix(static_cast<std::size_t>(count));
   }
   return ::fsync(fd) == 0 ? 0 : errno;
+}
+
+/// After the random letters of a temporary file's name: no file of the user's ends so.
+constexpr std::string_view kTemporaryEnd = ".nimbo-part";
+
+/// A new file beside `target`, locked as long as it is open, so that a name without a lock is one that a killed process
+/// left. Its path goes to `path`. None: errno says why.
+FileDescriptor makeTemporary(const std::filesystem::path& target, std::string& path) {
+  for (;;) {
+    path = target.native() + ".XXXXXX" + std::string(kTemporaryEnd);
+    FileDescriptor file(
+        ::mkostemps(path.data(), static_cast<int>(kTemporaryEnd.size()), O_CLOEXEC));  // made with mode 0600
+    if (!file) return file;
+    ::flock(file.get(), LOCK_EX);
+    struct stat status {};
+    // Another process may have taken it for a left one before it was locked.
+    if (::fstat(file.get(), &status) != 0 || status.st_nlink > 0) return file;
+  }
+}
+
+/// Removes what killed processes left beside `target`.
+void clearTemporaries(const std::filesystem::path& folder, const std::filesystem::path& target) {
+  const std::string begin = target.filename().native() + ".";
+  std::error_code ignored;
+  for (const auto& entry : std::filesystem::directory_iterator(folder, ignored)) {
+    const std::string name = entry.path().filename().native();
+    if (!name.starts_with(begin) || !name.ends_with(kTemporaryEnd)) continue;
+    const FileDescriptor left(::open(entry.path().c_str(), O_RDONLY | O_CLOEXEC | O_NONBLOCK | O_NOFOLLOW));
+    struct stat status {};
+    if (left && ::fstat(left.get(), &status) == 0 && S_ISREG(status.st_mode) &&
+        ::flock(left.get(), LOCK_EX | LOCK_NB) == 0)
+      ::unlink(entry.path().c_str());
+  }
+}
+
+/// 0, or the errno value of what stands at a path at which nothing but a regular file is replaced.
+int obstacleAt(const std::filesystem::path& path) {
+  struct stat status {};
+  if (::lstat(path.c_str(), &status) != 0 || S_ISREG(status.st_mode)) return 0;
+  return S_ISDIR(status.st_mode) ? EISDIR : S_ISLNK(status.st_mode) ? ELOOP : EEXIST;
 }
 
 }  // namespace
@@ -73,18 +115,16 @@ ErrorRef makeFolders(const std::filesystem::path& folder) {
 }
 
 ErrorRef writeFileAtomically(const std::filesystem::path& path, std::string_view bytes) {
-  std::error_code ignored;
-  std::filesystem::path target = path;
-  if (std::filesystem::is_symlink(path, ignored))
-    if (auto resolved = std::filesystem::canonical(path, ignored); !ignored) target = std::move(resolved);
-  const std::filesystem::path folder = target.has_parent_path() ? target.parent_path() : ".";
+  const std::filesystem::path folder = path.has_parent_path() ? path.parent_path() : ".";
   if (ErrorRef error = makeFolders(folder)) return error;
+  if (const int obstacle = obstacleAt(path)) return fileError("write", path, obstacle);
+  clearTemporaries(folder, path);
 
-  std::string temporary = target.native() + ".XXXXXX";
-  const FileDescriptor file(::mkostemp(temporary.data(), O_CLOEXEC));  // made with mode 0600
+  std::string temporary;
+  const FileDescriptor file = makeTemporary(path, temporary);
   if (!file) return fileError("write", path, errno);
   int failure = writeWhole(file.get(), bytes);
-  if (failure == 0 && ::rename(temporary.c_str(), target.c_str()) != 0) failure = errno;
+  if (failure == 0 && ::rename(temporary.c_str(), path.c_str()) != 0) failure = errno;
   if (failure != 0) {
     ::unlink(temporary.c_str());
     return fileError("write", path, failure);

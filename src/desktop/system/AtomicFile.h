@@ -19,8 +19,9 @@ ErrorRef fileError(std::string_view action, const std::filesystem::path& path, i
 ErrorRef makeFolders(const std::filesystem::path& folder);
 
 /// Replaces what `path` holds with `bytes`, readable and writable by the owner only. Readers, also after a crash, see
-/// the old bytes or the new ones, never a mixture; on failure the old file stays. Makes missing folders; where `path`
-/// is a symbolic link the file that it points to is replaced. Null on success. Any thread.
+/// the old bytes or the new ones, never a mixture; on failure the old file stays. Makes missing folders, and clears
+/// what killed processes left half written. A link, or whatever else is no regular file, is an error and stays; the
+/// folders above may be links. Null on success. Any thread.
 ErrorRef writeFileAtomically(const std::filesystem::path& path, std::string_view bytes);
 
 }  // namespace nimbo

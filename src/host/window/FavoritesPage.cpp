@@ -64,8 +64,10 @@ bool FavoritesPage::isFavorite(const TransitLine& line) const {
 }
 
 void FavoritesPage::readFavorites() {
-  const auto all = _context.platform->favoritesEditor().list();
+  FavoritesEditor& editor = _context.platform->favoritesEditor();
+  const auto all = editor.left();
   if (!all) return _context.navigator.tell(textOfError(*all.error()));
+  if (const auto whole = editor.list(); !whole) _context.navigator.tell(textOfError(*whole.error()));
   _favorites.clear();
   for (const FavoriteRef& favorite : *all)
     if (const auto* line = dynamic_cast<const FavoriteTransitLine*>(favorite.get()); line && line->transitLine())
@@ -76,11 +78,19 @@ void FavoritesPage::lookForGone() {
   std::vector<MapItemIdentifierRef> identifiers;
   for (const TransitLineRef& line : _favorites) identifiers.push_back(line->identifier());
   _goneLookup = _context.workers.start([this, identifiers, &library = _context.library](const std::stop_token&) {
-    const auto gone = FeedCatalog(library).goneLines(identifiers);
+    std::map<std::uint64_t, const char*> gone;
+    // Feeds that cannot be read are told of by the search.
+    if (const auto lines = FeedCatalog(library).goneLines(identifiers))
+      for (const MapItemIdentifierRef& line : lines->lines) gone[line->muid()] = "Window_Favorites_Gone";
+    if (const auto sources = library.sources())
+      for (const MapItemIdentifierRef& line : identifiers)
+        if (line->locator() && std::none_of(sources->begin(), sources->end(), [&](const FeedSourceRef& source) {
+              return source->name() == line->locator()->feed;
+            }))
+          gone[line->muid()] = "Window_Favorites_FeedGone";
     return [this, gone] {
-      if (!gone || gone->lines.empty()) return;  // feeds that cannot be read are told of by the search
-      for (const MapItemIdentifierRef& line : gone->lines) _gone.insert(line->muid());
-      showFavorites();
+      _gone = gone;
+      if (!gone.empty()) showFavorites();
     };
   });
 }
@@ -97,7 +107,7 @@ void FavoritesPage::showFavorites() {
     row->addMoving(i > 0, i + 1 < _favorites.size(), [this, line, i](int step) {
       move(line, static_cast<std::size_t>(static_cast<std::ptrdiff_t>(i) + step));
     });
-    if (_gone.contains(line->muid())) row->showGone();
+    if (const auto gone = _gone.find(line->muid()); gone != _gone.end()) row->showGone(gone->second);
     _favoritesList.append(*row);
     if (static_cast<int>(i) == std::min(focusedIndex, static_cast<int>(_favorites.size()) - 1))
       row->star().grab_focus();

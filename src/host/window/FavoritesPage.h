@@ -5,7 +5,7 @@
 #include <gtkmm/searchentry.h>
 #include <gtkmm/spinner.h>
 
-#include <set>
+#include <map>
 #include <vector>
 
 #include "desktop/gtfs/feeds/FeedCatalog.h"
@@ -23,7 +23,7 @@ class FavoritesPage final : public Page {
   void addSection(Gtk::Label& title, const char* key, Gtk::ListBox& list);
   void readFavorites();
   void showFavorites();
-  /// Looks up which favourites their feeds do not know any more.
+  /// Looks up which favourites' feeds are gone, or do not know them any more.
   void lookForGone();
   void search();
   void showFound();
@@ -35,7 +35,7 @@ class FavoritesPage final : public Page {
 
   const PageContext& _context;
   std::vector<TransitLineRef> _favorites;
-  std::set<std::uint64_t> _gone;  // favourites by their numbers
+  std::map<std::uint64_t, const char*> _gone;  // why, as a text's key, by the favourites' numbers
   FeedCatalog::Lines _found;
   Gtk::SearchEntry _query;
   Gtk::Label _favoritesTitle, _noFavorites, _linesTitle, _notice;

@@ -2,6 +2,7 @@
 
 #include <gtkmm/label.h>
 
+#include "desktop/store/FavoritesEditor.h"
 #include "host/window/Texts.h"
 #include "host/window/WidgetTexts.h"
 #include "platform/Localization.h"
@@ -44,6 +45,13 @@ void FeedRow::check() {
   _checkButton.set_sensitive(false);
 }
 
+namespace {
+
+/// The answer that the feed goes and its favourites with it.
+constexpr int kWithFavorites = 1;
+
+}  // namespace
+
 FeedsPage::FeedsPage(const PageContext& context)
     : Page(LocalizedString("Window_Feeds_Title")),
       _context(context),
@@ -81,16 +89,36 @@ void FeedsPage::confirmRemoval(const Feed& feed) {
   _confirmation->set_secondary_text(LocalizedString("Window_Feed_RemoveText"));
   _confirmation->add_button(LocalizedString("Window_Cancel"), Gtk::ResponseType::CANCEL);
   _confirmation->add_button(LocalizedString("Window_Feed_Remove"), Gtk::ResponseType::ACCEPT);
-  _confirmation->signal_response().connect([this, name = feed.name](int response) {
+  const std::vector<std::uint64_t> favorites = favoritesOf(feed.name);
+  if (!favorites.empty())
+    _confirmation->add_button(
+        LocalizedFormat(LocalizedString("Window_Feed_RemoveWithFavorites"), {std::uint64_t{favorites.size()}}),
+        kWithFavorites);
+  _confirmation->signal_response().connect([this, name = feed.name, favorites](int response) {
     _confirmation->hide();
-    if (response == Gtk::ResponseType::ACCEPT) remove(name);
+    if (response == kWithFavorites) remove(name, favorites);
+    if (response == Gtk::ResponseType::ACCEPT) remove(name, {});
   });
   _confirmation->show();
 }
 
-void FeedsPage::remove(const std::string& name) {
-  const ErrorRef failure = FeedConfiguration(_context.command.paths.config).remove(name);
-  if (!failure) _context.library.cache().remove(name);
+std::vector<std::uint64_t> FeedsPage::favoritesOf(const std::string& feed) const {
+  std::vector<std::uint64_t> muids;
+  const auto favorites = _context.platform->favoritesEditor().left();
+  if (!favorites) return muids;
+  for (const FavoriteRef& favorite : *favorites)
+    if (const auto* line = dynamic_cast<const FavoriteTransitLine*>(favorite.get()); line && line->transitLine())
+      if (const auto& locator = line->transitLine()->identifier()->locator(); locator && locator->feed == feed)
+        muids.push_back(line->transitLine()->muid());
+  return muids;
+}
+
+void FeedsPage::remove(const std::string& name, const std::vector<std::uint64_t>& favorites) {
+  ErrorRef failure = FeedConfiguration(_context.command.paths.config).remove(name);
+  if (!failure) {
+    _context.library.cache().remove(name);
+    if (!favorites.empty()) failure = _context.platform->favoritesEditor().remove(favorites);
+  }
   showFeeds();
   if (failure) _context.navigator.tell(textOfError(*failure));
 }

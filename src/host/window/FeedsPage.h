@@ -7,6 +7,7 @@
 #include <gtkmm/messagedialog.h>
 
 #include <memory>
+#include <vector>
 
 #include "host/window/FeedCheckView.h"
 #include "host/window/FeedForm.h"
@@ -39,7 +40,9 @@ class FeedsPage final : public Page {
  private:
   void showFeeds();
   void confirmRemoval(const Feed& feed);
-  void remove(const std::string& name);
+  /// The numbers of the favourite lines of a feed.
+  std::vector<std::uint64_t> favoritesOf(const std::string& feed) const;
+  void remove(const std::string& name, const std::vector<std::uint64_t>& favorites);
 
   const PageContext& _context;
   Gtk::Label _none;

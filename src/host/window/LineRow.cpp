@@ -53,8 +53,8 @@ void LineRow::addText(const std::string& text, const char* style) {
   _texts.append(*label);
 }
 
-void LineRow::showGone() {
-  const std::string text = LocalizedString("Window_Favorites_Gone");
+void LineRow::showGone(const char* key) {
+  const std::string text = LocalizedString(key);
   addText(text, "failed");
   _said.push_back(text);
   setAccessibleLabel(*this, CommaDelimitedList(_said));

@@ -20,8 +20,8 @@ class LineRow final : public Gtk::ListBoxRow {
   LineRow(const PageContext& context, TransitLineRef line, bool isFavorite, std::function<void()> toggle);
 
   void setFavorite(bool isFavorite);
-  /// Says that the line's feed does not know it any more.
-  void showGone();
+  /// Says why the line cannot be looked up any more; `key` is the text's.
+  void showGone(const char* key);
 
   /// Adds buttons (and, while the row has the focus, Alt with an arrow key) that move the line up (-1) or down (1) in
   /// its list, where there is room that way.

@@ -1,3 +1,4 @@
+#include <unistd.h>
 #include <zip.h>
 
 #include "desktop/gtfs/Fixtures.h"
@@ -196,6 +197,16 @@ TEST_F(StaticFeedStoreTest, ReadsAgainOnlyWhatChanged) {
     EXPECT_EQ(names(store.load(feed, {})), "AB");
     EXPECT_EQ(*readFile(cacheFile, 1 << 20), bytes);
   }
+
+  // Neither does one behind a link, which stays as it is.
+  const auto elsewhere = folder.write("elsewhere", bytes);
+  std::filesystem::remove(cacheFile);
+  std::filesystem::create_symlink(elsewhere, cacheFile);
+  folder.write("feed/routes.txt", "route_id,route_short_name\n1,C\n");
+  EXPECT_EQ(names(store.load(feed, {})), "C");
+  EXPECT_TRUE(std::filesystem::is_symlink(cacheFile));
+  EXPECT_EQ(*readFile(elsewhere, 1 << 20), bytes);
+  EXPECT_FALSE(readOwnFile(cacheFile, 1 << 20));
 }
 
 TEST_F(StaticFeedStoreTest, KeepsTripsBesideTheLines) {
@@ -281,6 +292,35 @@ TEST_F(FeedConfigurationTest, RefusesWhatItCannotKeepAndChangesNothing) {
   EXPECT_NE(unknown->reason().find("Feeds set up: metro."), std::string::npos);
   EXPECT_EQ(unknown->subject(), "tram");
   EXPECT_EQ(*readFile(configuration.file(), 1 << 20), before);
+}
+
+TEST_F(FeedConfigurationTest, FollowsTheLinksOfManagersOfDotfilesAlone) {
+  namespace fs = std::filesystem;
+  ASSERT_FALSE(configuration.add(feed("metro")));
+  fs::rename(configuration.file(), folder.path() / "dotfile");
+  const auto linkTo = [&](const fs::path& target) {
+    fs::remove(configuration.file());
+    fs::create_symlink(target, configuration.file());
+  };
+  linkTo("../dotfile");
+  ASSERT_FALSE(configuration.add(feed("tram")));
+  EXPECT_TRUE(fs::is_symlink(configuration.file()));
+  EXPECT_NE(readFile(folder.path() / "dotfile", 1 << 20)->find("tram"), std::string::npos);
+  EXPECT_EQ(configuration.feeds()->size(), 2u);
+
+  linkTo("/dev/zero");
+  EXPECT_NE(configuration.add(feed("bus"))->reason().find("which is no file"), std::string::npos);
+  linkTo("none");
+  EXPECT_NE(configuration.feeds().error()->reason().find("No such file"), std::string::npos);
+  if (::geteuid() == 0) {  // only the superuser gives files away
+    linkTo("../dotfile");
+    ASSERT_EQ(::chown((folder.path() / "dotfile").c_str(), 65534, 65534), 0);
+    EXPECT_NE(configuration.feeds().error()->reason().find("belongs to somebody else"), std::string::npos);
+  }
+  // What cannot be looked at is not the same as nothing.
+  folder.write("file", "");
+  EXPECT_NE(FeedConfiguration(folder.path() / "file").feeds().error()->reason().find("Not a directory"),
+            std::string::npos);
 }
 
 TEST_F(FeedConfigurationTest, SaysWhatIsWrongWithTheFile) {

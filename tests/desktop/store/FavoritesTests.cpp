@@ -1,6 +1,7 @@
 #include <thread>
 
 #include "desktop/store/Fixture.h"
+#include "desktop/store/FavoritesSeal.h"
 #include "desktop/store/GuardedFavorites.h"
 #include "support/TransitFixtures.h"
 
@@ -32,6 +33,13 @@ class FavoritesTest : public StoreTest {
     return names;
   }
 
+  /// Changes the database behind the editor's back, and seals it.
+  void change(const char* statements) {
+    SQLiteConnection connection = connect();
+    connection.execute(statements);
+    sealFavorites(connection);
+  }
+
   std::vector<TransitLineRef> firstFavorites;
 };
 
@@ -52,7 +60,7 @@ TEST_F(FavoritesTest, BeginWithTheFirstOnesUntilTheUserChangesThem) {
 TEST_F(FavoritesTest, ChangeLinesAndLeaveOtherKindsInTheirPlaces) {
   FavoritesEditor editor = makeEditor();
   ASSERT_EQ(editor.add({lineItem(1, "A")}), nullptr);
-  connect().execute("INSERT INTO favorites(position, kind, content) VALUES (1, 'place', x'00ff'), (4, 'guide', 12)");
+  change("INSERT INTO favorites(position, kind, content) VALUES (1, 'place', x'00ff'), (4, 'guide', 12)");
   ASSERT_EQ(editor.add({lineItem(2, "B"), lineItem(3, "C")}), nullptr);
   const Names beforeRefusals{"C", "place", "guide", "B", "A"};
   const struct {
@@ -121,7 +129,7 @@ TEST_F(FavoritesTest, KeepWholeLines) {
 TEST_F(FavoritesTest, KeepTheContentOfALineThatCannotBeRead) {
   FavoritesEditor editor = makeEditor();
   ASSERT_EQ(editor.add({lineItem(1, "A"), lineItem(2, "B"), lineItem(3, "C"), lineItem(4, "D")}), nullptr);
-  connect().execute(
+  change(
       "UPDATE favorites SET content = CASE muid WHEN 1 THEN '{\"isBus\": 7}' WHEN 2 THEN '[' END"
       " WHERE muid < 4");
   EXPECT_THAT(names(), ElementsAre("no line", "no line", "no line", "D"));
@@ -164,6 +172,61 @@ TEST_F(FavoritesTest, FailTheLookupRatherThanSeemToBeNone) {
   EXPECT_EQ(makeEditor().add({lineItem(3, "C")}), nullptr);
   EXPECT_EQ(lookUp(), "");
   EXPECT_EQ(platform.transitLines.lookups(), (std::vector<std::vector<std::uint64_t>>{{1}, {2}, {3}}));
+}
+
+TEST_F(FavoritesTest, AreNeverFewerWithoutAWordWhateverRots) {
+  const Names all{"A", "B", "C", "D", "E", "F", "G", "H", "I", "J", "K", "L"};  // more than a page holds
+  std::uint64_t muid = 0;
+  for (const std::string& name : all) ASSERT_EQ(makeEditor().add({lineItem(++muid, name)}), nullptr);
+  const std::string whole = contentOf(file());
+  EXPECT_FALSE(std::filesystem::exists(file().string() + "-wal")) << "the log is written back";
+  struct Rot {
+    std::string what;
+    std::string bytes;
+  };
+  std::vector<Rot> rots;
+  for (std::size_t i = 0; i < whole.size(); i += 131) {
+    rots.push_back({"bit of byte " + std::to_string(i), whole});
+    rots.back().bytes[i] = static_cast<char>(whole[i] ^ 1 << i % 8);
+  }
+  for (std::size_t i = 0; i < whole.size(); i += 512) {
+    rots.push_back({"sector at " + std::to_string(i), whole});
+    rots.back().bytes.replace(i, 512, 512, '\0');
+  }
+  for (const std::size_t end : {0, 1, 99, 512, 4096, 4196, 8192, static_cast<int>(whole.size()) - 4096})
+    rots.push_back({"end at " + std::to_string(end), whole.substr(0, end)});
+  int words = 0;
+  for (const Rot& rot : rots) {
+    SCOPED_TRACE(rot.what);
+    std::filesystem::remove_all(folder());
+    std::filesystem::create_directory(folder());
+    std::ofstream(file(), std::ios::binary) << rot.bytes;
+    for (int i = 0; i < 2; ++i) {  // the second time of what the first has left
+      const auto listed = makeEditor().list();
+      words += !listed;
+      if (listed) {
+        EXPECT_EQ(names(), all);
+      }
+    }
+  }
+  EXPECT_GT(words, 100);
+}
+
+TEST_F(FavoritesTest, CanBeChangedByWhatIsLeftOfThem) {
+  ASSERT_EQ(makeEditor().add({lineItem(1, "A"), lineItem(2, "B"), lineItem(3, "C")}), nullptr);
+  connect().execute("UPDATE favorites SET content = replace(content, '\"B\"', '\"P\"')");
+  const auto listed = makeEditor().list();
+  ASSERT_FALSE(listed);
+  EXPECT_THAT(listed.error()->reason(), testing::HasSubstr("2 of them are left (1, 3)"));
+  EXPECT_EQ(makeEditor().left()->size(), 2u);
+  EXPECT_EQ(makeEditor().remove({1}), nullptr);
+  EXPECT_EQ(makeEditor().add({lineItem(2, "B")}), nullptr);
+  EXPECT_THAT(names(), ElementsAre("C", "B"));
+  // Also when the change is what finds the damage.
+  connect().execute("UPDATE favorites_seal SET count = 3");
+  EXPECT_EQ(makeEditor().remove({3}), nullptr);
+  EXPECT_THAT(names(), ElementsAre("B"));
+  EXPECT_EQ(notices.size(), 2u);
 }
 
 TEST_F(FavoritesTest, LoseNothingWhenHostsChangeThemAtOnce) {

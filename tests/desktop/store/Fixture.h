@@ -25,6 +25,15 @@ class StoreTest : public testing::Test {
   std::filesystem::path folder() const { return _parent.path() / "state"; }
   std::filesystem::path file() const { return folder() / "state.sqlite"; }
 
+  /// Gives the database the form of version 1, with what version 2 keeps elsewhere among the settings.
+  void makeVersion1() {
+    connect().execute(
+        "INSERT INTO settings SELECT 'Nimbo.Favorites.wereSet', wereSet FROM favorites_seal;"
+        "DROP TABLE favorites_seal;"
+        "ALTER TABLE favorites DROP COLUMN checksum;"
+        "PRAGMA user_version = 1");
+  }
+
   static std::string contentOf(const std::filesystem::path& path) {
     std::ifstream stream(path, std::ios::binary);
     return {std::istreambuf_iterator<char>(stream), {}};

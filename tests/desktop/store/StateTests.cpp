@@ -5,8 +5,12 @@
 #include <csignal>
 
 #include "desktop/store/Fixture.h"
+#include "desktop/raii/SQLite.h"
+#include "desktop/store/FavoritesEditor.h"
 #include "desktop/store/SQLiteAnalyticsPipeline.h"
 #include "desktop/store/SQLiteSharedSettings.h"
+#include "desktop/store/StateDatabaseFile.h"
+#include "support/TransitFixtures.h"
 
 namespace nimbo {
 
@@ -92,6 +96,7 @@ TEST_F(StateDatabaseTest, EndsAReplacementThatWasCutShort) {
   // Half made beside the damaged one, or made and the damaged one set aside.
   std::ofstream(file().string() + ".new") << "half";
   EXPECT_EQ(makeSettings()->stringForKey("key"), "kept");
+  EXPECT_FALSE(fs::exists(file().string() + ".new"));
   fs::rename(file(), file().string() + ".new");
   std::ofstream(file().string() + "-wal") << "the damaged one's";
   EXPECT_EQ(makeSettings()->stringForKey("key"), "kept");
@@ -101,7 +106,7 @@ TEST_F(StateDatabaseTest, EndsAReplacementThatWasCutShort) {
 
 TEST_F(StateDatabaseTest, LeavesDatabasesOfOthersAsTheyAre) {
   fs::create_directory(folder());
-  for (const char* statements : {"CREATE TABLE t(x); PRAGMA user_version = 2", "CREATE TABLE favorites(name)"}) {
+  for (const char* statements : {"CREATE TABLE t(x); PRAGMA user_version = 99", "CREATE TABLE favorites(name)"}) {
     std::ofstream(file(), std::ios::trunc).close();
     connect().execute(statements);
     const std::string before = contentOf(file());
@@ -116,17 +121,85 @@ TEST_F(StateDatabaseTest, LeavesDatabasesOfOthersAsTheyAre) {
   }
 }
 
+/// A disk on which no file grows beyond so many bytes, for a scope.
+class FullDisk {
+ public:
+  explicit FullDisk(rlim_t bytes) : _handler(std::signal(SIGXFSZ, SIG_IGN)) {
+    ::getrlimit(RLIMIT_FSIZE, &_before);
+    const rlimit small{bytes, _before.rlim_max};
+    ::setrlimit(RLIMIT_FSIZE, &small);
+  }
+  ~FullDisk() {
+    ::setrlimit(RLIMIT_FSIZE, &_before);
+    std::signal(SIGXFSZ, _handler);
+  }
+  FullDisk(const FullDisk&) = delete;
+  FullDisk& operator=(const FullDisk&) = delete;
+
+ private:
+  rlimit _before{};
+  void (*_handler)(int);
+};
+
+TEST_F(StateDatabaseTest, ShowsWhatIsStoredOnAFullDiskInEitherForm) {
+  ASSERT_EQ(FavoritesEditor(makeDatabase(), nullptr).add({lineItem(1, "A")}), nullptr);
+  const auto count = [&] {
+    const auto favorites = FavoritesEditor(makeDatabase(), nullptr).list();
+    EXPECT_TRUE(favorites) << favorites.error()->reason();
+    return favorites ? favorites->size() : 0;
+  };
+  for (const int version : {2, 1}) {
+    SCOPED_TRACE(version);
+    if (version == 1) makeVersion1();
+    const std::string before = contentOf(file());
+    {
+      const FullDisk full(1024);
+      EXPECT_EQ(count(), 1u);
+    }
+    EXPECT_EQ(contentOf(file()), before);
+  }
+  EXPECT_EQ(count(), 1u);
+  EXPECT_EQ(connect().integer("PRAGMA user_version"), kStateSchemaVersion);
+  EXPECT_EQ(connect().integer("SELECT count(*) FROM settings"), 0);
+  EXPECT_EQ(FavoritesEditor(makeDatabase(), nullptr).remove({1}), nullptr);
+  makeVersion1();
+  const auto first = [] { return std::vector<TransitLineRef>{lineItem(2, "B")}; };
+  EXPECT_TRUE(FavoritesEditor(makeDatabase(), first).list()->empty()) << "an emptied list stays empty";
+  EXPECT_TRUE(notices.empty());
+}
+
+TEST_F(StateDatabaseTest, IsReachedThroughLinkedFoldersOnly) {
+  ASSERT_EQ(makeSettings()->setValue_forKey("kept", "key"), nullptr);
+  const fs::path real = folder().string() + "-real";
+  fs::rename(folder(), real);
+  fs::create_directory_symlink(real, folder());
+  EXPECT_EQ(makeSettings()->stringForKey("key"), "kept");
+  fs::rename(file(), real / "other");
+  for (const fs::path& target : {real / "other", real / "none", fs::path("/dev/zero")}) {
+    SCOPED_TRACE(target);
+    fs::create_symlink(target, file());
+    EXPECT_EQ(makeSettings()->valueForKey("key"), std::nullopt);
+    const ErrorRef error = makeSettings()->setValue_forKey("new", "key");
+    ASSERT_NE(error, nullptr);
+    EXPECT_THAT(error->reason(), HasSubstr("Cannot read " + file().native() + ": it is a link. Move it away"));
+    EXPECT_TRUE(fs::is_symlink(file()));
+    fs::remove(file());
+  }
+  EXPECT_TRUE(notices.empty());
+  EXPECT_FALSE(fs::exists(real / "none"));
+  // A link that comes between the look and the opening.
+  fs::create_symlink(real / "other", real / "late");
+  EXPECT_THROW(SQLiteConnection(real / "late", SQLiteConnection::Access::readWrite, 1000), SQLiteFailure);
+}
+
 TEST_F(StateDatabaseTest, KeepsTheOldValueWhenAWriteFails) {
   const auto settings = makeSettings();
   ASSERT_EQ(settings->setValue_forKey("old", "key"), nullptr);
-  rlimit before{};
-  ::getrlimit(RLIMIT_FSIZE, &before);
-  const auto handler = std::signal(SIGXFSZ, SIG_IGN);
-  rlimit small{64 * 1024, before.rlim_max};
-  ::setrlimit(RLIMIT_FSIZE, &small);
-  const ErrorRef full = settings->setValue_forKey(Bytes(1 << 20), "key");
-  ::setrlimit(RLIMIT_FSIZE, &before);
-  std::signal(SIGXFSZ, handler);
+  ErrorRef full;
+  {
+    const FullDisk disk(64 * 1024);
+    full = settings->setValue_forKey(Bytes(1 << 20), "key");
+  }
   ASSERT_NE(full, nullptr);
   EXPECT_THAT(full->reason(), HasSubstr("Cannot write " + file().native()));
   EXPECT_EQ(settings->valueForKey("key"), Value("old"));

@@ -1,12 +1,16 @@
+#include <fcntl.h>
 #include <gtest/gtest.h>
 #include <signal.h>
+#include <sys/file.h>
 #include <sys/resource.h>
+#include <sys/stat.h>
 
 #include <cerrno>
 #include <filesystem>
 #include <iterator>
 #include <string>
 
+#include "desktop/raii/FileDescriptor.h"
 #include "desktop/system/AtomicFile.h"
 #include "support/TemporaryFolder.h"
 
@@ -30,10 +34,23 @@ TEST(AtomicFile, ReplacesFilesAndMakesFoldersForTheirOwnerOnly) {
   EXPECT_EQ(fs::status(folder.path() / "a").permissions(), fs::perms::owner_all);
   EXPECT_EQ(entriesIn(file.parent_path()), 1u);
 
-  fs::create_symlink("b/c", folder.path() / "a/link");
-  EXPECT_EQ(writeFileAtomically(folder.path() / "a/link", "through"), nullptr);
+  fs::create_symlink("a", folder.path() / "link");
+  EXPECT_EQ(writeFileAtomically(folder.path() / "link/b/c", "through"), nullptr);
   EXPECT_EQ(folder.read("a/b/c"), "through");
-  EXPECT_TRUE(fs::is_symlink(folder.path() / "a/link"));
+}
+
+TEST(AtomicFile, ClearsWhatKilledProcessesLeftAndNothingElse) {
+  const TemporaryFolder folder;
+  folder.write("file.kil1ed.nimbo-part", "half");
+  folder.write("file.backup", "");
+  folder.write("other.kil1ed.nimbo-part", "");
+  const FileDescriptor running(
+      ::open((folder.path() / "file.abc123.nimbo-part").c_str(), O_CREAT | O_RDWR | O_CLOEXEC, 0600));
+  ASSERT_EQ(::flock(running.get(), LOCK_EX), 0);
+  EXPECT_EQ(writeFileAtomically(folder.path() / "file", "whole"), nullptr);
+  EXPECT_FALSE(fs::exists(folder.path() / "file.kil1ed.nimbo-part"));
+  EXPECT_TRUE(fs::exists(folder.path() / "file.abc123.nimbo-part"));
+  EXPECT_EQ(entriesIn(folder.path()), 4u);
 }
 
 TEST(AtomicFile, KeepsTheOldBytesWhenTheNewOnesDoNotFit) {
@@ -60,6 +77,9 @@ TEST(AtomicFile, SaysWhatStandsInTheWay) {
   const TemporaryFolder folder;
   folder.write("file", "");
   folder.write("folder/inside", "");
+  fs::create_symlink("file", folder.path() / "link");
+  fs::create_symlink("/dev/zero", folder.path() / "device");
+  ASSERT_EQ(::mkfifo((folder.path() / "pipe").c_str(), 0600), 0);
   const struct {
     fs::path path;
     int code;
@@ -67,6 +87,9 @@ TEST(AtomicFile, SaysWhatStandsInTheWay) {
   } kCases[] = {
       {folder.path() / "file/below", EEXIST, "Cannot make the folder " + (folder.path() / "file").native() + ": "},
       {folder.path() / "folder", EISDIR, "Cannot write " + (folder.path() / "folder").native() + ": "},
+      {folder.path() / "link", ELOOP, "Cannot write " + (folder.path() / "link").native() + ": "},
+      {folder.path() / "device", ELOOP, "Cannot write "},
+      {folder.path() / "pipe", EEXIST, "Cannot write "},
       {"/proc/none/file", ENOENT, "Cannot make the folder /proc/none: "},
   };
   for (const auto& test : kCases) {
@@ -76,7 +99,8 @@ TEST(AtomicFile, SaysWhatStandsInTheWay) {
     EXPECT_EQ(error->reason().rfind(test.start, 0), 0u) << error->reason();
     EXPECT_FALSE(error->subject().empty());
   }
-  EXPECT_EQ(entriesIn(folder.path()), 2u);
+  EXPECT_TRUE(fs::is_symlink(folder.path() / "link"));
+  EXPECT_EQ(entriesIn(folder.path()), 5u);
 }
 
 }  // namespace

@@ -66,8 +66,16 @@ class Window:
         return next((application.get_child_at_index(0) for application in applications if application
                      and application.get_process_id() == self.process.pid and application.get_child_count()), None)
 
+    def dialog(self):
+        """What stands in front of the window."""
+        application = self.frame() and self.frame().get_application()
+        if application and application.get_child_count() > 1:
+            return application.get_child_at_index(1)
+
     def nodes(self, node=None):
         """What there is on the page, as a screen reader walks it."""
+        if not node and (dialog := self.dialog()):
+            yield from self.nodes(dialog)
         if node := node or self.frame():
             node.clear_cache()
             yield node

@@ -36,7 +36,7 @@ std::optional<T> numberIn(std::string_view text) {
 }  // namespace
 
 std::optional<KeptAlerts> KeptAlerts::read(const std::filesystem::path& path, const FeedAddress& address) {
-  const auto bytes = readFile(path, kLargestFile);
+  const auto bytes = readOwnFile(path, kLargestFile);
   if (!bytes) return std::nullopt;
   std::string_view rest = *bytes;
   std::array<std::string_view, kLines> lines;

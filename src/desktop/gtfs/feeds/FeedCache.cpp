@@ -2,6 +2,7 @@
 
 #include <cstdio>
 #include <system_error>
+#include <vector>
 
 #include "desktop/gtfs/feeds/TransitLineServiceError.h"
 #include "platform/foundation/Hash.h"
@@ -17,8 +18,13 @@ std::filesystem::path FeedCache::file(std::string_view kind, std::string_view fe
 }
 
 void FeedCache::remove(std::string_view feed) const {
+  // Of whatever kind, and what killed processes left of them half written.
+  const std::string mark = file("", feed).filename().native();
   std::error_code ignored;
-  for (const auto& path : {staticFeed(feed), trips(feed), alerts(feed)}) std::filesystem::remove(path, ignored);
+  std::vector<std::filesystem::path> paths;
+  for (const auto& entry : std::filesystem::directory_iterator(_folder, ignored))
+    if (entry.path().filename().native().find(mark) != std::string::npos) paths.push_back(entry.path());
+  for (const auto& path : paths) std::filesystem::remove(path, ignored);
 }
 
 void logCacheFailure(const std::string& reason) {

@@ -16,7 +16,7 @@ class FeedCache {
   std::filesystem::path trips(std::string_view feed) const { return file("trips", feed); }
   std::filesystem::path alerts(std::string_view feed) const { return file("alerts", feed); }
 
-  /// Drops what is kept of a feed.
+  /// Drops all that is kept of a feed.
   void remove(std::string_view feed) const;
 
  private:

@@ -1,7 +1,12 @@
 #include "desktop/gtfs/feeds/FeedConfiguration.h"
 
+#include <sys/stat.h>
+
 #include <algorithm>
+#include <cerrno>
 #include <nlohmann/json.hpp>
+#include <optional>
+#include <system_error>
 
 #include "desktop/gtfs/feeds/TransitLineServiceError.h"
 #include "desktop/gtfs/net/FileReading.h"
@@ -27,10 +32,34 @@ struct Fault {
   }
 };
 
+/// The file that holds the configuration: where managers of dotfiles made a link of it, what that leads to. A link
+/// leads to nothing that somebody else made, but for the superuser. Absent when there is none.
+Outcome<std::optional<std::filesystem::path>> findDocument(const std::filesystem::path& file) {
+  const auto unreadable = [&](int errnoValue) {
+    return Fault{file}(std::generic_category().message(errnoValue) + ". Check that you may read it and its folder.");
+  };
+  struct stat link {};
+  if (::lstat(file.c_str(), &link) != 0) {
+    if (errno == ENOENT) return std::optional<std::filesystem::path>();
+    return unreadable(errno);
+  }
+  if (!S_ISLNK(link.st_mode)) return std::optional(file);
+  std::error_code failure;
+  auto target = std::filesystem::canonical(file, failure);
+  if (failure) return unreadable(failure.value());
+  struct stat status {};
+  if (::lstat(target.c_str(), &status) != 0) return unreadable(errno);
+  if (!S_ISREG(status.st_mode)) return Fault{file}("it is a link to " + target.native() + ", which is no file.");
+  if (status.st_uid != link.st_uid && status.st_uid != 0)
+    return Fault{file}("it is a link to " + target.native() + ", which belongs to somebody else than the link.");
+  return std::optional(std::move(target));
+}
+
 Outcome<JSON> readDocument(const std::filesystem::path& file) {
-  std::error_code ignored;
-  if (!std::filesystem::exists(std::filesystem::symlink_status(file, ignored))) return JSON{{"feeds", JSON::array()}};
-  const auto bytes = readFile(file, kLargestConfiguration);
+  const auto found = findDocument(file);
+  if (!found) return found.error();
+  if (!*found) return JSON{{"feeds", JSON::array()}};
+  const auto bytes = readOwnFile(**found, kLargestConfiguration);
   if (!bytes) return bytes.error();
   const Fault fault{file};
   const auto notJSON = [&](std::size_t byte) {
@@ -111,7 +140,10 @@ ErrorRef takenName(std::string_view name, const std::vector<Feed>& present) {
 }
 
 ErrorRef writeDocument(const std::filesystem::path& file, const JSON& document) {
-  return writeFileAtomically(file, document.dump(2, ' ', false, JSON::error_handler_t::replace) + "\n");
+  const auto found = findDocument(file);
+  if (!found) return found.error();
+  return writeFileAtomically(found->value_or(file),
+                             document.dump(2, ' ', false, JSON::error_handler_t::replace) + "\n");
 }
 
 }  // namespace

@@ -25,11 +25,9 @@ ErrorRef unreadable(const std::filesystem::path& path, int errnoValue) {
   return unreadable(path, std::generic_category().message(errnoValue) + "." + advice);
 }
 
-}  // namespace
-
-Outcome<std::string> readFile(const std::filesystem::path& path, std::uint64_t limit) {
+Outcome<std::string> read(const std::filesystem::path& path, std::uint64_t limit, int flags) {
   // Not blocking: a path may lead to a pipe that nobody writes to.
-  const FileDescriptor file(::open(path.c_str(), O_RDONLY | O_CLOEXEC | O_NONBLOCK));
+  const FileDescriptor file(::open(path.c_str(), O_RDONLY | O_CLOEXEC | O_NONBLOCK | flags));
   if (!file) return unreadable(path, errno);
   struct stat status {};
   if (::fstat(file.get(), &status) != 0) return unreadable(path, errno);
@@ -57,6 +55,14 @@ Outcome<std::string> readFile(const std::filesystem::path& path, std::uint64_t l
   }
   bytes.resize(count);
   return bytes;
+}
+
+}  // namespace
+
+Outcome<std::string> readFile(const std::filesystem::path& path, std::uint64_t limit) { return read(path, limit, 0); }
+
+Outcome<std::string> readOwnFile(const std::filesystem::path& path, std::uint64_t limit) {
+  return read(path, limit, O_NOFOLLOW);
 }
 
 std::string fileFingerprint(const std::filesystem::path& path) {

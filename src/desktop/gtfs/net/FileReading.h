@@ -14,6 +14,9 @@ namespace nimbo {
 /// and what to do.
 Outcome<std::string> readFile(const std::filesystem::path& path, std::uint64_t limit);
 
+/// The same of a file of the program's own, which is never reached through a link; its folders may be.
+Outcome<std::string> readOwnFile(const std::filesystem::path& path, std::uint64_t limit);
+
 /// What tells one state of a file from another without reading it: its size and when it was last written. Empty when
 /// there is none.
 std::string fileFingerprint(const std::filesystem::path& path);

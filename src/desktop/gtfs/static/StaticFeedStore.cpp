@@ -66,6 +66,8 @@ Outcome<std::unique_ptr<StaticFeedFiles>> openLocal(const std::filesystem::path&
 
 /// A file without a name in the folder: it goes when it is closed, whatever happens.
 FileDescriptor temporaryFile(const std::filesystem::path& folder) {
+  if (FileDescriptor unnamed{::open(folder.c_str(), O_TMPFILE | O_RDWR | O_CLOEXEC, 0600)}) return unnamed;
+  // Not every file system has files without a name.
   std::string name = (folder / "download.XXXXXX").native();
   FileDescriptor file(::mkostemp(name.data(), O_CLOEXEC));
   if (file) ::unlink(name.c_str());
@@ -103,7 +105,7 @@ void keep(const std::filesystem::path& path, std::string_view bytes) {
 }  // namespace
 
 std::optional<StaticFeed> StaticFeedStore::readCache(const Feed& feed) const {
-  auto bytes = readFile(_cache.staticFeed(feed.name), kLargestCacheFile);
+  auto bytes = readOwnFile(_cache.staticFeed(feed.name), kLargestCacheFile);
   return bytes ? StaticFeed::fromBytes(std::move(*bytes)) : std::nullopt;
 }
 
@@ -129,7 +131,7 @@ LoadedStaticFeed StaticFeedStore::withTrips(const Feed& feed, StaticFeed staticF
 
 Outcome<TripRoutes> StaticFeedStore::readTrips(const Feed& feed, const StaticFeed& staticFeed,
                                                const std::stop_token& stop) const {
-  if (const auto bytes = readFile(_cache.trips(feed.name), kLargestCacheFile))
+  if (const auto bytes = readOwnFile(_cache.trips(feed.name), kLargestCacheFile))
     if (auto kept = TripRoutes::fromBytes(*bytes, tripsKey(staticFeed), staticFeed.lineCount()))
       return wholeTrips(feed, std::move(*kept));
   auto fresh = readAnew(feed, stop);
