@@ -20,6 +20,13 @@ void tellGoneLines(const protocol::Snapshot& snapshot) {
   for (const std::string& line : snapshot.goneLines) printMessage(goneLineText(line));
 }
 
+/// What the rows leave out while they show an error; empty when nothing is known.
+std::string knownIncidentsText(const protocol::Snapshot& snapshot) {
+  std::string text = snapshot.knownIncidents.empty() ? "" : "Known from other feeds:\n";
+  for (const auto& [line, title] : snapshot.knownIncidents) text += "  " + printableText(line + ": " + title) + "\n";
+  return text;
+}
+
 }  // namespace
 
 int runStatus(const CommandContext& context, const StatusOptions& options) {
@@ -32,7 +39,7 @@ int runStatus(const CommandContext& context, const StatusOptions& options) {
   if (options.json)
     std::cout << printableJSON(protocol::write(snapshot).dump(2)) << "\n";
   else
-    std::cout << rowsAsText(snapshot, TerminalStyle::ofStandardOutput());
+    std::cout << rowsAsText(snapshot, TerminalStyle::ofStandardOutput()) << knownIncidentsText(snapshot);
   widget.close();
   tellGoneLines(snapshot);
   if (failure) throw CommandFailure(*failure);

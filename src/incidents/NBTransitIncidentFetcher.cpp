@@ -4,6 +4,7 @@
 #include "incidents/FavoritesStore+Nimbo.h"
 #include "incidents/SharedSettingsStore+Nimbo.h"
 #include "platform/Platform.h"
+#include "platform/SerialQueue.h"
 #include "platform/foundation/Log.h"
 #include "util/NimboMap.h"
 
@@ -40,7 +41,8 @@ void _NBTransitIncidentFetcherRequest::setResultAndInvokeCompletionHandlers(Resu
   _result = result;
   const auto handlers = _handlers;
   guard.unlock();
-  for (const auto& handler : handlers) handler(result);
+  // One that throws keeps no other from hearing.
+  for (const auto& handler : handlers) runGuarded("handler of a fetch", [&] { handler(result); });
 }
 
 namespace {
@@ -50,6 +52,17 @@ TransitLineRef transitLineOfFavorite(const FavoriteRef& favorite, std::size_t) {
   return lineFavorite ? lineFavorite->transitLine() : nullptr;
 }
 
+/// Runs a step of a fetch. One that throws ends the fetch with an error, since nothing else would.
+template <class Step>
+void runStep(const std::shared_ptr<_NBTransitIncidentFetcherRequest>& request, const Step& step) try {
+  step();
+} catch (const std::exception& exception) {
+  const ErrorRef error = Error::errorWithDomain_code_reason(
+      "NBTransitIncidentFetcher", 0, std::string("Fetching the incidents failed: ") + exception.what() + ".");
+  Platform::current().mainRunLoop().dispatchAsync(
+      [request, error] { request->setResultAndInvokeCompletionHandlers(Result::resultWithError(error)); });
+}
+
 }  // namespace
 
 std::shared_ptr<NBTransitIncidentFetcherRequest>
@@ -57,7 +70,7 @@ NBTransitIncidentFetcher::fetchFavoriteLinesTransitIncidentsWithCompletionHandle
     NBTransitIncidentFetcherHandler handler) {
   auto request = _NBTransitIncidentFetcherRequest::initWithCompletionHandler(std::move(handler));
   const auto self = std::static_pointer_cast<NBTransitIncidentFetcher>(shared_from_this());
-  defaultContainer()->readContents([self, request](const std::optional<Favorites>& favorites) {
+  const auto fetchForFavorites = [self, request](const std::optional<Favorites>& favorites) {
     writeLog(NBTransitWidgetLogFacility, LogLevel::debug, "Received %lu favorites from container.",
              {favorites ? favorites->size() : 0});
     const auto lines = NimboMap(favorites, transitLineOfFavorite);
@@ -66,6 +79,11 @@ NBTransitIncidentFetcher::fetchFavoriteLinesTransitIncidentsWithCompletionHandle
     Platform::current().mainRunLoop().dispatchAsync([request] {
       request->setResultAndInvokeCompletionHandlers(
           Result::resultWithValue(BoxedArray::of<TransitLineItem>(TransitLineItems{})));
+    });
+  };
+  runStep(request, [&] {
+    defaultContainer()->readContents([request, fetchForFavorites](const std::optional<Favorites>& favorites) {
+      runStep(request, [&] { fetchForFavorites(favorites); });
     });
   });
   return request;
@@ -77,17 +95,20 @@ void NBTransitIncidentFetcher::_fetchIncidentsForLines_withRequest(
   writeLog(NBTransitWidgetLogFacility, LogLevel::debug, "Issuing favorite lines lookup request for Muids: %{private}@.",
            {BoxedArray::of<MapItemIdentifier>(identifiers)});
   const auto self = std::static_pointer_cast<NBTransitIncidentFetcher>(shared_from_this());
-  Platform::current().transitLines().lookup(identifiers, [self, request = std::move(request)](
-                                                             const TransitLineItems& items, const ErrorRef& error) {
-    if (error) {
-      writeLog(NBTransitWidgetLogFacility, LogLevel::debug, "Received error: %{private}@.", {error});
-      return request->setResultAndInvokeCompletionHandlers(Result::resultWithError(error));
-    }
-    const bool fakes = __nimbo_groupUserDefaults()->boolForKey(kNimboTransitWidgetDebugInjectFakeIncidents);
-    const TransitLineItems delivered = fakes ? self->_fakeLineItemsFromItems(items) : items;
-    writeLog(NBTransitWidgetLogFacility, LogLevel::debug, "Received %lu line items.", {delivered.size()});
-    request->setResultAndInvokeCompletionHandlers(Result::resultWithValue(BoxedArray::of<TransitLineItem>(delivered)));
-  });
+  Platform::current().transitLines().lookup(
+      identifiers, [self, request = std::move(request)](const TransitLineItems& items, const ErrorRef& error) {
+        if (error) {
+          writeLog(NBTransitWidgetLogFacility, LogLevel::debug, "Received error: %{private}@.", {error});
+          return request->setResultAndInvokeCompletionHandlers(Result::resultWithError(error));
+        }
+        runStep(request, [&] {
+          const bool fakes = __nimbo_groupUserDefaults()->boolForKey(kNimboTransitWidgetDebugInjectFakeIncidents);
+          const TransitLineItems delivered = fakes ? self->_fakeLineItemsFromItems(items) : items;
+          writeLog(NBTransitWidgetLogFacility, LogLevel::debug, "Received %lu line items.", {delivered.size()});
+          request->setResultAndInvokeCompletionHandlers(
+              Result::resultWithValue(BoxedArray::of<TransitLineItem>(delivered)));
+        });
+      });
 }
 
 TransitLineItems NBTransitIncidentFetcher::_fakeLineItemsFromItems(const TransitLineItems& items) const {

@@ -7,6 +7,7 @@
 #include <vector>
 
 #include "platform/SerialQueue.h"
+#include "platform/foundation/Error.h"
 #include "platform/foundation/Object.h"
 #include "platform/transit/TransitLine.h"
 
@@ -54,12 +55,17 @@ class OtherFavorite final : public Favorite {
 /// The favourites in the user's order.
 using Favorites = std::vector<FavoriteRef>;
 
+/// Domain of the errors of favourites that were not read at all.
+inline constexpr std::string_view kFavoritesStoreErrorDomain = "org.nimbo.FavoritesStore";
+
 /// Reads the favourites from where they are kept.
 class FavoritesPersister {
  public:
   virtual ~FavoritesPersister() = default;
   /// Absent when they cannot be read (which is logged). Called on one thread at a time, not the main thread.
   virtual std::optional<Favorites> readFavorites() = 0;
+  /// What stands for favourites that were not read, for the reason given; absent where nothing does. Any thread.
+  virtual std::optional<Favorites> favoritesUnread(const ErrorRef& reason) = 0;
 };
 
 /// The user's favourites, read on a thread of the store's own.
@@ -69,11 +75,13 @@ class FavoritesStore final {
       : _persister(std::move(persister)), _queue("org.nimbo.FavoritesStore") {}
 
   /// Calls `callback` once with the favourites, absent when they cannot be read, on the store's own thread; not at all
-  /// when the store goes away first. Any thread.
+  /// when the store goes away first. When that thread cannot start, or has not read them after `DueAnswer::kPatience`,
+  /// the callback comes on the main thread with what the persister has for favourites that were not read. Any thread.
   void readContents(std::function<void(const std::optional<Favorites>&)> callback);
 
  private:
   std::shared_ptr<FavoritesPersister> _persister;
+  std::shared_ptr<bool> _alive = std::make_shared<bool>(true);  // let go of on the main thread
   SerialQueue _queue;
 };
 

@@ -43,7 +43,12 @@ SerialQueue::~SerialQueue() {
 void SerialQueue::dispatchAsync(std::function<void()> work) {
   const std::lock_guard guard(_state->lock);
   _state->work.push_back(std::move(work));
-  if (!_thread.joinable()) _thread = std::thread([state = _state, label = _label] { run(state, label); });
+  try {
+    if (!_thread.joinable()) _thread = std::thread([state = _state, label = _label] { run(state, label); });
+  } catch (...) {
+    _state->work.pop_back();
+    throw;
+  }
   _state->changed.notify_one();
 }
 

@@ -27,7 +27,8 @@ class SerialQueue {
 
   const std::string& label() const { return _label; }
 
-  /// Runs `work` after what was given before. Any thread. What `work` throws ends up in the log.
+  /// Runs `work` after what was given before. Any thread. What `work` throws ends up in the log. Throws
+  /// std::system_error when the thread cannot start, and std::bad_alloc: then `work` never runs.
   void dispatchAsync(std::function<void()> work);
 
  private:

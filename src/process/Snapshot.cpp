@@ -81,6 +81,8 @@ void setResult(protocol::Snapshot& snapshot, const ResultRef& result) {
                             [&](const ErrorRef& error) {
                               snapshot.result = protocol::FetchResult::error;
                               snapshot.error = {error->domain(), error->code(), error->reason()};
+                              if (!error->subject().empty()) snapshot.error->subject = error->subject();
+                              if (!error->feed().empty()) snapshot.error->feed = error->feed();
                             });
 }
 

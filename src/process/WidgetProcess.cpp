@@ -256,6 +256,9 @@ protocol::Highlighted WidgetProcess::highlightRow(const protocol::HighlightParam
 protocol::Snapshot WidgetProcess::snapshot(const Nothing&) {
   _frameAnnounced = false;
   protocol::Snapshot snapshot = snapshotOf(*_controller);
+  if (snapshot.error)
+    for (auto& [line, title] : _platform->transitLines().knownIncidents())
+      snapshot.knownIncidents.push_back({line, title});
   for (const auto& identifier : _platform->transitLines().goneLines())
     snapshot.goneLines.push_back(writtenNameOfLine(*identifier));
   snapshot.asOf = _platform->transitLines().asOf();

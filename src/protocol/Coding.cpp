@@ -179,8 +179,11 @@ template <>
 constexpr std::tuple kFields<ListItem>{Field{"summaryItem", &ListItem::summaryItem},
                                        Field{"expandedItems", &ListItem::expandedItems}};
 template <>
-constexpr std::tuple kFields<FetchError>{Field{"domain", &FetchError::domain}, Field{"code", &FetchError::code},
-                                         Field{"reason", &FetchError::reason}};
+constexpr std::tuple kFields<FetchError>{
+    Field{"domain", &FetchError::domain}, Field{"code", &FetchError::code}, Field{"reason", &FetchError::reason},
+    Field{"subject", &FetchError::subject, kMayBeLeftOut}, Field{"feed", &FetchError::feed, kMayBeLeftOut}};
+template <>
+constexpr std::tuple kFields<KnownIncident>{Field{"line", &KnownIncident::line}, Field{"title", &KnownIncident::title}};
 template <>
 constexpr std::tuple kFields<Snapshot>{Field{"displayMode", &Snapshot::displayMode},
                                        Field{"expanded", &Snapshot::expanded},
@@ -195,6 +198,7 @@ constexpr std::tuple kFields<Snapshot>{Field{"displayMode", &Snapshot::displayMo
                                        Field{"rows", &Snapshot::rows},
                                        Field{"listItem", &Snapshot::listItem},
                                        Field{"updateDates", &Snapshot::updateDates},
+                                       Field{"knownIncidents", &Snapshot::knownIncidents},
                                        Field{"goneLines", &Snapshot::goneLines},
                                        Field{"asOf", &Snapshot::asOf}};
 

@@ -74,13 +74,21 @@ struct ListItem {
   std::vector<Item> expandedItems;
 };
 
+/// An incident that another feed tells of while one fails.
+struct KnownIncident {
+  std::string line;
+  std::string title;
+};
+
 /// How the last fetch ended.
 enum class FetchResult { success, error };
 
 struct FetchError {
   std::string domain;
   std::int64_t code = 0;
-  std::string reason;  ///< for people
+  std::string reason;                  ///< for people
+  std::optional<std::string> subject;  ///< what failed, as text of no language
+  std::optional<std::string> feed;     ///< name of the feed that it happened to
 };
 
 struct Snapshot {
@@ -97,7 +105,8 @@ struct Snapshot {
   std::vector<Row> rows;
   ListItem listItem;
   std::vector<Date> updateDates;
-  std::vector<std::string> goneLines;  ///< "FEED:ROUTE_ID"
+  std::vector<KnownIncident> knownIncidents;  ///< in force, with an error that left other feeds' known
+  std::vector<std::string> goneLines;         ///< "FEED:ROUTE_ID"
   /// When the publishers made the alerts that the last successful fetch went by, by the names of the feeds that say so.
   std::map<std::string, Date> asOf;
 };

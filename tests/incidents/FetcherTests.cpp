@@ -1,9 +1,13 @@
 #include <gmock/gmock.h>
 
 #include <atomic>
+#include <future>
 #include <thread>
 
+#include "incidents/DebugTransitIncident.h"
 #include "incidents/NBTransitIncidentFetcher.h"
+#include "platform/DueAnswer.h"
+#include "support/NoThreads.h"
 #include "support/TestPlatform.h"
 #include "support/TransitFixtures.h"
 
@@ -93,6 +97,48 @@ TEST_F(Fetcher, DeliversTheErrorOfTheServiceAsItCame) {
   for (const auto& line : platform.log.lines())
     EXPECT_EQ(line.redacted.find("123456"), std::string::npos) << "not private: " << line.redacted;
   EXPECT_TRUE(platform.log.contains("123456"));
+}
+
+TEST_F(Fetcher, LooksUpWhatStandsForFavoritesThatWereNotRead) {
+  platform.favorites.setUnread(Favorites{favorite(77)});
+  {
+    const NoThreads noThreads;
+    fetch();
+    platform.loop.runUntilIdle();
+  }
+  EXPECT_THAT(platform.transitLines.lookups(), ElementsAre(ElementsAre(77u)));
+  EXPECT_THAT(platform.favorites.unreadReason(), StartsWith("The favorites could not be read: "));
+
+  std::promise<void> proceed;
+  platform.favorites.setFavorites(Favorites{favorite(1)}, proceed.get_future());
+  fetch();
+  platform.loop.runUntilIdle();
+  platform.time.advance(DueAnswer::kPatience - 1);
+  EXPECT_EQ(platform.transitLines.lookups().size(), 1u);
+  platform.time.advance(1);
+  EXPECT_THAT(platform.transitLines.lookups(), ElementsAre(ElementsAre(77u), ElementsAre(77u)));
+  EXPECT_THAT(platform.favorites.unreadReason(), StartsWith("The favorites could not be read within a minute"));
+  proceed.set_value();
+  fetch();  // comes after the one that was too late
+  platform.loop.waitAndDrain([&] { return platform.transitLines.lookups().size() == 3; });
+  EXPECT_THAT(platform.transitLines.lookups().back(), ElementsAre(1u));
+  platform.loop.runUntilIdle();
+  EXPECT_EQ(platform.time.pendingTimers(), 0u);
+}
+
+TEST_F(Fetcher, EndsWithAnErrorWhenAStepThrowsAndTellsEveryHandlerAllTheSame) {
+  platform.favorites.setFavorites(Favorites{favorite(1)});
+  platform.settings.groupStore()->setValue_forKey(true, kNimboTransitWidgetDebugInjectFakeIncidents);
+  platform.random.isBroken = true;
+  bool isFailure = false;
+  const auto request = fetch([](const ResultRef&) { throw std::runtime_error("handler"); });
+  request->addHandler([&](const ResultRef& result) {
+    result->withValue_orError([](const ObjectRef&) {}, [&](const ErrorRef&) { isFailure = true; });
+  });
+  waitForLookup();
+  platform.transitLines.answer({lineItem(1, "A")});
+  platform.loop.waitAndDrain([&] { return request->result() != nullptr; });
+  EXPECT_TRUE(isFailure);
 }
 
 TEST(FetcherRequest, LosesNoHandlerThatComesWhileItDelivers) {

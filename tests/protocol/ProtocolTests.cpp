@@ -54,7 +54,9 @@ TEST(Protocol, TellsWhereAMessageIsMalformedAndWhatBelongsThere) {
 }
 
 TEST(Protocol, ReadsWhatItWrites) {
-  Snapshot snapshot{.maxNumberOfRows = UINT64_MAX - 1, .result = FetchResult::error, .error = FetchError{"d", -7, "r"}};
+  Snapshot snapshot{.maxNumberOfRows = UINT64_MAX - 1,
+                    .result = FetchResult::error,
+                    .error = FetchError{"d", -7, "r", "s", std::nullopt}};
   const TransitItem incident{.primaryText = "1",
                              .artwork = Artwork{.shield = Shield{.color = "#112233"}, .size = 3, .alpha = 0.5},
                              .openable = Openable{.activityType = "a"}};
@@ -62,6 +64,7 @@ TEST(Protocol, ReadsWhatItWrites) {
   snapshot.listItem = {summary, {incident}};
   snapshot.rows = {{.item = incident, .views = {{.className = "View", .views = {{.className = "Inner"}}}}},
                    {.cell = "C"}};
+  snapshot.knownIncidents = {{"1", "Signals fail"}};
   const std::string line = write(snapshot).dump();
   EXPECT_EQ(write(read<Snapshot>(json::parse(line))).dump(), line);
   const json row = json::parse(line)["rows"][0];

@@ -1,5 +1,6 @@
 #pragma once
 
+#include <future>
 #include <mutex>
 
 #include "platform/FavoritesStore.h"
@@ -11,10 +12,26 @@ class FavoritesDouble final : public FavoritesPersisters {
  public:
   std::shared_ptr<FavoritesPersister> remotePersister() override { return std::make_shared<Persister>(*this); }
 
+  /// What the store gives for favourites that were not read, and why they were not, once they were not.
+  void setUnread(std::optional<Favorites> favorites) {
+    const std::lock_guard guard(_lock);
+    _unread = std::move(favorites);
+  }
+  std::string unreadReason() const {
+    const std::lock_guard guard(_lock);
+    return _unreadReason;
+  }
+
   /// Absent: they cannot be read. Empty until set.
   void setFavorites(std::optional<Favorites> favorites) {
     const std::lock_guard guard(_lock);
     _favorites = std::move(favorites);
+  }
+  /// The next reading takes until `proceed` is ready.
+  void setFavorites(Favorites favorites, std::future<void> proceed) {
+    setFavorites(std::move(favorites));
+    const std::lock_guard guard(_lock);
+    _proceed = std::move(proceed);
   }
 
  private:
@@ -22,16 +39,28 @@ class FavoritesDouble final : public FavoritesPersisters {
    public:
     explicit Persister(FavoritesDouble& owner) : _owner(owner) {}
     std::optional<Favorites> readFavorites() override {
-      const std::lock_guard guard(_owner._lock);
+      std::unique_lock guard(_owner._lock);
+      if (auto proceed = std::move(_owner._proceed); proceed.valid()) {
+        guard.unlock();
+        proceed.wait();
+        guard.lock();
+      }
       return _owner._favorites;
+    }
+    std::optional<Favorites> favoritesUnread(const ErrorRef& reason) override {
+      const std::lock_guard guard(_owner._lock);
+      _owner._unreadReason = reason->reason();
+      return _owner._unread;
     }
 
    private:
     FavoritesDouble& _owner;
   };
 
-  std::mutex _lock;
-  std::optional<Favorites> _favorites = Favorites();
+  mutable std::mutex _lock;
+  std::optional<Favorites> _favorites = Favorites(), _unread;
+  std::string _unreadReason;
+  std::future<void> _proceed;
 };
 
 }  // namespace nimbo

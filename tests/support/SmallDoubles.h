@@ -17,12 +17,14 @@ namespace nimbo {
 class ScriptedRandomSource final : public RandomSource {
  public:
   std::uint32_t next() override {
+    if (isBroken) throw std::runtime_error("no random numbers");
     if (numbers.empty()) return 0;
     const std::uint32_t number = numbers.front();
     numbers.pop_front();
     return number;
   }
   std::deque<std::uint32_t> numbers;
+  bool isBroken = false;
 };
 
 /// Keeps the events. The test's thread.

@@ -23,12 +23,22 @@ class GuardedFavorites::Persister final : public FavoritesPersister {
       _state->failure = favorites.error();
     }
     if (favorites) return std::move(*favorites);
+    return standIn();
+  }
+
+  std::optional<Favorites> favoritesUnread(const ErrorRef& reason) override {
+    const std::lock_guard guard(_state->lock);
+    _state->failure = reason;
+    return standIn();
+  }
+
+ private:
+  static Favorites standIn() {
     const auto line = std::make_shared<const BasicTransitLineItem>(
         BasicTransitLineItem::Fields{.identifier = std::make_shared<const MapItemIdentifier>(kUnreadableMuid)});
     return Favorites{std::make_shared<const FavoriteTransitLine>(line)};
   }
 
- private:
   std::shared_ptr<State> _state;
 };
 
@@ -45,6 +55,10 @@ void GuardedFavorites::lookup(const std::vector<MapItemIdentifierRef>& identifie
     const std::lock_guard guard(_state->lock);
     failure = _state->failure;
   }
+  // They have been read since; the fetch that could not wait for that has failed all the same.
+  if (!failure)
+    failure = Error::errorWithDomain_code_reason(std::string(kFavoritesStoreErrorDomain), 0,
+                                                 "The favorites were read too late. Try again.");
   Platform::current().mainRunLoop().dispatchAsync([failure, handler = std::move(handler)] { handler({}, failure); });
 }
 

@@ -121,6 +121,8 @@ const char* keyOfCode(TransitLineServiceError code) {
       return "Window_Error_OtherFeed";
     case foreignAlerts:
       return "Window_Error_ForeignAlerts";
+    case downloading:
+      return "Window_Error_Downloading";
     case unknownLine:
     case internal:
       break;

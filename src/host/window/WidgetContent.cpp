@@ -36,6 +36,13 @@ WidgetRow rowOf(const protocol::Row& row) {
   return {row.frame.y, row.frame.height, CommaDelimitedList(texts)};
 }
 
+ErrorRef errorOf(const protocol::FetchError& error) {
+  BoxedDictionary::Entries userInfo{{std::string(kErrorReasonKey), box(error.reason)}};
+  if (error.subject) userInfo.emplace(kErrorSubjectKey, box(*error.subject));
+  if (error.feed) userInfo.emplace(kErrorFeedKey, box(*error.feed));
+  return Error::errorWithDomain_code_userInfo(error.domain, error.code, std::move(userInfo));
+}
+
 }  // namespace
 
 WidgetContent WidgetContent::ofSnapshot(const protocol::Snapshot& snapshot) {
@@ -45,6 +52,8 @@ WidgetContent WidgetContent::ofSnapshot(const protocol::Snapshot& snapshot) {
   content.isExpanded = snapshot.expanded;
   content.goneLines = snapshot.goneLines;
   content.asOf = snapshot.asOf;
+  for (const auto& [line, title] : snapshot.knownIncidents) content.known.push_back(CommaDelimitedList({line, title}));
+  if (snapshot.error) content.failure = errorOf(*snapshot.error);
   return content;
 }
 

@@ -7,6 +7,7 @@
 
 #include "host/PictureMemory.h"
 #include "platform/foundation/Date.h"
+#include "platform/foundation/Error.h"
 #include "protocol/Snapshot.h"
 
 namespace nimbo {
@@ -25,6 +26,8 @@ struct WidgetContent {
   bool canExpand = false;
   bool isExpanded = false;
   std::vector<std::string> goneLines;  ///< "FEED:ROUTE_ID", of favorites that their feeds do not know any more
+  ErrorRef failure;                    ///< of the last fetch; null without one
+  std::vector<std::string> known;      ///< incidents of other feeds, with a failure, each as one line of text
   std::map<std::string, Date> asOf;    ///< when the publishers made their alerts, by the names of the feeds
 
   /// Takes rows and modes from a snapshot.

@@ -1,5 +1,7 @@
 #include "host/window/WidgetHostProcess.h"
 
+#include <giomm/networkmonitor.h>
+
 #include <algorithm>
 #include <stdexcept>
 
@@ -23,6 +25,8 @@ WidgetHostProcess::WidgetHostProcess(GLibRunLoop& runLoop, const Clock& clock, s
 
 WidgetHostProcess::~WidgetHostProcess() {
   if (_hiddenTimer) _hiddenTimer->invalidate();
+  endRetries();
+  _networkReturned.disconnect();
   stop();
 }
 
@@ -36,6 +40,7 @@ void WidgetHostProcess::setVisible(bool visible) {
     else if (!_gaveUp)
       start();
   } else if (_widget) {
+    endRetries();
     disappear();
     stopLater();
   }
@@ -209,13 +214,39 @@ void WidgetHostProcess::show(const std::shared_ptr<const WidgetPicture>& picture
     _isExpanded = content->isExpanded;
     setExpandedMode(_wantsExpanded && content->canExpand);
   }
+  if (content->failure)
+    retryLater();
+  else if (snapshot.result)
+    endRetries();
   _delegate.widgetDidChange(content);
+}
+
+void WidgetHostProcess::retryLater() {
+  if (_retry || _isUpdating || !_visible) return;
+  _retry = _runLoop.scheduleTimer(_retries.next(), false, [this](Timer&) {
+    _retry = nullptr;
+    update();
+  });
+  if (_networkReturned.connected()) return;
+  _networkReturned = Gio::NetworkMonitor::get_default()->signal_network_changed().connect([this](bool isAvailable) {
+    if (!isAvailable || !_retry) return;
+    endRetries();
+    update();
+  });
+}
+
+void WidgetHostProcess::endRetries() {
+  if (_retry) std::exchange(_retry, nullptr)->invalidate();
+  _retries.reset();
 }
 
 void WidgetHostProcess::update() {
   if (!_widget || _isUpdating) return;
   setUpdating(true);
-  _widget->ask(protocol::kPerformUpdate, {}, [this](const auto&) { setUpdating(false); });
+  _widget->ask(protocol::kPerformUpdate, {}, [this](const auto&) {
+    setUpdating(false);
+    askForContent();  // a failure that is the same again is no change, and is to be followed by another attempt
+  });
 }
 
 void WidgetHostProcess::setUpdating(bool updating) {

@@ -1,5 +1,7 @@
 #pragma once
 
+#include <sigc++/connection.h>
+
 #include <deque>
 #include <memory>
 #include <optional>
@@ -47,7 +49,8 @@ class WidgetHostProcess {
   /// Whether the user wants a row for each incident; it is so while the widget offers it.
   void setExpanded(bool expanded);
 
-  /// Fetches now.
+  /// Fetches now. While the widget can be seen, a fetch that failed is tried again by itself: after `kFirstRetry`, each
+  /// time after twice as long, and when the network returns.
   void update();
   /// Has the delegate hear what the widget shows now, changed or not, while it appears.
   void askForContent();
@@ -65,6 +68,8 @@ class WidgetHostProcess {
   static constexpr TimeInterval kHiddenPatience = 60;
   /// Seconds in which the process answers anything but an update.
   static constexpr TimeInterval kAnswerPatience = 10;
+  /// Seconds from a fetch that failed to the next.
+  static constexpr TimeInterval kFirstRetry = 30, kLongestRetry = 1800;
   /// So many crashes within so many seconds are not the last ones.
   static constexpr std::size_t kCrashLimit = 3;
   static constexpr TimeInterval kCrashWindow = 60;
@@ -88,6 +93,9 @@ class WidgetHostProcess {
   void show(const std::shared_ptr<const WidgetPicture>& picture, const protocol::Snapshot& snapshot);
   void setExpandedMode(bool expanded);
   void setUpdating(bool updating);
+  /// Sees to the next attempt after a fetch that failed.
+  void retryLater();
+  void endRetries();
 
   GLibRunLoop& _runLoop;
   const Clock& _clock;
@@ -100,6 +108,9 @@ class WidgetHostProcess {
   bool _gaveUp = false;
   std::deque<Date> _crashes;
   std::shared_ptr<Timer> _hiddenTimer;
+  Backoff _retries{kFirstRetry, kLongestRetry};
+  std::shared_ptr<Timer> _retry;      // while the next attempt is waited for
+  sigc::connection _networkReturned;  // from the first failure on
 
   // Of the process that runs.
   std::optional<PictureMemory> _pictures;

@@ -4,6 +4,8 @@
 #include <gtkmm/image.h>
 #include <gtkmm/native.h>
 
+#include <utility>
+
 #include "desktop/rpc/Base64.h"
 #include "host/window/Texts.h"
 #include "host/window/WidgetTexts.h"
@@ -39,6 +41,16 @@ Gtk::Widget* makePlace(const char* icon, const std::string& name) {
   row->set_child(*box);
   setAccessibleLabel(*row, name);
   return row;
+}
+
+/// Why a fetch failed, of which feed, and what is known of the others.
+std::string textOfFailedFetch(const WidgetContent& content) {
+  const Error& error = *content.failure;
+  std::string text = textOfError(error);
+  if (!error.feed().empty()) text = LocalizedFormat(LocalizedString("Window_Feed_Failed"), {error.feed(), text});
+  if (!content.known.empty()) text += "\n\n" + LocalizedString("Window_Feed_Known");
+  for (const std::string& incident : content.known) text += "\n" + incident;
+  return text;
 }
 
 }  // namespace
@@ -105,15 +117,11 @@ void WidgetPage::buildCard() {
 
   _failure.add_css_class("notice");
   _failureReason.set_xalign(0);
-  auto* tryAgain = Gtk::make_managed<Gtk::Button>(LocalizedString("Window_TryAgain"));
-  tryAgain->set_halign(Gtk::Align::START);
-  tryAgain->signal_clicked().connect([this] {
-    _failure.hide();
-    _waiting.set_visible(!_content);
-    _process.restart();
-  });
+  auto* button = Gtk::make_managed<Gtk::Button>(LocalizedString("Window_TryAgain"));
+  button->set_halign(Gtk::Align::START);
+  button->signal_clicked().connect([this] { tryAgain(); });
   _failure.append(_failureReason);
-  _failure.append(*tryAgain);
+  _failure.append(*button);
   _failure.hide();
 
   _card.add_css_class("card");
@@ -206,15 +214,30 @@ void WidgetPage::widgetDidChange(const WidgetContentRef& content) {
   _context.asOf = content->asOf;
   _view.setContent(content);
   _waiting.hide();
-  _failure.hide();
+  if (content->failure)
+    showFailure(textOfFailedFetch(*content));
+  else
+    _failure.hide();
   _goneText.set_text(LocalizedFormat(LocalizedString("Window_Widget_Gone"), {CommaDelimitedList(content->goneLines)}));
   _gone.set_visible(!content->goneLines.empty());
   showExpandButton();
 }
 
-void WidgetPage::widgetDidFail(const std::string& reason) {
-  _failureReason.set_text(LocalizedFormat(LocalizedString("Window_Widget_Failed"), {reason}));
+void WidgetPage::showFailure(const std::string& text) {
+  if (_failureReason.get_text() != text) _failureReason.set_text(text);
   _failure.show();
+}
+
+void WidgetPage::tryAgain() {
+  if (!std::exchange(_processFailed, false)) return _process.update();
+  _failure.hide();
+  _waiting.set_visible(!_content);
+  _process.restart();
+}
+
+void WidgetPage::widgetDidFail(const std::string& reason) {
+  _processFailed = true;
+  showFailure(LocalizedFormat(LocalizedString("Window_Widget_Failed"), {reason}));
   _waiting.hide();
 }
 

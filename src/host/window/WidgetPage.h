@@ -35,6 +35,10 @@ class WidgetPage final : public Page, private WidgetHostProcess::Delegate {
   void showExpandButton();
   WidgetPresentation presentation() const;
 
+  /// What to do about the failure that is told of.
+  void tryAgain();
+  void showFailure(const std::string& text);
+
   void widgetDidChange(const WidgetContentRef& content) override;
   void widgetDidFail(const std::string& reason) override;
   void widgetTells(const std::string& message) override;
@@ -45,6 +49,7 @@ class WidgetPage final : public Page, private WidgetHostProcess::Delegate {
   WidgetHostProcess _process;
   WidgetContentRef _content;
   bool _wantsExpanded;
+  bool _processFailed = false;  // not started again by itself
   double _width = WidgetPresentation::kDefaultWidth;
 
   Gtk::Box _card{Gtk::Orientation::VERTICAL};

@@ -32,6 +32,11 @@ std::string Error::subject() const {
   return text ? text->description() : std::string();
 }
 
+std::string Error::feed() const {
+  const ObjectRef text = _userInfo->objectForKey(kErrorFeedKey);
+  return text ? text->description() : std::string();
+}
+
 bool Error::isEqual(const Object* other) const {
   if (this == other) return true;
   const auto* error = instanceOf<Error>(other);

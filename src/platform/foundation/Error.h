@@ -21,6 +21,9 @@ inline constexpr std::string_view kErrorReasonKey = "Reason";
 /// user's language do so by its domain and code, and put this in.
 inline constexpr std::string_view kErrorSubjectKey = "Subject";
 
+/// User-info key of the name of the feed that it happened to.
+inline constexpr std::string_view kErrorFeedKey = "Feed";
+
 /// A runtime failure as a value: a domain, a code within it, and details by key. Equal when all three are.
 class Error final : public Object {
  public:
@@ -41,6 +44,8 @@ class Error final : public Object {
   std::string reason() const;
   /// Empty when there is none.
   std::string subject() const;
+  /// Empty when it is no feed's.
+  std::string feed() const;
 
   std::string_view className() const override { return "Error"; }
   bool isEqual(const Object* other) const override;

@@ -320,12 +320,7 @@ TEST_F(AlertsStoreTest, DoesWithoutADamagedCache) {
 TEST(StaticFeedStore, AsksAServerOnceADayAndKeepsWhatItHas) {
   TestPlatform platform;
   TemporaryFolder folder;
-  const auto path = folder.path() / "made.zip";
-  zip_t* archive = zip_open(path.c_str(), ZIP_CREATE, nullptr);
-  static const char kRoutes[] = "route_id\n1\n";
-  zip_file_add(archive, "routes.txt", zip_source_buffer(archive, kRoutes, sizeof kRoutes - 1, 0), 0);
-  zip_close(archive);
-  Answer answer{LoopbackServer::answer("200 OK\r\nETag: \"a\"", *readFile(path, 1 << 20))};
+  Answer answer{LoopbackServer::answer("200 OK\r\nETag: \"a\"", zipOfRoutes("route_id\n1\n"))};
   const LoopbackServer server([&](const std::string&) { return answer; });
   const StaticFeedStore store(FeedCache(folder.path() / "cache"));
   const Feed feed{"city", *FeedAddress::parse(server.address()), *FeedAddress::parse("/none")};

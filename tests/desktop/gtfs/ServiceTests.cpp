@@ -1,4 +1,5 @@
 #include <condition_variable>
+#include <future>
 
 #include "desktop/gtfs/Fixtures.h"
 #include "desktop/gtfs/LoopbackServer.h"
@@ -8,6 +9,8 @@
 #include "desktop/gtfs/feeds/GTFSTransitLineService.h"
 #include "desktop/gtfs/feeds/SampleCity.h"
 #include "desktop/gtfs/feeds/TransitLineServiceError.h"
+#include "platform/DueAnswer.h"
+#include "support/NoThreads.h"
 #include "support/TestPlatform.h"
 
 namespace nimbo {
@@ -30,6 +33,12 @@ class LineServiceTest : public testing::Test {
   }
   void addFeed(const std::string& name, const std::vector<std::string>& shortNames) {
     addFeed(name, shortNames, folder.write(name + "/alerts.pb", feedBytes(alert("a", "In " + name, route("r1")))));
+  }
+  /// Sets up "city", whose static feed comes from this address, and whose line r1 has an incident "T".
+  void addServedFeed(const std::string& staticFeed) {
+    const std::string alerts = folder.write("city.pb", feedBytes(alert("a", "T", route("r1"))));
+    ASSERT_FALSE(
+        FeedConfiguration(paths.config).add({"city", *FeedAddress::parse(staticFeed), *FeedAddress::parse(alerts)}));
   }
   static MapItemIdentifierRef line(const std::string& feed, const std::string& routeID,
                                    const std::string& shortName = "") {
@@ -80,7 +89,10 @@ TEST_F(LineServiceTest, FailsWhenAFeedDoes) {
   addFeed("south", {"1"}, folder.path() / "missing.pb");
   EXPECT_EQ(lookup({line("north", "r1")}), "1 (In north); ");
   EXPECT_EQ(lookup({line("north", "r1"), line("south", "r1")}), error(Code::unreadableFile));
+  ASSERT_EQ(service->knownIncidents().size(), 1u) << "what the other feed says stays known";
+  EXPECT_EQ(service->knownIncidents()[0].title, "In north");
   EXPECT_EQ(lookup({line("north", "r1"), line("east", "r1")}), error(Code::unknownFeed));
+  EXPECT_TRUE(service->knownIncidents().empty());
   std::string many;
   for (int i = 0; i <= 5000; ++i) many += alert(std::to_string(i), "T" + std::to_string(i), route("r1"));
   addFeed("west", {"1"}, folder.write("many.pb", feedBytes(many)));
@@ -123,6 +135,73 @@ TEST_F(LineServiceTest, AsksAllServersAtTheSameTime) {
   addFeed("north", {"1"}, server.address("/north"));
   addFeed("south", {"2"}, server.address("/south"));
   EXPECT_EQ(lookup({line("north", "r1"), line("south", "r1")}), "1; 2; ");
+}
+
+TEST_F(LineServiceTest, AnswersWithAnErrorWhenNoThreadStarts) {
+  addFeed("north", {"1"});
+  const NoThreads noThreads;
+  EXPECT_EQ(lookup({line("north", "r1")}), error(Code::internal));
+}
+
+/// A server that keeps an answer back until it may go on.
+struct HeldBack {
+  std::promise<void> promise;
+  std::shared_future<void> mayGoOn = promise.get_future();
+};
+
+TEST_F(LineServiceTest, AnswersWithinAMinuteAndTheNextLookupJoinsTheDownload) {
+  HeldBack archive;
+  const LoopbackServer server(
+      [&, bytes = zipOfRoutes("route_id,route_short_name,route_type\nr1,1,3\n")](const std::string&) {
+        platform.loop.wake();
+        archive.mayGoOn.wait();
+        return LoopbackServer::Answer{LoopbackServer::answer("200 OK\r\nETag: \"a\"", bytes)};
+      });
+  addServedFeed(server.address());
+  std::vector<ErrorRef> errors;
+  const auto ask = [&] {
+    service->lookup({line("city", "r1")}, [&](const auto&, const ErrorRef& error) { errors.push_back(error); });
+  };
+  ask();
+  platform.loop.waitAndDrain([&] { return !server.requests().empty(); });
+  platform.time.advance(DueAnswer::kPatience - 1);
+  EXPECT_TRUE(errors.empty());
+  platform.time.advance(1);
+  ASSERT_EQ(errors.size(), 1u);
+  EXPECT_EQ(errors[0]->code(), static_cast<int>(Code::downloading));
+  EXPECT_EQ(errors[0]->subject(), "city (0 MiB)");
+  ask();
+  archive.promise.set_value();
+  platform.loop.waitAndDrain([&] { return errors.size() == 2; });
+  EXPECT_EQ(errors[1], nullptr);
+  EXPECT_EQ(server.requests().size(), 1u);
+}
+
+TEST_F(LineServiceTest, DoesNotWaitForAStaticServerOnceThereIsACache) {
+  HeldBack end;
+  const LoopbackServer server([&, bytes = zipOfRoutes("route_id,route_short_name,route_type\nr1,1,3\n"),
+                               isFirst = std::make_shared<std::atomic<bool>>(true)](const std::string&) {
+    platform.loop.wake();
+    if (isFirst->exchange(false)) return LoopbackServer::Answer{LoopbackServer::answer("200 OK\r\nETag: \"a\"", bytes)};
+    end.mayGoOn.wait();
+    return LoopbackServer::Answer{};
+  });
+  addServedFeed(server.address());
+  EXPECT_EQ(lookup({line("city", "r1")}), "1 (T); ");
+  struct Step {
+    TimeInterval later;
+    std::size_t requests;  // after the lookup
+  };
+  // The server is silent from now on. It is asked after a day, then after 15 minutes, 30, an hour.
+  for (const Step& step :
+       {Step{86400, 2}, Step{899, 2}, Step{1, 3}, Step{1799, 3}, Step{1, 4}, Step{3599, 4}, Step{1, 5}}) {
+    platform.time.advance(step.later);
+    EXPECT_EQ(lookup({line("city", "r1")}), "1 (T); ");
+    platform.loop.waitAndDrain([&] { return server.requests().size() >= step.requests; });
+    EXPECT_EQ(server.requests().size(), step.requests) << step.later;
+    service = std::make_unique<GTFSTransitLineService>(paths);  // what the old one learned is kept
+  }
+  end.promise.set_value();
 }
 
 TEST_F(LineServiceTest, NeverCallsBackOnceItIsGone) {

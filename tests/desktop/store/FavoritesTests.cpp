@@ -1,7 +1,7 @@
 #include <thread>
 
-#include "desktop/store/Fixture.h"
 #include "desktop/store/FavoritesSeal.h"
+#include "desktop/store/Fixture.h"
 #include "desktop/store/GuardedFavorites.h"
 #include "support/TransitFixtures.h"
 
@@ -142,9 +142,9 @@ TEST_F(FavoritesTest, FailTheLookupRatherThanSeemToBeNone) {
   ASSERT_EQ(makeEditor().add({lineItem(1, "A")}), nullptr);
   GuardedFavorites favorites(makeEditor(), platform.transitLines);
   const auto persister = favorites.remotePersister();
-  const auto lookUp = [&] {
+  const auto lookUp = [&](const std::optional<Favorites>& unread = std::nullopt) {
     std::vector<MapItemIdentifierRef> identifiers;
-    const Favorites read = persister->readFavorites().value();
+    const Favorites read = unread ? *unread : persister->readFavorites().value();
     for (const FavoriteRef& favorite : read)
       identifiers.push_back(dynamic_cast<const FavoriteTransitLine&>(*favorite).transitLine()->identifier());
     std::optional<std::string> reason;
@@ -157,6 +157,10 @@ TEST_F(FavoritesTest, FailTheLookupRatherThanSeemToBeNone) {
     return reason.value();
   };
   EXPECT_EQ(lookUp(), "");
+  const auto unread = persister->favoritesUnread(Error::errorWithDomain_code_reason("Store", 0, "no thread"));
+  EXPECT_EQ(lookUp(unread), "no thread");
+  EXPECT_EQ(lookUp(), "");
+  EXPECT_THAT(lookUp(unread), testing::HasSubstr("too late")) << "they can be read by now";
   std::filesystem::remove_all(folder());
   std::filesystem::create_directories(file());
   EXPECT_THAT(lookUp(), testing::HasSubstr("Cannot read " + file().native()));

@@ -125,9 +125,13 @@ def tour(session, folder):
     window.see_page("1, Harbour Line")
     press("key", "alt+Left")
 
-    publish(city, ["A bridge is up"])
+    os.remove(city + "/alerts.pb")
     press("key", "F5")
+    window.see("^Feed “town”: .*/alerts.pb")
+    publish(city, ["A bridge is up"])
+    window.click("Try Again")
     window.see("A bridge is up", "push button")
+    wait("no failure any more", lambda: not window.find("^Feed “town”"))
     for news in "Cows walk the track", "The cows are gone", None:
         old = window.children()
         if news:

@@ -13,6 +13,8 @@ class FeedCache {
 
   const std::filesystem::path& folder() const { return _folder; }
   std::filesystem::path staticFeed(std::string_view feed) const { return file("static", feed); }
+  /// How often in a row the static feed's server was asked in vain.
+  std::filesystem::path attempts(std::string_view feed) const { return file("attempts", feed); }
   std::filesystem::path trips(std::string_view feed) const { return file("trips", feed); }
   std::filesystem::path alerts(std::string_view feed) const { return file("alerts", feed); }
 

@@ -17,7 +17,8 @@ Outcome<std::vector<FeedSourceRef>> FeedLibrary::sources() const {
   const auto feeds = _configuration.feeds();
   if (!feeds) return feeds.error();
   std::vector<FeedSourceRef> sources;
-  for (const Feed& feed : *feeds) sources.push_back(std::make_shared<const ConfiguredFeedSource>(feed, _cache));
+  for (const Feed& feed : *feeds)
+    sources.push_back(std::make_shared<const ConfiguredFeedSource>(feed, _cache, _downloads));
   if (sources.empty()) sources.push_back(sampleCity());
   return sources;
 }

@@ -5,6 +5,7 @@
 
 #include "desktop/gtfs/alerts/AlertsFeed.h"
 #include "desktop/gtfs/alerts/AlertsStore.h"
+#include "desktop/gtfs/static/StaticFeedDownloads.h"
 #include "desktop/gtfs/static/StaticFeedStore.h"
 
 namespace nimbo {
@@ -25,19 +26,19 @@ class FeedSource {
 /// A feed that the user set up.
 class ConfiguredFeedSource final : public FeedSource {
  public:
-  ConfiguredFeedSource(Feed feed, const FeedCache& cache)
-      : _feed(std::move(feed)), _staticFeeds(cache), _alerts(cache) {}
+  ConfiguredFeedSource(Feed feed, const FeedCache& cache, std::shared_ptr<StaticFeedDownloads> downloads)
+      : _feed(std::move(feed)), _staticFeeds(std::move(downloads)), _alerts(cache) {}
 
   const std::string& name() const override { return _feed.name; }
   bool minorAlerts() const override { return _feed.minorAlerts; }
   Outcome<LoadedStaticFeed> staticFeed(const std::stop_token& stop) const override {
-    return _staticFeeds.load(_feed, stop);
+    return _staticFeeds->load(_feed, stop);
   }
   Outcome<AlertsFeed> alerts(const std::stop_token& stop) const override { return _alerts.load(_feed, stop); }
 
  private:
   Feed _feed;
-  StaticFeedStore _staticFeeds;
+  std::shared_ptr<StaticFeedDownloads> _staticFeeds;
   AlertsStore _alerts;
 };
 

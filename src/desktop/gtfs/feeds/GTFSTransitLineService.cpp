@@ -6,7 +6,9 @@
 #include "desktop/gtfs/feeds/FeedLookup.h"
 #include "desktop/gtfs/feeds/TransitLineServiceError.h"
 #include "desktop/gtfs/static/LineItems.h"
+#include "platform/DueAnswer.h"
 #include "platform/Platform.h"
+#include "platform/SystemServices.h"
 
 namespace nimbo {
 
@@ -19,9 +21,15 @@ struct GTFSTransitLineService::Shared {
   std::string language = "en";
   std::vector<MapItemIdentifierRef> goneLines;
   std::map<std::string, Date> asOf;
+  std::vector<KnownIncident> known;
 };
 
 namespace {
+
+using KnownIncident = GTFSTransitLineService::KnownIncident;
+
+/// More than anybody reads beside an error.
+constexpr std::size_t kMostKnownIncidents = 20;
 
 /// The identifiers that may be of one feed, and their places in the lookup.
 struct FeedPart {
@@ -62,30 +70,60 @@ Outcome<FeedAnswer> lookUpPart(const FeedPart& part, const std::string& language
   }
 }
 
+/// The error with the name of the feed that it happened to.
+ErrorRef ofFeed(const Error& error, const std::string& name) {
+  auto userInfo = error.userInfo()->entries();
+  userInfo.emplace(kErrorFeedKey, box(name));
+  return Error::errorWithDomain_code_userInfo(error.domain(), error.code(), std::move(userInfo));
+}
+
 struct Answer {
   TransitLineItems items;  ///< one for each identifier, null for lines that are gone
   std::map<std::string, Date> asOf;
+  ErrorRef error;                    ///< of the first feed that failed; null without one
+  std::vector<KnownIncident> known;  ///< of the other feeds, with an error
 };
+
+std::vector<KnownIncident> incidentsInForce(const TransitLineItems& items) {
+  std::vector<KnownIncident> known;
+  const Date now = currentDate();
+  for (const TransitLineItemRef& item : items) {
+    if (!item) continue;
+    for (const TransitIncidentRef& incident : item->incidents()) {
+      if (known.size() == kMostKnownIncidents) return known;
+      const auto start = incident->startDate(), end = incident->endDate();
+      if ((!start || *start <= now) && (!end || *end >= now))
+        known.push_back({item->name().value_or(""), incident->title().value_or("")});
+    }
+  }
+  return known;
+}
 
 Outcome<Answer> lookUpAll(const std::vector<MapItemIdentifierRef>& identifiers, const FeedLibrary& library,
                           const std::string& language, const std::stop_token& stop) {
   const auto parts = partsOf(identifiers, library);
   if (!parts) return parts.error();
   std::vector<std::future<Outcome<FeedAnswer>>> others;
+  // Deferred where no thread can start: then one feed waits for another.
   for (std::size_t i = 1; i < parts->size(); ++i)
-    others.push_back(std::async(std::launch::async, [&, i] { return lookUpPart((*parts)[i], language, stop); }));
+    others.push_back(std::async(std::launch::async | std::launch::deferred,
+                                [&, i] { return lookUpPart((*parts)[i], language, stop); }));
   std::vector<Outcome<FeedAnswer>> answers;
   if (!parts->empty()) answers.push_back(lookUpPart(parts->front(), language, stop));
   for (auto& other : others) answers.push_back(other.get());
 
-  Answer all{TransitLineItems(identifiers.size()), {}};
+  Answer all{TransitLineItems(identifiers.size()), {}, nullptr, {}};
   for (std::size_t i = 0; i < answers.size(); ++i) {
-    if (!answers[i]) return answers[i].error();
+    if (!answers[i]) {
+      if (!all.error) all.error = ofFeed(*answers[i].error(), (*parts)[i].source->name());
+      continue;
+    }
     const FeedPart& part = (*parts)[i];
     for (std::size_t k = 0; k < answers[i]->items.size(); ++k)
       if (TransitLineItemRef& item = all.items[part.places[k]]; !item) item = answers[i]->items[k];
     if (answers[i]->asOf) all.asOf.emplace(part.source->name(), *answers[i]->asOf);
   }
+  if (all.error) all.known = incidentsInForce(all.items);
   return all;
 }
 
@@ -110,6 +148,12 @@ ErrorRef allGone(const std::vector<MapItemIdentifierRef>& gone) {
       "No line of the favorites is in its feed any more:" + names + ". Choose the lines anew.");
 }
 
+ErrorRef tooLate(const FeedLibrary& library) {
+  if (ErrorRef downloading = library.downloads().firstUnderWay()) return downloading;
+  return transitLineServiceError(TransitLineServiceError::timedOut,
+                                 "The feeds could not be read within a minute. Try again later.");
+}
+
 }  // namespace
 
 GTFSTransitLineService::GTFSTransitLineService(const Paths& paths)
@@ -132,8 +176,25 @@ std::map<std::string, Date> GTFSTransitLineService::asOf() const {
   return _shared->asOf;
 }
 
+std::vector<KnownIncident> GTFSTransitLineService::knownIncidents() const {
+  const std::lock_guard guard(_shared->lock);
+  return _shared->known;
+}
+
 void GTFSTransitLineService::lookup(const std::vector<MapItemIdentifierRef>& identifiers, Handler handler) {
-  const auto work = [shared = _shared, stop = _stop.get_token(), identifiers, handler = std::move(handler)] {
+  std::stop_source giveUp;
+  const auto due = DueAnswer::start([shared = _shared, serviceStop = _stop.get_token(), giveUp, handler]() mutable {
+    giveUp.request_stop();
+    {
+      const std::lock_guard guard(shared->lock);
+      shared->known.clear();
+    }
+    if (!serviceStop.stop_requested()) handler({}, tooLate(shared->library));
+  });
+  const auto work = [shared = _shared, due, giveUp, serviceStop = _stop.get_token(), identifiers, handler] {
+    if (due->isClaimed()) return;
+    const std::stop_callback endWithService(serviceStop, [giveUp = giveUp]() mutable { giveUp.request_stop(); });
+    const std::stop_token stop = giveUp.get_token();
     std::string language;
     {
       const std::lock_guard guard(shared->lock);
@@ -143,13 +204,18 @@ void GTFSTransitLineService::lookup(const std::vector<MapItemIdentifierRef>& ide
     ErrorRef error;
     try {
       auto outcome = lookUpAll(identifiers, shared->library, language, stop);
-      error = outcome.error();
-      if (outcome) {
+      if (due->isClaimed()) return;
+      error = outcome ? outcome->error : outcome.error();
+      std::vector<MapItemIdentifierRef> gone;
+      if (!error) {
         items = std::move(outcome->items);
-        const auto gone = takeGone(items, identifiers);
+        gone = takeGone(items, identifiers);
         if (items.empty() && !gone.empty()) error = allGone(gone);
-        const std::lock_guard guard(shared->lock);
-        shared->goneLines = gone;
+      }
+      const std::lock_guard guard(shared->lock);
+      shared->known = outcome ? std::move(outcome->known) : std::vector<KnownIncident>();
+      if (outcome && !outcome->error) {
+        shared->goneLines = std::move(gone);
         shared->asOf = std::move(outcome->asOf);
       }
     } catch (const std::exception& exception) {
@@ -157,11 +223,21 @@ void GTFSTransitLineService::lookup(const std::vector<MapItemIdentifierRef>& ide
                                       std::string("Looking up the lines failed: ") + exception.what() + ".");
     }
     if (stop.stop_requested()) return;
-    Platform::current().mainRunLoop().dispatchAsync([stop, handler, items = std::move(items), error] {
-      if (!stop.stop_requested()) handler(error ? TransitLineItems() : items, error);
+    Platform::current().mainRunLoop().dispatchAsync([due, serviceStop, handler, items = std::move(items), error] {
+      if (!serviceStop.stop_requested() && due->claim()) handler(error ? TransitLineItems() : items, error);
     });
   };
-  _queue.dispatchAsync(work);
+  try {
+    _queue.dispatchAsync(work);
+  } catch (const std::exception& failure) {
+    if (!due->claim()) return;
+    const ErrorRef error = transitLineServiceError(
+        TransitLineServiceError::internal,
+        std::string("Cannot look the lines up: ") + failure.what() + ". Close some programs and try again.");
+    Platform::current().mainRunLoop().dispatchAsync([serviceStop = _stop.get_token(), handler, error] {
+      if (!serviceStop.stop_requested()) handler({}, error);
+    });
+  }
 }
 
 }  // namespace nimbo

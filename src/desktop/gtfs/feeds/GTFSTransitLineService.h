@@ -14,7 +14,9 @@
 namespace nimbo {
 
 /// The line service over GTFS static feeds and GTFS-Realtime alerts. Works on threads of its own; lookups come one
-/// after the other, the feeds of one lookup at the same time, so that no feed waits for another one's server. Nothing
+/// after the other, the feeds of one lookup at the same time, so that no feed waits for another one's server. A lookup
+/// that takes longer than `DueAnswer::kPatience` is answered with an error; a static feed that it waits for goes on
+/// coming, and the next lookup joins that. Nothing
 /// is opened, and no thread begins, before the first lookup.
 class GTFSTransitLineService final : public TransitLineService {
  public:
@@ -31,6 +33,14 @@ class GTFSTransitLineService final : public TransitLineService {
 
   /// The lines that the last lookup which succeeded left out, since their feeds do not know them any more. Any thread.
   std::vector<MapItemIdentifierRef> goneLines() const;
+
+  /// An incident in force that is known although the lookup failed, since another feed answered.
+  struct KnownIncident {
+    std::string line;  ///< name of a line that it hits
+    std::string title;
+  };
+  /// Those of the last lookup, where it failed; the first ones, when they are many. Any thread.
+  std::vector<KnownIncident> knownIncidents() const;
 
   /// When the publishers made the alerts that the last lookup which succeeded went by, by the names of their feeds;
   /// without those that do not say. Any thread.

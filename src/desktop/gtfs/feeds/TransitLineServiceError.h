@@ -36,6 +36,7 @@ enum class TransitLineServiceError : std::int64_t {
   notKept = 18,          ///< no room for what the server sends
   otherFeed = 19,        ///< a GTFS-Realtime feed that holds no alerts but something else
   foreignAlerts = 20,    ///< the alerts name routes of another static feed
+  downloading = 21,      ///< a static feed that has never been here is still coming
 };
 
 /// An error of `kTransitLineServiceErrorDomain`. The subject is the feed's name, or its place without secrets.

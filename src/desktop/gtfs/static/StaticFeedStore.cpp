@@ -96,6 +96,11 @@ Outcome<TripRoutes> wholeTrips(const Feed& feed, TripRoutes trips) {
   return noTrips(feed, "its trips.txt is missing or damaged. Ask the publisher for a whole feed");
 }
 
+bool isDue(const StaticFeed& cached) {
+  const TimeInterval age = -intervalFromNow(cached.checkedAt());
+  return age < 0 || age >= kRemoteCheckInterval;
+}
+
 std::uint64_t tripsKey(const StaticFeed& feed) { return hashOfBytes(feed.fingerprint()); }
 
 void keep(const std::filesystem::path& path, std::string_view bytes) {
@@ -154,12 +159,16 @@ Outcome<FreshStaticFeed> StaticFeedStore::parse(StaticFeedFiles& files, const Fe
 }
 
 Outcome<std::optional<FreshStaticFeed>> StaticFeedStore::fetch(const Feed& feed, const HTTPValidators& validators,
-                                                               const std::stop_token& stop) const {
+                                                               const std::stop_token& stop,
+                                                               const Progress& progress) const {
   if (ErrorRef error = makeFolders(_cache.folder())) return error;
   const FileDescriptor file = temporaryFile(_cache.folder());
   if (!file) return fileError("write in", _cache.folder(), errno);
   const HTTPRequest request{feed.staticFeed, validators, kLargestDownload, kDownloadTimeLimit};
-  const auto answer = HTTPFetcher::fetch(request, stop, [&](std::string_view piece) { return writeAll(file, piece); });
+  const auto answer = HTTPFetcher::fetch(request, stop, [&](std::string_view piece) {
+    if (progress) progress(piece.size());
+    return writeAll(file, piece);
+  });
   if (!answer) return answer.error();
   if (answer->isUnchanged) return std::optional<FreshStaticFeed>();
   auto files = openZippedFeed(file, feed.staticFeed.publicText());
@@ -171,7 +180,7 @@ Outcome<std::optional<FreshStaticFeed>> StaticFeedStore::fetch(const Feed& feed,
 
 Outcome<FreshStaticFeed> StaticFeedStore::readAnew(const Feed& feed, const std::stop_token& stop) const {
   if (feed.staticFeed.isRemote()) {
-    auto fetched = fetch(feed, {}, stop);
+    auto fetched = fetch(feed, {}, stop, {});
     if (!fetched) return fetched.error();
     return std::move(**fetched);  // without validators nothing is unchanged
   }
@@ -183,14 +192,11 @@ Outcome<FreshStaticFeed> StaticFeedStore::readAnew(const Feed& feed, const std::
 }
 
 Outcome<LoadedStaticFeed> StaticFeedStore::loadRemote(const Feed& feed, const std::optional<StaticFeed>& cached,
-                                                      const std::stop_token& stop) const {
+                                                      const std::stop_token& stop, const Progress& progress) const {
   const auto validators = cached ? validatorsIn(cached->fingerprint(), feed.staticFeed) : std::nullopt;
   const bool isHeld = validators.has_value();
-  if (isHeld) {
-    const TimeInterval age = -intervalFromNow(cached->checkedAt());
-    if (age >= 0 && age < kRemoteCheckInterval) return withTrips(feed, *cached, std::nullopt, stop);
-  }
-  auto fetched = fetch(feed, validators.value_or(HTTPValidators()), stop);
+  if (isHeld && !isDue(*cached)) return withTrips(feed, *cached, std::nullopt, stop);
+  auto fetched = fetch(feed, validators.value_or(HTTPValidators()), stop, progress);
   if (fetched && *fetched) return withTrips(feed, (*fetched)->feed, std::move((*fetched)->trips), stop);
   if (!fetched) {
     if (!isHeld) return fetched.error();
@@ -203,9 +209,16 @@ Outcome<LoadedStaticFeed> StaticFeedStore::loadRemote(const Feed& feed, const st
   return withTrips(feed, std::move(checked), std::nullopt, stop);
 }
 
-Outcome<LoadedStaticFeed> StaticFeedStore::load(const Feed& feed, const std::stop_token& stop) const {
+std::optional<StaticFeedStore::Held> StaticFeedStore::held(const Feed& feed, const std::stop_token& stop) const {
   const auto cached = readCache(feed);
-  if (feed.staticFeed.isRemote()) return loadRemote(feed, cached, stop);
+  if (!cached || !validatorsIn(cached->fingerprint(), feed.staticFeed)) return std::nullopt;
+  return Held{withTrips(feed, *cached, std::nullopt, stop), isDue(*cached)};
+}
+
+Outcome<LoadedStaticFeed> StaticFeedStore::load(const Feed& feed, const std::stop_token& stop,
+                                                const Progress& progress) const {
+  const auto cached = readCache(feed);
+  if (feed.staticFeed.isRemote()) return loadRemote(feed, cached, stop, progress);
   const std::string fingerprint = localFingerprint(feed.staticFeed.path());
   if (cached && !fingerprint.empty() && cached->fingerprint() == fingerprint)
     return withTrips(feed, *cached, std::nullopt, stop);

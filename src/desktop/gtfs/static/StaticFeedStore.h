@@ -29,9 +29,20 @@ class StaticFeedStore {
  public:
   explicit StaticFeedStore(FeedCache cache) : _cache(std::move(cache)) {}
 
-  /// From the cache where that is as good as the source. A remote source that does not answer costs nothing while the
-  /// cache has an older state. `stop` also ends a reading of the trips that comes later.
-  Outcome<LoadedStaticFeed> load(const Feed& feed, const std::stop_token& stop) const;
+  /// Hears of bytes as they come. Called on the thread that loads.
+  using Progress = std::function<void(std::size_t bytes)>;
+
+  /// From the cache where that is as good as the source. A remote source that does not answer costs nothing but time
+  /// while the cache has an older state. `stop` also ends a reading of the trips that comes later.
+  Outcome<LoadedStaticFeed> load(const Feed& feed, const std::stop_token& stop, const Progress& progress = {}) const;
+
+  /// What the cache has of a remote source, without asking that.
+  struct Held {
+    LoadedStaticFeed loaded;
+    bool isDue;  ///< the source is to be asked again
+  };
+  /// Absent when the cache has nothing of this source.
+  std::optional<Held> held(const Feed& feed, const std::stop_token& stop) const;
 
   /// How trips of this table are looked up.
   static SelectorMatcher::TripLookup lookupIn(const Feed& feed, const TripRoutes& trips);
@@ -42,9 +53,9 @@ class StaticFeedStore {
  private:
   std::optional<StaticFeed> readCache(const Feed& feed) const;
   Outcome<LoadedStaticFeed> loadRemote(const Feed& feed, const std::optional<StaticFeed>& cached,
-                                       const std::stop_token& stop) const;
+                                       const std::stop_token& stop, const Progress& progress) const;
   Outcome<std::optional<FreshStaticFeed>> fetch(const Feed& feed, const HTTPValidators& validators,
-                                                const std::stop_token& stop) const;
+                                                const std::stop_token& stop, const Progress& progress) const;
   Outcome<FreshStaticFeed> parse(StaticFeedFiles& files, const Feed& feed, const std::string& fingerprint) const;
   Outcome<TripRoutes> readTrips(const Feed& feed, const StaticFeed& staticFeed, const std::stop_token& stop) const;
   LoadedStaticFeed withTrips(const Feed& feed, StaticFeed staticFeed, std::optional<TripRoutes> trips,
