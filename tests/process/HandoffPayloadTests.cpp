@@ -26,7 +26,7 @@ class HandoffPayload : public testing::Test {
 
   /// One whose texts all have so many characters.
   static TransitIncidentRef wordyIncident(std::size_t length) {
-    BasicTransitIncident::Fields fields;
+    TransitIncidentFields fields;
     fields.muid = 1;
     fields.title = fields.summary = fields.fullDescription = std::string(length, 'x');
     return std::make_shared<const BasicTransitIncident>(std::move(fields));
