@@ -7,9 +7,13 @@
 namespace nimbo {
 
 /// Favourites that a test sets. Any thread.
-class FavoritesDouble final : public FavoritesPersisters {
+class FavoritesDouble final : public FavoritesPersisters, public FavoritesPersister {
  public:
-  std::shared_ptr<FavoritesPersister> remotePersister() override { return std::make_shared<Persister>(*this); }
+  std::shared_ptr<FavoritesPersister> remotePersister() override { return {std::shared_ptr<void>(), this}; }
+  std::optional<Favorites> readFavorites() override {
+    const std::lock_guard guard(_lock);
+    return _favorites;
+  }
 
   /// Absent: they cannot be read. Empty until set.
   void setFavorites(std::optional<Favorites> favorites) {
@@ -18,18 +22,6 @@ class FavoritesDouble final : public FavoritesPersisters {
   }
 
  private:
-  class Persister final : public FavoritesPersister {
-   public:
-    explicit Persister(FavoritesDouble& owner) : _owner(owner) {}
-    std::optional<Favorites> readFavorites() override {
-      const std::lock_guard guard(_owner._lock);
-      return _owner._favorites;
-    }
-
-   private:
-    FavoritesDouble& _owner;
-  };
-
   std::mutex _lock;
   std::optional<Favorites> _favorites = Favorites();
 };
