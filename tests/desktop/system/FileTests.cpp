@@ -3,9 +3,7 @@
 #include <sys/resource.h>
 
 #include <cerrno>
-#include <filesystem>
 #include <iterator>
-#include <string>
 
 #include "desktop/system/AtomicFile.h"
 #include "support/TemporaryFolder.h"
