@@ -1,7 +1,6 @@
 #include <gmock/gmock.h>
 
 #include "analytics/NBTransitIncidentsAnalyticsDelegate.h"
-#include "platform/ui/ViewController.h"
 #include "support/TestPlatform.h"
 #include "support/TransitFixtures.h"
 #include "support/WidgetHostDouble.h"
@@ -12,19 +11,13 @@ namespace {
 using testing::ElementsAre;
 using Action = RecordingAnalyticsPipeline::Action;
 
-class Controller final : public ViewController {
- public:
-  explicit Controller(WidgetHost* host) : ViewController("", "", host) {}
-  std::string_view className() const override { return "Controller"; }
-};
-
 class Analytics : public testing::Test {
  protected:
   const RecordingAnalyticsPipeline::Interaction& closed() const { return platform.analytics.interactions.back(); }
 
   TestPlatform platform;
   WidgetHostDouble host;
-  std::shared_ptr<Controller> controller = std::make_shared<Controller>(&host);
+  std::shared_ptr<ViewControllerDouble> controller = std::make_shared<ViewControllerDouble>(&host);
   std::shared_ptr<NBTransitIncidentsAnalyticsDelegate> session =
       NBTransitIncidentsAnalyticsDelegate::initWithTransitIncidentsViewController(controller);
 };

@@ -4,7 +4,6 @@
 #include "handoff/NBOpenable.h"
 #include "handoff/NBUserActivityData.h"
 #include "platform/UserSession.h"
-#include "platform/ui/ViewController.h"
 #include "support/TestPlatform.h"
 #include "support/TransitFixtures.h"
 #include "support/WidgetHostDouble.h"
@@ -12,21 +11,10 @@
 namespace nimbo {
 namespace {
 
-class Controller final : public ViewController {
- public:
-  using ViewController::ViewController;
-  std::string_view className() const override { return "Controller"; }
-};
-
 class Openable : public testing::Test {
  protected:
-  struct Answer {
-    bool opened;
-    ErrorRef error;
-  };
-
   NBOpenable::Completion record() {
-    return [this](bool opened, const ErrorRef& error) { answers.push_back({opened, error}); };
+    return [this](bool opened, const ErrorRef& error) { answers.emplace_back(opened, error); };
   }
 
   static NBUserActivityDataRef data(std::optional<std::string> type, BoxedDictionary::Entries entries = {}) {
@@ -35,7 +23,7 @@ class Openable : public testing::Test {
   }
 
   TestPlatform platform;
-  std::vector<Answer> answers;
+  std::vector<std::pair<bool, ErrorRef>> answers;  // opened, or why not
 };
 
 TEST_F(Openable, ActivityDataIsTaggedWhenMadeAndComparedByWhatItStores) {
@@ -105,15 +93,15 @@ TEST_F(Openable, AnActivityThatCannotBeOpenedSaysWhy) {
   platform.activityLauncher.refusesToCreate = true;
   activity->openInContext_completionHandler(nullptr, record());
   ASSERT_EQ(answers.size(), 2u);
-  EXPECT_FALSE(answers[0].opened);
-  EXPECT_EQ(answers[0].error->domain(), "NimboActivityErrorDomain");
+  EXPECT_FALSE(answers[0].first);
+  EXPECT_EQ(answers[0].second->domain(), "NimboActivityErrorDomain");
   EXPECT_TRUE(answers[0]
-                  .error->userInfo()
+                  .second->userInfo()
                   ->objectForKey(kErrorDebugDescriptionKey)
                   ->isEqual(box("no appliction proxy object for current process").get()));
-  EXPECT_FALSE(answers[1].opened);
-  EXPECT_EQ(answers[1].error->domain(), "NBUserActivityErrorDomain");
-  EXPECT_EQ(answers[1].error->userInfo()->objectForKey("NBUserActivityErrorMissingActivityKey"), activity);
+  EXPECT_FALSE(answers[1].first);
+  EXPECT_EQ(answers[1].second->domain(), "NBUserActivityErrorDomain");
+  EXPECT_EQ(answers[1].second->userInfo()->objectForKey("NBUserActivityErrorMissingActivityKey"), activity);
   activity->openInContext_completionHandler(nullptr, nullptr);
   EXPECT_TRUE(platform.activityLauncher.opened.empty());
 }
@@ -121,7 +109,7 @@ TEST_F(Openable, AnActivityThatCannotBeOpenedSaysWhy) {
 TEST_F(Openable, AURLOpensThroughTheHostOfAViewController) {
   platform.random.numbers = {1, 2, 3, 4, 5, 6, 7, 8};
   WidgetHostDouble host;
-  const auto controller = std::make_shared<Controller>("", "", &host);
+  const auto controller = std::make_shared<ViewControllerDouble>(&host);
   const NBURLOpenable openable(URL("nimbo://?t=r"));
   const auto noController = std::make_shared<BoxedString>("context");
   openable.openInContext_completionHandler(noController.get(), record());
@@ -136,8 +124,8 @@ TEST_F(Openable, AURLOpensThroughTheHostOfAViewController) {
   for (const URL& url : host.openedURLs)
     EXPECT_EQ(url.absoluteString(), "nimbo://?t=r&session=" + session.value_or("?"));
   ASSERT_EQ(answers.size(), 2u);
-  EXPECT_TRUE(answers[0].opened);
-  EXPECT_FALSE(answers[1].opened);
+  EXPECT_TRUE(answers[0].first);
+  EXPECT_FALSE(answers[1].first);
   EXPECT_TRUE(openable.isEqual(std::make_shared<NBURLOpenable>(URL("nimbo://?t=r")).get()));
   EXPECT_FALSE(openable.isEqual(std::make_shared<NBURLOpenable>(URL("nimbo://")).get()));
 }

@@ -4,9 +4,6 @@
 #include <gmock/gmock.h>
 #include <unistd.h>
 
-#include <cstdlib>
-#include <filesystem>
-
 #include "desktop/raii/FileDescriptor.h"
 #include "host/Programs.h"
 #include "host/TerminalText.h"
@@ -20,6 +17,11 @@ using testing::HasSubstr;
 using testing::Not;
 
 const std::string kNow = "--now=2026-01-05T12:00:00Z";
+
+std::vector<std::string> words(const std::string& command) {
+  std::istringstream stream(command);
+  return {std::istream_iterator<std::string>(stream), {}};
+}
 
 TEST(CommandLine, ShowsTheSampleCityBeforeAnythingIsSetUp) {
   const Programs programs;
@@ -154,21 +156,13 @@ TEST(CommandLine, TellsWhereItsOutputCannotBeWritten) {
   programs.run({"settings", "set", "a", "b"});
   programs.run({"status", kNow});
   const std::string look = request("snapshot").dump();
-  for (const auto& command : std::vector<std::vector<std::string>>{{"--help"},
-                                                                   {"--version"},
-                                                                   {"status", kNow},
-                                                                   {"status", "--json", kNow},
-                                                                   {"status", "--waybar", kNow},
-                                                                   {"status", "--waybar", "--watch"},
-                                                                   {"feed", "list"},
-                                                                   {"feed", "check"},
-                                                                   {"lines"},
-                                                                   {"favorite", "list"},
-                                                                   {"settings", "get", "a"},
-                                                                   {"analytics"},
-                                                                   {"script", "-"}}) {
-    const ProgramRun run = programs.run(command, look, "/dev/full");
-    EXPECT_EQ(run.status, 1) << command.front();
+  for (const std::string& command :
+       {std::string("--help"), std::string("--version"), "status " + kNow, "status --json " + kNow,
+        "status --waybar " + kNow, std::string("status --waybar --watch"), std::string("feed list"),
+        std::string("feed check"), std::string("lines"), std::string("favorite list"), std::string("settings get a"),
+        std::string("analytics"), std::string("script -")}) {
+    const ProgramRun run = programs.run(words(command), look, "/dev/full");
+    EXPECT_EQ(run.status, 1) << command;
     EXPECT_THAT(run.errors, testing::StartsWith("nimbo-transit: cannot write to the standard output"));
   }
 }
@@ -191,27 +185,17 @@ TEST(CommandLine, PrintsNothingThatSteersATerminal) {
   programs.run({"feed", "add", "c" + hostile, "--static", feed, "--alerts", "/none" + hostile});
   programs.run({"favorite", "add", "c" + hostile + ":r" + hostile, "c" + hostile + ":m2"});
   programs.run({"settings", "set", "a", setting});
-  for (const auto& command : std::vector<std::vector<std::string>>{{"feed", "list"},
-                                                                   {"feed", "check"},
-                                                                   {"feed", "check", hostile},
-                                                                   {"lines"},
-                                                                   {"lines", "none" + hostile},
-                                                                   {"favorite", "add", hostile + ":m2"},
-                                                                   {"favorite", "list"},
-                                                                   {"status", kNow},
-                                                                   {"status", "--json", kNow},
-                                                                   {"status", "--waybar", kNow},
-                                                                   {"analytics"},
-                                                                   {"settings", "get", hostile},
-                                                                   {"decode", feed + hostile},
-                                                                   {"script", "-"},
-                                                                   {hostile},
-                                                                   {"--" + hostile}}) {
-    const ProgramRun run = programs.run(command, R"({"jsonrpc":"2.0","id":")" + hostile + R"(","method":"dance"})");
+  for (const std::string& command :
+       {std::string("feed list"), std::string("feed check"), "feed check " + hostile, std::string("lines"),
+        "lines none" + hostile, "favorite add " + hostile + ":m2", std::string("favorite list"), "status " + kNow,
+        "status --json " + kNow, "status --waybar " + kNow, std::string("analytics"), "settings get " + hostile,
+        "decode " + feed + hostile, std::string("script -"), hostile, "--" + hostile}) {
+    const ProgramRun run =
+        programs.run(words(command), R"({"jsonrpc":"2.0","id":")" + hostile + R"(","method":"dance"})");
     const std::string printed = run.output + run.errors;
     for (const char* steering : {"\x1b", "\u202e", "\xC2\x9B"})
-      EXPECT_THAT(printed, Not(HasSubstr(steering))) << command.front();
-    EXPECT_NE(printed, "") << command.front();
+      EXPECT_THAT(printed, Not(HasSubstr(steering))) << command;
+    EXPECT_NE(printed, "") << command;
   }
 
   // Another program gets the setting as it was stored.

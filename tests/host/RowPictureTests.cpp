@@ -3,7 +3,6 @@
 #include <cairo.h>
 #include <gmock/gmock.h>
 
-#include <array>
 #include <cctype>
 
 #include "desktop/drawing/Ink.h"
@@ -128,6 +127,8 @@ class RowPictures : public testing::Test {
     return {snapshots(lines).at(0), Picture(memory.take(drawn).value())};
   }
 
+  void expectRows(const json& parameters, bool isExpanded);
+
   Programs programs;
 };
 
@@ -178,6 +179,13 @@ void expectOrder(const json& row, const Picture& picture, bool isMirrored) {
   }
 }
 
+void RowPictures::expectRows(const json& parameters, bool isExpanded) {
+  SCOPED_TRACE(parameters.dump() + (isExpanded ? " expanded" : " compact"));
+  const auto [snapshot, picture] = draw(parameters, isExpanded);
+  ASSERT_EQ(snapshot["rows"].size(), isExpanded ? 4u : 1u);
+  for (const json& row : snapshot["rows"]) expectOrder(row, picture, parameters.value("locale", "") == "ar");
+}
+
 TEST_F(RowPictures, AreInOrderInEverySizeLanguageAndAppearance) {
   setUpCity(1, {{"x", {"m1", "m2"}, "Signal failure at the castle", "Trains run every ten minutes."},
                 {"y", {"m1", "b0"}, "Marathon", "Streets are closed and stops have moved until the evening."}});
@@ -193,12 +201,7 @@ TEST_F(RowPictures, AreInOrderInEverySizeLanguageAndAppearance) {
                         {{"textSize", "accessibilityLarge"}},
                         {{"textSize", "accessibilityExtraExtraExtraLarge"}, {"displayModes", tall}}};
   for (const json& parameters : cases)
-    for (const bool isExpanded : {false, true}) {
-      SCOPED_TRACE(parameters.dump() + (isExpanded ? " expanded" : " compact"));
-      const auto [snapshot, picture] = draw(parameters, isExpanded);
-      ASSERT_EQ(snapshot["rows"].size(), isExpanded ? 4u : 1u);
-      for (const json& row : snapshot["rows"]) expectOrder(row, picture, parameters.value("locale", "") == "ar");
-    }
+    for (const bool isExpanded : {false, true}) expectRows(parameters, isExpanded);
 }
 
 TEST_F(RowPictures, KeepShieldsOffTheTextsHoweverNarrowTheyAre) {
@@ -212,12 +215,8 @@ TEST_F(RowPictures, KeepShieldsOffTheTextsHoweverNarrowTheyAre) {
     for (const auto& [textSize, height] : {std::pair("large", 110), {"accessibilityExtraExtraExtraLarge", 343}})
       for (const char* locale : {"en", "ar"})
         for (const bool isExpanded : {false, true}) {
-          SCOPED_TRACE(std::to_string(width) + " " + textSize + " " + locale + (isExpanded ? " expanded" : ""));
           const json sizes = {{"compact", {width, height}}, {"expanded", {width, 4 * height}}};
-          const auto [snapshot, picture] =
-              draw({{"displayModes", sizes}, {"textSize", textSize}, {"locale", locale}}, isExpanded);
-          ASSERT_EQ(snapshot["rows"].size(), isExpanded ? 4u : 1u);
-          for (const json& row : snapshot["rows"]) expectOrder(row, picture, locale == std::string("ar"));
+          expectRows({{"displayModes", sizes}, {"textSize", textSize}, {"locale", locale}}, isExpanded);
         }
 }
 
@@ -226,10 +225,8 @@ TEST_F(RowPictures, CountTheShieldsThatDoNotFit) {
     setUpCity(lines);
     for (const int width : {200, 359})
       for (const char* locale : {"en", "ar"}) {
-        SCOPED_TRACE(std::to_string(lines) + " " + std::to_string(width) + " " + locale);
         const json sizes = {{"compact", {width, 110}}, {"expanded", {width, 440}}};
-        const auto [snapshot, picture] = draw({{"displayModes", sizes}, {"locale", locale}}, false);
-        expectOrder(snapshot["rows"][0], picture, locale == std::string("ar"));
+        expectRows({{"displayModes", sizes}, {"locale", locale}}, false);
       }
   }
 }

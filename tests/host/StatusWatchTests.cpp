@@ -3,8 +3,6 @@
 #include <gmock/gmock.h>
 
 #include <csignal>
-#include <cstdlib>
-#include <filesystem>
 
 #include "host/Programs.h"
 #include "host/StatusWatch.h"

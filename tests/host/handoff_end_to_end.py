@@ -37,6 +37,7 @@ with tempfile.TemporaryDirectory() as folder:
 
     summary, incident, second, overflow, clear = opened
     assert clear["url"].startswith("nimbo://?favorites=2&t=r&session="), clear
+    assert incident["application"] == "org.example.Host", incident
     for activity in (summary, overflow):
         assert activity["activityType"].endswith(".Transit.IncidentList")
         payload = base64.b64decode(activity["userInfo"]["incidentListKey"])

@@ -9,8 +9,6 @@
 namespace nimbo {
 namespace {
 
-using testing::ElementsAre;
-
 /// What a fetch delivers for `items` under the settings in force.
 TransitLineItems fetched(TestPlatform& platform, const TransitLineItems& items) {
   platform.favorites.setFavorites(Favorites{std::make_shared<const FavoriteTransitLine>(items.at(0))});
@@ -61,13 +59,14 @@ TEST(FakeIncidents, AreStrikesFromYesterdayUntilTomorrow) {
              tomorrow = dateByAdding(now, 86400);
   const auto fake = DebugTransitIncident::__debug_fakeIncidentAffectingLine(*lineItem(1000, "Red"));
   const std::string message = "Something Bad™ happened";
-  EXPECT_THAT(std::vector({fake->title(), fake->summary(), fake->fullDescription(), fake->messageForRoutePlanning(),
-                           fake->messageForRouteStepping(), fake->messageForNonRoutable()}),
-              ElementsAre("Something Bad™", "Red · Possible delays due to strike",
-                          "Only one train out of three is working due to national strike of public transit workers.",
-                          message, message, message));
+  EXPECT_THAT(
+      std::vector({fake->title(), fake->summary(), fake->fullDescription(), fake->messageForRoutePlanning(),
+                   fake->messageForRouteStepping(), fake->messageForNonRoutable()}),
+      testing::ElementsAre("Something Bad™", "Red · Possible delays due to strike",
+                           "Only one train out of three is working due to national strike of public transit workers.",
+                           message, message, message));
   EXPECT_THAT(std::vector({fake->startDate(), fake->endDate(), fake->creationDate(), fake->lastUpdated()}),
-              ElementsAre(yesterday, tomorrow, yesterday, now));
+              testing::ElementsAre(yesterday, tomorrow, yesterday, now));
   EXPECT_EQ(fake->muid(), 1001u);
   EXPECT_EQ(fake->iconType(), 1);
   EXPECT_TRUE(fake->isBlockingIncident());
@@ -77,16 +76,10 @@ TEST(FakeIncidents, AreStrikesFromYesterdayUntilTomorrow) {
 }
 
 TEST(FakeIncidents, StandOnALineThatIsTheRealOneInAllElse) {
+  const auto system = std::make_shared<const TransitSystem>(1, "System", nullptr);
   const auto line = std::make_shared<const BasicTransitLineItem>(
-      BasicTransitLineItem::Fields{std::make_shared<const MapItemIdentifier>(7),
-                                   "Red",
-                                   std::make_shared<const TransitSystem>(1, "System", nullptr),
-                                   shieldArtwork("1"),
-                                   shieldArtwork("2"),
-                                   shieldArtwork("3"),
-                                   "#ff0000",
-                                   true,
-                                   {}});
+      BasicTransitLineItem::Fields{std::make_shared<const MapItemIdentifier>(7), "Red", system, shieldArtwork("1"),
+                                   shieldArtwork("2"), shieldArtwork("3"), "#ff0000", true, TransitIncidents()});
   const TransitIncidents incidents{incident(1)};
   const std::shared_ptr<const TransitLineItem> fake = DebugTransitLineItem::initWithLine_incidents(line, incidents);
   const auto answers = [](const TransitLineItem& item) {

@@ -15,7 +15,6 @@ namespace nimbo {
 namespace {
 
 using testing::ElementsAre;
-using testing::StartsWith;
 
 class Fetcher : public testing::Test {
  protected:
@@ -79,9 +78,10 @@ TEST_F(Fetcher, LooksAllLinesUpAtOnceAndTellsEveryHandlerInOrder) {
   request->addHandler(hear(4));
   using Heard = std::pair<int, ResultRef>;
   EXPECT_THAT(heard, ElementsAre(Heard{1, result}, Heard{2, result}, Heard{3, result}, Heard{4, result}));
-  EXPECT_THAT(platform.log.texts("TransitWidget", LogLevel::debug),
-              ElementsAre("Received 4 favorites from container.",
-                          StartsWith("Issuing favorite lines lookup request for Muids"), "Received 2 line items."));
+  EXPECT_THAT(
+      platform.log.texts("TransitWidget", LogLevel::debug),
+      ElementsAre("Received 4 favorites from container.",
+                  testing::StartsWith("Issuing favorite lines lookup request for Muids"), "Received 2 line items."));
 }
 
 TEST_F(Fetcher, DeliversTheErrorOfTheServiceAsItCame) {

@@ -7,8 +7,6 @@
 namespace nimbo {
 namespace {
 
-using testing::ElementsAreArray;
-
 ErrorRef error(int code) { return Error::errorWithDomain_code_reason("Domain", code, "reason"); }
 ResultRef success(const char* text) { return Result::resultWithValue(box(text)); }
 
@@ -63,7 +61,7 @@ TEST(Result, CallsTheBlockOfWhatItHoldsAndComplainsOfMissingOnes) {
     const Result::ErrorBlock errorBlock = [&](const ErrorRef& e) { called += "error " + std::to_string(e->code()); };
     result->withValue_orError(c.hasValueBlock ? valueBlock : nullptr, c.hasErrorBlock ? errorBlock : nullptr);
     EXPECT_EQ(called, c.called);
-    EXPECT_THAT(platform.log.texts("Result", LogLevel::error), ElementsAreArray(c.complaints));
+    EXPECT_THAT(platform.log.texts("Result", LogLevel::error), testing::ElementsAreArray(c.complaints));
   }
 }
 

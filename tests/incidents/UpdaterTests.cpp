@@ -8,7 +8,6 @@ namespace nimbo {
 namespace {
 
 using testing::ElementsAre;
-using testing::IsEmpty;
 using Minutes = std::optional<int>;  // from the start of the test's clock
 
 Date at(int minutes) { return dateByAdding(TestPlatform::startDate(), 60.0 * minutes); }
@@ -75,7 +74,7 @@ TEST_F(Updater, TellsEachDateOnceAndAsksForARefreshAtEachInterval) {
   EXPECT_EQ(observer->refreshes, 0);
   platform.time.advance(75 * 60);
   EXPECT_THAT(observer->expired, ElementsAre(at(10), at(70)));
-  EXPECT_THAT(updater->updateDates(), IsEmpty());
+  EXPECT_THAT(updater->updateDates(), testing::IsEmpty());
   EXPECT_EQ(observer->refreshes, 3);
   for (const auto& line : platform.log.lines()) {
     EXPECT_EQ(line.level, LogLevel::debug) << line.text;

@@ -14,19 +14,20 @@
 namespace nimbo {
 namespace {
 
-/// Checks that makers give objects equal to their own second making, with equal hashes, and to no other's.
-template <class Maker>
-void expectEachEqualOnlyToItself(const std::vector<Maker>& makers) {
-  for (std::size_t i = 0; i < makers.size(); ++i) {
-    for (std::size_t j = 0; j < makers.size(); ++j) {
-      const ObjectRef a = makers[i](), b = makers[j]();
-      EXPECT_EQ(a->isEqual(b.get()), i == j) << i << " " << j;
-      EXPECT_TRUE(i != j || a->hash() == b->hash()) << i;
+/// Checks that each of the objects is equal to its own second making, with an equal hash, and to no other's.
+void expectEachEqualOnlyToItself(const std::function<std::vector<ObjectRef>()>& make) {
+  const auto first = make(), second = make();
+  for (std::size_t i = 0; i < first.size(); ++i)
+    for (std::size_t j = 0; j < first.size(); ++j) {
+      EXPECT_EQ(first[i]->isEqual(second[j].get()), i == j) << i << " " << j;
+      EXPECT_TRUE(i != j || first[i]->hash() == second[j]->hash()) << i;
     }
-  }
 }
 
-using Maker = std::function<ObjectRef()>;
+template <class... Refs>
+std::vector<ObjectRef> objects(Refs... refs) {
+  return {std::move(refs)...};
+}
 
 NBConfiguredArtworkRef artworkNamed(const char* name, double alpha = kFullArtworkAlpha) {
   return NBConfiguredArtwork::initWithArtworkSource_alpha(NamedImage::imageNamed(name), alpha);
@@ -45,11 +46,11 @@ TEST(ConfiguredArtwork, IsEqualByAlphaAndByWhatTheSourceArchivesTo) {
     return NBConfiguredArtwork::initWithArtworkSource_alpha(
         SizedTransitArtwork::initWithArtwork_shieldSize_artworkCache(shieldArtwork(text), size, nullptr), 1.0);
   };
-  expectEachEqualOnlyToItself<Maker>({[] { return artworkNamed("good"); }, [] { return artworkNamed("bad"); },
-                                      [] { return artworkNamed("good", kDimmedArtworkAlpha); },
-                                      [] { return NBConfiguredArtwork::initWithArtworkSource_alpha(nullptr, 1.0); },
-                                      [&] { return sized("A", 7); }, [&] { return sized("A", 6); },
-                                      [&] { return sized("B", 7); }});
+  expectEachEqualOnlyToItself([&] {
+    return objects(artworkNamed("good"), artworkNamed("bad"), artworkNamed("good", kDimmedArtworkAlpha),
+                   NBConfiguredArtwork::initWithArtworkSource_alpha(nullptr, 1.0), sized("A", 7), sized("A", 6),
+                   sized("B", 7));
+  });
 }
 
 TEST(TransitItem, CopiesItselfAndIsNoEqualOfADerivedItem) {
@@ -67,12 +68,12 @@ TEST(TransitItem, CopiesItselfAndIsNoEqualOfADerivedItem) {
 
 TEST(TransitItem, IsEqualFieldByField) {
   const TestPlatform platform;
-  expectEachEqualOnlyToItself<Maker>({[] { return item("a"); }, [] { return item(std::nullopt); },
-                                      [] { return item(""); }, [] { return item("a", "b"); },
-                                      [] { return item("a", std::nullopt, artworkNamed("good")); },
-                                      [] { return item("a", std::nullopt, nullptr, true); },
-                                      [] { return item("a", std::nullopt, nullptr, false, "nimbo://1"); },
-                                      [] { return item("a", std::nullopt, nullptr, false, "nimbo://2"); }});
+  expectEachEqualOnlyToItself([&] {
+    return objects(item("a"), item(std::nullopt), item(""), item("a", "b"),
+                   item("a", std::nullopt, artworkNamed("good")), item("a", std::nullopt, nullptr, true),
+                   item("a", std::nullopt, nullptr, false, "nimbo://1"),
+                   item("a", std::nullopt, nullptr, false, "nimbo://2"));
+  });
 }
 
 TEST(SummaryItem, IsEqualByTextShieldsInOrderAndActivity) {
@@ -86,31 +87,23 @@ TEST(SummaryItem, IsEqualByTextShieldsInOrderAndActivity) {
     fields.accessibilityText = text;
     return std::make_shared<const TransitArtwork>(std::move(fields));
   };
-  expectEachEqualOnlyToItself<Maker>({[&] {
-                                        return summary("2", {shieldArtwork("A"), shieldArtwork("B")}, nullptr);
-                                      },
-                                      [&] {
-                                        return summary("2", {shieldArtwork("B"), shieldArtwork("A")}, nullptr);
-                                      },
-                                      [&] { return summary("2", {shieldArtwork("A")}, nullptr); },
-                                      [&] { return summary("2", {accessible("Line A")}, nullptr); },
-                                      [&] { return summary("3", {shieldArtwork("A")}, nullptr); },
-                                      [&] { return summary("3", {shieldArtwork("A")}, "type"); }});
+  expectEachEqualOnlyToItself([&] {
+    return objects(summary("2", {shieldArtwork("A"), shieldArtwork("B")}, nullptr),
+                   summary("2", {shieldArtwork("B"), shieldArtwork("A")}, nullptr),
+                   summary("2", {shieldArtwork("A")}, nullptr), summary("2", {accessible("Line A")}, nullptr),
+                   summary("3", {shieldArtwork("A")}, nullptr), summary("3", {shieldArtwork("A")}, "type"));
+  });
 }
 
 TEST(ListItem, IsEqualByItsRows) {
   const auto list = [](ObjectRef summary, std::optional<NBTransitItems> items) {
     return NBTransitListItem::initWithSummaryItem_expandedItems(std::move(summary), std::move(items));
   };
-  expectEachEqualOnlyToItself<Maker>({[&] { return list(item("a"), NBTransitItems{}); },
-                                      [&] { return list(item("b"), NBTransitItems{}); },
-                                      [&] { return list(item("a"), std::nullopt); },
-                                      [&] {
-                                        return list(item("a"), NBTransitItems{item("x"), item("y")});
-                                      },
-                                      [&] {
-                                        return list(item("a"), NBTransitItems{item("y"), item("x")});
-                                      }});
+  expectEachEqualOnlyToItself([&] {
+    return objects(list(item("a"), NBTransitItems{}), list(item("b"), NBTransitItems{}), list(item("a"), std::nullopt),
+                   list(item("a"), NBTransitItems{item("x"), item("y")}),
+                   list(item("a"), NBTransitItems{item("y"), item("x")}));
+  });
 }
 
 TEST(IncidentFilter, ShowsWhatIsInForceNow) {

@@ -8,9 +8,23 @@
 namespace nimbo {
 
 /// Favourites that a test sets. Any thread.
-class FavoritesDouble final : public FavoritesPersisters {
+class FavoritesDouble final : public FavoritesPersisters, public FavoritesPersister {
  public:
-  std::shared_ptr<FavoritesPersister> remotePersister() override { return std::make_shared<Persister>(*this); }
+  std::shared_ptr<FavoritesPersister> remotePersister() override { return {std::shared_ptr<void>(), this}; }
+  std::optional<Favorites> readFavorites() override {
+    std::unique_lock guard(_lock);
+    if (auto proceed = std::move(_proceed); proceed.valid()) {
+      guard.unlock();
+      proceed.wait();
+      guard.lock();
+    }
+    return _favorites;
+  }
+  std::optional<Favorites> favoritesUnread(const ErrorRef& reason) override {
+    const std::lock_guard guard(_lock);
+    _unreadReason = reason->reason();
+    return _unread;
+  }
 
   /// What the store gives for favourites that were not read, and why they were not, once they were not.
   void setUnread(std::optional<Favorites> favorites) {
@@ -35,28 +49,6 @@ class FavoritesDouble final : public FavoritesPersisters {
   }
 
  private:
-  class Persister final : public FavoritesPersister {
-   public:
-    explicit Persister(FavoritesDouble& owner) : _owner(owner) {}
-    std::optional<Favorites> readFavorites() override {
-      std::unique_lock guard(_owner._lock);
-      if (auto proceed = std::move(_owner._proceed); proceed.valid()) {
-        guard.unlock();
-        proceed.wait();
-        guard.lock();
-      }
-      return _owner._favorites;
-    }
-    std::optional<Favorites> favoritesUnread(const ErrorRef& reason) override {
-      const std::lock_guard guard(_owner._lock);
-      _owner._unreadReason = reason->reason();
-      return _owner._unread;
-    }
-
-   private:
-    FavoritesDouble& _owner;
-  };
-
   mutable std::mutex _lock;
   std::optional<Favorites> _favorites = Favorites(), _unread;
   std::string _unreadReason;

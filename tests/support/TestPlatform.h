@@ -20,11 +20,16 @@ namespace nimbo {
 class TestPlatform final {
  public:
   /// The given archive and compressor, where there are any, replace the doubles; they outlive this.
-  explicit TestPlatform(KeyedArchive* archiveInForce = nullptr, Compressor* compressorInForce = nullptr);
-  ~TestPlatform();
+  explicit TestPlatform(KeyedArchive* archiveInForce = nullptr, Compressor* compressorInForce = nullptr)
+      : platform({time, loop, log, signposts, random, strings, settings, favorites, transitLines, network,
+                  memoryPressure, activityLauncher, analytics, deviceLockState,
+                  archiveInForce ? *archiveInForce : archive, compressorInForce ? *compressorInForce : compressor,
+                  images, text, shieldRenderer}) {}
+  /// What queued work holds goes while the platform is still in force.
+  ~TestPlatform() { loop.clear(); }
 
   /// The date at which the clock starts.
-  static Date startDate();
+  static Date startDate() { return *dateFromISOText("2026-01-05T12:00:00Z"); }
 
   VirtualTime time{startDate()};
   TestRunLoop loop{time};

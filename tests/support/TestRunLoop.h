@@ -19,18 +19,34 @@ class TestRunLoop final : public RunLoop {
   explicit TestRunLoop(VirtualTime& time) : _time(time) {}
 
   bool isCurrent() const override { return std::this_thread::get_id() == _thread; }
-  void dispatchAsync(std::function<void()> work) override;
+  void dispatchAsync(std::function<void()> work) override {
+    const std::lock_guard guard(_lock);
+    _queue.push_back(std::move(work));
+    _arrived.notify_all();
+  }
   std::shared_ptr<Timer> scheduleTimer(TimeInterval interval, bool repeats, std::function<void(Timer&)> fire) override {
     return std::make_shared<TolerantTimer>(_time.scheduleTimer(interval, repeats, std::move(fire)), tolerances);
   }
   std::vector<TimeInterval> tolerances;  ///< given to the timers so far
 
   /// Runs the queued work, and what that queues, until none is left.
-  void runUntilIdle();
+  void runUntilIdle() {
+    while (runOne()) {
+    }
+  }
 
   /// Runs work as it comes, from other threads too, until `done` holds; asked after each piece and after each `wake`.
   /// Throws std::runtime_error when that takes unreasonably long.
-  void waitAndDrain(const std::function<bool()>& done);
+  void waitAndDrain(const std::function<bool()>& done) {
+    // A guard against waiting for ever in a broken program; a working one never gets near it.
+    const auto deadline = std::chrono::steady_clock::now() + std::chrono::seconds(30);
+    while (!done()) {
+      if (runOne()) continue;
+      std::unique_lock guard(_lock);
+      if (!_arrived.wait_until(guard, deadline, [this] { return !_queue.empty(); }))
+        throw std::runtime_error("waited in vain for work from another thread");
+    }
+  }
 
   /// Makes `waitAndDrain` look again. Any thread.
   void wake() {
@@ -38,7 +54,12 @@ class TestRunLoop final : public RunLoop {
   }
 
   /// Drops the queued work.
-  void clear();
+  void clear() {
+    std::unique_lock guard(_lock);
+    const auto dropped = std::move(_queue);
+    _queue.clear();
+    guard.unlock();  // what the work holds may queue more as it goes
+  }
 
  private:
   /// Virtual time is never late: only records by how much it might be.
@@ -52,7 +73,15 @@ class TestRunLoop final : public RunLoop {
     std::vector<TimeInterval>& tolerances;
   };
 
-  bool runOne();
+  bool runOne() {
+    std::unique_lock guard(_lock);
+    if (_queue.empty()) return false;
+    const auto work = std::move(_queue.front());
+    _queue.pop_front();
+    guard.unlock();
+    work();
+    return true;
+  }
 
   VirtualTime& _time;
   const std::thread::id _thread = std::this_thread::get_id();

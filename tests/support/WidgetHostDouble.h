@@ -2,6 +2,7 @@
 
 #include <vector>
 
+#include "platform/ui/ViewController.h"
 #include "platform/ui/WidgetHost.h"
 
 namespace nimbo {
@@ -28,6 +29,13 @@ class WidgetHostDouble final : public WidgetHost {
   bool opens = true;  ///< what `openURL` reports
   std::vector<URL> openedURLs;
   std::vector<Size> preferredSizes;
+};
+
+/// A controller that does nothing.
+class ViewControllerDouble final : public ViewController {
+ public:
+  explicit ViewControllerDouble(WidgetHost* host) : ViewController("", "", host) {}
+  std::string_view className() const override { return "ViewControllerDouble"; }
 };
 
 }  // namespace nimbo

@@ -1,7 +1,5 @@
 #include <gmock/gmock.h>
 
-#include <array>
-
 #include "platform/ui/Environment.h"
 #include "support/TestPlatform.h"
 #include "ui/DynamicTypeWizard.h"

@@ -9,9 +9,6 @@ namespace nimbo {
 namespace {
 
 using testing::ElementsAre;
-using testing::IsEmpty;
-using testing::Optional;
-using testing::Pointee;
 
 TEST(NimboMap, KeepsInOrderWhatIsAnsweredForElementsAndTheirPositions) {
   std::vector<std::size_t> positions;
@@ -19,9 +16,9 @@ TEST(NimboMap, KeepsInOrderWhatIsAnsweredForElementsAndTheirPositions) {
     positions.push_back(position);
     return element % 2 == 1 ? std::make_shared<int>(2 * element) : nullptr;
   };
-  EXPECT_THAT(NimboMap(std::vector{1, 2, 3}, doubledIfOdd), ElementsAre(Pointee(2), Pointee(6)));
+  EXPECT_THAT(NimboMap(std::vector{1, 2, 3}, doubledIfOdd), ElementsAre(testing::Pointee(2), testing::Pointee(6)));
   EXPECT_THAT(positions, ElementsAre(0, 1, 2));
-  EXPECT_THAT(NimboMap(std::optional(std::vector{2}), doubledIfOdd), Optional(IsEmpty()));
+  EXPECT_THAT(NimboMap(std::optional(std::vector{2}), doubledIfOdd), testing::Optional(testing::IsEmpty()));
   EXPECT_EQ(NimboMap(std::optional<std::vector<int>>(), doubledIfOdd), std::nullopt);
   EXPECT_THAT(NimboMap(std::vector{1}, [](int one, std::size_t) { return std::optional(one); }), ElementsAre(1));
 }

@@ -128,38 +128,25 @@ TEST_F(Archive, StatesComeBackWithTheirResult) {
   EXPECT_EQ(content["root"], json({{"$class", "NBTransitIncidentViewControllerState"}, {"expanded", false}}));
 }
 
-/// Everything that rows, the updater and the map application ask a line item, as a text.
-std::string answersOf(const TransitLineItem& item) {
-  const auto text = [](const std::optional<std::string>& value) { return value ? "'" + *value + "' " : "- "; };
-  const auto date = [](std::optional<Date> value) { return value ? isoTextOfDate(*value) + " " : "- "; };
-  const auto artwork = [&](const TransitArtworkRef& value) {
-    if (!value) return std::string("- ");
-    std::string all = text(value->accessibilityText()) + std::to_string(value->artworkSourceType());
-    if (const auto& shield = value->shieldDataSource())
-      all += text(shield->shieldText) + text(shield->shieldColorString) + text(shield->shieldTextColorString);
-    if (const auto& icon = value->iconDataSource()) all += std::to_string(icon->defaultTransitType);
-    return all;
-  };
-  std::string all = std::to_string(item.muid()) + text(item.name()) + text(item.lineColorString());
-  if (const auto& locator = item.identifier()->locator())
-    all += locator->feed + locator->agencyID + locator->routeID + locator->shortName +
-           std::to_string(static_cast<int>(locator->mode));
-  if (item.system())
-    all += std::to_string(item.system()->muid()) + text(item.system()->name()) + artwork(item.system()->artwork());
-  all += artwork(item.artwork()) + artwork(item.modeArtwork()) + artwork(item.alternateArtwork());
-  for (const bool flag :
-       {item.isBus(), item.hasLineColorString(), item.showVehicleNumber(), item.hasIncidentComponent(),
-        item.departuresAreVehicleSpecific(), item.isIncidentsTTLExpired(), item.hasEncyclopedicInfo()})
-    all += flag ? "y" : "n";
-  for (const TransitIncidentRef& i : item.incidents()) {
-    all += "\n" + std::to_string(i->muid()) + text(i->title()) + text(i->summary()) + text(i->fullDescription()) +
-           text(i->messageForRoutePlanning()) + text(i->messageForRouteStepping()) + text(i->messageForNonRoutable()) +
-           date(i->startDate()) + date(i->endDate()) + date(i->creationDate()) + date(i->lastUpdated()) +
-           std::to_string(i->iconType()) + (i->isBlockingIncident() ? "blocking" : "") + text(i->linkURL());
-    for (const auto& entity : i->affectedEntities())
-      all += std::to_string(entity->muid()) + (entity->hasNextStopIDs() ? "stops" : "");
-  }
-  return all;
+/// What rows, the updater and the map application ask an incident.
+auto answersOf(const TransitIncident& i) {
+  std::vector<std::pair<std::uint64_t, bool>> entities;
+  for (const auto& entity : i.affectedEntities()) entities.emplace_back(entity->muid(), entity->hasNextStopIDs());
+  return std::tuple(i.muid(), i.title(), i.summary(), i.fullDescription(), i.messageForRoutePlanning(),
+                    i.messageForRouteStepping(), i.messageForNonRoutable(), i.startDate(), i.endDate(),
+                    i.creationDate(), i.lastUpdated(), i.iconType(), i.isBlockingIncident(), i.linkURL(), entities);
+}
+
+/// What they ask a line item, but for its artworks.
+auto answersOf(const TransitLineItem& item) {
+  std::vector<decltype(answersOf(*item.incidents()[0]))> incidents;
+  for (const TransitIncidentRef& incident : item.incidents()) incidents.push_back(answersOf(*incident));
+  const auto& system = item.system();
+  return std::tuple(item.muid(), item.name(), item.lineColorString(), item.identifier()->locator(),
+                    system ? std::pair(system->muid(), system->name()) : std::pair(std::uint64_t{0}, item.name()),
+                    item.isBus(), item.hasLineColorString(), item.showVehicleNumber(), item.hasIncidentComponent(),
+                    item.departuresAreVehicleSpecific(), item.isIncidentsTTLExpired(), item.hasEncyclopedicInfo(),
+                    incidents);
 }
 
 TransitLineItemRef wholeLineItem() {
@@ -206,11 +193,23 @@ TEST_F(Archive, RestoredLineItemsAnswerLikeTheFetchedOnes) {
       [](const ErrorRef&) {});
   ASSERT_EQ(restored.size(), items.size());
   for (std::size_t index = 0; index < items.size(); ++index) {
-    EXPECT_EQ(answersOf(*restored[index]), answersOf(*items[index]));
-    EXPECT_TRUE(restored[index]->artwork()->isEqual(items[index]->artwork().get()));
+    const TransitLineItem &item = *items[index], &again = *restored[index];
+    ASSERT_TRUE(answersOf(again) == answersOf(item)) << index;
+    EXPECT_TRUE(again.artwork()->isEqual(item.artwork().get()));
+    EXPECT_TRUE(artworksAreEquivalent(again.modeArtwork().get(), item.modeArtwork().get()));
+    EXPECT_TRUE(artworksAreEquivalent(again.alternateArtwork().get(), item.alternateArtwork().get()));
+    EXPECT_TRUE(!item.system() ||
+                artworksAreEquivalent(again.system()->artwork().get(), item.system()->artwork().get()));
     // A snapshot of the snapshot is the same again.
     EXPECT_TRUE(StoredTransitLineItem::initWithLineItem(restored[index])->isEqual(restored[index].get()));
   }
+}
+
+TEST_F(Archive, TheEarlierClassNameIsReadAsAState) {
+  const auto state = State::unarchiveFromData_error(
+      archiveOf({{"$class", "NBTransitListItemData"}, {"lineItemResultSuccess", json::array()}, {"expanded", true}}),
+      nullptr);
+  EXPECT_TRUE(state && state->expanded());
 }
 
 TEST_F(Archive, BrokenStatesEndInNothingAndOnlyUndecodableOnesInAnError) {
@@ -219,13 +218,8 @@ TEST_F(Archive, BrokenStatesEndInNothingAndOnlyUndecodableOnesInAnError) {
     fields.emplace("$class", "NBTransitIncidentViewControllerState");
     return archiveOf(fields);
   };
-  const auto raw = [](std::string_view hex) {
-    Bytes bytes;
-    for (std::size_t i = 0; i + 1 < hex.size(); i += 2)
-      bytes.push_back(static_cast<std::uint8_t>(std::stoi(std::string(hex.substr(i, 2)), nullptr, 16)));
-    return bytes;
-  };
-  const std::string marker = "a2682461726368697665";  // a map of two, "$archive"
+  const auto raw = [](const std::string& bytes) { return Bytes(bytes.begin(), bytes.end()); };
+  const std::string root = "\xa2\x68$archive\x01\x64root", most(8, '\xff');  // a map of two, up to the root
   json deep = 1;
   for (int i = 0; i < 1000; ++i) deep = json::array({deep});
   Bytes withRest = state({{"lineItemResultSuccess", json::array()}});
@@ -241,19 +235,17 @@ TEST_F(Archive, BrokenStatesEndInNothingAndOnlyUndecodableOnesInAnError) {
       {archiveOf(deep), ""},
       {withRest, ""},
       {Bytes(std::size_t{100} << 20), ""},
-      {raw(marker + "0164726f6f749bffffffffffffffff"), ""},               // an array of 2^64 - 1
-      {raw(marker + "0164726f6f745bffffffffffffffff00"), ""},             // as many bytes
-      {raw(marker + "0164726f6f747bffffffffffffffff61"), ""},             // as long a text
-      {raw("a3682461726368697665016161016161" + std::string("02")), ""},  // a key twice
-      {raw(marker + "0164726f6f74c100"), ""},                             // a tag
-      {archiveOf(std::vector<int>(300000)), ""},                          // too many values
+      {raw(root + "\x9b" + most), ""},                      // an array of 2^64 - 1
+      {raw(root + "\x5b" + most + "."), ""},                // as many bytes
+      {raw(root + "\x7b" + most + "."), ""},                // as long a text
+      {raw("\xa3\x68$archive\x01\x61x\x01\x61x\x02"), ""},  // a key twice
+      {raw(root + "\xc1" + '\0'), ""},                      // a tag
+      {archiveOf(std::vector<int>(300000)), ""},            // too many values
       // Archives without a state, or with one that holds no result.
       {json::to_cbor({{"$archive", 1}}), ""},
       {state({{"expanded", true}}), ""},
       {state({{"lineItemResultSuccess", line}}), ""},
       {archiveOf(1), ""},
-      {archiveOf(json::array()), ""},
-      {archiveOf({{"$class", "Foreign"}}), ""},
       // Archives that hold what may not stand there.
       {archiveOf(nullptr), "root: null stands where an object is needed"},
       {archiveOf(json::object()), "root: the object has no class name"},
@@ -338,15 +330,6 @@ TEST_F(Archive, SavedRowsThatDoNotDecodeAreRemovedAndOthersKept) {
   controller->viewWillDisappear(false);
   EXPECT_TRUE(platform.log.contains("couldnt be converted to Blob"));
   EXPECT_EQ(store->dataForKey(kKey), saved);
-}
-
-TEST_F(Archive, TheEarlierClassNameIsReadAsAState) {
-  ErrorRef error;
-  const auto state = State::unarchiveFromData_error(
-      archiveOf({{"$class", "NBTransitListItemData"}, {"lineItemResultSuccess", json::array()}, {"expanded", true}}),
-      &error);
-  ASSERT_TRUE(state) << error->reason();
-  EXPECT_TRUE(state->expanded());
 }
 
 }  // namespace

@@ -1,7 +1,6 @@
 #include <gtest/gtest.h>
 
 #include <cmath>
-#include <filesystem>
 #include <limits>
 
 #include "desktop/drawing/CairoImage.h"
@@ -17,25 +16,26 @@ constexpr Color kRed{1, 0, 0, 1}, kNone{0, 0, 0, 0};
 
 TEST(Picture, RefusesSizesThatNoMemoryHolds) {
   constexpr double kInfinity = std::numeric_limits<double>::infinity();
-  struct Case {
-    Size size;
-    double scale;
-    int width;  // 0: refused
-    int height;
-  };
-  for (const Case& c :
-       {Case{{0, 1}, 1, 1, 1}, Case{{320, 110}, 2, 640, 220}, Case{{10.1, 3}, 10, 101, 30}, Case{{3, 3}, 0.5, 2, 2},
-        Case{{10000, 110}, 1, 10000, 110}, Case{{10000, 10000}, 4, 0, 0}, Case{{10000, 1}, 4, 0, 0},
-        Case{{-1, 1}, 1, 0, 0}, Case{{1, 1}, 0, 0, 0}, Case{{std::nan(""), 1}, 1, 0, 0}, Case{{1, kInfinity}, 1, 0, 0},
-        Case{{1, 1}, kInfinity, 0, 0}}) {
-    const auto made = CairoSurface::make(c.size, c.scale);
-    ASSERT_EQ(bool(made), c.width > 0) << c.size.width << " " << c.scale;
-    if (made) {
-      EXPECT_EQ((*made)->pixelWidth(), c.width);
-      EXPECT_EQ((*made)->pixelHeight(), c.height);
-    } else {
-      EXPECT_EQ(made.error()->code(), kDrawingErrorBadSize);
-    }
+  for (const auto& [size, scale, width, height] : {std::tuple{Size{0, 1}, 1.0, 1, 1},
+                                                   {{320, 110}, 2, 640, 220},
+                                                   {{10.1, 3}, 10, 101, 30},
+                                                   {{3, 3}, 0.5, 2, 2},
+                                                   {{10000, 110}, 1, 10000, 110}}) {
+    const auto made = CairoSurface::make(size, scale);
+    ASSERT_TRUE(made) << size.width << " " << scale;
+    EXPECT_EQ((*made)->pixelWidth(), width);
+    EXPECT_EQ((*made)->pixelHeight(), height);
+  }
+  for (const auto& [size, scale] : {std::pair{Size{10000, 10000}, 4.0},
+                                    {{10000, 1}, 4},
+                                    {{-1, 1}, 1},
+                                    {{1, 1}, 0},
+                                    {{std::nan(""), 1}, 1},
+                                    {{1, kInfinity}, 1},
+                                    {{1, 1}, kInfinity}}) {
+    const auto made = CairoSurface::make(size, scale);
+    ASSERT_FALSE(made) << size.width << " " << scale;
+    EXPECT_EQ(made.error()->code(), kDrawingErrorBadSize);
   }
 }
 

@@ -1,8 +1,6 @@
 #include <gtest/gtest.h>
 
 #include <algorithm>
-#include <string>
-#include <vector>
 
 #include "desktop/drawing/CairoShieldRenderer.h"
 #include "desktop/drawing/Ink.h"
@@ -101,17 +99,15 @@ TEST_F(Shields, KnowTheirShapes) {
 }
 
 TEST_F(Shields, KeepTheirTextLegible) {
-  struct Case {
-    const char* color;
-    const char* textColor;
-    std::uint32_t expected;
-  };
   // The agency's colour where it contrasts, else black or white, whichever contrasts more.
-  for (const Case& c :
-       {Case{"#000000", "#ffff00", 0xffff00}, Case{"#fccc0a", "#ffffff", 0x000000}, Case{"fccc0a", nullptr, 0x000000},
-        Case{"#0039A6", "#000000", 0xffffff}, Case{"#0039a6", "blue", 0xffffff}, Case{"#0039a6", " ", 0xffffff}}) {
-    const Ink ink(render(shieldOf(ShieldType::roundedBox, "HH", c.color, c.textColor)));
-    EXPECT_GT(ink.ofColor(c.expected).count, 50u) << c.color;
+  for (const auto& [color, textColor, expected] : {std::tuple{"#000000", "#ffff00", 0xffff00u},
+                                                   {"#fccc0a", "#ffffff", 0x000000u},
+                                                   {"fccc0a", nullptr, 0x000000u},
+                                                   {"#0039A6", "#000000", 0xffffffu},
+                                                   {"#0039a6", "blue", 0xffffffu},
+                                                   {"#0039a6", " ", 0xffffffu}}) {
+    const Ink ink(render(shieldOf(ShieldType::roundedBox, "HH", color, textColor)));
+    EXPECT_GT(ink.ofColor(expected).count, 50u) << color;
   }
   for (const bool night : {false, true})
     for (const char* color : {"#777777", "#7c878e", "#ff6319", static_cast<const char*>(nullptr)}) {

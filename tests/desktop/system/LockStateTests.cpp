@@ -1,9 +1,4 @@
 #include <gmock/gmock.h>
-#include <gtest/gtest.h>
-#include <stdlib.h>
-
-#include <filesystem>
-#include <string>
 
 #include "desktop/system/SoftLinkedDeviceLockState.h"
 #include "support/TemporaryFolder.h"
@@ -18,8 +13,6 @@ extern "C" const char* __tsan_default_suppressions() {
 
 namespace nimbo {
 namespace {
-
-using testing::ElementsAre;
 
 TEST(SoftLinkedDeviceLockState, OpensTheFirstLibraryThatThereIs) {
   TestPlatform platform;
@@ -47,7 +40,7 @@ TEST(SoftLinkedDeviceLockState, CountsAsUnlockedWithoutALibraryAndLooksOnce) {
   std::filesystem::copy_file(FAKE_LOCK_STATE_1, library);
   EXPECT_EQ(state.getDeviceLockState(), 0);
   EXPECT_THAT(platform.log.texts("TransitWidget", LogLevel::error),
-              ElementsAre("### Failed to Soft Linked: " + library.native()));
+              testing::ElementsAre("### Failed to Soft Linked: " + library.native()));
 }
 
 TEST(LockStateLibrary, CountsAsUnlockedWithoutABus) {

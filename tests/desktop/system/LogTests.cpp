@@ -1,15 +1,8 @@
 #include <fcntl.h>
 #include <gmock/gmock.h>
-#include <gtest/gtest.h>
-#include <stdlib.h>
 #include <sys/stat.h>
 
-#include <memory>
-#include <span>
 #include <stdexcept>
-#include <string>
-#include <tuple>
-#include <vector>
 
 #include "desktop/raii/FileDescriptor.h"
 #include "desktop/system/LogSink.h"

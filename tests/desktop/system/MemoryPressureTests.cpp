@@ -3,9 +3,6 @@
 #include <sys/stat.h>
 #include <unistd.h>
 
-#include <memory>
-#include <string>
-
 #include "desktop/raii/FileDescriptor.h"
 #include "desktop/system/LinuxMemoryPressure.h"
 #include "support/TemporaryFolder.h"

@@ -1,8 +1,5 @@
 #include <gtest/gtest.h>
 
-#include <map>
-#include <string>
-
 #include "desktop/system/LinuxNetworkFailureDiagnosis.h"
 #include "support/TemporaryFolder.h"
 
@@ -20,6 +17,7 @@ const std::string kUnreachable6 =
     kZeros + " 00 " + kZeros + " 00 " + kZeros + " ffffffff 00000001 00000000 00200200       lo\n";
 
 TEST(LinuxNetworkFailureDiagnosis, ReadsRadiosAndRoutes) {
+  using enum NetworkFailure;
   using Files = std::map<std::string, std::string>;
   const Files kNoRoute{{"proc/net/route", kNearOnly}, {"proc/net/ipv6_route", kUnreachable6}};
   const auto noRouteAnd = [&](Files files) {
@@ -43,22 +41,21 @@ TEST(LinuxNetworkFailureDiagnosis, ReadsRadiosAndRoutes) {
     Files files;
     NetworkFailure expected;
   } kCases[] = {
-      {"nothing to read", {}, NetworkFailure::unknown},
-      {"a route", {{"proc/net/route", kDefault4}}, NetworkFailure::unknown},
+      {"nothing to read", {}, unknown},
+      {"a route", {{"proc/net/route", kDefault4}}, unknown},
       {"a route of version 6 only",
        {{"proc/net/route", kRoutes4}, {"proc/net/ipv6_route", kUnreachable6 + kDefault6}},
-       NetworkFailure::unknown},
-      {"no route", kNoRoute, NetworkFailure::noInternet},
-      {"an unreachable default", {{"proc/net/route", kRejected4}}, NetworkFailure::noInternet},
-      {"a table cut off", {{"proc/net/route", "eth0\t00000000"}}, NetworkFailure::noInternet},
-      {"all radios blocked", noRouteAnd(radios("1\n", "bluetooth\n", "1\n")), NetworkFailure::airplaneMode},
-      {"all radios blocked, cable in", blockedWithRoute, NetworkFailure::unknown},
-      {"one radio free", noRouteAnd(radios("1\n", "bluetooth\n", "0\n")), NetworkFailure::noInternet},
-      {"mobile data down", noRouteAnd(mobile("down\n")), NetworkFailure::cellularDataDisabled},
-      {"mobile data up", noRouteAnd(mobile("unknown\n")), NetworkFailure::noInternet},
-      {"modem without an interface", noRouteAnd({{"sys/class/wwan/wwan0/uevent", ""}}),
-       NetworkFailure::cellularDataDisabled},
-      {"mobile radio blocked", noRouteAnd(radios("0\n", "wwan\n", "1\n")), NetworkFailure::cellularDataDisabled},
+       unknown},
+      {"no route", kNoRoute, noInternet},
+      {"an unreachable default", {{"proc/net/route", kRejected4}}, noInternet},
+      {"a table cut off", {{"proc/net/route", "eth0\t00000000"}}, noInternet},
+      {"all radios blocked", noRouteAnd(radios("1\n", "bluetooth\n", "1\n")), airplaneMode},
+      {"all radios blocked, cable in", blockedWithRoute, unknown},
+      {"one radio free", noRouteAnd(radios("1\n", "bluetooth\n", "0\n")), noInternet},
+      {"mobile data down", noRouteAnd(mobile("down\n")), cellularDataDisabled},
+      {"mobile data up", noRouteAnd(mobile("unknown\n")), noInternet},
+      {"modem without an interface", noRouteAnd({{"sys/class/wwan/wwan0/uevent", ""}}), cellularDataDisabled},
+      {"mobile radio blocked", noRouteAnd(radios("0\n", "wwan\n", "1\n")), cellularDataDisabled},
   };
   for (const auto& test : kCases) {
     const TemporaryFolder root;

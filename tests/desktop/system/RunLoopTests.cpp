@@ -1,17 +1,10 @@
 #include <gmock/gmock.h>
-#include <gtest/gtest.h>
 #include <sys/resource.h>
 #include <sys/socket.h>
 #include <unistd.h>
 
 #include <algorithm>
-#include <array>
-#include <functional>
-#include <memory>
 #include <stdexcept>
-#include <string>
-#include <thread>
-#include <vector>
 
 #include "desktop/raii/FileDescriptor.h"
 #include "desktop/system/GLibRunLoop.h"

@@ -2,8 +2,6 @@
 #include <sys/mman.h>
 #include <unistd.h>
 
-#include <cstdint>
-
 #include "desktop/system/SmallMemory.h"
 
 namespace nimbo {

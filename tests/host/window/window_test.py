@@ -2,6 +2,7 @@
 """The window as its user has it. usage: window_test.py tour|faults NIMBO_TRANSIT_DESKTOP NIMBO_TRANSIT WIDGET"""
 import json
 import os
+import pathlib
 import re
 import signal
 import socket
@@ -38,12 +39,10 @@ def publish(folder, headers):
               "routes.txt": "route_id,agency_id,route_short_name,route_long_name,route_type,route_color\n"
                             "m1,M,1,Harbour Line,1,005599\nm2,M,2,Castle Line,1,CC0000\nm3,M,3,Ring,1,\n"}
     for name, table in tables.items():
-        with open(os.path.join(folder, name), "w") as file:
-            file.write(table)
+        pathlib.Path(folder, name).write_text(table)
     alerts = [(2, message((1, header), (5, message((5, message((2, "m1"))), (10, message((1, message((1, header)))))))))
               for header in headers]
-    with open(os.path.join(folder, "alerts.pb"), "wb") as file:
-        file.write(message((1, message((1, "2.0"), (3, int(time.time())))), *alerts))
+    pathlib.Path(folder, "alerts.pb").write_bytes(message((1, message((1, "2.0"), (3, int(time.time())))), *alerts))
 
 
 def open_url(url):
@@ -205,8 +204,7 @@ def faults(session, folder):
     windows = []
     for number, program in enumerate(FAULTS):
         path = os.path.join(folder, f"widget{number}")
-        with open(path, "w") as file:
-            file.write(program)
+        pathlib.Path(path).write_text(program)
         os.chmod(path, stat.S_IRWXU)
         windows.append(Window(session, desktop, "--state", path + ".state", NIMBO_TRANSIT_WIDGET=path))
     for window, reason in zip(windows, FAULTS.values()):
@@ -233,15 +231,14 @@ def faults(session, folder):
     told, gate = os.path.join(folder, "told"), os.path.join(folder, "gate")
     os.mkfifo(gate)
     path = os.path.join(folder, "listening")
-    with open(path, "w") as file:
-        file.write(f"#!/bin/sh\ntee '{told}' | '{widget}' \"$@\" | {{ read -r go <'{gate}'; cat; }}\n")
+    pathlib.Path(path).write_text(
+        f"#!/bin/sh\ntee '{told}' | '{widget}' \"$@\" | {{ read -r go <'{gate}'; cat; }}\n")
     os.chmod(path, stat.S_IRWXU)
     window = Window(session, desktop, "--state", path + ".state", NIMBO_TRANSIT_WIDGET=path)
     identifier = window.comes_to_front()
     window.click("Menu")
     press("key", "Escape")
-    with open(gate, "w") as file:
-        file.write("The window has its size before it hears of the widget's.\n")
+    pathlib.Path(gate).write_text("The window has its size before it hears of the widget's.\n")
     window.see("4 Advisories", "push button")
     with open(told) as file:
         sizes = wait("the window's width", lambda: [json.loads(line)["params"]["size"] for line in file
@@ -261,8 +258,7 @@ def faults(session, folder):
     with sqlite3.connect(path + ".state/state.sqlite") as state:  # as before the first rows
         state.execute("DELETE FROM settings WHERE key = 'Nimbo.TransitWidget.savedUIData'")
     window = Window(session, desktop, "--state", path + ".state", NIMBO_TRANSIT_WIDGET=path)
-    with open(gate, "w") as file:
-        file.write("\n")
+    pathlib.Path(gate).write_text("\n")
     window.see("Show Less")
     window.comes_to_front()
     window.quit()

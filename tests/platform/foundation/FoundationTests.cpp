@@ -4,9 +4,6 @@
 #include <future>
 #include <limits>
 #include <stdexcept>
-#include <string>
-#include <thread>
-#include <vector>
 
 #include "platform/SerialQueue.h"
 #include "platform/VirtualTime.h"

@@ -33,14 +33,23 @@ std::shared_ptr<StyledLabel> label(const std::string& text, std::size_t lines = 
   return view;
 }
 
+void activate(const std::vector<LayoutConstraintRef>& constraints) {
+  LayoutConstraint::activateConstraints(constraints);
+}
+
 class Layout : public testing::Test {
  protected:
   Layout() { root->setFrame({0, 0, 200, 100}); }
 
   /// Pins a view to the root's leading top corner.
   void pinToCorner(View& view) {
-    LayoutConstraint::activateConstraints({view.leadingAnchor().constraintEqualToAnchor(root->leadingAnchor()),
-                                           view.topAnchor().constraintEqualToAnchor(root->topAnchor())});
+    activate({view.leadingAnchor().constraintEqualToAnchor(root->leadingAnchor()),
+              view.topAnchor().constraintEqualToAnchor(root->topAnchor())});
+  }
+
+  Rect laidOut(const View& view) {
+    root->layoutIfNeeded();
+    return view.frame();
   }
 
   TestPlatform platform;
@@ -53,30 +62,24 @@ TEST_F(Layout, FollowsConstantsPrioritiesAndActiveFlags) {
   const auto narrow = box->widthAnchor().constraintEqualToConstant(30);
   const auto wide = box->widthAnchor().constraintEqualToConstant(90);
   wide->setPriority(400);
-  LayoutConstraint::activateConstraints(
-      {narrow, wide, box->bottomAnchor().constraintEqualToAnchor(root->bottomAnchor(), -20)});
-  root->layoutIfNeeded();
-  EXPECT_EQ(box->frame(), (Rect{0, 0, 30, 80}));
+  activate({narrow, wide, box->bottomAnchor().constraintEqualToAnchor(root->bottomAnchor(), -20)});
+  EXPECT_EQ(laidOut(*box), (Rect{0, 0, 30, 80}));
   narrow->setConstant(40);
-  root->layoutIfNeeded();
-  EXPECT_EQ(box->frame().width, 40);
+  EXPECT_EQ(laidOut(*box).width, 40);
   narrow->setPriority(399);
-  root->layoutIfNeeded();
-  EXPECT_EQ(box->frame().width, 90);
+  EXPECT_EQ(laidOut(*box).width, 90);
   wide->setActive(false);
   box->layoutIfNeeded();
   EXPECT_EQ(box->frame().width, 40);
   root->setFrame({0, 0, 200, 60});
-  root->layoutIfNeeded();
-  EXPECT_EQ(box->frame(), (Rect{0, 0, 40, 40}));
+  EXPECT_EQ(laidOut(*box), (Rect{0, 0, 40, 40}));
   const auto half = constrainedView(*box, "half");
-  LayoutConstraint::activateConstraints({half->bottomAnchor().constraintEqualToAnchor(half->centerYAnchor(), 9),
-                                         half->trailingAnchor().constraintEqualToAnchor(root->trailingAnchor(), -50),
-                                         half->leadingAnchor().constraintEqualToAnchor(box->leadingAnchor())});
+  activate({half->bottomAnchor().constraintEqualToAnchor(half->centerYAnchor(), 9),
+            half->trailingAnchor().constraintEqualToAnchor(root->trailingAnchor(), -50),
+            half->leadingAnchor().constraintEqualToAnchor(box->leadingAnchor())});
   for (const double width : {100, 110}) {
     root->setFrame({0, 0, width, 60});
-    root->layoutIfNeeded();
-    EXPECT_EQ(half->frame().size(), (Size{width - 50, 18}));
+    EXPECT_EQ(laidOut(*half).size(), (Size{width - 50, 18}));
   }
   EXPECT_TRUE(platform.log.lines().empty());
 }
@@ -87,7 +90,7 @@ TEST_F(Layout, LogsAContradictionOnceAndLeavesTheBoundOutWhileItLasts) {
   const auto height = box->heightAnchor().constraintEqualToConstant(10);
   const auto minimum = box->heightAnchor().constraintGreaterThanOrEqualToConstant(40);
   minimum->setIdentifier("room for a finger");
-  LayoutConstraint::activateConstraints({minimum, height});
+  activate({minimum, height});
   for (int i = 0; i < 3; ++i) {
     root->layoutIfNeeded();
     root->setNeedsUpdateConstraints();
@@ -101,15 +104,12 @@ TEST_F(Layout, LogsAContradictionOnceAndLeavesTheBoundOutWhileItLasts) {
   height->setConstant(50);
   root->layoutIfNeeded();
   minimum->setConstant(60);
-  root->layoutIfNeeded();
-  EXPECT_EQ(box->frame().height, 50);
+  EXPECT_EQ(laidOut(*box).height, 50);
   height->setActive(false);
-  root->layoutIfNeeded();
-  EXPECT_EQ(box->frame().height, 60);
+  EXPECT_EQ(laidOut(*box).height, 60);
   platform.log.clear();
   box->heightAnchor().constraintLessThanOrEqualToConstant(20)->setActive(true);
-  root->layoutIfNeeded();
-  EXPECT_EQ(box->frame().height, 60) << "the bound that came last is left out";
+  EXPECT_EQ(laidOut(*box).height, 60) << "the bound that came last is left out";
   EXPECT_THAT(platform.log.texts("Layout"), SizeIs(1));
 }
 
@@ -118,16 +118,14 @@ TEST_F(Layout, ChangesThatFitOnlyTogetherAreNoContradiction) {
   pinToCorner(*box);
   const auto least = box->widthAnchor().constraintGreaterThanOrEqualToConstant(10);
   const auto most = box->widthAnchor().constraintLessThanOrEqualToConstant(20);
-  LayoutConstraint::activateConstraints({least, most});
+  activate({least, most});
   root->layoutIfNeeded();
   least->setConstant(30);
   most->setConstant(40);
-  root->layoutIfNeeded();
-  EXPECT_GE(box->frame().width, 30);
+  EXPECT_GE(laidOut(*box).width, 30);
   least->setConstant(5);
   most->setConstant(6);
-  root->layoutIfNeeded();
-  EXPECT_LE(box->frame().width, 6);
+  EXPECT_LE(laidOut(*box).width, 6);
   EXPECT_TRUE(platform.log.lines().empty());
 }
 
@@ -153,40 +151,35 @@ TEST_F(Layout, MirrorsLeadingAndTrailing) {
   const auto box = constrainedView(*root, "box");
   const auto guide = std::make_shared<LayoutGuide>();
   root->addLayoutGuide(guide);
-  LayoutConstraint::activateConstraints({box->leadingAnchor().constraintEqualToAnchor(root->leadingAnchor(), 8),
-                                         box->trailingAnchor().constraintEqualToAnchor(byHand->trailingAnchor(), -20),
-                                         box->topAnchor().constraintEqualToAnchor(byHand->topAnchor()),
-                                         box->bottomAnchor().constraintEqualToAnchor(byHand->bottomAnchor(), 1),
-                                         guide->leadingAnchor().constraintEqualToAnchor(box->trailingAnchor()),
-                                         guide->trailingAnchor().constraintEqualToAnchor(root->trailingAnchor())});
-  root->layoutIfNeeded();
-  EXPECT_EQ(box->frame(), (Rect{8, 7, 32, 21}));
+  activate({box->leadingAnchor().constraintEqualToAnchor(root->leadingAnchor(), 8),
+            box->trailingAnchor().constraintEqualToAnchor(byHand->trailingAnchor(), -20),
+            box->topAnchor().constraintEqualToAnchor(byHand->topAnchor()),
+            box->bottomAnchor().constraintEqualToAnchor(byHand->bottomAnchor(), 1),
+            guide->leadingAnchor().constraintEqualToAnchor(box->trailingAnchor()),
+            guide->trailingAnchor().constraintEqualToAnchor(root->trailingAnchor())});
+  EXPECT_EQ(laidOut(*box), (Rect{8, 7, 32, 21}));
   EXPECT_EQ(guide->layoutFrame(), (Rect{40, 0, 160, 0}));
   // A frame set by hand stays where it is: its trailing edge is now the left one.
   root->setRightToLeft(true);
-  root->layoutIfNeeded();
-  EXPECT_EQ(byHand->frame().x, 10);
+  EXPECT_EQ(laidOut(*byHand).x, 10);
   EXPECT_EQ(box->frame(), (Rect{30, 7, 162, 21}));
   EXPECT_EQ(guide->layoutFrame(), (Rect{0, 0, 30, 0}));
   root->setRightToLeft(std::nullopt);
   platform.strings.rightToLeft = true;
   root->setNeedsUpdateConstraints();
-  root->layoutIfNeeded();
-  EXPECT_EQ(box->frame().x, 30);
+  EXPECT_EQ(laidOut(*box).x, 30);
 }
 
 TEST_F(Layout, PutsEdgesOnDevicePixelsOfTheScreen) {
   Environment::current().setScreenScale(2);
   const auto box = constrainedView(*root, "box");
-  LayoutConstraint::activateConstraints({box->leadingAnchor().constraintEqualToAnchor(root->leadingAnchor(), 3.3),
-                                         box->widthAnchor().constraintEqualToConstant(10.3),
-                                         box->centerYAnchor().constraintEqualToAnchor(root->centerYAnchor()),
-                                         box->heightAnchor().constraintEqualToConstant(7.5)});
-  root->layoutIfNeeded();
-  EXPECT_EQ(box->frame(), (Rect{3.5, 46.5, 10, 7.5}));
+  activate({box->leadingAnchor().constraintEqualToAnchor(root->leadingAnchor(), 3.3),
+            box->widthAnchor().constraintEqualToConstant(10.3),
+            box->centerYAnchor().constraintEqualToAnchor(root->centerYAnchor()),
+            box->heightAnchor().constraintEqualToConstant(7.5)});
+  EXPECT_EQ(laidOut(*box), (Rect{3.5, 46.5, 10, 7.5}));
   Environment::current().setScreenScale(1);
-  root->layoutIfNeeded();
-  EXPECT_EQ(box->frame(), (Rect{3, 46, 11, 8}));
+  EXPECT_EQ(laidOut(*box), (Rect{3, 46, 11, 8}));
 }
 
 TEST_F(Layout, StackArrangesOnBaselinesAndClosesGaps) {
@@ -201,25 +194,20 @@ TEST_F(Layout, StackArrangesOnBaselinesAndClosesGaps) {
   stack->widthAnchor().constraintEqualToConstant(120)->setActive(true);
   const auto marker = constrainedView(*root, "marker");
   marker->topAnchor().constraintEqualToAnchor(stack->lastBaselineAnchor())->setActive(true);
-  root->layoutIfNeeded();
-  EXPECT_EQ(stack->frame(), (Rect{0, 0, 120, 77}));
+  EXPECT_EQ(laidOut(*stack), (Rect{0, 0, 120, 77}));
   EXPECT_EQ(second->frame(), (Rect{0, 30, 120, 17}));
   EXPECT_EQ(marker->frame().y, 74);  // 60 and the ascent of 13.6
   third->setHidden(true);
-  root->layoutIfNeeded();
-  EXPECT_EQ(stack->frame().height, 47);
+  EXPECT_EQ(laidOut(*stack).height, 47);
   EXPECT_EQ(marker->frame().y, 44);
   EXPECT_EQ(third->frame(), (Rect{0, 47, 120, 0}));
   first->setHidden(true);
-  root->layoutIfNeeded();
-  EXPECT_EQ(stack->frame().height, 17);
+  EXPECT_EQ(laidOut(*stack).height, 17);
   first->setHidden(false);
   stack->setSpacing(50);
-  root->layoutIfNeeded();
-  EXPECT_EQ(second->frame().y, 50);
+  EXPECT_EQ(laidOut(*second).y, 50);
   stack->setBaselineRelativeArrangement(false);
-  root->layoutIfNeeded();
-  EXPECT_EQ(second->frame().y, 67);
+  EXPECT_EQ(laidOut(*second).y, 67);
 }
 
 TEST_F(Layout, AStackByItselfIsLaidOutAndKeepsDrawingsOnBaselinesApart) {
@@ -276,9 +264,9 @@ TEST_F(Layout, LabelTakesTheLinesItsWidthNeeds) {
     const auto text = label(c.text, c.lines);
     text->setUsesAutomaticConstraints(false);
     view->addSubview(text);
-    LayoutConstraint::activateConstraints({text->leadingAnchor().constraintEqualToAnchor(view->leadingAnchor()),
-                                           text->topAnchor().constraintEqualToAnchor(view->topAnchor()),
-                                           text->trailingAnchor().constraintEqualToAnchor(view->trailingAnchor())});
+    activate({text->leadingAnchor().constraintEqualToAnchor(view->leadingAnchor()),
+              text->topAnchor().constraintEqualToAnchor(view->topAnchor()),
+              text->trailingAnchor().constraintEqualToAnchor(view->trailingAnchor())});
     if (c.height > 0) text->heightAnchor().constraintLessThanOrEqualToConstant(c.height)->setActive(true);
     view->layoutIfNeeded();
     SCOPED_TRACE(std::string(c.text).substr(0, 20) + " in " + std::to_string(c.height));
@@ -299,12 +287,11 @@ TEST_F(Layout, ShortOfRoomTheLastTextGivesWayButKeepsItsFirstLine) {
   stack->addArrangedSubview(second);
   pinToCorner(*stack);
   const auto height = stack->heightAnchor().constraintLessThanOrEqualToConstant(90);
-  LayoutConstraint::activateConstraints({height, stack->widthAnchor().constraintEqualToConstant(10)});
+  activate({height, stack->widthAnchor().constraintEqualToConstant(10)});
   for (const auto& [room, firstHeight, secondHeight] :
        {std::array{200, 51, 102}, {90, 51, 34}, {70, 51, 17}, {40, 17, 17}, {25, 17, 8}, {90, 51, 34}}) {
     height->setConstant(room);
-    root->layoutIfNeeded();
-    EXPECT_EQ(first->frame().height, firstHeight) << room;
+    EXPECT_EQ(laidOut(*first).height, firstHeight) << room;
     EXPECT_EQ(second->frame(), (Rect{0, static_cast<double>(firstHeight), 10, static_cast<double>(secondHeight)}))
         << room;
   }

@@ -10,8 +10,6 @@
 
 #include <cstdio>
 #include <iostream>
-#include <string>
-#include <vector>
 
 #include "platform/ui/layout/LayoutSolver.h"
 
@@ -19,9 +17,9 @@ using nimbo::LayoutSolver;
 
 namespace {
 
-void printConflict(const std::vector<LayoutSolver::ConstraintId>& conflict) {
-  std::printf("no");
-  for (const auto id : conflict) std::printf(" %u", static_cast<unsigned>(id));
+void answer(bool isAccepted, const std::vector<LayoutSolver::ConstraintId>& ids) {
+  std::printf(isAccepted ? "yes" : "no");
+  for (const auto id : ids) std::printf(" %u", static_cast<unsigned>(id));
   std::printf("\n");
 }
 
@@ -53,19 +51,13 @@ int main() {
         constraint.terms.push_back({variables.at(variable), coefficient});
       }
       const auto added = solver.addConstraint(constraint);
-      if (added.accepted)
-        std::printf("yes %u\n", static_cast<unsigned>(added.id));
-      else
-        printConflict(added.conflict);
+      answer(added.accepted, added.accepted ? std::vector{added.id} : added.conflict);
     } else if (word == "set") {
       unsigned id = 0;
       double constant = 0;
       std::cin >> id >> constant;
       const auto conflict = solver.setConstant(LayoutSolver::ConstraintId{id}, constant);
-      if (conflict.empty())
-        std::printf("yes\n");
-      else
-        printConflict(conflict);
+      answer(conflict.empty(), conflict);
     } else if (word == "remove") {
       unsigned id = 0;
       std::cin >> id;

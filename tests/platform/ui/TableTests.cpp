@@ -10,9 +10,6 @@
 namespace nimbo {
 namespace {
 
-using testing::ElementsAre;
-using testing::SizeIs;
-
 /// A cell whose constraints want a height.
 class TallCell final : public StyledTableCell {
  public:
@@ -118,7 +115,7 @@ TEST_F(Table, CellsThatFallOutAreUsedAgain) {
   EXPECT_EQ(table->cellForRowAtIndexPath({0, 0}), first);
   EXPECT_EQ(table->cellForRowAtIndexPath({0, 2}), last);
   EXPECT_EQ(rectOf(2), (Rect{0, 66, 300, 48}));
-  EXPECT_THAT(table->subviews(), SizeIs(3));
+  EXPECT_THAT(table->subviews(), testing::SizeIs(3));
   EXPECT_THROW(table->dequeueReusableCellWithIdentifier_forIndexPath("unknown", {0, 0}), std::invalid_argument);
 }
 
@@ -126,7 +123,7 @@ TEST_F(Table, TapsOnlyWhatMayBeHighlighted) {
   rows->dead = {1};
   EXPECT_TRUE(table->selectRowAtIndexPath({0, 2}));
   EXPECT_FALSE(table->selectRowAtIndexPath({0, 1}));
-  EXPECT_THAT(rows->selected, ElementsAre(2));
+  EXPECT_THAT(rows->selected, testing::ElementsAre(2));
   EXPECT_EQ(table->highlightedRow(), std::nullopt);
 
   table->highlightRowAtIndexPath(IndexPath{0, 0});
@@ -151,7 +148,7 @@ TEST_F(Table, DrawsSeparatorsBetweenRowsAndTheTouchedRow) {
   RecordingPainter painter;
   root->draw(painter);
   EXPECT_EQ(painter.clips.at(0), table->bounds());
-  ASSERT_THAT(painter.fills, SizeIs(3));
+  ASSERT_THAT(painter.fills, testing::SizeIs(3));
   EXPECT_EQ(painter.fills[0].rect, (Rect{0, 27.5, 300, 0.5}));
   EXPECT_EQ(painter.fills[0].color, effect->color(Appearance::light));
   EXPECT_EQ(painter.fills[1].rect, (Rect{0, 28, 300, 38}));

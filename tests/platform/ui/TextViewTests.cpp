@@ -12,22 +12,12 @@
 namespace nimbo {
 namespace {
 
-using testing::SizeIs;
-
-TEST(SystemColors, TextsAreReadableInBothAppearances) {
-  for (const Appearance appearance : {Appearance::light, Appearance::dark})
-    for (const SystemColor behind : {SystemColor::background, SystemColor::rowHighlight})
-      for (const Color& text : {colorOf(SystemColor::label, appearance), colorOf(SystemColor::systemGrey, appearance),
-                                VisualEffect(101).color(appearance), VisualEffect(102).color(appearance)})
-        EXPECT_GE(contrastRatio(text, colorOf(behind, appearance)), 4.5);
-}
-
 TEST(SystemColors, AreThoseOfThePalette) {
-  const std::tuple<SystemColor, const char*, const char*> colors[] = {{SystemColor::background, "f6f6f8", "1e1e20"},
-                                                                      {SystemColor::label, "000000", "ffffff"},
-                                                                      {SystemColor::systemGrey, "606066", "a6a6ac"},
-                                                                      {SystemColor::rowHighlight, "e2e2e6", "343438"}};
-  for (const auto& [color, light, dark] : colors) {
+  using enum SystemColor;
+  for (const auto& [color, light, dark] : {std::tuple{background, "f6f6f8", "1e1e20"},
+                                           {label, "000000", "ffffff"},
+                                           {systemGrey, "606066", "a6a6ac"},
+                                           {rowHighlight, "e2e2e6", "343438"}}) {
     EXPECT_EQ(colorOf(color, Appearance::light), colorFromHexText(light));
     EXPECT_EQ(colorOf(color, Appearance::dark), colorFromHexText(dark));
   }
@@ -80,26 +70,20 @@ class TransitInfoLabel : public testing::Test {
 };
 
 TEST_F(TransitInfoLabel, KeepsAsManyShieldsAsFitWithTheirCount) {
-  struct Case {
-    std::size_t count;
-    double width;
-    std::size_t shown;
-    const char* text;
-  };
-  for (const Case& c : {Case{3, 94, 3, ""},
-                        {3, 93, 2, "+1"},
-                        {3, 82, 1, "+2"},
-                        {10, 325, 10, ""},
-                        {10, 40, 0, "+10"},
-                        {1, 10, 0, "+1"},
-                        {1, 0, 0, ""},
-                        {0, 50, 0, ""}}) {
-    label->setLabelItems({shields.begin(), shields.begin() + static_cast<std::ptrdiff_t>(c.count)});
-    setMaxWidth(c.width);
-    EXPECT_EQ(label->numberOfShownItems(), c.shown) << c.count << " in " << c.width;
-    EXPECT_EQ(label->truncationText(), c.text) << c.count << " in " << c.width;
+  for (const auto& [count, width, shown, text] : {std::tuple{3, 94, 3u, ""},
+                                                  {3, 93, 2u, "+1"},
+                                                  {3, 82, 1u, "+2"},
+                                                  {10, 325, 10u, ""},
+                                                  {10, 40, 0u, "+10"},
+                                                  {1, 10, 0u, "+1"},
+                                                  {1, 0, 0u, ""},
+                                                  {0, 50, 0u, ""}}) {
+    label->setLabelItems({shields.begin(), shields.begin() + count});
+    setMaxWidth(width);
+    EXPECT_EQ(label->numberOfShownItems(), shown) << count << " in " << width;
+    EXPECT_EQ(label->truncationText(), text) << count << " in " << width;
     root->layoutIfNeeded();
-    EXPECT_LE(label->frame().width, c.width);
+    EXPECT_LE(label->frame().width, width);
   }
 }
 
@@ -119,11 +103,11 @@ TEST_F(TransitInfoLabel, DrawsShieldsOnTheMiddleOfItsCapitals) {
     EXPECT_EQ(label->frame(), (Rect{mirrored ? 18.0 : 0.0, 0, 102, 28}));
     RecordingPainter painter;
     root->draw(painter);
-    ASSERT_THAT(painter.pictures, SizeIs(3));
+    ASSERT_THAT(painter.pictures, testing::SizeIs(3));
     EXPECT_EQ(painter.pictures[0].alpha, 1);
     EXPECT_EQ(painter.pictures[0].rect, (Rect{mirrored ? 92.0 : 0.0, 0, 28, 28}));
     EXPECT_EQ(painter.pictures[1].rect, (Rect{mirrored ? 73.0 : 33.0, 7, 14, 14}));
-    ASSERT_THAT(painter.texts, SizeIs(1));
+    ASSERT_THAT(painter.texts, testing::SizeIs(1));
     EXPECT_NEAR(painter.texts[0].origin.y, 14 + 0.35 * 17 - 0.8 * 17, 1e-9);
     EXPECT_EQ(painter.texts[0].color, colorOf(SystemColor::systemGrey, appearance));
   }

@@ -8,9 +8,6 @@
 namespace nimbo {
 namespace {
 
-using testing::ElementsAre;
-using testing::SizeIs;
-
 /// Fills its bounds, counts its layouts, and asks for as many more as it is told.
 class CountingView final : public View {
  public:
@@ -60,7 +57,7 @@ TEST_F(Views, AreLaidOutWhenTheyAskAndOnlyThen) {
   const auto a = viewIn(*root), b = viewIn(*a);
   const auto expectLayouts = [&](int ofRoot, int ofA, int ofB) {
     root->layoutIfNeeded();
-    EXPECT_THAT((std::array{root->layouts, a->layouts, b->layouts}), ElementsAre(ofRoot, ofA, ofB));
+    EXPECT_THAT((std::array{root->layouts, a->layouts, b->layouts}), testing::ElementsAre(ofRoot, ofA, ofB));
   };
   expectLayouts(1, 1, 1);
   expectLayouts(1, 1, 1);
@@ -99,7 +96,7 @@ TEST_F(Views, AreDrawnOnDevicePixelsUnlessThereIsNothingToSee) {
   viewIn(*root, {5, 6, 7, 8});
   RecordingPainter painter;
   root->draw(painter);
-  ASSERT_THAT(painter.fills, SizeIs(4));
+  ASSERT_THAT(painter.fills, testing::SizeIs(4));
   EXPECT_EQ(painter.fills[3].rect, (Rect{5, 6, 7, 8}));
   EXPECT_EQ(painter.fills[1].rect, (Rect{1.5, 2.5, 10, 20}));
   EXPECT_EQ(painter.fills[2].rect, (Rect{3, 2.5, 1, 1}));

@@ -4,9 +4,7 @@
 #include <gtest/gtest.h>
 #include <nimbo-activity.pb.h>
 
-#include <functional>
 #include <limits>
-#include <memory>
 
 #include "handoff/NimboActivity.h"
 
@@ -30,42 +28,29 @@ void fillFields(Message& message, Fill fill);
 void fillField(Message& message, const FieldDescriptor* field, Fill fill) {
   const auto* reflection = message.GetReflection();
   for (int count = field->is_repeated() ? 2 : 1; count > 0; --count) {
-    const auto set = [&](auto setter, auto adder, auto value) {
+    using R = google::protobuf::Reflection;
+    const auto setIf = [&](auto type, auto setter, auto adder, auto value) {
+      if (field->cpp_type() != type) return;
       if (field->is_repeated())
         (reflection->*adder)(&message, field, value);
       else
         (reflection->*setter)(&message, field, value);
     };
-    using R = google::protobuf::Reflection;
-    switch (field->cpp_type()) {
-      case FieldDescriptor::CPPTYPE_INT32:
-        set(&R::SetInt32, &R::AddInt32, extreme<std::int32_t>(fill));
-        break;
-      case FieldDescriptor::CPPTYPE_INT64:
-        set(&R::SetInt64, &R::AddInt64, extreme<std::int64_t>(fill));
-        break;
-      case FieldDescriptor::CPPTYPE_UINT32:
-        set(&R::SetUInt32, &R::AddUInt32, extreme<std::uint32_t>(fill));
-        break;
-      case FieldDescriptor::CPPTYPE_UINT64:
-        // The least unsigned value but 0, which `zero` gives.
-        set(&R::SetUInt64, &R::AddUInt64, fill == Fill::smallest ? 1 : extreme<std::uint64_t>(fill));
-        break;
-      case FieldDescriptor::CPPTYPE_DOUBLE:
-        set(&R::SetDouble, &R::AddDouble, extreme<double>(fill));
-        break;
-      case FieldDescriptor::CPPTYPE_BOOL:
-        set(&R::SetBool, &R::AddBool, fill != Fill::zero);
-        break;
-      case FieldDescriptor::CPPTYPE_STRING:
-        reflection->SetString(&message, field,
-                              fill == Fill::zero ? "" : std::string(fill == Fill::largest ? 300 : 1, 'x'));
-        break;
-      default:
-        fillFields(field->is_repeated() ? *reflection->AddMessage(&message, field)
-                                        : *reflection->MutableMessage(&message, field),
-                   fill);
-    }
+    setIf(FieldDescriptor::CPPTYPE_INT32, &R::SetInt32, &R::AddInt32, extreme<std::int32_t>(fill));
+    setIf(FieldDescriptor::CPPTYPE_INT64, &R::SetInt64, &R::AddInt64, extreme<std::int64_t>(fill));
+    setIf(FieldDescriptor::CPPTYPE_UINT32, &R::SetUInt32, &R::AddUInt32, extreme<std::uint32_t>(fill));
+    // The least unsigned value but 0, which `zero` gives.
+    setIf(FieldDescriptor::CPPTYPE_UINT64, &R::SetUInt64, &R::AddUInt64,
+          fill == Fill::smallest ? 1 : extreme<std::uint64_t>(fill));
+    setIf(FieldDescriptor::CPPTYPE_DOUBLE, &R::SetDouble, &R::AddDouble, extreme<double>(fill));
+    setIf(FieldDescriptor::CPPTYPE_BOOL, &R::SetBool, &R::AddBool, fill != Fill::zero);
+    if (field->cpp_type() == FieldDescriptor::CPPTYPE_STRING)
+      reflection->SetString(&message, field,
+                            fill == Fill::zero ? "" : std::string(fill == Fill::largest ? 300 : 1, 'x'));
+    if (field->message_type())
+      fillFields(field->is_repeated() ? *reflection->AddMessage(&message, field)
+                                      : *reflection->MutableMessage(&message, field),
+                 fill);
   }
 }
 
