@@ -224,7 +224,7 @@ void WidgetPage::widgetDidChange(const WidgetContentRef& content) {
 }
 
 void WidgetPage::showFailure(const std::string& text) {
-  if (_failureReason.get_text() != text) _failureReason.set_text(text);
+  if (_failureReason.get_text().raw() != text) _failureReason.set_text(text);
   _failure.show();
 }
 
