@@ -31,6 +31,10 @@ void Programs::setUpCity(const std::vector<std::string>& favorites,
                          const std::vector<AlertsBuilder::Alert>& alerts) const {
   publish(alerts);
   run({"feed", "add", "city", "--static", folder.path() / "feed", "--alerts", alertsFile()});
+  // Its alerts are of the virtual date, whatever the date of a program is.
+  auto feeds = nlohmann::json::parse(folder.read("config/feeds.json"));
+  for (auto& feed : feeds["feeds"]) feed["maximumAlertsAgeMinutes"] = 0;
+  folder.write("config/feeds.json", feeds.dump());
   std::vector<std::string> add = {"favorite", "add"};
   for (const std::string& route : favorites) add.push_back("city:" + route);
   if (!favorites.empty()) run(add);

@@ -37,8 +37,11 @@ class LineServiceTest : public testing::Test {
   /// Sets up "city", whose static feed comes from this address, and whose line r1 has an incident "T".
   void addServedFeed(const std::string& staticFeed) {
     const std::string alerts = folder.write("city.pb", feedBytes(alert("a", "T", route("r1"))));
-    ASSERT_FALSE(
-        FeedConfiguration(paths.config).add({"city", *FeedAddress::parse(staticFeed), *FeedAddress::parse(alerts)}));
+    ASSERT_FALSE(FeedConfiguration(paths.config)
+                     .add({.name = "city",
+                           .staticFeed = *FeedAddress::parse(staticFeed),
+                           .alerts = *FeedAddress::parse(alerts),
+                           .maximumAlertsAge = std::chrono::minutes(0)}));  // however far a test's time goes
   }
   static MapItemIdentifierRef line(const std::string& feed, const std::string& routeID,
                                    const std::string& shortName = "") {

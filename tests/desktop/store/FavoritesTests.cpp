@@ -175,7 +175,7 @@ TEST_F(FavoritesTest, FailTheLookupRatherThanSeemToBeNone) {
   EXPECT_EQ(notices.size(), 1u);
   EXPECT_EQ(makeEditor().add({lineItem(3, "C")}), nullptr);
   EXPECT_EQ(lookUp(), "");
-  EXPECT_EQ(platform.transitLines.lookups(), (std::vector<std::vector<std::uint64_t>>{{1}, {2}, {3}}));
+  EXPECT_EQ(platform.transitLines.lookups(), (std::vector<std::vector<std::uint64_t>>{{1}, {1}, {2}, {3}}));
 }
 
 TEST_F(FavoritesTest, AreNeverFewerWithoutAWordWhateverRots) {
