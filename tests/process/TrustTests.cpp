@@ -288,10 +288,12 @@ TEST(Trust, ProgramsEndWithAMessageWhereTheyCannotReadOrWrite) {
     const std::string within = "cd " + programs.folder.path().string() + " && exec 2>errors && ";
     // Not SIGKILL: a process that is stopped so is in the test's hand.
     const int status = std::system((within + "(" + command +
-                                    ") & p=$!; (sleep 30; kill $p) & w=$!; wait $p; s=$?; "
+                                    ") & p=$!; (sleep 30; kill $p) >/dev/null & w=$!; wait $p; s=$?; "
                                     "kill $w; exit $s")
                                        .c_str());
-    EXPECT_TRUE(WIFEXITED(status) && (WEXITSTATUS(status) == 1 || WEXITSTATUS(status) == 2)) << command << status;
+    // Rows that could not be kept are told, and shown all the same.
+    const int least = command.ends_with("update") ? 0 : 1;
+    EXPECT_TRUE(WIFEXITED(status) && WEXITSTATUS(status) >= least && WEXITSTATUS(status) <= 2) << command << status;
     EXPECT_THAT(programs.folder.read("errors"), HasSubstr(message)) << command;
   }
 }
