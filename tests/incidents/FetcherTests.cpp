@@ -117,7 +117,8 @@ TEST_F(Fetcher, LooksUpWhatStandsForFavoritesThatWereNotRead) {
   EXPECT_EQ(platform.transitLines.lookups().size(), 1u);
   platform.time.advance(1);
   EXPECT_THAT(platform.transitLines.lookups(), ElementsAre(ElementsAre(77u), ElementsAre(77u)));
-  EXPECT_THAT(platform.favorites.unreadReason(), testing::StartsWith("The favorites could not be read within a minute"));
+  EXPECT_THAT(platform.favorites.unreadReason(),
+              testing::StartsWith("The favorites could not be read within a minute"));
   proceed.set_value();
   fetch();  // comes after the one that was too late
   platform.loop.waitAndDrain([&] { return platform.transitLines.lookups().size() == 3; });

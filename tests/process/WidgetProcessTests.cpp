@@ -223,10 +223,11 @@ TEST(WidgetProcess, ShowsIncidentsThatAreTooManyToHandOver) {
   const auto lines =
       programs.play(appearing() + kUpdateAndLook +
                     std::vector<json>{request("selectRow", {{"section", 0}, {"row", 0}}), request("snapshot")});
-  EXPECT_THAT(lines,
-              Contains(json{{"jsonrpc", "2.0"},
-                            {"method", "notice"},
-                            {"params", {{"message", "Cannot open it: the list of incidents has more than 1048576 bytes."}}}}));
+  EXPECT_THAT(
+      lines,
+      Contains(json{{"jsonrpc", "2.0"},
+                    {"method", "notice"},
+                    {"params", {{"message", "Cannot open it: the list of incidents has more than 1048576 bytes."}}}}));
   EXPECT_THAT(snapshots(lines), SizeIs(2));
   for (const json& seen : snapshots(lines)) EXPECT_THAT(titles(seen), ElementsAre("600 Advisories"));
 }

@@ -5,7 +5,8 @@
 #include "platform/wire/FieldTable.h"
 #include "platform/wire/StoredTransitIncident.h"
 
-// Incidents and transit values as messages. The numbers are part of the hand-off and of saved states: they never change.
+// Incidents and transit values as messages. The numbers are part of the hand-off and of saved states: they never
+// change.
 
 namespace nimbo {
 

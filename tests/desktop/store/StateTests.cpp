@@ -4,9 +4,9 @@
 
 #include <csignal>
 
-#include "desktop/store/Fixture.h"
 #include "desktop/raii/SQLite.h"
 #include "desktop/store/FavoritesEditor.h"
+#include "desktop/store/Fixture.h"
 #include "desktop/store/SQLiteAnalyticsPipeline.h"
 #include "desktop/store/SQLiteSharedSettings.h"
 #include "desktop/store/StateDatabaseFile.h"
