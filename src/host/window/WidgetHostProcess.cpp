@@ -228,7 +228,9 @@ void WidgetHostProcess::retryLater() {
     update();
   });
   if (_networkReturned.connected()) return;
-  _networkReturned = Gio::NetworkMonitor::get_default()->signal_network_changed().connect([this](bool isAvailable) {
+  // giomm's own get_default() gives away a reference that is GLib's.
+  const auto monitor = Glib::wrap(g_network_monitor_get_default(), true);
+  _networkReturned = monitor->signal_network_changed().connect([this](bool isAvailable) {
     if (!isAvailable || !_retry) return;
     endRetries();
     update();

@@ -165,7 +165,16 @@ def tour(session, folder):
         window.see(sight)
 
     with socket.create_server(("127.0.0.1", 0)) as silent:
+        subprocess.run([command_line, "feed", "remove", "other"], check=True)
+        window.click("Favorites", "list item")
+        window.see("Metro, Its feed is not set up any more", "list item")
+        press("key", "Escape")
         window.click("Feeds", "list item")
+        window.click("^Remove$")
+        window.see("Remove with 2 Favorites")
+        press("key", "Tab", "Tab", "Return")
+        window.see("No feed is set up")
+        assert "town" not in subprocess.run([command_line, "favorite", "list"], capture_output=True, text=True).stdout
         window.click("Name", "text")
         address = f"http://127.0.0.1:{silent.getsockname()[1]}/feed"
         press("type", "slow")
