@@ -14,7 +14,7 @@ tools/arrows.py
 # As a unity build has them, so that what many files include is read a few times; the window's own files too.
 cmake --preset lint >/dev/null
 # The sources and headers that the build makes.
-ninja -C build/lint -t targets rule CUSTOM_COMMAND | xargs ninja -C build/lint >/dev/null
+ninja -C build/lint -t targets rule CUSTOM_COMMAND | grep -E '[.](cc|cpp|h)$' | xargs ninja -C build/lint >/dev/null
 mapfile -t sources < <(python3 -c 'import json; print(*[e["file"] for e in json.load(open("build/lint/compile_commands.json"))], sep="\n")')
 printf '%s\n' "${sources[@]}" |
   xargs -P "$(nproc)" -n 1 clang-tidy -p build/lint --quiet --extra-arg=-Wno-unknown-warning-option --warnings-as-errors='*' 2>/dev/null
