@@ -27,8 +27,8 @@ std::string madeUpRoutes() {
   std::string text = "route_id,agency_id,route_short_name,route_long_name,route_type,route_color,route_text_color\n";
   for (std::size_t i = 0; i < kMadeUpRoutes; ++i) {
     const std::string number = std::to_string(i);
-    text += "R" + number + ",A" + std::to_string(i % 10) + "," + number + ",\"Central Station - Terminal " + number +
-            " via Harbour Square\",3,0057B7,FFFFFF\n";
+    text.append("R").append(number).append(",A").append(std::to_string(i % 10)).append(",").append(number);
+    text.append(",\"Central Station - Terminal ").append(number).append(" via Harbour Square\",3,0057B7,FFFFFF\n");
   }
   return text;
 }
@@ -37,7 +37,7 @@ std::string madeUpAgencies() {
   std::string text = "agency_id,agency_name,agency_url,agency_timezone\n";
   for (int i = 0; i < 10; ++i) {
     const std::string number = std::to_string(i);
-    text += "A" + number + ",Agency " + number + ",https://example.org,Europe/Berlin\n";
+    text.append("A").append(number).append(",Agency ").append(number).append(",https://example.org,Europe/Berlin\n");
   }
   return text;
 }

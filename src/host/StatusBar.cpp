@@ -77,7 +77,8 @@ std::string tooltipOf(const protocol::Snapshot& snapshot) {
     if (!text.empty()) addLine(markupText(text));
   }
   if (snapshot.error) addLine(markupText(snapshot.error->reason));
-  for (const auto& [line, title] : snapshot.knownIncidents) addLine(markupText(line + ": " + title));
+  for (const auto& [line, title] : snapshot.knownIncidents)
+    addLine(markupText(line).append(": ").append(markupText(title)));
   for (const std::string& line : snapshot.goneLines) addLine("<i>" + markupText(goneLineText(line)) + "</i>");
   return tooltip;
 }

@@ -23,7 +23,8 @@ void tellGoneLines(const protocol::Snapshot& snapshot) {
 /// What the rows leave out while they show an error; empty when nothing is known.
 std::string knownIncidentsText(const protocol::Snapshot& snapshot) {
   std::string text = snapshot.knownIncidents.empty() ? "" : "Known from other feeds:\n";
-  for (const auto& [line, title] : snapshot.knownIncidents) text += "  " + printableText(line + ": " + title) + "\n";
+  for (const auto& [line, title] : snapshot.knownIncidents)
+    text.append("  ").append(printableText(line)).append(": ").append(printableText(title)).append("\n");
   return text;
 }
 

@@ -27,7 +27,7 @@ struct Attempts {
 };
 
 Attempts readAttempts(const std::filesystem::path& path) {
-  const auto bytes = readFile(path, kLargestAttemptsFile);
+  const auto bytes = readOwnFile(path, kLargestAttemptsFile);
   Attempts attempts;
   double seconds = 0;
   if (!bytes || std::sscanf(bytes->c_str(), "%d %lf", &attempts.count, &seconds) != 2) return {};
@@ -40,6 +40,14 @@ void writeAttempts(const std::filesystem::path& path, int count) {
   const std::string text =
       std::to_string(count) + " " + std::to_string(intervalBetween(dateFromUnixTime(0), currentDate())) + "\n";
   if (const ErrorRef error = writeFileAtomically(path, text)) logCacheFailure(error->reason());
+}
+
+ErrorRef downloading(const std::string& feed, std::size_t received) {
+  const std::string size = std::to_string(received >> 20) + " MiB";
+  return transitLineServiceError(TransitLineServiceError::downloading,
+                                 "The static feed of \"" + feed + "\" is still being downloaded: " + size +
+                                     " have come. It goes on; look again in a minute.",
+                                 feed + " (" + size + ")");
 }
 
 }  // namespace
@@ -157,11 +165,7 @@ ErrorRef StaticFeedDownloads::firstUnderWay() const {
   for (const auto& [name, download] : _downloads) {
     const std::lock_guard downloadGuard(download->lock);
     if (download->isHeld || download->result) continue;
-    const std::string size = std::to_string(download->received >> 20) + " MiB";
-    return transitLineServiceError(TransitLineServiceError::downloading,
-                                   "The static feed of \"" + name + "\" is still being downloaded: " + size +
-                                       " have come. It goes on; look again in a minute.",
-                                   name + " (" + size + ")");
+    return downloading(name, download->received);
   }
   return nullptr;
 }
