@@ -1,5 +1,6 @@
 #include "items/NBTransitIncidentsDataSourceBuilder.h"
 
+#include <algorithm>
 #include <limits>
 
 namespace nimbo {
@@ -50,16 +51,17 @@ NBTransitIncidentsDataSourceBuilder::Scan NBTransitIncidentsDataSourceBuilder::s
     for (std::size_t index = 0; index < incidents.size(); ++index) {
       const TransitIncidentRef& incident = incidents[index];
       if (!filter.shouldDisplayIncident(*incident)) continue;
-      const std::size_t displayed = scan.displayedMuids.firstIndexOf(incident->muid());
-      if (displayed < scan.items.size()) {
-        scan.itemToLines[displayed].others.push_back(line);
+      const auto displayed = std::find(scan.displayedMuids.begin(), scan.displayedMuids.end(), incident->muid());
+      if (displayed != scan.displayedMuids.end()) {
+        const auto row = static_cast<std::size_t>(displayed - scan.displayedMuids.begin());
+        scan.itemToLines[row].others.push_back(line);
         lineHasRow = true;
         continue;
       }
       NBTransitItemRef item = _itemForIncidentAtIndex_inLine(index, line);
       if (!item) continue;
       scan.displayedIncidents.push_back(incident);
-      scan.displayedMuids.append(incident->muid());
+      scan.displayedMuids.push_back(incident->muid());
       scan.items.push_back(std::move(item));
       if (needsIncidentsToLine) scan.incidentsToLine.emplace(incident, line);
       scan.itemToLines.push_back({line, {}});

@@ -11,7 +11,6 @@
 #include "items/NBTransitIncidentFilter.h"
 #include "items/NBTransitItemDataSourceBuilder.h"
 #include "items/NBTransitSummaryItem.h"
-#include "items/NumberList.h"
 #include "platform/artwork/ArtworkCache.h"
 #include "platform/foundation/URL.h"
 #include "platform/transit/TransitLine.h"
@@ -63,7 +62,7 @@ class NBTransitIncidentsDataSourceBuilder final : public NBTransitItemDataSource
   /// What a scan of the lines finds. Row k shows displayed incident k, whose number is displayed muid k.
   struct Scan {
     TransitIncidents displayedIncidents;
-    NumberList displayedMuids;
+    std::vector<std::uint64_t> displayedMuids;
     NBTransitItems items;
     TransitIncidentToLineMap incidentsToLine;  ///< empty when nobody is going to ask
     ItemToLinesMap itemToLines;

@@ -59,16 +59,17 @@ void NBTransitIncidentsDataSourceBuilder::_updateItemsAffectingSeveralLines_item
     NBTransitItems& items, ItemToLinesMap& itemToLines) const {
   const auto isOfSeveral = [](const RowLines& lines) { return !lines.others.empty(); };
   if (std::none_of(itemToLines.begin(), itemToLines.end(), isOfSeveral)) return;
-  NumberList keys;
-  for (const NBTransitItemRef& item : items) keys.append(keyOfTexts(*item));
+  std::vector<std::uint64_t> keys;
+  for (const NBTransitItemRef& item : items) keys.push_back(keyOfTexts(*item));
+  const auto placeOf = [&](auto key) { return static_cast<std::size_t>(key - keys.begin()); };
   for (std::size_t row = 0; row < items.size(); ++row) {
     if (!isOfSeveral(itemToLines[row])) continue;
     const NBTransitItemRef old = items[row];
-    const std::uint64_t key = keys.at(row);
-    std::size_t place = keys.firstIndexOf(key);
-    while (!items[place]->isEqual(old.get())) place = keys.firstIndexOf(key, place + 1);
+    auto found = std::find(keys.begin(), keys.end(), keys[row]);
+    while (!items[placeOf(found)]->isEqual(old.get())) found = std::find(found + 1, keys.end(), keys[row]);
+    const std::size_t place = placeOf(found);
     items[place] = itemAffectingLines(*old, itemToLines[row].all());
-    keys.replace(place, keyOfTexts(*items[place]));
+    *found = keyOfTexts(*items[place]);
     itemToLines[place] = std::exchange(itemToLines[row], {});
   }
 }
