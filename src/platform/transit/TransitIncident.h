@@ -83,6 +83,25 @@ struct TransitIncidentFields {
   std::optional<std::string> linkURL;
 };
 
+/// What any incident says.
+inline TransitIncidentFields fieldsOf(const TransitIncident& incident) {
+  return {.muid = incident.muid(),
+          .title = incident.title(),
+          .summary = incident.summary(),
+          .fullDescription = incident.fullDescription(),
+          .messageForRoutePlanning = incident.messageForRoutePlanning(),
+          .messageForRouteStepping = incident.messageForRouteStepping(),
+          .messageForNonRoutable = incident.messageForNonRoutable(),
+          .startDate = incident.startDate(),
+          .endDate = incident.endDate(),
+          .creationDate = incident.creationDate(),
+          .lastUpdated = incident.lastUpdated(),
+          .iconType = incident.iconType(),
+          .isBlockingIncident = incident.isBlockingIncident(),
+          .affectedEntities = incident.affectedEntities(),
+          .linkURL = incident.linkURL()};
+}
+
 /// An incident that answers from fields.
 class FieldsTransitIncident : public TransitIncident {
  public:
