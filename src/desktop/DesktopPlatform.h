@@ -47,7 +47,6 @@ class DesktopPlatform {
   explicit DesktopPlatform(Options options);
   ~DesktopPlatform();
 
-  const Paths& paths() const { return _paths; }
   FavoritesEditor& favoritesEditor() { return _favoritesEditor; }
   SQLiteAnalyticsPipeline& analytics() { return _analytics; }
   GTFSTransitLineService& transitLines() { return _transitLines; }

@@ -57,15 +57,9 @@ class FieldEncoder final : public KeyedEncoder {
     set(key, _writer.valueOf(object));
   }
   void encodeBool_forKey(bool value, std::string_view key) override { set(key, value); }
-  void encodeInt64_forKey(std::int64_t value, std::string_view key) override { set(key, value); }
-  void encodeUInt64_forKey(std::uint64_t value, std::string_view key) override { set(key, value); }
-  void encodeDouble_forKey(double value, std::string_view key) override { set(key, value); }
   void encodeString_forKey(const std::optional<std::string>& value, std::string_view key) override {
     const ArchivePath::Scope scope(_writer.path(), std::string(key));
     if (value) set(key, _writer.textOf(*value));
-  }
-  void encodeDate_forKey(const std::optional<Date>& value, std::string_view key) override {
-    if (value) set(key, _writer.dateOf(*value));
   }
   void encodeBytes_forKey(std::span<const std::uint8_t> value, std::string_view key) override {
     set(key, json::binary(Bytes(value.begin(), value.end())));

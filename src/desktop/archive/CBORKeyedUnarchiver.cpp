@@ -153,29 +153,10 @@ std::int64_t CBORKeyedDecoder::decodeInt64ForKey(std::string_view key) {
   return value ? value->get<std::int64_t>() : 0;
 }
 
-std::uint64_t CBORKeyedDecoder::decodeUInt64ForKey(std::string_view key) {
-  const auto isUInt64 = [](const json& kind) {
-    return kind.is_number_unsigned() || (kind.is_number_integer() && kind.get<std::int64_t>() >= 0);
-  };
-  const json* value = field(key, isUInt64, "an unsigned 64-bit integer");
-  return value ? value->get<std::uint64_t>() : 0;
-}
-
-double CBORKeyedDecoder::decodeDoubleForKey(std::string_view key) {
-  const json* value = field(
-      key, [](const json& kind) { return kind.is_number(); }, "a number");
-  return value ? value->get<double>() : 0;
-}
-
 std::optional<std::string> CBORKeyedDecoder::decodeStringForKey(std::string_view key) {
   const json* value = field(
       key, [](const json& kind) { return kind.is_string(); }, "a text");
   return value ? std::optional(value->get<std::string>()) : std::nullopt;
-}
-
-std::optional<Date> CBORKeyedDecoder::decodeDateForKey(std::string_view key) {
-  const auto date = std::dynamic_pointer_cast<const BoxedDate>(decodeObjectOfClasses_forKey({&kDateClass}, key));
-  return date ? std::optional(date->value()) : std::nullopt;
 }
 
 std::optional<Bytes> CBORKeyedDecoder::decodeBytesForKey(std::string_view key) {

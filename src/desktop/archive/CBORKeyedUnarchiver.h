@@ -27,13 +27,11 @@ class CBORKeyedDecoder final : public KeyedDecoder {
   bool containsValueForKey(std::string_view key) const override;
   ObjectRef decodeObjectOfClasses_forKey(const AllowedClasses& classes, std::string_view key) override;
   bool decodeBoolForKey(std::string_view key) override;
-  std::int64_t decodeInt64ForKey(std::string_view key) override;
-  std::uint64_t decodeUInt64ForKey(std::string_view key) override;
-  double decodeDoubleForKey(std::string_view key) override;
   std::optional<std::string> decodeStringForKey(std::string_view key) override;
-  std::optional<Date> decodeDateForKey(std::string_view key) override;
   std::optional<Bytes> decodeBytesForKey(std::string_view key) override;
   void failWithReason(std::string reason) override;
+  /// 0 when absent.
+  std::int64_t decodeInt64ForKey(std::string_view key);
 
  private:
   /// The field, or null when it is absent, not `isKind`, or the decoding has failed. Another kind fails the decoding.

@@ -230,7 +230,7 @@ double CairoShieldRenderer::widestWithin(const Look& look) {
 }
 
 TextLayoutRef CairoShieldRenderer::layOut(const std::string& text, double pointSize, double width) const {
-  return _text.layOut(text, {pointSize, true}, width, 1, TextAlignment::natural, false);
+  return _text.layOut(text, {pointSize, true}, width, 1, false);
 }
 
 std::optional<CairoShieldRenderer::FittedText> CairoShieldRenderer::whole(const std::string& text,

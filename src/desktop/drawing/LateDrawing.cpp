@@ -23,8 +23,8 @@ TextSystem& LateDrawing::text() {
 FontMetrics LateDrawing::metrics(const FontDescriptor& font) { return text().metrics(font); }
 
 TextLayoutRef LateDrawing::layOut(const std::string& text, const FontDescriptor& font, double maxWidth,
-                                  std::size_t maxLines, TextAlignment alignment, bool rightToLeft) {
-  return this->text().layOut(text, font, maxWidth, maxLines, alignment, rightToLeft);
+                                  std::size_t maxLines, bool rightToLeft) {
+  return this->text().layOut(text, font, maxWidth, maxLines, rightToLeft);
 }
 
 ImageRef LateDrawing::image(std::string_view name, double screenScale, bool nightMode) try {

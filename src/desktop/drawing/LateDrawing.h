@@ -14,7 +14,7 @@ class LateDrawing final : public TextSystem, public ImageResources, public Shiel
 
   FontMetrics metrics(const FontDescriptor& font) override;
   TextLayoutRef layOut(const std::string& text, const FontDescriptor& font, double maxWidth, std::size_t maxLines,
-                       TextAlignment alignment, bool rightToLeft) override;
+                       bool rightToLeft) override;
   ImageRef image(std::string_view name, double screenScale, bool nightMode) override;
   ImageRef render(const TransitArtwork& artwork, std::int64_t shieldSize, double screenScale, bool nightMode) override;
   void setCachesIconAtlases(bool caches) override;

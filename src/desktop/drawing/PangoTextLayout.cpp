@@ -31,9 +31,8 @@ int ellipsisPadding(const PangoLayoutLine* line) {
 
 }  // namespace
 
-PangoTextLayout::PangoTextLayout(GObjectHandle<PangoLayout> layout, double scale, TextAlignment alignment,
-                                 bool rightToLeft, bool wasCut)
-    : _layout(std::move(layout)), _scale(scale), _alignment(alignment), _rightToLeft(rightToLeft) {
+PangoTextLayout::PangoTextLayout(GObjectHandle<PangoLayout> layout, double scale, bool rightToLeft, bool wasCut)
+    : _layout(std::move(layout)), _scale(scale), _rightToLeft(rightToLeft) {
   int width = 0, height = 0;
   pango_layout_get_size(_layout.get(), &width, &height);
   _size = {points(width), points(height)};
@@ -56,12 +55,7 @@ void PangoTextLayout::draw(cairo_t* context, Point origin, double width) const {
   do {
     PangoRectangle line;
     pango_layout_iter_get_line_extents(iter.get(), nullptr, &line);
-    const double room = width - points(line.width);
-    double x = 0;
-    if (_alignment == TextAlignment::center && room > 0)
-      x = room / 2;
-    else if (_rightToLeft)
-      x = room;
+    const double x = _rightToLeft ? width - points(line.width) : 0;
     cairo_save(context);
     cairo_translate(context, origin.x + x, origin.y + points(pango_layout_iter_get_baseline(iter.get())));
     cairo_scale(context, _scale, _scale);

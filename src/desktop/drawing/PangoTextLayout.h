@@ -14,8 +14,7 @@ class PangoTextLayout final : public TextLayout {
  public:
   /// `layout` is complete and starts every line at its left edge. `scale`: points for each of its own, above 0.
   /// `wasCut`: text was left out of it already.
-  PangoTextLayout(GObjectHandle<PangoLayout> layout, double scale, TextAlignment alignment, bool rightToLeft,
-                  bool wasCut);
+  PangoTextLayout(GObjectHandle<PangoLayout> layout, double scale, bool rightToLeft, bool wasCut);
 
   Size size() const override { return _size; }
   std::size_t lineCount() const override { return _lineCount; }
@@ -34,7 +33,6 @@ class PangoTextLayout final : public TextLayout {
 
   GObjectHandle<PangoLayout> _layout;
   double _scale;
-  TextAlignment _alignment;
   bool _rightToLeft;
   Size _size;
   std::size_t _lineCount;

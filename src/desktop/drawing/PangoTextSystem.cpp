@@ -171,7 +171,7 @@ FontMetrics PangoTextSystem::metrics(const FontDescriptor& font) {
 }
 
 TextLayoutRef PangoTextSystem::layOut(const std::string& text, const FontDescriptor& font, double maxWidth,
-                                      std::size_t maxLines, TextAlignment alignment, bool rightToLeft) {
+                                      std::size_t maxLines, bool rightToLeft) {
   const double scale = scaleOf(font);
   std::string shown = valid(text);
   const bool wasCut = cutToMaximum(shown);
@@ -194,7 +194,7 @@ TextLayoutRef PangoTextSystem::layOut(const std::string& text, const FontDescrip
     pango_layout_set_height(layout.get(), -static_cast<int>(std::min<std::size_t>(maxLines, 1'000'000)));
   }
   if (pango_layout_get_unknown_glyphs_count(layout.get()) > 0) logMissingCharacters();
-  return std::make_shared<const PangoTextLayout>(std::move(layout), scale, alignment, rightToLeft, wasCut);
+  return std::make_shared<const PangoTextLayout>(std::move(layout), scale, rightToLeft, wasCut);
 }
 
 void PangoTextSystem::logMissingCharacters() {

@@ -27,7 +27,7 @@ class PangoTextSystem final : public TextSystem {
   /// Text that is limited in lines is one paragraph: its line ends become spaces. Of a text of more than
   /// `kMaximumCharacters` the beginning is laid out. Throws as `metrics` does.
   TextLayoutRef layOut(const std::string& text, const FontDescriptor& font, double maxWidth, std::size_t maxLines,
-                       TextAlignment alignment, bool rightToLeft) override;
+                       bool rightToLeft) override;
 
   /// More than any row shows. Pango breaks a single long word in time that grows with its square: a tenth of a second
   /// for this many, two seconds for four times as many.

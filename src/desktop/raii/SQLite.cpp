@@ -30,8 +30,6 @@ void SQLiteStatement::bind(int parameter, const Bytes& value) {
                       : sqlite3_bind_blob64(_statement.get(), parameter, value.data(), value.size(), nullptr));
 }
 
-void SQLiteStatement::bind(int parameter, std::nullopt_t) { check(sqlite3_bind_null(_statement.get(), parameter)); }
-
 void SQLiteStatement::bindColumn(int parameter, const SQLiteStatement& row, int column) {
   check(sqlite3_bind_value(_statement.get(), parameter, sqlite3_column_value(row._statement.get(), column)));
 }
@@ -45,8 +43,6 @@ bool SQLiteStatement::step() {
 }
 
 void SQLiteStatement::reset() { sqlite3_reset(_statement.get()); }
-
-int SQLiteStatement::columnCount() const { return sqlite3_column_count(_statement.get()); }
 
 SQLiteStatement::ColumnType SQLiteStatement::type(int column) const {
   switch (sqlite3_column_type(_statement.get(), column)) {

@@ -44,7 +44,6 @@ class SQLiteStatement final {
   void bind(int parameter, std::string_view value);
   /// The bytes are not copied: they outlive the last step.
   void bind(int parameter, const Bytes& value);
-  void bind(int parameter, std::nullopt_t);
   /// The value in a column of another statement's row, copied.
   void bindColumn(int parameter, const SQLiteStatement& row, int column);
 
@@ -53,7 +52,6 @@ class SQLiteStatement final {
   /// Back to before the first row, the parameters kept.
   void reset();
 
-  int columnCount() const;
   ColumnType type(int column) const;
   std::int64_t integer(int column) const;
   std::string text(int column) const;

@@ -132,11 +132,4 @@ Outcome<std::vector<AnalyticsEntry>> SQLiteAnalyticsPipeline::list() const {
   return entries;
 }
 
-ErrorRef SQLiteAnalyticsPipeline::clear() {
-  return _database->write([](SQLiteConnection& connection) -> ErrorRef {
-    connection.execute("DELETE FROM analytics");
-    return nullptr;
-  });
-}
-
 }  // namespace nimbo

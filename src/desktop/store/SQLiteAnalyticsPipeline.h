@@ -53,8 +53,6 @@ class SQLiteAnalyticsPipeline final : public AnalyticsPipeline {
 
   /// Sets `entries` to what is kept, the oldest first; a record that cannot be understood is left out. Null on success.
   Outcome<std::vector<AnalyticsEntry>> list() const;
-  /// Forgets everything. Null on success.
-  ErrorRef clear();
 
  private:
   void keep(const AnalyticsEntry& entry);

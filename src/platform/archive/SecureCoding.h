@@ -40,13 +40,8 @@ class KeyedEncoder {
   /// A null object writes nothing. An object that cannot be archived makes the whole archive fail.
   virtual void encodeObject_forKey(const ObjectRef& object, std::string_view key) = 0;
   virtual void encodeBool_forKey(bool value, std::string_view key) = 0;
-  virtual void encodeInt64_forKey(std::int64_t value, std::string_view key) = 0;
-  virtual void encodeUInt64_forKey(std::uint64_t value, std::string_view key) = 0;
-  virtual void encodeDouble_forKey(double value, std::string_view key) = 0;
   /// An absent text writes nothing.
   virtual void encodeString_forKey(const std::optional<std::string>& value, std::string_view key) = 0;
-  /// An absent date writes nothing.
-  virtual void encodeDate_forKey(const std::optional<Date>& value, std::string_view key) = 0;
   virtual void encodeBytes_forKey(std::span<const std::uint8_t> value, std::string_view key) = 0;
 };
 
@@ -60,14 +55,7 @@ class KeyedDecoder {
   virtual ObjectRef decodeObjectOfClasses_forKey(const AllowedClasses& classes, std::string_view key) = 0;
   /// NO when absent.
   virtual bool decodeBoolForKey(std::string_view key) = 0;
-  /// 0 when absent.
-  virtual std::int64_t decodeInt64ForKey(std::string_view key) = 0;
-  /// 0 when absent.
-  virtual std::uint64_t decodeUInt64ForKey(std::string_view key) = 0;
-  /// 0 when absent.
-  virtual double decodeDoubleForKey(std::string_view key) = 0;
   virtual std::optional<std::string> decodeStringForKey(std::string_view key) = 0;
-  virtual std::optional<Date> decodeDateForKey(std::string_view key) = 0;
   virtual std::optional<Bytes> decodeBytesForKey(std::string_view key) = 0;
   /// Makes the decoding fail with this reason, as a field of the wrong kind does.
   virtual void failWithReason(std::string reason) = 0;

@@ -15,7 +15,6 @@ class StackView : public View {
  public:
   /// Puts a view at the bottom of the stack.
   void addArrangedSubview(std::shared_ptr<View> view);
-  const std::vector<std::shared_ptr<View>>& arrangedSubviews() const { return _arranged; }
 
   /// Points from a view's bottom to the next one's top, or from its last baseline to the next one's first when arranged
   /// on baselines: then more where the next one would otherwise be drawn over it. 0 until set.

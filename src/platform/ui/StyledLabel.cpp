@@ -44,9 +44,8 @@ void StyledLabel::invalidateText() {
 const TextLayoutRef& StyledLabel::layOut(Measured& measured, double width, std::size_t lines) {
   const bool rightToLeft = isRightToLeft();
   if (!measured.layout || measured.width != width || measured.lines != lines || measured.rightToLeft != rightToLeft) {
-    measured = {
-        TextSystem::current().layOut(*_text, _font->descriptor(), width, lines, TextAlignment::natural, rightToLeft),
-        width, lines, rightToLeft};
+    measured = {TextSystem::current().layOut(*_text, _font->descriptor(), width, lines, rightToLeft), width, lines,
+                rightToLeft};
   }
   return measured.layout;
 }
@@ -112,7 +111,7 @@ void StyledLabel::drawContent(Painter& painter, const DrawingContext& context) {
   // A line that is cut through cannot be read: at the largest text sizes a row may have no room for its second text.
   constexpr double kLeastShareOfALine = 0.8;
   if (frame().height < kLeastShareOfALine * layout->size().height) return;
-  const Color color = context.vibrantColor.value_or(colorOf(_textColor, context.appearance));
+  const Color color = context.vibrantColor.value_or(colorOf(SystemColor::label, context.appearance));
   painter.drawText(*layout, {0, 0}, frame().width, color);
 }
 

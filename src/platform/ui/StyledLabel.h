@@ -24,10 +24,7 @@ class StyledLabel : public View {
   /// Null gives the preferred body font.
   void setFont(FontRef font);
   /// The most lines; 0: any number. 1 until set.
-  std::size_t numberOfLines() const { return _numberOfLines; }
   void setNumberOfLines(std::size_t lines);
-  /// Outside visual effects. The label colour until set.
-  void setTextColor(SystemColor color) { _textColor = color; }
 
   bool isBlank() const override { return isHidden() || !_text || _text->empty(); }
 
@@ -61,7 +58,6 @@ class StyledLabel : public View {
   std::optional<std::string> _text;
   FontRef _font;
   std::size_t _numberOfLines = 1;
-  SystemColor _textColor = SystemColor::label;
   std::optional<double> _foundWidth;  // of the last layout
   std::size_t _linesThatFit = 0;      // in the height that was found; 0: all
   Measured _unbroken, _broken;

@@ -58,11 +58,6 @@ void TableView::reloadData() {
 
 void TableView::reloadSection_withRowAnimation(std::int64_t, TableRowAnimation) { reloadData(); }
 
-std::int64_t TableView::numberOfSections() {
-  loadIfNeeded();
-  return _sections;
-}
-
 std::int64_t TableView::numberOfRows() {
   loadIfNeeded();
   return static_cast<std::int64_t>(_rows.size());
@@ -77,13 +72,6 @@ Rect TableView::rectForRowAtIndexPath(IndexPath indexPath) {
   layoutIfNeeded();
   const Row* row = rowAt(indexPath);
   return row ? row->cell->frame() : Rect{};
-}
-
-std::optional<IndexPath> TableView::indexPathForRowAtPoint(Point point) {
-  layoutIfNeeded();
-  for (const Row& row : _rows)
-    if (row.cell->frame().contains(point)) return row.indexPath;
-  return std::nullopt;
 }
 
 bool TableView::selectRowAtIndexPath(IndexPath indexPath) {
@@ -123,8 +111,8 @@ void TableView::loadIfNeeded() {
   emptyIntoPool();
   const auto dataSource = _dataSource.lock();
   const auto delegate = _delegate.lock();
-  _sections = dataSource ? dataSource->numberOfSectionsInTableView(*this) : 0;
-  for (IndexPath path; path.section < _sections; ++path.section) {
+  const std::int64_t sections = dataSource ? dataSource->numberOfSectionsInTableView(*this) : 0;
+  for (IndexPath path; path.section < sections; ++path.section) {
     const auto count = dataSource->tableView_numberOfRowsInSection(*this, path.section);
     for (path.row = 0; path.row < count; ++path.row) {
       auto cell = dataSource->tableView_cellForRowAtIndexPath(*this, path);

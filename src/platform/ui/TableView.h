@@ -72,13 +72,11 @@ class TableView : public View {
   /// Reloads every section: a table of one section is all there is.
   void reloadSection_withRowAnimation(std::int64_t section, TableRowAnimation animation);
 
-  std::int64_t numberOfSections();
   std::int64_t numberOfRows();
   /// Null beyond the rows.
   std::shared_ptr<StyledTableCell> cellForRowAtIndexPath(IndexPath indexPath);
   /// In the table's coordinates; empty beyond the rows.
   Rect rectForRowAtIndexPath(IndexPath indexPath);
-  std::optional<IndexPath> indexPathForRowAtPoint(Point point);
 
   /// What a tap does: nothing unless the delegate lets the row be highlighted; else the row is highlighted and
   /// selected. Answers whether the row was selected.
@@ -114,7 +112,6 @@ class TableView : public View {
   std::weak_ptr<TableViewDelegate> _delegate;
   std::shared_ptr<const VisualEffect> _separatorEffect;
   std::optional<IndexPath> _highlightedRow;
-  std::int64_t _sections = 0;
   bool _needsReload = true;
 };
 

@@ -41,9 +41,6 @@ using TextLayoutRef = std::shared_ptr<const TextLayout>;
 /// Points; a width for texts that are not to be broken.
 inline constexpr double kUnboundedTextWidth = 1e6;
 
-/// Where lines begin when they are narrower than their box.
-enum class TextAlignment { natural, center };
-
 /// Fonts and text of the platform. Main thread only. A missing font is replaced by another, and logged.
 class TextSystem {
  public:
@@ -56,7 +53,7 @@ class TextSystem {
   /// letter that has a direction and is not isolated; `rightToLeft` is the direction of text without one. A width that
   /// is not positive gives one column of words.
   virtual TextLayoutRef layOut(const std::string& text, const FontDescriptor& font, double maxWidth,
-                               std::size_t maxLines, TextAlignment alignment, bool rightToLeft) = 0;
+                               std::size_t maxLines, bool rightToLeft) = 0;
 };
 
 }  // namespace nimbo

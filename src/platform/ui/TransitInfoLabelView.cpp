@@ -64,10 +64,6 @@ void TransitInfoLabelView::invalidateRow() {
   setNeedsUpdateConstraints();
 }
 
-std::size_t TransitInfoLabelView::numberOfShownItems() { return row().shown.size(); }
-
-const std::string& TransitInfoLabelView::truncationText() { return row().text; }
-
 ImageRef TransitInfoLabelView::image(std::size_t item, double screenScale, bool nightMode) const {
   if (!_artworkCache) return nullptr;
   const TransitArtworkRef& artwork = _labelItems[item];
@@ -117,9 +113,8 @@ void TransitInfoLabelView::fillRow(Row& row, const std::vector<std::pair<std::si
         row.text = _truncationTextGenerator(shields.size() - shown);
         row.textX = ends[shown] + (shown > 0 ? _spaceBetweenShields : 0);
         // Alone it is cut off if need be; after shields it has to fit.
-        row.textLayout =
-            TextSystem::current().layOut(row.text, _font->descriptor(), shown > 0 ? kUnboundedTextWidth : *_maxWidth, 1,
-                                         TextAlignment::natural, row.rightToLeft);
+        row.textLayout = TextSystem::current().layOut(row.text, _font->descriptor(),
+                                                      shown > 0 ? kUnboundedTextWidth : *_maxWidth, 1, row.rightToLeft);
         if (shown == 0 || row.textX + row.textLayout->size().width <= room) break;
       }
     }

@@ -37,20 +37,14 @@ class TransitInfoLabelView : public View {
   void setShieldSize(std::int64_t size);
   /// Points. 0 until set.
   void setSpaceBetweenShields(double space);
-  /// Points; absent until set: any number of shields fits.
-  std::optional<double> maxWidth() const { return _maxWidth; }
-  /// The width that the shields have, and the text for those that do not fit; without a generator they are left out
-  /// silently. The width that it has already changes nothing.
+  /// The width in points that the shields have, any until set, and the text for those that do not fit; without a
+  /// generator they are left out silently. The width that it has already changes nothing.
   void setMaxWidth_truncationTextGenerator(double width, TruncationTextGenerator generator);
 
   const FontRef& font() const { return _font; }
   void setFont(FontRef font);
   /// Of the text. Grey until set.
   void setTextColor(SystemColor color) { _textColor = color; }
-
-  /// How many shields are shown, and the text after them; empty when all are.
-  std::size_t numberOfShownItems();
-  const std::string& truncationText();
 
   std::string_view className() const override { return "TransitInfoLabelView"; }
 

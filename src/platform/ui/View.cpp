@@ -114,16 +114,7 @@ double View::screenScale() const {
   return _superview ? _superview->screenScale() : Environment::current().screenScale();
 }
 
-bool View::isRightToLeft() const {
-  if (_rightToLeft) return *_rightToLeft;
-  return _superview ? _superview->isRightToLeft() : Environment::current().isRightToLeft();
-}
-
-void View::setRightToLeft(std::optional<bool> rightToLeft) {
-  _rightToLeft = rightToLeft;
-  setNeedsUpdateConstraints();
-  setNeedsLayout();
-}
+bool View::isRightToLeft() const { return Environment::current().isRightToLeft(); }
 
 View& View::layoutRoot() {
   View* view = this;

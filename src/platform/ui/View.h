@@ -29,7 +29,6 @@ class View : public LayoutItem {
   Rect bounds() const { return {0, 0, _frame.width, _frame.height}; }
 
   /// Distances from the edges that `layoutMarginsFrame` keeps, in points. None until set.
-  const Insets& layoutMargins() const { return _layoutMargins; }
   void setLayoutMargins(const Insets& margins);
   /// The bounds inside the layout margins, never of negative size.
   Rect layoutMarginsFrame() const;
@@ -53,9 +52,8 @@ class View : public LayoutItem {
 
   /// Device pixels for each point of the screen that the view is on.
   virtual double screenScale() const;
-  /// Whether leading is on the right: as the nearest view that has it set says, else as the locale's script.
+  /// Whether leading is on the right: as the locale's script.
   bool isRightToLeft() const;
-  void setRightToLeft(std::optional<bool> rightToLeft);
 
   /// Asks for `layoutSubviews` at the next `layoutIfNeeded`.
   void setNeedsLayout();
@@ -145,8 +143,7 @@ class View : public LayoutItem {
   std::vector<std::shared_ptr<LayoutGuide>> _guides;
   std::vector<std::shared_ptr<LayoutConstraint>> _constraints;
   std::unique_ptr<LayoutEngine> _engine;  // of a layout root with constraints inside
-  std::optional<bool> _rightToLeft;
-  double _laidOutScale = 0;  // of the screen, when the root of all views was last laid out
+  double _laidOutScale = 0;               // of the screen, when the root of all views was last laid out
   int _compressionRank = 0;
   bool _hidden = false;
   bool _usesAutomaticConstraints = true;

@@ -23,7 +23,6 @@ class VisualEffect final : public Object {
   static std::shared_ptr<const VisualEffect> widgetTertiaryVibrancyEffect();
   explicit VisualEffect(std::int64_t vibrancyStyle) : _vibrancyStyle(vibrancyStyle) {}
 
-  std::int64_t vibrancyStyle() const { return _vibrancyStyle; }
   Color color(Appearance appearance) const;
   std::string_view className() const override { return "VisualEffect"; }
 

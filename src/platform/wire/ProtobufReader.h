@@ -29,10 +29,7 @@ class ProtobufReader {
     if (_position < _length && _bytes[_position] < 0x80) return _bytes[_position++];
     return readLongVarint();
   }
-  std::int32_t readInt32() { return static_cast<std::int32_t>(readVarint()); }
   std::int64_t readInt64() { return static_cast<std::int64_t>(readVarint()); }
-  std::uint32_t readUInt32() { return static_cast<std::uint32_t>(readVarint()); }
-  std::uint64_t readUInt64() { return readVarint(); }
   bool readBool() { return readVarint() != 0; }
   double readDouble();
   /// The bytes of a length-delimited field, in place; absent when they are not all there.

@@ -24,7 +24,6 @@ class ProtobufWriter {
   void writeBool(bool value, std::uint32_t field) { writeUInt64(value ? 1 : 0, field); }
   void writeInt32(std::int32_t value, std::uint32_t field) { writeInt64(value, field); }
   void writeInt64(std::int64_t value, std::uint32_t field) { writeUInt64(static_cast<std::uint64_t>(value), field); }
-  void writeUInt32(std::uint32_t value, std::uint32_t field) { writeUInt64(value, field); }
   [[gnu::always_inline]] void writeUInt64(std::uint64_t value, std::uint32_t field) {
     reserve(kMaximumTagLength + kMaximumVarintLength);
     putVarint(value);

@@ -84,10 +84,6 @@ void LayoutConstraint::activateConstraints(const std::vector<std::shared_ptr<Lay
   for (const auto& constraint : constraints) constraint->setActive(true);
 }
 
-void LayoutConstraint::deactivateConstraints(const std::vector<std::shared_ptr<LayoutConstraint>>& constraints) {
-  for (const auto& constraint : constraints) constraint->setActive(false);
-}
-
 bool LayoutConstraint::involvesDescendantOf(const View& view) const {
   const auto isInside = [&](const LayoutAnchor& anchor) {
     const View* owner = owningViewOf(anchor);

@@ -50,7 +50,6 @@ class LayoutConstraint final : public Object {
   /// Throws std::invalid_argument for a constraint whose items are gone or are not in one tree of views.
   void setActive(bool active);
   static void activateConstraints(const std::vector<std::shared_ptr<LayoutConstraint>>& constraints);
-  static void deactivateConstraints(const std::vector<std::shared_ptr<LayoutConstraint>>& constraints);
 
   /// What logs call the constraint; its rule until set.
   void setIdentifier(std::string identifier) { _identifier = std::move(identifier); }

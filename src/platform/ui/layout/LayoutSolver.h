@@ -59,8 +59,6 @@ class LayoutSolver {
   /// contradict each other with the new constant, this one among them, and the old constant stays.
   std::vector<ConstraintId> setConstant(ConstraintId id, double constant);
 
-  std::size_t constraintCount() const { return _constraints.size() - _unused.size(); }
-
   /// How variables and constraints are called in `dump`; empty functions give "v0" and "c0".
   struct Names {
     std::function<std::string(Variable)> variable;
