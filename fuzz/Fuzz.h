@@ -2,7 +2,6 @@
 
 #include <cstdio>
 #include <cstdlib>
-#include <span>
 #include <string_view>
 
 #include "desktop/gtfs/text/Utf8.h"
@@ -22,23 +21,6 @@ inline void require(bool holds, const char* what) {
 inline std::string_view textOf(const std::uint8_t* data, std::size_t size) {
   return {reinterpret_cast<const char*>(data), size};
 }
-
-/// Takes small numbers off the front of an input; zeros when it is used up.
-class Choices {
- public:
-  explicit Choices(std::span<const std::uint8_t> bytes) : _bytes(bytes) {}
-  bool isEmpty() const { return _bytes.empty(); }
-  /// 0 to `count` - 1, at most 255.
-  unsigned upTo(unsigned count) {
-    if (_bytes.empty()) return 0;
-    const std::uint8_t byte = _bytes.front();
-    _bytes = _bytes.subspan(1);
-    return byte % count;
-  }
-
- private:
-  std::span<const std::uint8_t> _bytes;
-};
 
 /// A text that a publisher wrote, as it is shown: valid UTF-8 without controls, invisible characters and directional
 /// embeddings, with no white space at its ends or twice in a row, and no more than one empty line.

@@ -1,8 +1,5 @@
-#include <gmock/gmock.h>
-
 #include "analytics/NBTransitIncidentsAnalyticsDelegate.h"
 #include "support/TestPlatform.h"
-#include "support/TransitFixtures.h"
 #include "support/WidgetHostDouble.h"
 
 namespace nimbo {

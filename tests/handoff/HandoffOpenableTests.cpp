@@ -1,11 +1,8 @@
-#include <gtest/gtest.h>
-
 #include "handoff/ApplicationRecord+NimboExtras.h"
 #include "handoff/NBOpenable.h"
 #include "handoff/NBUserActivityData.h"
 #include "platform/UserSession.h"
 #include "support/TestPlatform.h"
-#include "support/TransitFixtures.h"
 #include "support/WidgetHostDouble.h"
 
 namespace nimbo {

@@ -1,10 +1,7 @@
 #include "host/Programs.h"
 
-#include <fcntl.h>
-#include <spawn.h>
-#include <sys/wait.h>
-#include <unistd.h>
-
+#include <cstdlib>
+#include <regex>
 #include <sstream>
 #include <stdexcept>
 
@@ -44,24 +41,15 @@ ProgramRun Programs::run(std::vector<std::string> arguments, const std::string& 
                          const std::string& output) const {
   folder.write("stdin", input);
   folder.write("stdout", "");
-  const std::string files[] = {folder.path() / "stdin", output.empty() ? (folder.path() / "stdout").string() : output,
-                               folder.path() / "stderr"};
-  posix_spawn_file_actions_t actions;
-  posix_spawn_file_actions_init(&actions);
-  posix_spawn_file_actions_addopen(&actions, 0, files[0].c_str(), O_RDONLY, 0);
-  for (const int fd : {1, 2})
-    posix_spawn_file_actions_addopen(&actions, fd, files[fd].c_str(), O_WRONLY | O_CREAT | O_TRUNC | O_NOCTTY, 0600);
-  arguments.insert(arguments.begin(),
-                   {NIMBO_TRANSIT, "--config", folder.path() / "config", "--state", folder.path() / "state"});
-  std::vector<char*> argv;
-  for (std::string& argument : arguments) argv.push_back(argument.data());
-  argv.push_back(nullptr);
-  pid_t process = 0;
-  const int failure = posix_spawn(&process, NIMBO_TRANSIT, &actions, nullptr, argv.data(), environ);
-  posix_spawn_file_actions_destroy(&actions);
-  if (failure != 0) throw std::runtime_error("cannot start " NIMBO_TRANSIT);
-  int status = 0;
-  waitpid(process, &status, 0);
+  arguments.insert(arguments.begin(), {"--config", folder.path() / "config", "--state", folder.path() / "state", "<",
+                                       folder.path() / "stdin", "2>", folder.path() / "stderr", ">",
+                                       output.empty() ? (folder.path() / "stdout").string() : output});
+  std::string command = "exec " NIMBO_TRANSIT;
+  for (const std::string& argument : arguments) {
+    const bool isRedirection = argument == "<" || argument == ">" || argument == "2>";
+    command += isRedirection ? " " + argument : " '" + std::regex_replace(argument, std::regex("'"), "'\\''") + "'";
+  }
+  const int status = std::system(command.c_str());
   return {WIFEXITED(status) ? WEXITSTATUS(status) : 128 + WTERMSIG(status), folder.read("stdout"),
           folder.read("stderr")};
 }

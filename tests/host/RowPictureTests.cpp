@@ -220,16 +220,5 @@ TEST_F(RowPictures, KeepShieldsOffTheTextsHoweverNarrowTheyAre) {
         }
 }
 
-TEST_F(RowPictures, CountTheShieldsThatDoNotFit) {
-  for (const int lines : {3, 30}) {
-    setUpCity(lines);
-    for (const int width : {200, 359})
-      for (const char* locale : {"en", "ar"}) {
-        const json sizes = {{"compact", {width, 110}}, {"expanded", {width, 440}}};
-        expectRows({{"displayModes", sizes}, {"locale", locale}}, false);
-      }
-  }
-}
-
 }  // namespace
 }  // namespace nimbo

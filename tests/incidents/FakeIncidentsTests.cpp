@@ -1,10 +1,7 @@
-#include <gmock/gmock.h>
-
 #include "incidents/DebugTransitIncident.h"
 #include "incidents/NBTransitIncidentFetcher.h"
 #include "incidents/SharedSettingsStore+Nimbo.h"
 #include "support/TestPlatform.h"
-#include "support/TransitFixtures.h"
 
 namespace nimbo {
 namespace {
@@ -73,23 +70,6 @@ TEST(FakeIncidents, AreStrikesFromYesterdayUntilTomorrow) {
   ASSERT_EQ(fake->affectedEntities().size(), 1u);
   EXPECT_EQ(fake->affectedEntities()[0]->muid(), 1000u);
   EXPECT_FALSE(fake->affectedEntities()[0]->hasNextStopIDs());
-}
-
-TEST(FakeIncidents, StandOnALineThatIsTheRealOneInAllElse) {
-  const auto system = std::make_shared<const TransitSystem>(1, "System", nullptr);
-  const auto line = std::make_shared<const BasicTransitLineItem>(
-      BasicTransitLineItem::Fields{std::make_shared<const MapItemIdentifier>(7), "Red", system, shieldArtwork("1"),
-                                   shieldArtwork("2"), shieldArtwork("3"), "#ff0000", true, TransitIncidents()});
-  const TransitIncidents incidents{incident(1)};
-  const std::shared_ptr<const TransitLineItem> fake = DebugTransitLineItem::initWithLine_incidents(line, incidents);
-  const auto answers = [](const TransitLineItem& item) {
-    return std::tuple(item.muid(), item.identifier(), item.name(), item.system(), item.artwork(), item.modeArtwork(),
-                      item.alternateArtwork(), item.hasLineColorString(), item.lineColorString(), item.isBus());
-  };
-  EXPECT_EQ(answers(*fake), answers(*line));
-  EXPECT_EQ(fake->incidents(), incidents);
-  EXPECT_TRUE(fake->hasIncidentComponent());
-  EXPECT_FALSE(fake->isIncidentsTTLExpired());
 }
 
 }  // namespace

@@ -1,5 +1,3 @@
-#include <gmock/gmock.h>
-
 #include <atomic>
 #include <future>
 #include <thread>
@@ -9,7 +7,6 @@
 #include "platform/DueAnswer.h"
 #include "support/NoThreads.h"
 #include "support/TestPlatform.h"
-#include "support/TransitFixtures.h"
 
 namespace nimbo {
 namespace {

@@ -1,5 +1,3 @@
-#include <gmock/gmock.h>
-
 #include "incidents/Result.h"
 #include "platform/foundation/Hash.h"
 #include "support/TestPlatform.h"

@@ -1,5 +1,3 @@
-#include <gmock/gmock.h>
-
 #include "handoff/NBOpenable.h"
 #include "items/NBTransitIncidentDataSourceErrorBuilder.h"
 #include "items/NBTransitIncidentFilter.h"
@@ -9,7 +7,6 @@
 #include "platform/artwork/ArtworkCache.h"
 #include "platform/artwork/ArtworkImageSource.h"
 #include "support/TestPlatform.h"
-#include "support/TransitFixtures.h"
 
 namespace nimbo {
 namespace {

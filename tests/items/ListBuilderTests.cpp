@@ -1,5 +1,3 @@
-#include <gmock/gmock.h>
-
 #include <cctype>
 
 #include "analytics/NBTransitIncidentsAnalyticsDelegate.h"
@@ -10,7 +8,6 @@
 #include "platform/artwork/ArtworkCache.h"
 #include "platform/artwork/ArtworkImageSource.h"
 #include "support/TestPlatform.h"
-#include "support/TransitFixtures.h"
 
 namespace nimbo {
 namespace {
@@ -287,15 +284,6 @@ TEST_F(ListBuilder, TellsTheSessionEveryIncidentWithItsFirstLine) {
   for (const auto& item : record.incidentItems) items.push_back(item.transitLineMuid + " " + item.transitIncidentTitle);
   EXPECT_THAT(items, testing::ElementsAre("100 Incident 1", "100 Incident 2", "101 Incident 3"));
   EXPECT_EQ(record.transitMessageType, 1);
-}
-
-TEST_F(ListBuilder, AnswersOneListItemAndEqualOnesForEqualLines) {
-  const auto builder = NBTransitIncidentsDataSourceBuilder::initWithLineItems_maxNumberOfItems_artworkCache_analytics(
-      Network("A/rail:1,2 B/rail:2 C:").lines, 0, cache, nullptr);
-  const NBTransitListItemRef list = builder->listItem();
-  EXPECT_EQ(builder->listItem(), list);
-  EXPECT_TRUE(list->isEqual(build(Network("A/rail:1,2 B/rail:2 C:")).get()));
-  EXPECT_FALSE(list->isEqual(build(Network("A/rail:1,2 B/bus:2 C:")).get()));
 }
 
 }  // namespace

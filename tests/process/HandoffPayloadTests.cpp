@@ -1,7 +1,5 @@
 // Hand-offs through the real compressor and archive, and the decoder that shows them to people.
 
-#include <gtest/gtest.h>
-
 #include <nlohmann/json.hpp>
 
 #include "desktop/archive/Bzip2.h"
@@ -10,7 +8,6 @@
 #include "handoff/NimboActivity.h"
 #include "process/HandoffDecoder.h"
 #include "support/TestPlatform.h"
-#include "support/TransitFixtures.h"
 #include "widget/NBTransitIncidentViewControllerState.h"
 
 namespace nimbo {

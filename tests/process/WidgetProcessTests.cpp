@@ -54,23 +54,6 @@ TEST(WidgetProcess, ShowsTheRowsThatTheFeedCallsFor) {
   }
 }
 
-TEST(WidgetProcess, MergesASharedIncidentUnderTheLinesNames) {
-  Programs programs;
-  programs.setUpCity({"m1", "m2", "b10"},
-                     {{"a", {"m1", "m2"}, "Closed", "No trains."}, {"b", {"m2", "b10"}, "Fair", "Crowds."}});
-  const auto seen =
-      snapshots(programs.play(appearing() + std::vector<json>{request("performUpdate"), kExpand, request("snapshot")}));
-  ASSERT_THAT(seen, SizeIs(1));
-  const json& rows = seen[0]["rows"];
-  ASSERT_THAT(rows, SizeIs(2));
-  EXPECT_EQ(rows[0]["secondaryText"], "1 and 2: No trains.");
-  EXPECT_EQ(rows[0]["artwork"]["alpha"], 1.0);
-  EXPECT_EQ(rows[0]["artwork"]["shield"]["icon"]["defaultTransitType"], 2) << "the symbol of the metro's mode";
-  EXPECT_EQ(rows[1]["secondaryText"], "2 and 10: Crowds.");
-  EXPECT_EQ(rows[1]["artwork"]["image"], "WidgetGenericTransit");
-  EXPECT_THAT(seen[0]["listItem"]["summaryItem"]["artworks"], SizeIs(3));
-}
-
 TEST(WidgetProcess, ChangesItsRowsOnTheSecond) {
   Programs programs;
   const std::int64_t now = Programs::unixNow();
@@ -199,19 +182,6 @@ TEST(WidgetProcess, KeepsPrivatePartsFromItsHost) {
                                      {"message", "The line <private> is gone from its feed"}}}}));
 }
 
-TEST(WidgetProcess, AnswersBothOfTwoUpdates) {
-  Programs programs;
-  programs.setUpCity({"m1"}, {});
-  const json first = request("performUpdate"), second = request("performUpdate");
-  std::vector<int> updates;
-  for (const json& line : programs.play(appearing() + std::vector<json>{first, second, request("snapshot")}))
-    if (line.contains("result") && line["result"].contains("updateResult")) {
-      EXPECT_EQ(line["result"]["updateResult"], "newData");
-      updates.push_back(line["id"]);
-    }
-  EXPECT_THAT(updates, ElementsAre(first["id"], second["id"]));
-}
-
 TEST(WidgetProcess, ShowsIncidentsThatAreTooManyToHandOver) {
   std::vector<AlertsBuilder::Alert> alerts;
   for (int i = 0; i < 600; ++i) {
@@ -249,15 +219,10 @@ TEST(WidgetProcess, OutlivesEveryMessage) {
       {R"({"jsonrpc":"2.0","method":"shutdown"})" + std::string(1, '\0'), -32700},
       {request("dance"), -32601},
       {request("initialize"), -32001},
-      {request("loadView"), -32001},
       {request("viewDidDisappear"), -32001},
       {request("setActiveDisplayMode", {{"mode", "huge"}}), -32602},
-      {request("setActiveDisplayMode", {{"mode", "expanded"}, {"maximumSize", {1, "2"}}}), -32602},
-      {request("transitionToSize", {{"size", {-1, 5}}}), -32602},
-      {request("setTextSize", {{"category", "tiny"}}), -32602},
       {request("selectRow", {{"section", 0}, {"row", 1}}), -32602},
       {request("selectRow", {{"section", 1}, {"row", 0}}), -32602},
-      {request("selectRow", {{"section", 0}}), -32602},
       {request("advanceTime", {{"seconds", -1}}), -32602},
       {request("render", {{"path", "/nonexistent/folder/x.png"}}), -32602},
       {request("render", {{"surface", "/proc/self/fd/0"}}), -32602},

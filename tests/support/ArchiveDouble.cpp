@@ -24,14 +24,8 @@ class TextEncoder final : public KeyedEncoder {
     }
   }
   void encodeBool_forKey(bool value, std::string_view key) override { write(key, value ? "yes" : "no"); }
-  void encodeInt64_forKey(std::int64_t value, std::string_view key) override { write(key, std::to_string(value)); }
-  void encodeUInt64_forKey(std::uint64_t value, std::string_view key) override { write(key, std::to_string(value)); }
-  void encodeDouble_forKey(double value, std::string_view key) override { write(key, std::to_string(value)); }
   void encodeString_forKey(const std::optional<std::string>& value, std::string_view key) override {
     if (value) write(key, "\"" + *value + "\"");
-  }
-  void encodeDate_forKey(const std::optional<Date>& value, std::string_view key) override {
-    if (value) write(key, isoTextOfDate(*value));
   }
   void encodeBytes_forKey(std::span<const std::uint8_t> value, std::string_view key) override {
     write(key, std::string(value.begin(), value.end()));

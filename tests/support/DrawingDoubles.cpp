@@ -37,7 +37,7 @@ ImageRef ShieldRendererDouble::render(const TransitArtwork& artwork, std::int64_
 }
 
 TextLayoutRef TextSystemDouble::layOut(const std::string& text, const FontDescriptor& font, double maxWidth,
-                                       std::size_t maxLines, TextAlignment, bool) {
+                                       std::size_t maxLines, bool) {
   const double characters = maxWidth / (font.pointSize / 2) + 1e-9;  // a width of exactly n characters holds n
   constexpr std::size_t kAny = std::numeric_limits<std::size_t>::max();
   const bool oneColumn = !(maxWidth > 0);

@@ -76,7 +76,7 @@ class TextSystemDouble final : public TextSystem {
     return {0.8 * font.pointSize, 0.2 * font.pointSize, 0.7 * font.pointSize};
   }
   TextLayoutRef layOut(const std::string& text, const FontDescriptor& font, double maxWidth, std::size_t maxLines,
-                       TextAlignment alignment, bool rightToLeft) override;
+                       bool rightToLeft) override;
 };
 
 }  // namespace nimbo

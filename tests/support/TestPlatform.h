@@ -1,17 +1,14 @@
 #pragma once
 
+#include <gmock/gmock.h>
+
 #include "platform/Platform.h"
 #include "platform/VirtualTime.h"
-#include "support/ActivityLauncherDouble.h"
 #include "support/ArchiveDouble.h"
 #include "support/DrawingDoubles.h"
-#include "support/FavoritesDouble.h"
-#include "support/MemorySettings.h"
-#include "support/RecordingLog.h"
 #include "support/SmallDoubles.h"
-#include "support/StringTablesDouble.h"
 #include "support/TestRunLoop.h"
-#include "support/TransitLineServiceDouble.h"
+#include "support/TransitFixtures.h"
 
 namespace nimbo {
 

@@ -5,7 +5,6 @@
 #include <functional>
 #include <mutex>
 #include <thread>
-#include <vector>
 
 #include "platform/RunLoop.h"
 #include "platform/VirtualTime.h"
@@ -25,9 +24,8 @@ class TestRunLoop final : public RunLoop {
     _arrived.notify_all();
   }
   std::shared_ptr<Timer> scheduleTimer(TimeInterval interval, bool repeats, std::function<void(Timer&)> fire) override {
-    return std::make_shared<TolerantTimer>(_time.scheduleTimer(interval, repeats, std::move(fire)), tolerances);
+    return _time.scheduleTimer(interval, repeats, std::move(fire));
   }
-  std::vector<TimeInterval> tolerances;  ///< given to the timers so far
 
   /// Runs the queued work, and what that queues, until none is left.
   void runUntilIdle() {
@@ -62,17 +60,6 @@ class TestRunLoop final : public RunLoop {
   }
 
  private:
-  /// Virtual time is never late: only records by how much it might be.
-  struct TolerantTimer final : Timer {
-    TolerantTimer(std::shared_ptr<Timer> inner, std::vector<TimeInterval>& given)
-        : timer(std::move(inner)), tolerances(given) {}
-    bool isValid() const override { return timer->isValid(); }
-    void invalidate() override { timer->invalidate(); }
-    void setTolerance(TimeInterval tolerance) override { tolerances.push_back(tolerance); }
-    std::shared_ptr<Timer> timer;
-    std::vector<TimeInterval>& tolerances;
-  };
-
   bool runOne() {
     std::unique_lock guard(_lock);
     if (_queue.empty()) return false;

@@ -1,10 +1,7 @@
-#include <gmock/gmock.h>
-
 #include "items/NBTransitSummaryItem.h"
 #include "platform/artwork/ArtworkCache.h"
 #include "support/RecordingPainter.h"
 #include "support/TestPlatform.h"
-#include "support/TransitFixtures.h"
 #include "ui/ArtworkCache+Nimbo.h"
 #include "ui/DynamicTypeWizard.h"
 #include "ui/NBTransitItemFixedHeightCell.h"
@@ -188,8 +185,10 @@ TEST_F(SummaryCell, CountsTheShieldsThatDoNotFit) {
     summaryCell->setItem(summary(count));
     layOut(*summaryCell, width);
     EXPECT_EQ(summaryCell->frame().height, 110);
-    EXPECT_EQ(shields.numberOfShownItems(), shown);
-    EXPECT_EQ(shields.truncationText(), text);
+    RecordingPainter painter;
+    summaryCell->draw(painter);
+    EXPECT_THAT(painter.pictures, testing::SizeIs(shown));
+    EXPECT_EQ(painter.texts.back().text, *text ? text : "4 advisories");
     // The cap line of the text and the bottom of the shields are as far from the edges, to a pixel.
     EXPECT_EQ(frameInCell(*summaryCell->primaryLabel()), (Rect{0, 26, width, 17}));
     EXPECT_EQ(frameInCell(shields), (Rect{0, 55, width, 28}));

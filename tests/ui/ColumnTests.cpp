@@ -1,8 +1,5 @@
-#include <gmock/gmock.h>
-
 #include "platform/artwork/ArtworkImageSource.h"
 #include "support/TestPlatform.h"
-#include "support/TransitFixtures.h"
 #include "ui/ArtworkCache+Nimbo.h"
 #include "ui/NBTransitItemArtworkColumnCalculator.h"
 

@@ -1,5 +1,3 @@
-#include <gmock/gmock.h>
-
 #include "platform/ui/Environment.h"
 #include "support/TestPlatform.h"
 #include "ui/DynamicTypeWizard.h"

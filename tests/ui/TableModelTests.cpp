@@ -1,5 +1,3 @@
-#include <gmock/gmock.h>
-
 #include <algorithm>
 
 #include "analytics/NBTransitIncidentsAnalyticsDelegate.h"
@@ -8,7 +6,6 @@
 #include "items/NBTransitSummaryItem.h"
 #include "platform/artwork/ArtworkCache.h"
 #include "support/TestPlatform.h"
-#include "support/TransitFixtures.h"
 #include "ui/ArtworkCache+Nimbo.h"
 #include "ui/NBTransitIncidentDataSource.h"
 #include "ui/NBTransitItemFixedHeightCell.h"

@@ -1,6 +1,5 @@
 #include <gmock/gmock.h>
 
-#include "items/NumberList.h"
 #include "platform/transit/IncidentStringProvider.h"
 #include "support/TransitFixtures.h"
 #include "util/NimboMap.h"
@@ -42,19 +41,6 @@ TEST(IncidentStringProvider, FillsBothTextsWithWhatIsThereAndShowsNoneTwice) {
   }
   EXPECT_EQ(IncidentStringProvider::cellTitleForIncident(nullptr), "");
   EXPECT_EQ(IncidentStringProvider::cellSecondaryTextForIncident(nullptr), "");
-}
-
-TEST(NumberList, FindsTheFirstEqualNumberInListsOfEveryLength) {
-  NumberList list;
-  for (std::uint64_t i = 0; i < 300; ++i) {
-    EXPECT_EQ(list.firstIndexOf(i << 32), list.count());
-    list.append(i << 32);
-    for (std::uint64_t j = 0; j <= i; ++j) ASSERT_EQ(list.firstIndexOf(j << 32), j);
-    ASSERT_EQ(list.firstIndexOf(i), i == 0 ? 0u : list.count()) << "folds to the same as another number";
-  }
-  list.replace(270, std::uint64_t{40} << 32);
-  EXPECT_EQ(list.firstIndexOf(std::uint64_t{40} << 32, 41), 270u);
-  EXPECT_EQ(list.firstIndexOf(std::uint64_t{270} << 32), list.count());
 }
 
 }  // namespace

@@ -1,11 +1,8 @@
-#include <gmock/gmock.h>
-
 #include <limits>
 
 #include "platform/ui/Environment.h"
 #include "support/RecordingPainter.h"
 #include "support/TestPlatform.h"
-#include "support/TransitFixtures.h"
 #include "support/WidgetHostDouble.h"
 #include "widget/NBTransitIncidentsViewController.h"
 

@@ -1,7 +1,5 @@
 // Keyed archives and saved states, their bytes read and written by a plain CBOR library too.
 
-#include <gtest/gtest.h>
-
 #include <cmath>
 #include <limits>
 #include <nlohmann/json.hpp>
@@ -12,7 +10,6 @@
 #include "platform/wire/StoredTransitIncident.h"
 #include "platform/wire/StoredTransitLineItem.h"
 #include "support/TestPlatform.h"
-#include "support/TransitFixtures.h"
 #include "widget/NBTransitIncidentsViewController.h"
 
 namespace nimbo {
@@ -231,12 +228,10 @@ TEST_F(Archive, BrokenStatesEndInNothingAndOnlyUndecodableOnesInAnError) {
       // Bytes that are no archive.
       {{}, ""},
       {json::to_cbor({{"$archive", 2}, {"root", 1}}), ""},
-      {json::to_cbor({{"$archive", "1"}, {"root", 1}}), ""},
       {archiveOf(deep), ""},
       {withRest, ""},
       {Bytes(std::size_t{100} << 20), ""},
       {raw(root + "\x9b" + most), ""},                      // an array of 2^64 - 1
-      {raw(root + "\x5b" + most + "."), ""},                // as many bytes
       {raw(root + "\x7b" + most + "."), ""},                // as long a text
       {raw("\xa3\x68$archive\x01\x61x\x01\x61x\x02"), ""},  // a key twice
       {raw(root + "\xc1" + '\0'), ""},                      // a tag
@@ -245,7 +240,6 @@ TEST_F(Archive, BrokenStatesEndInNothingAndOnlyUndecodableOnesInAnError) {
       {json::to_cbor({{"$archive", 1}}), ""},
       {state({{"expanded", true}}), ""},
       {state({{"lineItemResultSuccess", line}}), ""},
-      {archiveOf(1), ""},
       // Archives that hold what may not stand there.
       {archiveOf(nullptr), "root: null stands where an object is needed"},
       {archiveOf(json::object()), "root: the object has no class name"},

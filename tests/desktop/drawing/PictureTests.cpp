@@ -1,5 +1,3 @@
-#include <gtest/gtest.h>
-
 #include <cmath>
 #include <limits>
 
@@ -86,22 +84,6 @@ TEST(Picture, FitsImagesAndTintsTheirShape) {
   EXPECT_EQ(greys(2.3), greys(1.74));
   const std::uint32_t faint = drawn(0.3, kBlack).at(35, 15) & 0xff;
   EXPECT_NEAR(faint, 255 * 0.7, 2);
-}
-
-TEST(Picture, IsWrittenWholeOrNotAtAll) {
-  const TemporaryFolder parent;
-  const auto folder = parent.path() / "pictures";
-  const auto draw = [](Painter& painter) { painter.fillRect({0, 0, 5, 5}, kRed); };
-  EXPECT_NE(renderToPNG(draw, {10, 10}, 1, kWhite, folder / "a.png"), nullptr) << "a folder that is missing";
-  std::filesystem::create_directory(folder);
-  EXPECT_EQ(renderToPNG(draw, {10, 10}, 1, kWhite, folder / "a.png"), nullptr);
-  EXPECT_TRUE(parent.read("pictures/a.png").starts_with("\x89PNG\r\n\x1a\n"));
-  std::filesystem::create_directory(folder / "b.png");
-  const auto error = renderToPNG(draw, {10, 10}, 1, kWhite, folder / "b.png");
-  ASSERT_NE(error, nullptr);
-  EXPECT_NE(error->reason().find((folder / "b.png").native()), std::string::npos);
-  const std::filesystem::directory_iterator files(folder);
-  EXPECT_EQ(std::distance(begin(files), end(files)), 2) << "nothing half-written stays";
 }
 
 TEST(NamedImages, AreSharpAtAnyScaleAndReadableInBothAppearances) {

@@ -1,5 +1,3 @@
-#include <gtest/gtest.h>
-
 #include <algorithm>
 
 #include "desktop/drawing/CairoShieldRenderer.h"
@@ -86,18 +84,6 @@ TEST_F(Shields, KeepTheTextInsideTheShape) {
       }
 }
 
-TEST_F(Shields, KnowTheirShapes) {
-  const Ink box(render(shieldOf(ShieldType::roundedBox, "1"))), circle(render(shieldOf(ShieldType::circle, "1"))),
-      pill(render(shieldOf(ShieldType::pill, "1"))), other(render(shieldOf(static_cast<ShieldType>(77), "1")));
-  EXPECT_EQ(box.width(), box.height());
-  EXPECT_EQ(circle.width(), circle.height());
-  EXPECT_GT(pill.width(), pill.height());
-  EXPECT_GT(box.drawn().count, circle.drawn().count);
-  EXPECT_EQ(other.drawn().count, box.drawn().count);
-  EXPECT_EQ(Ink(render(shieldOf(ShieldType::circle, "SIR"))).width(),
-            Ink(render(shieldOf(ShieldType::pill, "SIR"))).width());
-}
-
 TEST_F(Shields, KeepTheirTextLegible) {
   // The agency's colour where it contrasts, else black or white, whichever contrasts more.
   for (const auto& [color, textColor, expected] : {std::tuple{"#000000", "#ffff00", 0xffff00u},
@@ -169,17 +155,6 @@ TEST_F(Shields, DrawTextsAndNothing) {
   EXPECT_TRUE(render(shieldOf(ShieldType::pill, nullptr, "#00ff00")));
   EXPECT_FALSE(render(fieldsOf(shieldOf(ShieldType::pill, "1")), 7, 5000)) << "too large";
   EXPECT_EQ(platform.log.texts("Images", LogLevel::error).size(), 1u);
-}
-
-TEST_F(Shields, CarryABadgeBesideTheText) {
-  auto fields = fieldsOf(shieldOf(ShieldType::roundedBox, "42", "#0039a6", "#ffff00"));
-  const Ink plain(render(fields));
-  fields.hasRoutingIncidentBadge = true;
-  const Ink badged(render(fields));
-  EXPECT_EQ(badged.height(), plain.height());
-  EXPECT_GT(badged.width(), plain.width());
-  EXPECT_EQ(badged.drawn().right, badged.width());
-  EXPECT_EQ(badged.ofColor(0xffff00).count, plain.ofColor(0xffff00).count);
 }
 
 }  // namespace

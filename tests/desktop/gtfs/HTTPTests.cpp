@@ -1,7 +1,4 @@
-#include <openssl/pem.h>
 #include <openssl/ssl.h>
-#include <openssl/x509.h>
-#include <openssl/x509v3.h>
 #include <sched.h>
 #include <sys/mount.h>
 #include <sys/wait.h>
@@ -97,20 +94,14 @@ TEST(HTTPFetcher, GivesUpOnServersThatDoNotAnswer) {
 class OwnCertificate {
  public:
   OwnCertificate() {
-    X509_NAME* const name = X509_get_subject_name(_certificate.get());
-    X509_NAME_add_entry_by_txt(name, "CN", MBSTRING_ASC, reinterpret_cast<const unsigned char*>("127.0.0.1"), -1, -1,
-                               0);
-    X509_set_issuer_name(_certificate.get(), name);
-    const std::unique_ptr<X509_EXTENSION, decltype(&X509_EXTENSION_free)> address(
-        X509V3_EXT_conf_nid(nullptr, nullptr, NID_subject_alt_name, "IP:127.0.0.1"), X509_EXTENSION_free);
-    X509_set_version(_certificate.get(), X509_VERSION_3);
-    X509_add_ext(_certificate.get(), address.get(), -1);
-    X509_gmtime_adj(X509_getm_notBefore(_certificate.get()), 0);
-    X509_gmtime_adj(X509_getm_notAfter(_certificate.get()), 3600);
-    X509_set_pubkey(_certificate.get(), _key.get());
-    X509_sign(_certificate.get(), _key.get(), EVP_sha256());
-    SSL_CTX_use_certificate(_context.get(), _certificate.get());
-    SSL_CTX_use_PrivateKey(_context.get(), _key.get());
+    const std::string key = _folder.path() / "key.pem";
+    const std::string make =
+        "openssl req -x509 -newkey ec -pkeyopt ec_paramgen_curve:P-256 -nodes -subj /CN=127.0.0.1"
+        " -addext subjectAltName=IP:127.0.0.1 -keyout " +
+        key + " -out " + path().native();
+    EXPECT_EQ(std::system((make + " 2>/dev/null").c_str()), 0);
+    SSL_CTX_use_certificate_file(_context.get(), path().c_str(), SSL_FILETYPE_PEM);
+    SSL_CTX_use_PrivateKey_file(_context.get(), key.c_str(), SSL_FILETYPE_PEM);
   }
 
   void answer(int connection, const std::string& answer) const {
@@ -120,14 +111,10 @@ class OwnCertificate {
     if (SSL_accept(tls.get()) != 1 || SSL_read(tls.get(), request, sizeof request) <= 0) return;
     SSL_write(tls.get(), answer.data(), static_cast<int>(answer.size()));
   }
-  void writeTo(const std::filesystem::path& path) const {
-    const std::unique_ptr<BIO, decltype(&BIO_free)> file(BIO_new_file(path.c_str(), "w"), BIO_free);
-    PEM_write_bio_X509(file.get(), _certificate.get());
-  }
+  std::filesystem::path path() const { return _folder.path() / "certificate.pem"; }
 
  private:
-  std::unique_ptr<EVP_PKEY, decltype(&EVP_PKEY_free)> _key{EVP_EC_gen("P-256"), EVP_PKEY_free};
-  std::unique_ptr<X509, decltype(&X509_free)> _certificate{X509_new(), X509_free};
+  TemporaryFolder _folder;
   std::unique_ptr<SSL_CTX, decltype(&SSL_CTX_free)> _context{SSL_CTX_new(TLS_server_method()), SSL_CTX_free};
 };
 
@@ -168,16 +155,14 @@ bool trustIn(const std::filesystem::path& certificates) {
 
 TEST(HTTPFetcher, IsNotLedOffHTTPS) {
   const OwnCertificate certificate;
-  const TemporaryFolder folder;
-  certificate.writeTo(folder.path() / "trusted.pem");
   const pid_t attempt = ::fork();
-  if (attempt == 0) ::_exit(trustIn(folder.path() / "trusted.pem") ? 0 : 1);
+  if (attempt == 0) ::_exit(trustIn(certificate.path()) ? 0 : 1);
   int status = 0;
   ::waitpid(attempt, &status, 0);
   if (status != 0) GTEST_SKIP() << "no name space of one's own in which a certificate could be trusted";
   EXPECT_EXIT(
       {
-        const bool isTrusted = trustIn(folder.path() / "trusted.pem");
+        const bool isTrusted = trustIn(certificate.path());
         const LoopbackServer plain(
             [](const std::string&) { return Answer{LoopbackServer::answer("200 OK", "plain")}; });
         const auto stayed = fetchOverTLS(certificate, LoopbackServer::answer("200 OK", "there"));

@@ -256,23 +256,5 @@ TEST_F(LineServiceTest, CatalogFindsLines) {
   EXPECT_EQ(lines->errors.size(), 1u);
 }
 
-TEST_F(LineServiceTest, CheckTellsHowTheHalvesFit) {
-  const std::string alerts = folder.write("alerts.pb", feedBytes(alert("a", "T", route("r1") + route("r9")) +
-                                                                 alert("b", "T", "effect: 10 " + route("r2"))));
-  addFeed("north", {"1", "2"}, alerts);
-  const Feed feed = *FeedConfiguration(paths.config).feedNamed("north");
-  FeedCheckReport report = checkFeed(feed, FeedCache(paths.cache));
-  ASSERT_TRUE(report.staticFeed && report.alerts);
-  EXPECT_EQ(report.staticFeed->lines, 2u);
-  EXPECT_EQ(report.alerts->alerts, 2u);
-  EXPECT_EQ(report.alerts->selectors, 3u);
-  EXPECT_EQ(report.alerts->affectedLines, 1u);
-  EXPECT_EQ(report.alerts->unfit.entries().at(0).example, "route r9");
-  EXPECT_EQ(report.alerts->skipped.entries().at(0).example, "b");
-  std::filesystem::remove(folder.path() / "north/routes.txt");
-  report = checkFeed(feed, FeedCache(paths.cache));
-  EXPECT_TRUE(report.staticError && report.alerts);
-}
-
 }  // namespace
 }  // namespace nimbo

@@ -3,7 +3,6 @@
 #include "desktop/store/FavoritesSeal.h"
 #include "desktop/store/Fixture.h"
 #include "desktop/store/GuardedFavorites.h"
-#include "support/TransitFixtures.h"
 
 namespace nimbo {
 
@@ -62,29 +61,17 @@ TEST_F(FavoritesTest, ChangeLinesAndLeaveOtherKindsInTheirPlaces) {
   ASSERT_EQ(editor.add({lineItem(1, "A")}), nullptr);
   change("INSERT INTO favorites(position, kind, content) VALUES (1, 'place', x'00ff'), (4, 'guide', 12)");
   ASSERT_EQ(editor.add({lineItem(2, "B"), lineItem(3, "C")}), nullptr);
-  const Names beforeRefusals{"C", "place", "guide", "B", "A"};
-  const struct {
-    ErrorRef error;
-    std::optional<FavoritesError> refusal;
-    Names after;
-  } steps[] = {
-      {editor.move(1, 2), {}, names()},
-      {editor.move(3, 0), {}, names()},
-      {editor.move(2, 1), {}, names()},
-      {editor.move(2, 3), FavoritesError::position, names()},
-      {editor.move(9, 0), FavoritesError::unknown, names()},
-      {editor.remove({1, 9}), FavoritesError::unknown, names()},
-      {editor.add({lineItem(4, "D"), lineItem(2, "B")}), FavoritesError::duplicate, names()},
-      {editor.add({lineItem(4, "D"), lineItem(4, "D")}), FavoritesError::duplicate, names()},
-  };
-  EXPECT_THAT(steps[0].after, ElementsAre("B", "place", "guide", "C", "A"));
-  for (const auto& step : steps) {
-    SCOPED_TRACE(&step - steps);
-    EXPECT_EQ(step.error ? std::optional(FavoritesError{step.error->code()}) : std::nullopt, step.refusal);
-    if (&step != steps) {
-      EXPECT_EQ(step.after, beforeRefusals);
-    }
-  }
+  EXPECT_EQ(editor.move(1, 2), nullptr);
+  EXPECT_THAT(names(), ElementsAre("B", "place", "guide", "C", "A"));
+  EXPECT_EQ(editor.move(3, 0), nullptr);
+  EXPECT_EQ(editor.move(2, 1), nullptr) << "where it is";
+  for (const auto& [error, code] : {std::pair{editor.move(2, 3), FavoritesError::position},
+                                    {editor.move(9, 0), FavoritesError::unknown},
+                                    {editor.remove({1, 9}), FavoritesError::unknown},
+                                    {editor.add({lineItem(4, "D"), lineItem(2, "B")}), FavoritesError::duplicate},
+                                    {editor.add({lineItem(4, "D"), lineItem(4, "D")}), FavoritesError::duplicate}})
+    EXPECT_EQ(error ? std::optional(FavoritesError{error->code()}) : std::nullopt, code);
+  EXPECT_THAT(names(), ElementsAre("C", "place", "guide", "B", "A"));
   EXPECT_EQ(editor.remove({3}), nullptr);
   EXPECT_THAT(names(), ElementsAre("place", "guide", "B", "A"));
   EXPECT_EQ(connect().integer("SELECT count(*) FROM favorites WHERE (kind, content) IN"
@@ -110,16 +97,12 @@ TEST_F(FavoritesTest, KeepWholeLines) {
   const auto read = this->read();
   const TransitLineRef kept = dynamic_cast<const FavoriteTransitLine&>(*read.at(0)).transitLine();
   ASSERT_NE(kept, nullptr);
-  EXPECT_EQ(kept->muid(), line->muid());
-  EXPECT_EQ(kept->identifier()->locator()->feed, "city");
-  EXPECT_EQ(kept->identifier()->locator()->agencyID, "agency \uFFFD");
-  EXPECT_EQ(kept->identifier()->locator()->routeID, "U1");
-  EXPECT_EQ(kept->identifier()->locator()->mode, TransitMode::tram);
-  EXPECT_EQ(kept->name(), line->name());
-  EXPECT_EQ(kept->lineColorString(), "#336699");
-  EXPECT_TRUE(kept->isBus());
-  EXPECT_EQ(kept->system()->muid(), 1u << 31);
-  EXPECT_EQ(kept->system()->name(), "System");
+  const auto answers = [](const TransitLine& one) {
+    return std::tuple(one.muid(), one.name(), one.lineColorString(), one.isBus(), one.system()->muid(),
+                      one.system()->name());
+  };
+  EXPECT_EQ(answers(*kept), answers(*line));
+  EXPECT_EQ(kept->identifier()->locator(), (TransitLineLocator{"city", "agency \uFFFD", "U1", "1", TransitMode::tram}));
   EXPECT_TRUE(artworksAreEquivalent(kept->system()->artwork().get(), fields.system->artwork().get()));
   EXPECT_TRUE(artworksAreEquivalent(kept->modeArtwork().get(), line->modeArtwork().get()));
   EXPECT_TRUE(artworksAreEquivalent(kept->alternateArtwork().get(), line->alternateArtwork().get()));

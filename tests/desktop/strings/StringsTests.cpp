@@ -1,4 +1,3 @@
-#include <gmock/gmock.h>
 #include <unicode/locid.h>
 #include <unicode/messagepattern.h>
 #include <unicode/msgfmt.h>
@@ -124,8 +123,6 @@ TEST(StringTables, CountByTheRulesOfTheLanguage) {
       // for                 0             1                2            3            11           100
       {"en", {"0 Advisories", "1 Advisory", "2 Advisories", "3 Advisories", "11 Advisories", "100 Advisories"}},
       {"de", {"0 Hinweise", "1 Hinweis", "2 Hinweise", "3 Hinweise", "11 Hinweise", "100 Hinweise"}},
-      {"fr", {"0 alerte", "1 alerte", "2 alertes", "3 alertes", "11 alertes", "100 alertes"}},
-      {"es", {"0 avisos", "1 aviso", "2 avisos", "3 avisos", "11 avisos", "100 avisos"}},
       {"ja", {"運行情報0件", "運行情報1件", "運行情報2件", "運行情報3件", "運行情報11件", "運行情報100件"}},
       {"ar", {"لا تنبيهات", "تنبيه واحد", "تنبيهان", "٣ تنبيهات", "١١ تنبيهًا", "١٠٠ تنبيه"}},
       {"ar-AE", {"لا تنبيهات", "تنبيه واحد", "تنبيهان", "3 تنبيهات", "11 تنبيهًا", "100 تنبيه"}},
@@ -236,7 +233,6 @@ TEST(Locale, IsTheFirstOfLanguageThatHasTextsUnlessTheLocaleIsPlain) {
       {"", "", "de_DE", "pl:fr_CA.UTF-8:es", "fr_CA"},
       {"", "", "de_DE", ":fr", "fr"},
       {"", "", "de_DE", "pl:C:fr", "en"},
-      {"", "", "de_DE", "pl:cs", "pl"},
       {"", "", "de_DE", ":", "de_DE"},
       {"", "", "", "fr", "en"},
       {"C.UTF-8", "", "de_DE", "fr", "en"},

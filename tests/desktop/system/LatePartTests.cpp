@@ -1,24 +1,9 @@
-#include <gmock/gmock.h>
-
 #include "desktop/drawing/LateDrawing.h"
 #include "desktop/system/LatePart.h"
 #include "support/TestPlatform.h"
 
 namespace nimbo {
 namespace {
-
-TEST(LatePart, NamesTheFileThatIsMissing) {
-  const auto failure = [](const char* file) -> std::string {
-    try {
-      functionOfLatePart(file, "nimbo_other");
-    } catch (const LatePartMissing& missing) {
-      return missing.what();
-    }
-    return "it is there";
-  };
-  for (const char* file : {"libnimbo-other.so", "libnimbo-feeds.so"})
-    EXPECT_THAT(failure(file), testing::HasSubstr(file));
-}
 
 TEST(LatePart, HasTheProgramsPlatform) {
   LateDrawing drawing("en");

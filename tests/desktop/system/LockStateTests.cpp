@@ -1,5 +1,3 @@
-#include <gmock/gmock.h>
-
 #include "desktop/system/SoftLinkedDeviceLockState.h"
 #include "support/TemporaryFolder.h"
 #include "support/TestPlatform.h"

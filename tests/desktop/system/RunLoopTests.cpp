@@ -1,4 +1,3 @@
-#include <gmock/gmock.h>
 #include <sys/resource.h>
 #include <sys/socket.h>
 #include <unistd.h>

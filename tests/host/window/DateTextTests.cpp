@@ -1,4 +1,3 @@
-#include <gmock/gmock.h>
 #include <unicode/timezone.h>
 
 #include "host/window/Texts.h"

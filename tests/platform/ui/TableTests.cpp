@@ -1,5 +1,3 @@
-#include <gmock/gmock.h>
-
 #include <set>
 
 #include "platform/ui/Color.h"
@@ -80,10 +78,6 @@ TEST_F(Table, RowsAreAsTallAsTheirConstraintsWant) {
   EXPECT_EQ(rectOf(1), (Rect{0, 28, 300, 44}));
   EXPECT_EQ(rectOf(2), (Rect{0, 72, 300, 48}));
   EXPECT_EQ(footer->frame(), (Rect{0, 120, 300, 12}));
-  for (const Point inside : {Point{0, 28}, {299, 71.9}})
-    EXPECT_EQ(table->indexPathForRowAtPoint(inside), (IndexPath{0, 1}));
-  for (const Point outside : {Point{-0.1, 30}, {300, 30}, {5, 120}, {5, -0.1}})
-    EXPECT_EQ(table->indexPathForRowAtPoint(outside), std::nullopt);
 
   const auto first = std::static_pointer_cast<TallCell>(table->cellForRowAtIndexPath({0, 0}));
   first->height->setPriority(500);  // stronger than the estimate
