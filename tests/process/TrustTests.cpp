@@ -286,7 +286,7 @@ TEST(Trust, ProgramsEndWithAMessageWhereTheyCannotReadOrWrite) {
     const std::string within = "cd " + programs.folder.path().string() + " && exec 2>errors && ";
     // Not SIGKILL: a process that is stopped so is in the test's hand.
     const int status = std::system((within + "(" + command +
-                                    ") & p=$!; (sleep 30; kill $p) >/dev/null & w=$!; wait $p; s=$?; "
+                                    ") & p=$!; (sleep 30; kill $p) >/dev/null 2>&1 & w=$!; wait $p; s=$?; "
                                     "kill $w; exit $s")
                                        .c_str());
     // Rows that could not be kept are told, and shown all the same.

@@ -11,7 +11,6 @@
 #include "desktop/gtfs/feeds/TransitLineServiceError.h"
 #include "desktop/gtfs/net/FileReading.h"
 #include "desktop/gtfs/net/HTTPFetcher.h"
-#include "desktop/gtfs/static/StaticFeedStore.h"
 #include "support/TestPlatform.h"
 
 namespace nimbo {
@@ -300,32 +299,6 @@ TEST_F(AlertsStoreTest, DoesWithoutADamagedCache) {
   EXPECT_EQ(load(), "0 alerts of -3600");
   std::filesystem::remove(feed.alerts.path());
   EXPECT_EQ(load(), error(Code::unreadableFile));
-}
-
-TEST(StaticFeedStore, AsksAServerOnceADayAndKeepsWhatItHas) {
-  TestPlatform platform;
-  TemporaryFolder folder;
-  Answer answer{LoopbackServer::answer("200 OK\r\nETag: \"a\"", zipOfRoutes("route_id\n1\n"))};
-  const LoopbackServer server([&](const std::string&) { return answer; });
-  const StaticFeedStore store(FeedCache(folder.path() / "cache"));
-  const Feed feed{"city", *FeedAddress::parse(server.address()), *FeedAddress::parse("/none")};
-  const auto requestsAfterLoad = [&] {
-    EXPECT_TRUE(store.load(feed, {}));
-    return server.requests().size();
-  };
-  EXPECT_EQ(requestsAfterLoad(), 1u);
-  EXPECT_EQ(requestsAfterLoad(), 1u);
-  platform.time.advance(86400);
-  answer.bytes = LoopbackServer::answer("304 Not Modified", "");
-  EXPECT_EQ(requestsAfterLoad(), 2u);
-  EXPECT_NE(server.requests().back().find("If-None-Match: \"a\""), std::string::npos);
-  EXPECT_EQ(requestsAfterLoad(), 2u);
-  platform.time.advance(86400);
-  answer.bytes = LoopbackServer::answer("500 Oops", "");
-  EXPECT_EQ(requestsAfterLoad(), 3u);
-  EXPECT_TRUE(platform.log.contains("Keeping the older static feed"));
-  std::filesystem::remove_all(folder.path() / "cache");
-  EXPECT_FALSE(store.load(feed, {}));
 }
 
 }  // namespace

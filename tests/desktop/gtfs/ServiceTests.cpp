@@ -202,6 +202,7 @@ TEST_F(LineServiceTest, DoesNotWaitForAStaticServerOnceThereIsACache) {
     EXPECT_EQ(lookup({line("city", "r1")}), "1 (T); ");
     platform.loop.waitAndDrain([&] { return server.requests().size() >= step.requests; });
     EXPECT_EQ(server.requests().size(), step.requests) << step.later;
+    EXPECT_NE(server.requests().back().find("If-None-Match: \"a\""), std::string::npos);
     service = std::make_unique<GTFSTransitLineService>(paths);  // what the old one learned is kept
   }
   end.promise.set_value();
