@@ -1,10 +1,11 @@
+#include <algorithm>
 #include <iostream>
 
-#include "desktop/gtfs/feeds/FeedCatalog.h"
-#include "desktop/gtfs/feeds/FeedLibrary.h"
 #include "desktop/gtfs/static/LineItems.h"
 #include "host/Commands.h"
+#include "host/FeedAnswers.h"
 #include "host/HostPlatform.h"
+#include "host/ProgressLine.h"
 #include "host/TerminalText.h"
 
 namespace nimbo {
@@ -13,14 +14,17 @@ namespace {
 
 /// Says which lines are gone, and which feeds cannot tell.
 void tellGoneLines(const CommandContext& context, const std::vector<TransitLineRef>& lines) {
-  std::vector<MapItemIdentifierRef> identifiers;
-  identifiers.reserve(lines.size());
-  for (const TransitLineRef& line : lines) identifiers.push_back(line->identifier());
-  const FeedLibrary library(context.paths);
-  const auto gone = FeedCatalog(library).goneLines(identifiers);
-  if (!gone) throw CommandFailure(gone.error()->reason());
-  for (const auto& line : gone->lines) printMessage(goneLineText(writtenNameOfLine(*line)));
-  for (const ErrorRef& error : gone->errors) printMessage(error->reason());
+  protocol::DescribeLinesParams params;
+  for (const TransitLineRef& line : lines)
+    if (line->identifier()->locator()) params.lines.push_back(keyOf(*line->identifier()));
+  if (params.lines.empty()) return;
+  const auto described = WidgetWithProgress(context).call(protocol::kDescribeLines, params);
+  for (std::size_t i = 0; i < std::min(described.lines.size(), params.lines.size()); ++i)
+    if (described.lines[i].isGone) printMessage(goneLineText(*params.lines[i].id));
+  for (const protocol::FetchError& failure : described.failures) {
+    if (!failure.feed) throw CommandFailure(failure.reason);
+    printMessage(failure.reason);
+  }
 }
 
 /// Of a damaged database those that are left.
@@ -45,12 +49,16 @@ std::uint64_t muidOfFavorite(HostPlatform& platform, const std::string& name) {
 
 int runFavoriteAdd(const CommandContext& context, const std::vector<std::string>& names) {
   HostPlatform platform(context);
-  const FeedLibrary library(context.paths);
+  protocol::DescribeLinesParams params;
+  for (const std::string& name : names) params.lines.push_back({.id = name});
+  const auto described = WidgetWithProgress(context).call(protocol::kDescribeLines, params);
+  if (!described.failures.empty()) throw CommandFailure(described.failures.front().reason);
   std::vector<TransitLineRef> lines;
-  for (const std::string& name : names) {
-    auto line = FeedCatalog(library).lineNamed(name);
-    if (!line) throw CommandFailure(line.error()->reason());
-    lines.push_back(*line);
+  for (std::size_t i = 0; i < names.size(); ++i) {
+    if (i >= described.lines.size() || !described.lines[i].line)
+      throw CommandFailure("No line is named \"" + names[i] +
+                           "\": its feed has no such route. \"lines\" lists the lines there are.");
+    lines.push_back(lineOf(*described.lines[i].line));
   }
   require(platform->favoritesEditor().add(lines));
   return kExitSuccess;

@@ -2,12 +2,13 @@
 #include <iostream>
 #include <vector>
 
-#include "desktop/gtfs/feeds/FeedCatalog.h"
-#include "desktop/gtfs/feeds/FeedCheck.h"
-#include "desktop/gtfs/feeds/FeedLibrary.h"
+#include "desktop/gtfs/feeds/FeedCache.h"
+#include "desktop/gtfs/feeds/FeedConfiguration.h"
 #include "desktop/gtfs/static/LineItems.h"
 #include "host/Commands.h"
+#include "host/FeedAnswers.h"
 #include "host/HostPlatform.h"
+#include "host/ProgressLine.h"
 #include "host/TerminalText.h"
 
 namespace nimbo {
@@ -22,15 +23,15 @@ T require(Outcome<T> outcome) {
 
 void printLine(const std::string& text) { std::cout << "  " << printableText(text) << "\n"; }
 
-void printReport(const char* what, const SkipReport& report) {
-  for (const SkipReport::Entry& entry : report.entries()) {
+void printReport(const char* what, const std::vector<protocol::Skipped>& report) {
+  for (const protocol::Skipped& entry : report) {
     const std::string text = std::string(what) + ": " + std::to_string(entry.count) + " × " + entry.reason;
     printLine(entry.example.empty() ? text : text + " (first: " + entry.example + ")");
   }
 }
 
 /// Prints what a check found. Answers whether both halves can be used.
-bool printCheck(const FeedCheckReport& report) {
+bool printCheck(const protocol::FeedReport& report) {
   std::cout << printableText(report.name) << "\n";
   if (const auto& feed = report.staticFeed) {
     printLine(counted(feed->agencies, "agency", "agencies"));
@@ -52,7 +53,7 @@ bool printCheck(const FeedCheckReport& report) {
     printReport("fits nothing", alerts->unfit);
   }
   const auto faults = report.faults();
-  for (const ErrorRef& fault : faults) printLine("error: " + fault->reason());
+  for (const protocol::FetchError& fault : faults) printLine("error: " + fault.reason);
   return faults.empty();
 }
 
@@ -94,14 +95,15 @@ int runFeedAdd(const CommandContext& context, const FeedOptions& options) {
   FeedConfiguration configuration(context.paths.config);
   if (const ErrorRef error = configuration.checkNewName(feed.name)) throw CommandFailure(error->reason());
   const FeedCache cache(context.paths.cache);
-  const FeedCheckReport report = checkFeed(feed, cache);
-  if (report.isOtherFeed()) {
+  const protocol::FeedReport report =
+      WidgetWithProgress(context).call(protocol::kCheckFeed, {.definition = definitionOf(feed)});
+  if (report.isOtherFeed && report.alertsError) {
     cache.remove(feed.name);
-    throw CommandFailure(report.alertsError->reason() + " \"--combined\" does so.");
+    throw CommandFailure(report.alertsError->reason + " \"--combined\" does so.");
   }
   if (report.alerts && report.alerts->hasOthers) feed.isCombined = true;
   if (const ErrorRef error = configuration.add(feed)) throw CommandFailure(error->reason());
-  for (const ErrorRef& fault : report.faults()) printMessage(fault->reason());
+  for (const protocol::FetchError& fault : report.faults()) printMessage(fault.reason);
   return kExitSuccess;
 }
 
@@ -125,24 +127,28 @@ int runFeedList(const CommandContext& context) {
 int runFeedCheck(const CommandContext& context, const std::string& name) {
   const HostPlatform platform(context);
   const FeedConfiguration configuration(context.paths.config);
-  const FeedCache cache(context.paths.cache);
   const auto feeds =
       name.empty() ? require(configuration.feeds()) : std::vector<Feed>{require(configuration.feedNamed(name))};
   if (feeds.empty()) throw CommandFailure("no feed is set up to be checked. Set one up with \"feed add\".");
+  WidgetWithProgress widget(context);
   std::size_t bad = 0;
-  for (const Feed& feed : feeds) bad += printCheck(checkFeed(feed, cache)) ? 0 : 1;
+  for (const Feed& feed : feeds) bad += printCheck(widget.call(protocol::kCheckFeed, {.feed = feed.name})) ? 0 : 1;
   if (bad > 0) throw CommandFailure(counted(bad, "feed") + " of " + std::to_string(feeds.size()) + " cannot be used");
   return kExitSuccess;
 }
 
 int runLines(const CommandContext& context, const std::string& text) {
-  const HostPlatform platform(context);
-  const FeedLibrary library(context.paths);
-  const auto found = require(FeedCatalog(library).linesMatching(text));
-  printLines(found.lines);
-  for (const ErrorRef& error : found.errors) printMessage(error->reason());
-  if (!found.errors.empty()) return kExitFailure;
-  if (found.lines.empty()) throw CommandFailure("no line contains \"" + text + "\"");
+  WidgetWithProgress widget(context);
+  std::vector<TransitLineRef> lines;
+  protocol::FoundLines page;
+  do {
+    page = widget.call(protocol::kFindLines, {.query = text, .offset = lines.size()});
+    for (const protocol::FeedLine& line : page.lines) lines.push_back(lineOf(line));
+  } while (!page.lines.empty() && lines.size() < page.total);
+  printLines(lines);
+  for (const protocol::FetchError& failure : page.failures) printMessage(failure.reason);
+  if (!page.failures.empty()) return kExitFailure;
+  if (lines.empty()) throw CommandFailure("no line contains \"" + text + "\"");
   return kExitSuccess;
 }
 

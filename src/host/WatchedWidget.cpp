@@ -45,14 +45,15 @@ void WatchedWidget::countLine() {
   if (++_lines == kLinesPerSecond) fail("it does not stop talking");
 }
 
-void WatchedWidget::send(const char* method, const json& params, JSONRPCConnection::Completion completion) {
+std::int64_t WatchedWidget::send(const char* method, const json& params, bool waitsForFeeds,
+                                 JSONRPCConnection::Completion completion) {
   std::shared_ptr<Timer> timer;
-  if (std::string_view(method) != protocol::kPerformUpdate.name) {
+  if (!waitsForFeeds) {
     timer = _runLoop.scheduleTimer(
         _patience, false, [this, name = std::string(method)](Timer&) { fail("it does not answer \"" + name + "\""); });
     _waiting.push_back(timer);
   }
-  _client.connection().call(method, params, [this, timer, completion](const json& result, const auto& error) {
+  return _client.connection().call(method, params, [this, timer, completion](const json& result, const auto& error) {
     if (timer) timer->invalidate();
     std::erase_if(_waiting, [](const auto& waiting) { return !waiting->isValid(); });
     completion(result, error);

@@ -37,7 +37,7 @@ class WatchedWidget {
   using FailureHandler = std::function<void(const std::string& reason)>;
 
   /// Starts the widget with these arguments, and with memory to draw into when it is to draw. `patience` is the time,
-  /// in seconds, in which it answers anything but an update, which takes as long as its feeds. `failed` hears once, in
+  /// in seconds, in which it answers anything that waits for no feed. `failed` hears once, in
   /// a call of its own in which it may destroy this, why the process is no more ("it ended"). Throws
   /// WidgetClientFailure when it cannot be started.
   WatchedWidget(GLibRunLoop& runLoop, const std::vector<std::string>& arguments, TimeInterval patience,
@@ -57,12 +57,12 @@ class WatchedWidget {
              fail("it refuses \"" + std::string(name) + "\": " + error.message);
          });
   }
-  /// A request that may be answered with an error; the error counts when there is no result.
+  /// A request that may be answered with an error; the error counts when there is no result. Answers its identifier.
   template <class Params, class Result>
-  void call(const protocol::Method<Params, Result>& method, const Params& params,
+  std::int64_t call(const protocol::Method<Params, Result>& method, const Params& params,
             std::function<void(const std::optional<std::type_identity_t<Result>>& result, const JSONRPCError& error)>
                 completion) {
-    send(method.name, protocol::write(params),
+    return send(method.name, protocol::write(params), method.waitsForFeeds,
          [this, name = method.name, completion = std::move(completion)](const nlohmann::json& json,
                                                                         const std::optional<JSONRPCError>& error) {
            std::optional<Result> result;
@@ -78,8 +78,9 @@ class WatchedWidget {
   void fail(const std::string& reason);
 
  private:
-  /// Sends a request, and fails when the answer does not come in time.
-  void send(const char* method, const nlohmann::json& params, JSONRPCConnection::Completion completion);
+  /// Sends a request, and fails when an answer that waits for nothing does not come in time.
+  std::int64_t send(const char* method, const nlohmann::json& params, bool waitsForFeeds,
+                    JSONRPCConnection::Completion completion);
   void countLine();
 
   GLibRunLoop& _runLoop;

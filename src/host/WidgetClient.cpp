@@ -98,6 +98,11 @@ WidgetClient::WidgetClient(GLibRunLoop& runLoop, const std::vector<std::string>&
     else
       printMessage(message);
   });
+  _connection->setHandler(protocol::kProgress.name, [this](const json& params, const JSONRPCResponder&) {
+    const auto progress = protocol::read<protocol::ProgressParams>(params);
+    ++_progressCount;
+    if (_progressHandler) _progressHandler(progress);
+  });
   _connection->start();
 }
 
@@ -151,7 +156,9 @@ json WidgetClient::call(std::string_view method, const json& params) {
 
 void WidgetClient::waitUntil(const std::function<bool()>& done) {
   bool tired = false;
-  const auto patience = _runLoop.scheduleTimer(kPatience, false, [&](Timer&) { tired = true; });
+  std::size_t progressCount = _progressCount;
+  const auto patience = _runLoop.scheduleTimer(
+      kPatience, true, [&](Timer&) { tired = std::exchange(progressCount, _progressCount) == _progressCount; });
   while (!done() && _running && !tired) _runLoop.runOnce();
   patience->invalidate();
   if (done()) return;

@@ -46,6 +46,8 @@ class WidgetClient {
   using Opening = std::variant<protocol::OpenURLParams, protocol::OpenUserActivityParams>;
   /// Hears of one; answers whether it opened.
   using OpenHandler = std::function<bool(const Opening& opening)>;
+  /// Hears how far a request is.
+  using ProgressHandler = std::function<void(const protocol::ProgressParams& progress)>;
   /// Hears what the user must be told.
   using NoticeHandler = std::function<void(const std::string& message)>;
 
@@ -61,6 +63,7 @@ class WidgetClient {
   void setOpenHandler(OpenHandler handler) { _openHandler = std::move(handler); }
   /// Until this is called, notices go to standard error.
   void setNoticeHandler(NoticeHandler handler) { _noticeHandler = std::move(handler); }
+  void setProgressHandler(ProgressHandler handler) { _progressHandler = std::move(handler); }
   /// Hears of what is no message, or no such one as it says, in place of the widget, which else gets an error.
   void setNonsenseHandler(std::function<void(const std::string& problem)> handler);
   JSONRPCConnection& connection() { return *_connection; }
@@ -80,7 +83,7 @@ class WidgetClient {
     }
   }
   /// Runs the loop until `done` answers true. Throws WidgetClientFailure when the process ends first, or after
-  /// `kPatience` seconds without a word from it.
+  /// `kPatience` seconds without a word of progress from it.
   void waitUntil(const std::function<bool()>& done);
 
   static constexpr double kPatience = 120;
@@ -101,6 +104,8 @@ class WidgetClient {
   std::unique_ptr<JSONRPCConnection> _connection;
   OpenHandler _openHandler;
   NoticeHandler _noticeHandler;
+  ProgressHandler _progressHandler;
+  std::size_t _progressCount = 0;  // how often it told of progress
   std::function<void(const std::string&)> _nonsenseHandler;
 };
 

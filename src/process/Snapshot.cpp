@@ -80,13 +80,18 @@ void setResult(protocol::Snapshot& snapshot, const ResultRef& result) {
   result->withValue_orError([&](const ObjectRef&) { snapshot.result = protocol::FetchResult::success; },
                             [&](const ErrorRef& error) {
                               snapshot.result = protocol::FetchResult::error;
-                              snapshot.error = {error->domain(), error->code(), error->reason()};
-                              if (!error->subject().empty()) snapshot.error->subject = error->subject();
-                              if (!error->feed().empty()) snapshot.error->feed = error->feed();
+                              snapshot.error = fetchErrorOf(*error);
                             });
 }
 
 }  // namespace
+
+protocol::FetchError fetchErrorOf(const Error& error) {
+  protocol::FetchError result{error.domain(), error.code(), error.reason(), std::nullopt, std::nullopt};
+  if (!error.subject().empty()) result.subject = error.subject();
+  if (!error.feed().empty()) result.feed = error.feed();
+  return result;
+}
 
 protocol::Shield shieldOf(const TransitArtwork& artwork) {
   protocol::Shield result;

@@ -11,6 +11,9 @@ namespace nimbo {
 /// The artwork's description.
 protocol::Shield shieldOf(const TransitArtwork& artwork);
 
+/// The error as hosts hear of it.
+protocol::FetchError fetchErrorOf(const Error& error);
+
 /// The table as it stands, but for the lines that are gone. The controller's view is loaded.
 protocol::Snapshot snapshotOf(NBTransitIncidentsViewController& controller);
 

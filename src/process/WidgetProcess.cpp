@@ -56,6 +56,10 @@ WidgetProcess::WidgetProcess(Options options, int input, int output)
   addMethod(protocol::kLoadView, &WidgetProcess::loadView);
   addMethod(protocol::kShutdown, &WidgetProcess::shutdown);
   addMethod(protocol::kDecode, &WidgetProcess::decode);
+  addFeedMethod(protocol::kFindLines, &FeedRequests::findLines);
+  addFeedMethod(protocol::kDescribeLines, &FeedRequests::describeLines);
+  addFeedMethod(protocol::kCheckFeed, &FeedRequests::checkFeed);
+  addMethod(protocol::kCancel, &WidgetProcess::cancel);
   addViewMethod(protocol::kViewWillAppear, &WidgetProcess::viewWillAppear);
   addViewMethod(protocol::kViewDidAppear, &WidgetProcess::viewDidAppear);
   addViewMethod(protocol::kViewWillDisappear, &WidgetProcess::viewWillDisappear);
@@ -105,6 +109,16 @@ void WidgetProcess::addViewMethod(const protocol::Method<Params, Result>& method
       });
 }
 
+template <class Params, class Result>
+void WidgetProcess::addFeedMethod(const protocol::Method<Params, Result>& method,
+                                  void (FeedRequests::*start)(const Params&, const JSONRPCResponder&)) {
+  _connection.setHandler(method.name, [this, start](const json& params, const JSONRPCResponder& responder) {
+    const Params read = paramsOf<Params>(params);
+    if (!_platform) makePlatform({});
+    (_feedRequests.get()->*start)(read, responder);
+  });
+}
+
 void WidgetProcess::requireStage(std::initializer_list<Stage> stages, const char* method) const {
   if (std::find(stages.begin(), stages.end(), _stage) != stages.end()) return;
   static constexpr const char* kNames[] = {"not loaded", "hidden", "about to appear", "on screen",
@@ -113,9 +127,7 @@ void WidgetProcess::requireStage(std::initializer_list<Stage> stages, const char
                        std::string(method) + " does not fit: the view is " + kNames[static_cast<std::size_t>(_stage)]);
 }
 
-protocol::Initialized WidgetProcess::initialize(const protocol::InitializeParams& params) {
-  if (_platform) throw JSONRPCFailure(JSONRPCError::kInvalidState, "initialize was called already");
-
+void WidgetProcess::makePlatform(const std::string& locale) {
   auto logSink = std::make_unique<HostLogSink>(makeLogSink(LogOptions::fromEnvironment()), _runLoop,
                                                [this](const std::string& category, const std::string& text) {
                                                  notify(_connection, protocol::kLog,
@@ -123,12 +135,21 @@ protocol::Initialized WidgetProcess::initialize(const protocol::InitializeParams
                                                });
   _platform = std::make_unique<DesktopPlatform>(
       DesktopPlatform::Options{.paths = _options.paths,
-                               .locale = params.locale.value_or(""),
+                               .locale = locale,
                                .runLoop = _runLoop,
                                .virtualTime = _virtualTime.get(),
                                .activityLauncher = _host,
                                .logSink = std::move(logSink),
                                .notice = [this](const ErrorRef& notice) { tellNotice(notice); }});
+  _feedRequests = std::make_unique<FeedRequests>(_platform->transitLines().library(), _runLoop, _connection);
+}
+
+protocol::Initialized WidgetProcess::initialize(const protocol::InitializeParams& params) {
+  if (_controller) throw JSONRPCFailure(JSONRPCError::kInvalidState, "initialize was called already");
+  // What was asked for before was read without the host's locale.
+  _feedRequests.reset();
+  _platform.reset();
+  makePlatform(params.locale.value_or(""));
   Environment& environment = Environment::current();
   environment.setContentSizeCategory(params.textSize);
   environment.setScreenScale(params.scale);
@@ -311,7 +332,7 @@ void WidgetProcess::announceFrame() {
 }
 
 protocol::Advanced WidgetProcess::advanceTime(const protocol::AdvanceParams& params) {
-  if (!_platform) throw JSONRPCFailure(JSONRPCError::kInvalidState, "advanceTime needs \"initialize\" first");
+  if (!_controller) throw JSONRPCFailure(JSONRPCError::kInvalidState, "advanceTime needs \"initialize\" first");
   _virtualTime->advance(params.seconds);
   _sentTo = dateByAdding(_sentTo, params.seconds);
   return {_sentTo};
@@ -323,6 +344,11 @@ protocol::Handoff WidgetProcess::decode(const protocol::DecodeParams& params) {
   const Outcome<protocol::Handoff> handoff = decodeHandoff(*bytes);
   if (!handoff) throw JSONRPCFailure(JSONRPCError::kBrokenPayload, handoff.error()->reason());
   return *handoff;
+}
+
+protocol::Nothing WidgetProcess::cancel(const protocol::CancelParams& params) {
+  if (_feedRequests) _feedRequests->cancel(params.request);
+  return {};
 }
 
 protocol::Nothing WidgetProcess::shutdown(const Nothing&) {

@@ -7,6 +7,7 @@
 #include "desktop/rpc/JSONRPCConnection.h"
 #include "desktop/system/Paths.h"
 #include "platform/VirtualTime.h"
+#include "process/FeedRequests.h"
 #include "process/RemoteHost.h"
 #include "protocol/Methods.h"
 #include "widget/NBTransitIncidentsViewController.h"
@@ -41,6 +42,10 @@ class WidgetProcess {
   /// A method that needs the loaded view.
   template <class Params, class Result>
   void addViewMethod(const protocol::Method<Params, Result>& method, Result (WidgetProcess::*answer)(const Params&));
+  /// A method whose answer comes when feeds have been read, at any stage.
+  template <class Params, class Result>
+  void addFeedMethod(const protocol::Method<Params, Result>& method,
+                     void (FeedRequests::*start)(const Params&, const JSONRPCResponder&));
   void requireStage(std::initializer_list<Stage> stages, const char* method) const;
 
   using Nothing = protocol::Nothing;
@@ -62,9 +67,11 @@ class WidgetProcess {
   Nothing setScale(const protocol::ScaleParams& params);
   protocol::Advanced advanceTime(const protocol::AdvanceParams& params);
   protocol::Handoff decode(const protocol::DecodeParams& params);
+  Nothing cancel(const protocol::CancelParams& params);
   Nothing shutdown(const Nothing&);
   void performUpdate(const JSONRPCResponder& responder);
 
+  void makePlatform(const std::string& locale);
   /// Throws JSONRPCFailure for a row that is none.
   IndexPath existingRow(std::uint32_t section, std::uint32_t row) const;
   /// Tells the controller of the host's mode, unless it knows.
@@ -81,7 +88,8 @@ class WidgetProcess {
   GLibRunLoop _runLoop;
   JSONRPCConnection _connection;
   RemoteHost _host;
-  std::unique_ptr<DesktopPlatform> _platform;  // null until initialized
+  std::unique_ptr<DesktopPlatform> _platform;   // null until initialized, or asked for feeds
+  std::unique_ptr<FeedRequests> _feedRequests;  // with the platform, on which it works
   std::shared_ptr<NBTransitIncidentsViewController> _controller;
   Stage _stage = Stage::created;
   bool _hostChoseMode = false;

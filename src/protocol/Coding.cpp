@@ -228,6 +228,87 @@ template <>
 constexpr std::tuple kFields<Handoff>{Field{"text", &Handoff::text}, Field{"line", &Handoff::line},
                                       Field{"incidents", &Handoff::incidents}};
 
+template <>
+constexpr std::tuple kFields<Agency>{Field{"id", &Agency::id}, Field{"muid", &Agency::muid},
+                                     Field{"name", &Agency::name}, Field{"artwork", &Agency::artwork}};
+template <>
+constexpr std::tuple kFields<FeedLine>{Field{"id", &FeedLine::id},
+                                       Field{"muid", &FeedLine::muid},
+                                       Field{"feed", &FeedLine::feed},
+                                       Field{"routeID", &FeedLine::routeID},
+                                       Field{"shortName", &FeedLine::shortName},
+                                       Field{"longName", &FeedLine::longName},
+                                       Field{"name", &FeedLine::name},
+                                       Field{"agency", &FeedLine::agency},
+                                       Field{"mode", &FeedLine::mode},
+                                       Field{"color", &FeedLine::color},
+                                       Field{"artwork", &FeedLine::artwork}};
+template <>
+constexpr std::tuple kFields<FindLinesParams>{
+    Field{"query", &FindLinesParams::query}, Field{"feed", &FindLinesParams::feed, kMayBeLeftOut},
+    Field{"offset", &FindLinesParams::offset, kMayBeLeftOut}, Field{"limit", &FindLinesParams::limit, kMayBeLeftOut}};
+template <>
+constexpr std::tuple kFields<FoundLines>{Field{"total", &FoundLines::total}, Field{"lines", &FoundLines::lines},
+                                         Field{"failures", &FoundLines::failures}};
+template <>
+constexpr std::tuple kFields<LineKey>{
+    Field{"id", &LineKey::id, kMayBeLeftOut}, Field{"muid", &LineKey::muid, kMayBeLeftOut},
+    Field{"agencyID", &LineKey::agencyID, kMayBeLeftOut}, Field{"shortName", &LineKey::shortName, kMayBeLeftOut},
+    Field{"mode", &LineKey::mode, kMayBeLeftOut}};
+template <>
+constexpr std::tuple kFields<DescribeLinesParams>{Field{"lines", &DescribeLinesParams::lines}};
+template <>
+constexpr std::tuple kFields<DescribedLine>{Field{"line", &DescribedLine::line}, Field{"gone", &DescribedLine::isGone}};
+template <>
+constexpr std::tuple kFields<DescribedLines>{Field{"lines", &DescribedLines::lines},
+                                             Field{"failures", &DescribedLines::failures}};
+template <>
+constexpr std::tuple kFields<FeedDefinition>{
+    Field{"name", &FeedDefinition::name},
+    Field{"static", &FeedDefinition::staticFeed},
+    Field{"alerts", &FeedDefinition::alerts},
+    Field{"minorAlerts", &FeedDefinition::minorAlerts, kMayBeLeftOut},
+    Field{"combined", &FeedDefinition::isCombined, kMayBeLeftOut},
+    Field{"maximumAlertsAgeMinutes", &FeedDefinition::maximumAlertsAgeMinutes, kMayBeLeftOut}};
+template <>
+constexpr std::tuple kFields<CheckFeedParams>{Field{"feed", &CheckFeedParams::feed, kMayBeLeftOut},
+                                              Field{"definition", &CheckFeedParams::definition, kMayBeLeftOut}};
+template <>
+constexpr std::tuple kFields<Skipped>{Field{"reason", &Skipped::reason}, Field{"count", &Skipped::count},
+                                      Field{"example", &Skipped::example}};
+template <>
+constexpr std::tuple kFields<StaticFeedReport>{
+    Field{"agencies", &StaticFeedReport::agencies}, Field{"lines", &StaticFeedReport::lines},
+    Field{"trips", &StaticFeedReport::trips}, Field{"language", &StaticFeedReport::language},
+    Field{"skipped", &StaticFeedReport::skipped}};
+template <>
+constexpr std::tuple kFields<AlertsReport>{Field{"version", &AlertsReport::version},
+                                           Field{"timestamp", &AlertsReport::timestamp, kMayBeLeftOut},
+                                           Field{"staleness", &AlertsReport::staleness, kMayBeLeftOut},
+                                           Field{"gap", &AlertsReport::gap, kMayBeLeftOut},
+                                           Field{"alerts", &AlertsReport::alerts},
+                                           Field{"skipped", &AlertsReport::skipped},
+                                           Field{"hasOthers", &AlertsReport::hasOthers},
+                                           Field{"periods", &AlertsReport::periods},
+                                           Field{"selectors", &AlertsReport::selectors},
+                                           Field{"incidents", &AlertsReport::incidents},
+                                           Field{"affectedLines", &AlertsReport::affectedLines},
+                                           Field{"unfit", &AlertsReport::unfit}};
+template <>
+constexpr std::tuple kFields<FeedReport>{Field{"name", &FeedReport::name},
+                                         Field{"static", &FeedReport::staticFeed, kMayBeLeftOut},
+                                         Field{"staticError", &FeedReport::staticError, kMayBeLeftOut},
+                                         Field{"alerts", &FeedReport::alerts, kMayBeLeftOut},
+                                         Field{"alertsError", &FeedReport::alertsError, kMayBeLeftOut},
+                                         Field{"otherFeed", &FeedReport::isOtherFeed}};
+template <>
+constexpr std::tuple kFields<CancelParams>{Field{"request", &CancelParams::request}};
+template <>
+constexpr std::tuple kFields<ProgressParams>{
+    Field{"request", &ProgressParams::request}, Field{"feed", &ProgressParams::feed},
+    Field{"part", &ProgressParams::part},       Field{"received", &ProgressParams::received},
+    Field{"done", &ProgressParams::done},       Field{"total", &ProgressParams::total}};
+
 template <class T>
 constexpr bool kMayBeAbsent = false;
 template <class T>
@@ -380,6 +461,18 @@ struct Coding<Date> {
   }
 };
 
+template <>
+struct Coding<RequestID> {
+  static json write(const RequestID& request) {
+    return std::visit([](const auto& value) { return json(value); }, request);
+  }
+  static RequestID read(const json& found, const Rules&) {
+    if (found.is_string()) return found.get<std::string>();
+    if (found.is_number_integer()) return Coding<std::int64_t>::read(found, {});
+    throw Malformed("", "a text or a whole number");
+  }
+};
+
 template <class Value>
 struct Coding<std::optional<Value>> {
   static json write(const std::optional<Value>& value) { return value ? Coding<Value>::write(*value) : json(); }
@@ -488,6 +581,14 @@ NIMBO_MESSAGE(AdvanceParams);
 NIMBO_MESSAGE(Advanced);
 NIMBO_MESSAGE(DecodeParams);
 NIMBO_MESSAGE(Handoff);
+NIMBO_MESSAGE(FindLinesParams);
+NIMBO_MESSAGE(FoundLines);
+NIMBO_MESSAGE(DescribeLinesParams);
+NIMBO_MESSAGE(DescribedLines);
+NIMBO_MESSAGE(CheckFeedParams);
+NIMBO_MESSAGE(FeedReport);
+NIMBO_MESSAGE(CancelParams);
+NIMBO_MESSAGE(ProgressParams);
 NIMBO_MESSAGE(OpenURLParams);
 NIMBO_MESSAGE(OpenUserActivityParams);
 NIMBO_MESSAGE(Opened);

@@ -1,5 +1,6 @@
 #pragma once
 
+#include "protocol/Feeds.h"
 #include "protocol/Handoff.h"
 #include "protocol/Messages.h"
 #include "protocol/Snapshot.h"
@@ -10,6 +11,7 @@ namespace nimbo::protocol {
 template <class Params, class Result = Nothing>
 struct Method {
   const char* name;
+  bool waitsForFeeds = false;  ///< others are answered before it, and it takes as long as servers do
 };
 
 /// What is told without an answer.
@@ -26,7 +28,7 @@ inline constexpr Method<Nothing> kViewDidAppear{"viewDidAppear"};
 inline constexpr Method<Nothing> kViewWillDisappear{"viewWillDisappear"};
 inline constexpr Method<Nothing> kViewDidDisappear{"viewDidDisappear"};
 inline constexpr Method<Nothing> kDidReceiveMemoryWarning{"didReceiveMemoryWarning"};
-inline constexpr Method<Nothing, UpdateResult> kPerformUpdate{"performUpdate"};
+inline constexpr Method<Nothing, UpdateResult> kPerformUpdate{"performUpdate", true};
 inline constexpr Method<ActiveDisplayModeParams> kSetActiveDisplayMode{"setActiveDisplayMode"};
 inline constexpr Method<TransitionParams> kTransitionToSize{"transitionToSize"};
 inline constexpr Method<TextSizeParams> kSetTextSize{"setTextSize"};
@@ -38,6 +40,10 @@ inline constexpr Method<Nothing, Snapshot> kSnapshot{"snapshot"};
 inline constexpr Method<RenderParams, Rendered> kRender{"render"};
 inline constexpr Method<AdvanceParams, Advanced> kAdvanceTime{"advanceTime"};
 inline constexpr Method<DecodeParams, Handoff> kDecode{"decode"};
+inline constexpr Method<FindLinesParams, FoundLines> kFindLines{"findLines", true};
+inline constexpr Method<DescribeLinesParams, DescribedLines> kDescribeLines{"describeLines", true};
+inline constexpr Method<CheckFeedParams, FeedReport> kCheckFeed{"checkFeed", true};
+inline constexpr Method<CancelParams> kCancel{"cancel"};
 inline constexpr Method<Nothing> kShutdown{"shutdown"};
 
 // The widget's requests.
@@ -50,6 +56,7 @@ inline constexpr Notification<LargestDisplayModeParams> kLargestAvailableDisplay
     "largestAvailableDisplayModeDidChange"};
 inline constexpr Notification<Nothing> kFrame{"frame"};
 inline constexpr Notification<NoticeParams> kNotice{"notice"};
+inline constexpr Notification<ProgressParams> kProgress{"progress"};
 inline constexpr Notification<LogParams> kLog{"log"};
 
 }  // namespace nimbo::protocol

@@ -6,6 +6,7 @@
 #include <string_view>
 
 #include "platform/foundation/Presentation.h"
+#include "protocol/Feeds.h"
 #include "protocol/Snapshot.h"
 
 namespace nimbo::protocol {
@@ -35,6 +36,8 @@ template <>
 inline constexpr std::array<std::string_view, 3> kNames<WidgetUpdateResult>{"newData", "noData", "failed"};
 template <>
 inline constexpr std::array<std::string_view, 2> kNames<FetchResult>{"success", "error"};
+template <>
+inline constexpr std::array<std::string_view, 2> kNames<FeedPart>{"static", "alerts"};
 
 template <class Enumeration>
 constexpr std::string_view nameOf(Enumeration value) {

@@ -202,6 +202,75 @@ TEST(WidgetProcess, ShowsIncidentsThatAreTooManyToHandOver) {
   for (const json& seen : snapshots(lines)) EXPECT_THAT(titles(seen), ElementsAre("600 Advisories"));
 }
 
+/// The results of the requests, in their order.
+std::vector<json> results(const std::vector<json>& lines, const std::vector<json>& requests) {
+  std::vector<json> found;
+  for (const json& asked : requests)
+    for (const json& line : lines)
+      if (line.value("id", json()) == asked["id"]) found.push_back(line.value("result", json()));
+  return found;
+}
+
+TEST(WidgetProcess, TellsOfLinesBeforeAnythingElse) {
+  Programs programs;
+  programs.setUpCity({}, {});
+  programs.run({"feed", "add", "bad", "--static", "/none", "--alerts", "/none"});
+  const std::vector<json> asked = {
+      request("findLines", {{"query", "castle"}}),
+      request("findLines", {{"query", ""}, {"feed", "city"}, {"offset", 1}, {"limit", 2}}),
+      request("findLines", {{"query", ""}, {"feed", "nowhere"}}),
+      request("describeLines", {{"lines",
+                                 {{{"id", "city:old"}, {"agencyID", "M"}, {"shortName", "2"}, {"mode", 2}},
+                                  {{"id", "city:gone"}},
+                                  {{"id", "bad:1"}},
+                                  {{"id", "nowhere:1"}}}}}),
+  };
+  const auto lines = results(programs.play(asked), asked);
+  ASSERT_THAT(lines, SizeIs(4));
+  EXPECT_EQ(lines[0]["total"], 1);
+  const json castle = lines[0]["lines"].at(0);
+  EXPECT_EQ(castle["id"], "city:m2");
+  EXPECT_EQ(castle["agency"]["name"], "Metro");
+  EXPECT_EQ(castle["artwork"]["accessibilityText"], "2, Castle Line");
+  EXPECT_EQ(lines[0]["failures"].at(0)["feed"], "bad");
+  EXPECT_EQ(lines[1]["total"], 5);
+  EXPECT_THAT(lines[1]["lines"], SizeIs(2));
+  EXPECT_EQ(lines[1]["lines"].at(0)["id"], "city:m2");
+  EXPECT_THAT(lines[1]["failures"], SizeIs(0));
+  EXPECT_EQ(lines[2]["failures"].at(0)["subject"], "nowhere");
+  const json& described = lines[3]["lines"];
+  EXPECT_EQ(described.at(0)["line"]["longName"], "Castle Line") << "renumbered";
+  EXPECT_EQ(described.at(1), (json{{"line", nullptr}, {"gone", true}}));
+  EXPECT_EQ(described.at(2), (json{{"line", nullptr}, {"gone", false}})) << "nobody knows";
+  EXPECT_EQ(described.at(3), (json{{"line", nullptr}, {"gone", false}}));
+  EXPECT_THAT(lines[3]["failures"], SizeIs(2));
+  const std::vector<json> byNumber = {
+      request("describeLines", {{"lines", {{{"muid", castle["muid"]}}, {{"muid", 7}}}}})};
+  const json numbered = results(programs.play(byNumber), byNumber).at(0)["lines"];
+  EXPECT_EQ(numbered.at(0)["line"], castle);
+  EXPECT_EQ(numbered.at(1), (json{{"line", nullptr}, {"gone", false}}));
+}
+
+TEST(WidgetProcess, ChecksFeedsThatAreSetUpOrToBe) {
+  Programs programs;
+  programs.setUpCity({}, {{"a", {"m2"}, "Works", "Slow."}, {"x", {"gone"}, "Old", "Line."}});
+  const std::string feed = programs.folder.path() / "feed";
+  const auto definition = [&](const std::string& name, const std::string& alerts) {
+    return request("checkFeed", {{"definition", {{"name", name}, {"static", feed}, {"alerts", alerts}}}});
+  };
+  const std::vector<json> asked = {request("checkFeed", {{"feed", "city"}}), definition("new", "/none"),
+                                   definition("a:b", "/none"), request("checkFeed", {{"feed", "nowhere"}}),
+                                   request("checkFeed")};
+  const auto reports = results(programs.play(asked), asked);
+  ASSERT_THAT(reports, SizeIs(5));
+  EXPECT_EQ(reports[0]["static"]["lines"], 5);
+  EXPECT_EQ(reports[0]["alerts"]["affectedLines"], 1);
+  EXPECT_EQ(reports[0]["alerts"]["unfit"].at(0)["example"], "route gone");
+  EXPECT_FALSE(reports[0].contains("alertsError"));
+  EXPECT_EQ(reports[1]["alertsError"]["subject"], "/none");
+  for (std::size_t i = 2; i < 5; ++i) EXPECT_EQ(reports[i], nullptr) << asked[i];
+}
+
 TEST(WidgetProcess, OutlivesEveryMessage) {
   Programs programs;
   programs.setUpCity({"m1"}, {});
@@ -225,6 +294,8 @@ TEST(WidgetProcess, OutlivesEveryMessage) {
       {request("selectRow", {{"section", 1}, {"row", 0}}), -32602},
       {request("advanceTime", {{"seconds", -1}}), -32602},
       {request("render", {{"path", "/nonexistent/folder/x.png"}}), -32602},
+      {request("describeLines", {{"lines", {{{"id", "no colon"}}}}}), -32602},
+      {request("cancel", {{"request", 1.5}}), -32602},
       {request("render", {{"surface", "/proc/self/fd/0"}}), -32602},
   };
   std::vector<json> events = appearing() + kUpdateAndLook;

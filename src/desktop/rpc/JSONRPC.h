@@ -24,6 +24,8 @@ struct JSONRPCError {
   static constexpr int kDrawingFailed = -32002;
   /// Bytes that are to be decoded are neither a hand-off nor a saved state, or broken.
   static constexpr int kBrokenPayload = -32003;
+  /// The other end does not want the answer any more.
+  static constexpr int kCancelled = -32004;
   /// Never sent: no answer comes because the connection is closed.
   static constexpr int kConnectionClosed = -1;
 };
@@ -44,6 +46,8 @@ class JSONRPCResponder {
   JSONRPCResponder(std::optional<nlohmann::json> id, Send send);
   void answer(const nlohmann::json& result) const;
   void fail(const JSONRPCError& error) const;
+  /// As the request has it; absent for a notification.
+  const std::optional<nlohmann::json>& id() const { return _state->id; }
 
  private:
   void send(nlohmann::json message) const;

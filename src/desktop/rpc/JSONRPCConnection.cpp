@@ -143,13 +143,20 @@ void JSONRPCConnection::notify(std::string_view method, const json& params) {
   send({{"jsonrpc", "2.0"}, {"method", method}, {"params", params}});
 }
 
-void JSONRPCConnection::call(std::string_view method, const json& params, Completion completion) {
-  if (!_open) return completion(nullptr, JSONRPCError{JSONRPCError::kConnectionClosed, "the connection is closed"});
+std::int64_t JSONRPCConnection::call(std::string_view method, const json& params, Completion completion) {
   const std::int64_t id = _nextID++;
+  if (!_open) {
+    completion(nullptr, JSONRPCError{JSONRPCError::kConnectionClosed, "the connection is closed"});
+    return id;
+  }
   const std::string line = lineOf({{"jsonrpc", "2.0"}, {"id", id}, {"method", method}, {"params", params}});
-  if (line.size() > kMaximumLine) return completion(nullptr, tooLong("request"));
+  if (line.size() > kMaximumLine) {
+    completion(nullptr, tooLong("request"));
+    return id;
+  }
   _pending.emplace(id, std::move(completion));
   sendLine(line);
+  return id;
 }
 
 void JSONRPCConnection::send(const json& message) {

@@ -48,8 +48,8 @@ class JSONRPCConnection {
 
   void notify(std::string_view method, const nlohmann::json& params);
   /// Asks the other end; `completion` hears once, also (with an error) when the connection closes first; at once
-  /// when nothing can be sent.
-  void call(std::string_view method, const nlohmann::json& params, Completion completion);
+  /// when nothing can be sent. Answers the request's identifier.
+  std::int64_t call(std::string_view method, const nlohmann::json& params, Completion completion);
   /// Writes a line as it stands.
   void sendLine(std::string_view line);
 

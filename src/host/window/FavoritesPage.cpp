@@ -1,8 +1,11 @@
 #include "host/window/FavoritesPage.h"
 
 #include <algorithm>
+#include <set>
 
+#include "desktop/gtfs/feeds/TransitLineServiceError.h"
 #include "desktop/store/FavoritesEditor.h"
+#include "host/FeedAnswers.h"
 #include "host/window/Texts.h"
 #include "host/window/WidgetTexts.h"
 #include "platform/Localization.h"
@@ -13,6 +16,13 @@ namespace {
 
 /// More lines than anybody reads: the search narrows them.
 constexpr std::size_t kLineLimit = 100;
+
+bool isUnknownFeed(const protocol::FetchError& failure) {
+  return failure.domain == kTransitLineServiceErrorDomain &&
+         failure.code == static_cast<std::int64_t>(TransitLineServiceError::unknownFeed);
+}
+
+protocol::FetchError failureOf(const Error& error) { return {error.domain(), error.code(), error.reason(), {}, {}}; }
 
 void clear(Gtk::ListBox& list) {
   while (Gtk::ListBoxRow* row = list.get_row_at_index(0)) list.remove(*row);
@@ -75,23 +85,25 @@ void FavoritesPage::readFavorites() {
 }
 
 void FavoritesPage::lookForGone() {
-  std::vector<MapItemIdentifierRef> identifiers;
-  for (const TransitLineRef& line : _favorites) identifiers.push_back(line->identifier());
-  _goneLookup = _context.workers.start([this, identifiers, &library = _context.library](const std::stop_token&) {
-    std::map<std::uint64_t, const char*> gone;
+  protocol::DescribeLinesParams params;
+  std::vector<MapItemIdentifierRef> asked;
+  for (const TransitLineRef& line : _favorites) {
+    if (!line->identifier()->locator()) continue;
+    asked.push_back(line->identifier());
+    params.lines.push_back(keyOf(*asked.back()));
+  }
+  _goneLookup = _context.process->ask(protocol::kDescribeLines, params, [this, asked](const auto& described) {
+    if (!described) return;
+    std::set<std::string> goneFeeds;
     // Feeds that cannot be read are told of by the search.
-    if (const auto lines = FeedCatalog(library).goneLines(identifiers))
-      for (const MapItemIdentifierRef& line : lines->lines) gone[line->muid()] = "Window_Favorites_Gone";
-    if (const auto sources = library.sources())
-      for (const MapItemIdentifierRef& line : identifiers)
-        if (line->locator() && std::none_of(sources->begin(), sources->end(), [&](const FeedSourceRef& source) {
-              return source->name() == line->locator()->feed;
-            }))
-          gone[line->muid()] = "Window_Favorites_FeedGone";
-    return [this, gone] {
-      _gone = gone;
-      if (!gone.empty()) showFavorites();
-    };
+    for (const protocol::FetchError& failure : described->failures)
+      if (isUnknownFeed(failure)) goneFeeds.insert(failure.feed.value_or(""));
+    _gone.clear();
+    for (std::size_t i = 0; i < std::min(asked.size(), described->lines.size()); ++i) {
+      if (described->lines[i].isGone) _gone[asked[i]->muid()] = "Window_Favorites_Gone";
+      if (goneFeeds.contains(asked[i]->locator()->feed)) _gone[asked[i]->muid()] = "Window_Favorites_FeedGone";
+    }
+    if (!_gone.empty()) showFavorites();
   });
 }
 
@@ -121,31 +133,28 @@ void FavoritesPage::showFavorites() {
 void FavoritesPage::search() {
   showFavorites();
   _searching.start();
-  _search = _context.workers.start(
-      [this, &library = _context.library, text = _query.get_text().raw()](const std::stop_token& stop) {
-        auto found = FeedCatalog(library).linesMatching(text, stop);
-        return [this, found = std::move(found)] {
-          _found = found ? *found : FeedCatalog::Lines{{}, {found.error()}};
-          showFound();
-        };
+  _search = _context.process->ask(
+      protocol::kFindLines, {.query = _query.get_text().raw(), .limit = kLineLimit}, [this](const auto& found) {
+        _found = found ? *found : protocol::FoundLines{.failures = {failureOf(*found.error())}};
+        showFound();
       });
 }
 
 void FavoritesPage::showFound() {
   _searching.stop();
   clear(_linesList);
-  for (std::size_t i = 0; i < std::min(_found.lines.size(), kLineLimit); ++i) {
-    const TransitLineRef& line = _found.lines[i];
+  for (const protocol::FeedLine& found : _found.lines) {
+    const TransitLineRef line = lineOf(found);
     _linesList.append(*Gtk::make_managed<LineRow>(_context, line, isFavorite(*line), [this, line] { toggle(line); }));
   }
   _linesList.set_visible(!_found.lines.empty());
   std::string notice;
   const auto addNotice = [&notice](const std::string& text) { notice += (notice.empty() ? "" : "\n") + text; };
-  if (_found.lines.size() > kLineLimit)
+  if (_found.total > _found.lines.size())
     addNotice(
-        LocalizedFormat(LocalizedString("Window_Favorites_More"), {std::uint64_t{_found.lines.size() - kLineLimit}}));
-  if (_found.lines.empty() && _found.errors.empty()) addNotice(LocalizedString("Window_Favorites_NothingFound"));
-  for (const ErrorRef& error : _found.errors) addNotice(textOfError(*error));
+        LocalizedFormat(LocalizedString("Window_Favorites_More"), {std::uint64_t{_found.total - _found.lines.size()}}));
+  if (_found.lines.empty() && _found.failures.empty()) addNotice(LocalizedString("Window_Favorites_NothingFound"));
+  for (const protocol::FetchError& failure : _found.failures) addNotice(textOfError(*errorOf(failure)));
   _notice.set_text(notice);
   _notice.set_visible(!notice.empty());
 }

@@ -8,7 +8,6 @@
 #include <map>
 #include <vector>
 
-#include "desktop/gtfs/feeds/FeedCatalog.h"
 #include "host/window/LineRow.h"
 #include "host/window/Page.h"
 
@@ -36,12 +35,12 @@ class FavoritesPage final : public Page {
   const PageContext& _context;
   std::vector<TransitLineRef> _favorites;
   std::map<std::uint64_t, const char*> _gone;  // why, as a text's key, by the favourites' numbers
-  FeedCatalog::Lines _found;
+  protocol::FoundLines _found;
   Gtk::SearchEntry _query;
   Gtk::Label _favoritesTitle, _noFavorites, _linesTitle, _notice;
   Gtk::ListBox _favoritesList, _linesList;
   Gtk::Spinner _searching;
-  std::shared_ptr<Workers::Job> _search, _goneLookup;
+  std::shared_ptr<WidgetHostProcess::Question> _search, _goneLookup;
 };
 
 }  // namespace nimbo

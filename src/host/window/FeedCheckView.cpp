@@ -4,6 +4,7 @@
 #include <gtkmm/expander.h>
 #include <gtkmm/label.h>
 
+#include "host/FeedAnswers.h"
 #include "host/window/Texts.h"
 #include "host/window/WidgetTexts.h"
 #include "platform/Localization.h"
@@ -28,7 +29,7 @@ void FeedCheckView::clear() {
 }
 
 void FeedCheckView::cancel() {
-  _job = nullptr;
+  _question = nullptr;
   clear();
   set_visible(false);
 }
@@ -42,7 +43,7 @@ void FeedCheckView::addText(const std::string& text, const char* style) {
   (_details ? *_details : *this).append(*label);
 }
 
-void FeedCheckView::check(const Feed& feed, Done done) {
+void FeedCheckView::check(const protocol::CheckFeedParams& feed, Done done) {
   clear();
   auto* line = Gtk::make_managed<Gtk::Box>(Gtk::Orientation::HORIZONTAL, 8);
   auto* spinner = Gtk::make_managed<Gtk::Spinner>();
@@ -62,16 +63,18 @@ void FeedCheckView::check(const Feed& feed, Done done) {
   append(*line);
   set_visible();
   stop->grab_focus();
-  _job = _context.workers.start([this, feed, done, &library = _context.library](const std::stop_token& token) {
-    const FeedCheckReport report = checkFeed(feed, library.cache(), token);
-    return [this, report, done] {
-      show(report);
-      done(&report);
-    };
+  _question = _context.process->ask(protocol::kCheckFeed, feed, [this, done](const auto& report) {
+    if (report) {
+      show(*report);
+      return done(&*report);
+    }
+    clear();
+    addText(textOfError(*report.error()), "failed");
+    done(nullptr);
   });
 }
 
-void FeedCheckView::show(const FeedCheckReport& report) {
+void FeedCheckView::show(const protocol::FeedReport& report) {
   clear();
   set_visible();
   if (const auto& feed = report.staticFeed)
@@ -87,12 +90,12 @@ void FeedCheckView::show(const FeedCheckReport& report) {
                               {DateText(_context.preferences.locale()).textOf(*alerts->timestamp)}),
               "item-caption");
   }
-  for (const ErrorRef& fault : report.faults()) addText(textOfError(*fault), "failed");
+  for (const protocol::FetchError& fault : report.faults()) addText(textOfError(*errorOf(fault)), "failed");
   addSkipped(report);
 }
 
-void FeedCheckView::addSkipped(const FeedCheckReport& report) {
-  std::vector<std::pair<const char*, const SkipReport*>> parts;
+void FeedCheckView::addSkipped(const protocol::FeedReport& report) {
+  std::vector<std::pair<const char*, const std::vector<protocol::Skipped>*>> parts;
   if (report.staticFeed) parts.emplace_back("Window_Feed_SkippedLines", &report.staticFeed->skipped);
   if (report.alerts) {
     parts.emplace_back("Window_Feed_SkippedIncidents", &report.alerts->skipped);
@@ -103,7 +106,7 @@ void FeedCheckView::addSkipped(const FeedCheckReport& report) {
   for (const auto& [key, part] : parts) {
     std::size_t count = 0;
     std::vector<std::string> examples;
-    for (const SkipReport::Entry& entry : part->entries()) {
+    for (const protocol::Skipped& entry : *part) {
       count += entry.count;
       if (!entry.example.empty()) examples.push_back(entry.example);
     }

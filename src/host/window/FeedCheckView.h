@@ -3,7 +3,6 @@
 #include <gtkmm/box.h>
 #include <gtkmm/spinner.h>
 
-#include "desktop/gtfs/feeds/FeedCheck.h"
 #include "host/window/PageContext.h"
 
 namespace nimbo {
@@ -15,23 +14,23 @@ class FeedCheckView final : public Gtk::Box {
   explicit FeedCheckView(const PageContext& context);
 
   /// Hears what was found; null when the user did not want to wait.
-  using Done = std::function<void(const FeedCheckReport* report)>;
+  using Done = std::function<void(const protocol::FeedReport* report)>;
 
-  /// Reads the feed anew.
-  void check(const Feed& feed, Done done);
-  void show(const FeedCheckReport& report);
+  /// Has the feed read anew.
+  void check(const protocol::CheckFeedParams& feed, Done done);
+  void show(const protocol::FeedReport& report);
   /// Drops what runs and what is shown.
   void cancel();
 
  private:
   void addText(const std::string& text, const char* style);
   /// How much was left out of which part, and an example for each reason, whose words "feed check" has.
-  void addSkipped(const FeedCheckReport& report);
+  void addSkipped(const protocol::FeedReport& report);
   void clear();
 
   const PageContext& _context;
   Gtk::Box* _details = nullptr;
-  std::shared_ptr<Workers::Job> _job;
+  std::shared_ptr<WidgetHostProcess::Question> _question;
 };
 
 }  // namespace nimbo

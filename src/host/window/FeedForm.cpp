@@ -2,6 +2,7 @@
 
 #include <gtkmm/dialog.h>
 
+#include "host/FeedAnswers.h"
 #include "host/window/Texts.h"
 #include "host/window/WidgetTexts.h"
 #include "platform/Localization.h"
@@ -125,22 +126,21 @@ void FeedForm::check() {
   const auto entered = feed();
   if (!entered) return;
   _addAnyway.hide();
-  _check.check(*entered, [this, entered = *entered](const FeedCheckReport* report) {
+  _check.check({.definition = definitionOf(*entered)}, [this, entered = *entered](const protocol::FeedReport* report) {
     setBusy(false);
     _add.grab_focus();
     if (!report) return;
     if (report->faults().empty()) return keep(entered, report);
-    if (report->isOtherFeed()) return _combined.show();
+    if (report->isOtherFeed) return _combined.show();
     _addAnyway.show();
   });
   // The keyboard is with the check by now.
   setBusy(true);
 }
 
-void FeedForm::keep(Feed feed, const FeedCheckReport* report) {
+void FeedForm::keep(Feed feed, const protocol::FeedReport* report) {
   if (report && report->alerts && report->alerts->hasOthers) feed.isCombined = true;
-  if (const ErrorRef failure = FeedConfiguration(_context.command.paths.config).add(feed))
-    return showProblem(textOfError(*failure));
+  if (const ErrorRef failure = _context.feeds().add(feed)) return showProblem(textOfError(*failure));
   for (Gtk::Entry* entry : {&_name, &_static, &_alerts}) entry->set_text("");
   _check.cancel();
   _addAnyway.hide();

@@ -14,7 +14,7 @@ namespace nimbo {
 class FeedForm final : public Gtk::Box {
  public:
   /// Hears of a feed that was kept, and what was found when it was read; null when it was not.
-  using Added = std::function<void(const FeedCheckReport* report)>;
+  using Added = std::function<void(const protocol::FeedReport* report)>;
 
   FeedForm(const PageContext& context, Added added);
 
@@ -26,7 +26,7 @@ class FeedForm final : public Gtk::Box {
   /// What the entries say; absent, and the user is told, when that is no feed.
   std::optional<Feed> feed();
   void check();
-  void keep(Feed feed, const FeedCheckReport* report);
+  void keep(Feed feed, const protocol::FeedReport* report);
   void showProblem(const std::string& text);
   void setBusy(bool busy);
 

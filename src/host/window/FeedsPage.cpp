@@ -2,6 +2,7 @@
 
 #include <gtkmm/label.h>
 
+#include "desktop/gtfs/feeds/FeedCache.h"
 #include "desktop/store/FavoritesEditor.h"
 #include "host/window/Texts.h"
 #include "host/window/WidgetTexts.h"
@@ -38,7 +39,7 @@ FeedRow::FeedRow(const PageContext& context, const Feed& feed, std::function<voi
 }
 
 void FeedRow::check() {
-  _check.check(_feed, [this](const FeedCheckReport*) {
+  _check.check({.feed = _feed.name}, [this](const protocol::FeedReport*) {
     _checkButton.set_sensitive(true);
     _checkButton.grab_focus();
   });
@@ -55,7 +56,7 @@ constexpr int kWithFavorites = 1;
 FeedsPage::FeedsPage(const PageContext& context)
     : Page(LocalizedString("Window_Feeds_Title")),
       _context(context),
-      _form(context, [this](const FeedCheckReport* report) {
+      _form(context, [this](const protocol::FeedReport* report) {
         showFeeds();
         auto* added = dynamic_cast<FeedRow*>(_list.get_last_child());
         if (added && report) added->show(*report);
@@ -72,7 +73,7 @@ FeedsPage::FeedsPage(const PageContext& context)
 
 void FeedsPage::showFeeds() {
   while (Gtk::ListBoxRow* row = _list.get_row_at_index(0)) _list.remove(*row);
-  const auto feeds = _context.library.configuration().feeds();
+  const auto feeds = _context.feeds().feeds();
   if (!feeds) return _context.navigator.tell(textOfError(*feeds.error()));
   for (const Feed& feed : *feeds)
     _list.append(*Gtk::make_managed<FeedRow>(_context, feed, [this, feed] { confirmRemoval(feed); }));
@@ -114,9 +115,9 @@ std::vector<std::uint64_t> FeedsPage::favoritesOf(const std::string& feed) const
 }
 
 void FeedsPage::remove(const std::string& name, const std::vector<std::uint64_t>& favorites) {
-  ErrorRef failure = FeedConfiguration(_context.command.paths.config).remove(name);
+  ErrorRef failure = _context.feeds().remove(name);
   if (!failure) {
-    _context.library.cache().remove(name);
+    FeedCache(_context.command.paths.cache).remove(name);
     if (!favorites.empty()) failure = _context.platform->favoritesEditor().remove(favorites);
   }
   showFeeds();

@@ -22,7 +22,7 @@ class FeedRow final : public Gtk::ListBoxRow {
   FeedRow(const PageContext& context, const Feed& feed, std::function<void()> remove);
 
   /// Shows what was found when the feed was read.
-  void show(const FeedCheckReport& report) { _check.show(report); }
+  void show(const protocol::FeedReport& report) { _check.show(report); }
 
  private:
   void check();

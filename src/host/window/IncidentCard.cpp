@@ -5,7 +5,7 @@
 
 #include <algorithm>
 
-#include "desktop/gtfs/feeds/FeedCatalog.h"
+#include "host/FeedAnswers.h"
 #include "host/window/ShieldImage.h"
 #include "host/window/Texts.h"
 #include "host/window/WidgetTexts.h"
@@ -188,17 +188,17 @@ void IncidentCards::lookUpLines(const PageContext& context, const TransitInciden
   for (const TransitIncidentRef& incident : incidents)
     for (const auto& entity : incident->affectedEntities()) muids.insert(entity->muid());
   if (muids.empty()) return;
-  _lookup = context.workers.start([this, muids, &library = context.library](const std::stop_token& stop) {
-    auto found = FeedCatalog(library).linesNumbered(muids, stop);
-    return [this, found = std::move(found)] {
-      if (!found) return;  // the cards go on counting what they cannot name
-      LinesByNumber lines;
-      for (const TransitLineRef& line : found->lines) lines.emplace(line->muid(), line);
-      for (IncidentCard* card : _cards) {
-        card->showAffectedLines(lines);
-        card->showAsOf(lines);
-      }
-    };
+  protocol::DescribeLinesParams params;
+  for (const std::uint64_t muid : muids) params.lines.push_back({.muid = muid});
+  _lookup = context.process->ask(protocol::kDescribeLines, params, [this](const auto& described) {
+    if (!described) return;  // the cards go on counting what they cannot name
+    LinesByNumber lines;
+    for (const protocol::DescribedLine& found : described->lines)
+      if (found.line) lines.emplace(found.line->muid, lineOf(*found.line));
+    for (IncidentCard* card : _cards) {
+      card->showAffectedLines(lines);
+      card->showAsOf(lines);
+    }
   });
 }
 

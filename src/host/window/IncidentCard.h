@@ -55,7 +55,7 @@ class IncidentCards final : public Gtk::ListBox {
   void lookUpLines(const PageContext& context, const TransitIncidents& incidents);
 
   std::vector<IncidentCard*> _cards;
-  std::shared_ptr<Workers::Job> _lookup;
+  std::shared_ptr<WidgetHostProcess::Question> _lookup;
 };
 
 }  // namespace nimbo

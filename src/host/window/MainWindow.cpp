@@ -5,6 +5,7 @@
 #include <gtkmm/eventcontrollerkey.h>
 #include <gtkmm/gestureclick.h>
 
+#include "desktop/rpc/Base64.h"
 #include "host/window/FavoritesPage.h"
 #include "host/window/FeedsPage.h"
 #include "host/window/IncidentPages.h"
@@ -51,11 +52,10 @@ Glib::RefPtr<Gio::MenuModel> makeMainMenu() {
 }
 
 MainWindow::MainWindow(const CommandContext& command, HostPlatform& platform, DesktopPreferences& preferences)
-    : _library(command.paths),
-      _workers(command.runLoop),
-      _context{command, platform, _library, preferences, _workers, *this, _asOf},
+    : _context{command, platform, preferences, *this, _asOf},
       _widgetPage(new WidgetPage(_context)),
       _pages(std::unique_ptr<Page>(_widgetPage)) {
+  _context.process = &_widgetPage->process();
   constexpr int kWidth = 420, kHeight = 680;
   set_default_size(kWidth, kHeight);
   set_icon_name("org.nimbo.Transit");
@@ -161,12 +161,14 @@ void MainWindow::open(const OpenRequest& request) {
       window.push(std::make_unique<IncidentListPage>(window._context, show.incidents));
     }
     void operator()(const ShowHandoff& show) {
-      window._widgetPage->decode(show.payload, [&window = window, show](const Outcome<protocol::Handoff>& decoded) {
-        if (const auto request = openRequestOfHandoff(show, decoded))
-          window.open(*request);
-        else
-          window.tell(request.error()->reason());
-      });
+      window._decoding =
+          window._context.process->ask(protocol::kDecode, {base64(show.payload)},
+                                       [&window = window, show](const Outcome<protocol::Handoff>& decoded) {
+                                         if (const auto request = openRequestOfHandoff(show, decoded))
+                                           window.open(*request);
+                                         else
+                                           window.tell(request.error()->reason());
+                                       });
     }
   };
   std::visit(Opener{*this}, request);

@@ -33,8 +33,6 @@ class MainWindow final : public Gtk::ApplicationWindow, public Navigator {
   void showFront();
   void push(std::unique_ptr<Page> page);
 
-  FeedLibrary _library;
-  Workers _workers;
   std::map<std::string, Date> _asOf;
   PageContext _context;
   Gtk::HeaderBar _header;
@@ -46,6 +44,7 @@ class MainWindow final : public Gtk::ApplicationWindow, public Navigator {
   Gtk::Label _message;
   WidgetPage* _widgetPage;  // the first page of the stack
   PageStack _pages;
+  std::shared_ptr<WidgetHostProcess::Question> _decoding;  // what was handed over last
 };
 
 }  // namespace nimbo

@@ -3,6 +3,7 @@
 #include <glib.h>
 
 #include "desktop/rpc/Base64.h"
+#include "host/FeedAnswers.h"
 #include "platform/Localization.h"
 #include "platform/SystemServices.h"
 #include "platform/foundation/Log.h"
@@ -66,19 +67,6 @@ Outcome<OpenRequest> requestOfActivityURL(const URLParts& parts) {
 std::string_view payloadKey(bool isLine) {
   return isLine ? kNimboTransitWidgetIncidentActivityUserInfoKey
                 : kNimboTransitWidgetIncidentSummaryActivityUserInfoKey;
-}
-
-TransitArtworkRef artworkOf(const std::optional<protocol::Shield>& shield) {
-  if (!shield) return nullptr;
-  TransitArtwork::Fields fields;
-  const bool isIcon = shield->icon && !shield->text;
-  fields.artworkSourceType = static_cast<std::int64_t>(isIcon ? ArtworkSourceType::icon : ArtworkSourceType::shield);
-  if (!isIcon) fields.shieldDataSource = TransitShield{shield->type, shield->text, shield->color, shield->textColor};
-  if (const auto& icon = shield->icon)
-    fields.iconDataSource = TransitIcon{icon->iconType, icon->cartoID, icon->defaultTransitType, icon->iconAttributeKey,
-                                        icon->iconAttributeValue};
-  fields.accessibilityText = shield->accessibilityText;
-  return std::make_shared<const TransitArtwork>(std::move(fields));
 }
 
 TransitIncidents incidentsOf(const std::vector<protocol::Incident>& incidents) {

@@ -3,12 +3,12 @@
 #include <map>
 #include <string>
 
-#include "desktop/gtfs/feeds/FeedLibrary.h"
+#include "desktop/gtfs/feeds/FeedConfiguration.h"
 #include "host/Commands.h"
 #include "host/HostPlatform.h"
 #include "host/window/DesktopPreferences.h"
 #include "host/window/OpenRequest.h"
-#include "host/window/Workers.h"
+#include "host/window/WidgetHostProcess.h"
 #include "platform/foundation/Date.h"
 
 namespace nimbo {
@@ -27,12 +27,14 @@ class Navigator {
 struct PageContext {
   const CommandContext& command;
   HostPlatform& platform;
-  const FeedLibrary& library;
   DesktopPreferences& preferences;
-  Workers& workers;
   Navigator& navigator;
   /// When publishers made their alerts, by the names of the feeds, as the widget said last.
   std::map<std::string, Date>& asOf;
+  /// Whom to ask about feeds. The widget screen's; null until that is made.
+  WidgetHostProcess* process = nullptr;
+
+  FeedConfiguration feeds() const { return FeedConfiguration(command.paths.config); }
 };
 
 }  // namespace nimbo

@@ -2,6 +2,7 @@
 
 #include <algorithm>
 
+#include "host/FeedAnswers.h"
 #include "platform/Localization.h"
 
 namespace nimbo {
@@ -34,13 +35,6 @@ WidgetRow rowOf(const protocol::Row& row) {
   std::vector<std::string> texts;
   if (row.item) texts = std::visit([](const auto& item) { return textsOf(item); }, *row.item);
   return {row.frame.y, row.frame.height, CommaDelimitedList(texts)};
-}
-
-ErrorRef errorOf(const protocol::FetchError& error) {
-  BoxedDictionary::Entries userInfo{{std::string(kErrorReasonKey), box(error.reason)}};
-  if (error.subject) userInfo.emplace(kErrorSubjectKey, box(*error.subject));
-  if (error.feed) userInfo.emplace(kErrorFeedKey, box(*error.feed));
-  return Error::errorWithDomain_code_userInfo(error.domain, error.code, std::move(userInfo));
 }
 
 }  // namespace

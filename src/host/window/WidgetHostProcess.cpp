@@ -5,7 +5,6 @@
 #include <algorithm>
 #include <stdexcept>
 
-#include "desktop/rpc/Base64.h"
 #include "platform/foundation/Log.h"
 
 namespace nimbo {
@@ -27,6 +26,7 @@ WidgetHostProcess::~WidgetHostProcess() {
   if (_hiddenTimer) _hiddenTimer->invalidate();
   endRetries();
   _networkReturned.disconnect();
+  _questions.clear();  // those who asked go, too
   stop();
 }
 
@@ -50,6 +50,11 @@ void WidgetHostProcess::stopLater() {
   if (_hiddenTimer) _hiddenTimer->invalidate();
   _hiddenTimer = _runLoop.scheduleTimer(kHiddenPatience, false, [this](Timer&) {
     _hiddenTimer = nullptr;
+    const bool isAsked = std::any_of(_questions.begin(), _questions.end(), [](const auto& waiting) {
+      const auto asked = waiting.lock();
+      return asked && asked->_fail;
+    });
+    if (isAsked) return stopLater();
     stop();
     setUpdating(false);
   });
@@ -106,6 +111,7 @@ void WidgetHostProcess::start() {
   } catch (const std::runtime_error& failure) {
     return giveUp(failure.what());
   }
+  _processMark = std::make_shared<bool>(true);
   _told = _presentation;
   _contentHeight = 0;
   _isExpanded = _wantsExpanded;
@@ -146,7 +152,9 @@ void WidgetHostProcess::stop() {
   if (!_widget) return;
   if (_appeared) disappear();
   // What was asked is still done: the process reads it before the end of its input.
+  _processMark.reset();
   _widget.reset();
+  endQuestions("the widget process was ended");
 }
 
 void WidgetHostProcess::replace(const std::string& reason) {
@@ -263,20 +271,32 @@ void WidgetHostProcess::selectRow(std::size_t row) {
   askOfRow(protocol::kSelectRow, {.row = static_cast<std::uint32_t>(row)});
 }
 
-void WidgetHostProcess::decode(const Bytes& handoff,
-                               std::function<void(const Outcome<protocol::Handoff>&)> completion) {
-  const auto failure = [](std::string reason) {
-    return Error::errorWithDomain_code_reason(std::string(kProcessErrorDomain), 0, std::move(reason));
-  };
+ErrorRef WidgetHostProcess::failure(std::string reason) {
+  return Error::errorWithDomain_code_reason(std::string(kProcessErrorDomain), 0, std::move(reason));
+}
+
+bool WidgetHostProcess::prepareFor(const std::shared_ptr<Question>& question) {
   if (!_widget && !_gaveUp) start();
-  if (!_widget) return completion(failure("the widget process does not run"));
-  _widget->call(protocol::kDecode, {base64(handoff)},
-                [failure, completion = std::move(completion)](const auto& result, const JSONRPCError& error) {
-                  if (result)
-                    completion(*result);
-                  else
-                    completion(failure(error.message));
-                });
+  std::erase_if(_questions, [](const auto& asked) { return asked.expired(); });
+  _questions.push_back(question);
+  if (_widget && !_visible) stopLater();
+  if (_widget) return true;
+  // Not before the one who asks has the question.
+  _runLoop.dispatchAsync([waiting = std::weak_ptr(question)] {
+    const auto asked = waiting.lock();
+    if (!asked) return;
+    if (const auto fail = std::exchange(asked->_fail, nullptr)) fail(failure("the widget process does not run"));
+  });
+  return false;
+}
+
+void WidgetHostProcess::endQuestions(const std::string& reason) {
+  for (const auto& waiting : std::exchange(_questions, {})) {
+    const auto asked = waiting.lock();
+    if (!asked) continue;
+    asked->_cancel = nullptr;
+    if (const auto fail = std::exchange(asked->_fail, nullptr)) fail(failure(reason));
+  }
 }
 
 }  // namespace nimbo

@@ -13,7 +13,7 @@
 #include "host/window/WidgetContent.h"
 #include "platform/SystemServices.h"
 #include "platform/foundation/Outcome.h"
-#include "protocol/Handoff.h"
+#include "protocol/Methods.h"
 
 namespace nimbo {
 
@@ -56,9 +56,14 @@ class WidgetHostProcess {
   void askForContent();
   void highlightRow(std::size_t row, bool highlighted);
   void selectRow(std::size_t row);
-  /// Has the process read a hand-off; one that is not running is started for it, and ends as when it is hidden.
-  /// `completion` hears once, unless the process is ended before; errors say what is wrong with the bytes.
-  void decode(const Bytes& handoff, std::function<void(const Outcome<protocol::Handoff>&)> completion);
+  /// A question that somebody waits for. When it is let go nobody hears the answer, and the process stops looking.
+  class Question;
+  /// Asks the process what needs no row on screen; one that is not running is started for it, and ends as when it is
+  /// hidden. `completion` hears once, unless the question is let go: the answer, or why there is none.
+  template <class Params, class Result>
+  [[nodiscard]] std::shared_ptr<Question> ask(
+      const protocol::Method<Params, Result>& method, const std::type_identity_t<Params>& params,
+      std::function<void(const Outcome<std::type_identity_t<Result>>& answer)> completion);
   /// Starts anew after `widgetDidFail`.
   void restart();
 
@@ -85,6 +90,12 @@ class WidgetHostProcess {
   void replace(const std::string& reason);
   void giveUp(const std::string& reason);
   void setUpConnection();
+  static ErrorRef failure(std::string reason);
+  /// Starts a process where there is none, and keeps it for the question. False when there is none to be had, which the
+  /// question then hears.
+  bool prepareFor(const std::shared_ptr<Question>& question);
+  /// Tells all that wait that no answer comes.
+  void endQuestions(const std::string& reason);
   /// A request about a row, which may be gone by now.
   template <class Params, class Result>
   void askOfRow(const protocol::Method<Params, Result>& method, const Params& params);
@@ -115,6 +126,8 @@ class WidgetHostProcess {
   // Of the process that runs.
   std::optional<PictureMemory> _pictures;
   std::unique_ptr<WatchedWidget> _widget;
+  std::vector<std::weak_ptr<Question>> _questions;  // that were asked
+  std::shared_ptr<bool> _processMark;               // while it runs
   bool _appeared = false;
   bool _isExpanded = false;  // as last told or shown
   bool _awaitsContent = false;
@@ -123,5 +136,39 @@ class WidgetHostProcess {
   WidgetPresentation _told;   // what the process knows of _presentation
   double _contentHeight = 0;  // points; 0 until it has drawn
 };
+
+class WidgetHostProcess::Question {
+ public:
+  ~Question() {
+    if (_cancel) _cancel();
+  }
+
+ private:
+  friend class WidgetHostProcess;
+  std::function<void(const ErrorRef& failure)> _fail;  // null once answered
+  std::function<void()> _cancel;                       // null where nothing is to be told
+};
+
+template <class Params, class Result>
+std::shared_ptr<WidgetHostProcess::Question> WidgetHostProcess::ask(
+    const protocol::Method<Params, Result>& method, const std::type_identity_t<Params>& params,
+    std::function<void(const Outcome<std::type_identity_t<Result>>& answer)> completion) {
+  const auto question = std::make_shared<Question>();
+  question->_fail = [completion](const ErrorRef& failure) { completion(failure); };
+  if (!prepareFor(question)) return question;
+  const auto waiting = std::weak_ptr(question);
+  const std::int64_t request = _widget->call(
+      method, params, [waiting, completion](const std::optional<Result>& answer, const JSONRPCError& error) {
+        const auto asked = waiting.lock();
+        if (!asked || !std::exchange(asked->_fail, nullptr)) return;
+        asked->_cancel = nullptr;
+        answer ? completion(*answer) : completion(failure(error.message));
+      });
+  if (method.waitsForFeeds && question->_fail)
+    question->_cancel = [this, request, process = std::weak_ptr(_processMark)] {
+      if (!process.expired()) _widget->call(protocol::kCancel, {request}, [](const auto&, const auto&) {});
+    };
+  return question;
+}
 
 }  // namespace nimbo

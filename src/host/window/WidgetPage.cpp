@@ -162,7 +162,7 @@ void WidgetPage::buildPlaces() {
 
 void WidgetPage::watchVisibility() {
   signal_map().connect([this] {
-    const auto feeds = _context.library.configuration().feeds();
+    const auto feeds = _context.feeds().feeds();
     _sampleNotice.set_visible(feeds && feeds->empty());
     updateVisibility();
   });

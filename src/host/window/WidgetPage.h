@@ -20,10 +20,7 @@ class WidgetPage final : public Page, private WidgetHostProcess::Delegate {
 
   /// Fetches now.
   void update() { _process.update(); }
-  /// As `WidgetHostProcess::decode`.
-  void decode(const Bytes& handoff, std::function<void(const Outcome<protocol::Handoff>&)> completion) {
-    _process.decode(handoff, std::move(completion));
-  }
+  WidgetHostProcess& process() { return _process; }
 
  private:
   void buildCard();

@@ -37,6 +37,12 @@ std::string Error::feed() const {
   return text ? text->description() : std::string();
 }
 
+ErrorRef Error::ofFeed(std::string name) const {
+  auto details = _userInfo->entries();
+  details.insert_or_assign(std::string(kErrorFeedKey), box(std::move(name)));
+  return errorWithDomain_code_userInfo(_domain, _code, std::move(details));
+}
+
 bool Error::isEqual(const Object* other) const {
   if (this == other) return true;
   const auto* error = instanceOf<Error>(other);

@@ -46,6 +46,8 @@ class Error final : public Object {
   std::string subject() const;
   /// Empty when it is no feed's.
   std::string feed() const;
+  /// The same error, as one of that feed.
+  ErrorRef ofFeed(std::string name) const;
 
   std::string_view className() const override { return "Error"; }
   bool isEqual(const Object* other) const override;

@@ -87,9 +87,9 @@ class PublishedFeeds : public testing::Test {
     const FeedLibrary library(paths);
     std::vector<MapItemIdentifierRef> identifiers;
     std::set<std::string> agencies;
-    const auto lines = FeedCatalog(library).linesMatching("");
+    const auto lines = FeedCatalog(library).find({.limit = SIZE_MAX});
     ASSERT_TRUE(lines->errors.empty());
-    for (const auto& line : lines->lines)
+    for (const auto& [line, longName] : lines->lines)
       if (line->identifier()->locator()->feed == name) {
         identifiers.push_back(line->identifier());
         agencies.insert(line->identifier()->locator()->agencyID);

@@ -243,18 +243,22 @@ TEST_F(LineServiceTest, ServesTheSampleCityUntilAFeedIsSetUp) {
 TEST_F(LineServiceTest, CatalogFindsLines) {
   const FeedLibrary library(paths);
   const FeedCatalog catalog(library);
-  EXPECT_EQ(catalog.linesMatching("")->lines.size(), 12u);
-  EXPECT_EQ(catalog.linesMatching("aIrPort")->lines.size(), 1u);
-  EXPECT_EQ(catalog.linesMatching("merebay")->lines.size(), 2u);
-  EXPECT_EQ((*catalog.lineNamed("sample:coast"))->name(), "Coast Express");
-  for (const char* name : {"coast", "sample:", "sample:x", "metro:coast"})
-    EXPECT_FALSE(catalog.lineNamed(name)) << name;
+  const auto count = [&](const char* text) { return catalog.find({.text = text, .limit = 100})->lines.size(); };
+  EXPECT_EQ(count(""), 12u);
+  EXPECT_EQ(count("aIrPort"), 1u);
+  EXPECT_EQ(count("merebay"), 2u);
+  const auto page = catalog.find({.offset = 10, .limit = 5});
+  EXPECT_EQ(page->total, 12u);
+  EXPECT_EQ(page->lines.size(), 2u);
   addFeed("north", {"1", "2"});
   addFeed("south", {"1"});
   std::filesystem::remove(folder.path() / "south/routes.txt");
-  const auto lines = catalog.linesMatching("r");
+  const auto lines = catalog.find({.text = "r", .limit = 100});
   EXPECT_EQ(lines->lines.size(), 2u);
-  EXPECT_EQ(lines->errors.size(), 1u);
+  ASSERT_EQ(lines->errors.size(), 1u);
+  EXPECT_EQ(lines->errors[0]->feed(), "south");
+  EXPECT_FALSE(catalog.find({.feed = "west", .limit = 1}));
+  EXPECT_EQ(catalog.find({.feed = "north", .limit = 1})->total, 2u);
 }
 
 }  // namespace

@@ -1,9 +1,8 @@
 #include "desktop/gtfs/feeds/FeedCatalog.h"
 
-#include <map>
+#include <algorithm>
 
 #include "desktop/gtfs/feeds/FeedLookup.h"
-#include "desktop/gtfs/feeds/TransitLineServiceError.h"
 #include "desktop/gtfs/static/LineItems.h"
 #include "desktop/gtfs/text/Utf8.h"
 
@@ -15,76 +14,87 @@ bool holds(std::string_view text, const std::string& part) {
   return asciiLowerCase(text).find(part) != std::string::npos;
 }
 
+bool isHit(const StaticFeed& feed, const StaticLine& line, const std::string& part) {
+  const StaticAgency agency = feed.agency(line.agency);
+  if (line.routeID.size() + line.shortName.size() + agency.id.size() > FeedCatalog::kLongestIdentifiers) return false;
+  return holds(line.shortName, part) || holds(line.longName, part) || holds(line.routeID, part) ||
+         holds(agency.name, part);
+}
+
+FeedCatalog::Line lineOf(LineItems& items, const StaticFeed& feed, std::size_t index, std::uint64_t muid) {
+  return {items.item(index, muid), std::string(feed.line(index).longName)};
+}
+
 }  // namespace
 
-Outcome<FeedCatalog::Lines> FeedCatalog::lines(const Filter& isWanted, const std::stop_token& stop) const {
-  const auto sources = _library.sources();
+Outcome<FeedCatalog::Hits> FeedCatalog::find(const Query& query, const std::stop_token& stop,
+                                             const Progress& progress) const {
+  auto sources = _library.sources();
   if (!sources) return sources.error();
-  Lines result;
-  for (const FeedSourceRef& source : *sources) {
-    const auto loaded = source->staticFeed(stop);
+  if (query.feed) {
+    const auto source = _library.sourceNamed(*query.feed);
+    if (!source) return source.error();
+    *sources = {*source};
+  }
+  const std::string part = asciiLowerCase(query.text);
+  Hits hits;
+  for (std::size_t done = 0; done < sources->size() && !stop.stop_requested(); ++done) {
+    const FeedSource& source = *(*sources)[done];
+    if (progress) progress(source.name(), done, sources->size());
+    const auto loaded = source.staticFeed(stop);
     if (!loaded) {
-      result.errors.push_back(loaded.error());
+      hits.errors.push_back(loaded.error()->ofFeed(source.name()));
       continue;
     }
     const StaticFeed& feed = loaded->feed;
-    LineItems items(source->name(), feed);
-    for (std::size_t i = 0; i < feed.lineCount(); ++i)
-      if (const StaticLine line = feed.line(i); isWanted(feed, line)) result.lines.push_back(items.item(i, line.muid));
+    LineItems items(source.name(), feed);
+    for (std::size_t i = 0; i < feed.lineCount(); ++i) {
+      const StaticLine line = feed.line(i);
+      if (!isHit(feed, line, part) || hits.total++ < query.offset || hits.lines.size() == query.limit) continue;
+      hits.lines.push_back(lineOf(items, feed, i, line.muid));
+    }
   }
-  return result;
+  return hits;
 }
 
-Outcome<FeedCatalog::Lines> FeedCatalog::linesMatching(std::string_view text, const std::stop_token& stop) const {
-  const auto isWanted = [part = asciiLowerCase(text)](const StaticFeed& feed, const StaticLine& line) {
-    return holds(line.shortName, part) || holds(line.longName, part) || holds(line.routeID, part) ||
-           holds(feed.agency(line.agency).name, part);
+Outcome<FeedCatalog::Descriptions> FeedCatalog::describe(const std::vector<MapItemIdentifierRef>& identifiers,
+                                                         const std::stop_token& stop, const Progress& progress) const {
+  const auto sources = _library.sources();
+  if (!sources) return sources.error();
+  Descriptions result{std::vector<Description>(identifiers.size(), {std::nullopt, true}), {}};
+  const auto fail = [&](const ErrorRef& error, const std::string& feed, const std::vector<std::size_t>& places) {
+    result.errors.push_back(error->ofFeed(feed));
+    for (const std::size_t place : places) result.lines[place].isGone = false;
   };
-  return lines(isWanted, stop);
-}
-
-Outcome<FeedCatalog::Lines> FeedCatalog::linesNumbered(const std::set<std::uint64_t>& muids,
-                                                       const std::stop_token& stop) const {
-  return lines([&](const StaticFeed&, const StaticLine& line) { return muids.contains(line.muid); }, stop);
-}
-
-Outcome<FeedCatalog::GoneLines> FeedCatalog::goneLines(const std::vector<MapItemIdentifierRef>& identifiers) const {
-  if (const auto sources = _library.sources(); !sources) return sources.error();
-  std::map<std::string, std::vector<MapItemIdentifierRef>> byFeed;
+  std::vector<std::string> names;  // of the feeds that are asked for
+  for (const FeedSourceRef& source : *sources) names.push_back(source->name());
   for (const MapItemIdentifierRef& identifier : identifiers)
-    if (identifier->locator()) byFeed[identifier->locator()->feed].push_back(identifier);
-  GoneLines gone;
-  for (const auto& [name, ofFeed] : byFeed) {
-    const auto source = _library.sourceNamed(name);
-    const auto loaded = source ? (*source)->staticFeed({}) : source.error();
+    if (const auto& locator = identifier->locator();
+        locator && std::find(names.begin(), names.end(), locator->feed) == names.end())
+      names.push_back(locator->feed);
+  for (std::size_t done = 0; done < names.size(); ++done) {
+    std::vector<MapItemIdentifierRef> ofFeed;
+    std::vector<std::size_t> places;
+    for (std::size_t i = 0; i < identifiers.size(); ++i) {
+      const auto& locator = identifiers[i]->locator();
+      if (result.lines[i].line || (locator && locator->feed != names[done])) continue;
+      ofFeed.push_back(identifiers[i]);
+      places.push_back(i);
+    }
+    if (ofFeed.empty()) continue;
+    if (progress) progress(names[done], done, names.size());
+    const auto source = done < sources->size() ? (*sources)[done] : _library.sourceNamed(names[done]);
+    const auto loaded = source ? (*source)->staticFeed(stop) : source.error();
     if (!loaded) {
-      gone.errors.push_back(loaded.error());
+      fail(loaded.error(), names[done], places);
       continue;
     }
-    const auto found = findLines(loaded->feed, name, ofFeed);
+    LineItems items(names[done], loaded->feed);
+    const auto found = findLines(loaded->feed, names[done], ofFeed);
     for (std::size_t i = 0; i < found.size(); ++i)
-      if (!found[i]) gone.lines.push_back(ofFeed[i]);
+      if (found[i]) result.lines[places[i]] = {lineOf(items, loaded->feed, found[i]->index, ofFeed[i]->muid()), false};
   }
-  return gone;
-}
-
-Outcome<TransitLineRef> FeedCatalog::lineNamed(std::string_view name) const {
-  const auto unknown = [&](const std::string& why) {
-    return transitLineServiceError(
-        TransitLineServiceError::unknownLine,
-        "No line is named \"" + std::string(name) + "\": " + why + " \"lines\" lists the lines there are.");
-  };
-  const std::size_t colon = name.find(':');
-  if (colon == std::string_view::npos) return unknown("write the feed, a colon and the route, FEED:ROUTE_ID.");
-  const auto source = _library.sourceNamed(name.substr(0, colon));
-  if (!source) return source.error();
-  const auto loaded = (*source)->staticFeed({});
-  if (!loaded) return loaded.error();
-  const StaticFeed& feed = loaded->feed;
-  for (std::size_t i = 0; i < feed.lineCount(); ++i)
-    if (feed.line(i).routeID == name.substr(colon + 1))
-      return TransitLineRef(LineItems((*source)->name(), feed).item(i, feed.line(i).muid));
-  return unknown("its feed has no such route.");
+  return result;
 }
 
 }  // namespace nimbo

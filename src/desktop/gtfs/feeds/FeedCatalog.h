@@ -1,9 +1,9 @@
 #pragma once
 
 #include <functional>
-#include <set>
+#include <optional>
 #include <stop_token>
-#include <string_view>
+#include <string>
 #include <vector>
 
 #include "desktop/gtfs/feeds/FeedLibrary.h"
@@ -14,36 +14,50 @@ namespace nimbo {
 /// The lines that there are to choose from. Blocks its thread.
 class FeedCatalog {
  public:
-  struct Lines {
-    std::vector<TransitLineRef> lines;  ///< by feed, then as their agencies list them
-    std::vector<ErrorRef> errors;       ///< of feeds that could not be read
-  };
-
   /// The library outlives this.
   explicit FeedCatalog(const FeedLibrary& library) : _library(library) {}
 
-  /// The lines in whose names, route identifier or agency `text` occurs, whatever the case of its ASCII letters; all
-  /// for an empty text. An error when the configuration cannot be read.
-  Outcome<Lines> linesMatching(std::string_view text, const std::stop_token& stop = {}) const;
+  /// Hears which feed is read next, how many have been read, and how many are to be.
+  using Progress = std::function<void(const std::string& feed, std::size_t done, std::size_t total)>;
 
-  /// The lines of these numbers; those that no feed knows are left out. An error as above.
-  Outcome<Lines> linesNumbered(const std::set<std::uint64_t>& muids, const std::stop_token& stop = {}) const;
-
-  /// Of these lines those that their feeds do not know any more, and the errors of feeds that could not be read or are
-  /// not set up. An error as above.
-  struct GoneLines {
-    std::vector<MapItemIdentifierRef> lines;
-    std::vector<ErrorRef> errors;
+  /// A line of a feed.
+  struct Line {
+    TransitLineRef line;
+    std::string longName;  ///< may be empty
   };
-  Outcome<GoneLines> goneLines(const std::vector<MapItemIdentifierRef>& identifiers) const;
 
-  /// The line that is written "FEED:ROUTE_ID", or an error that says what to do.
-  Outcome<TransitLineRef> lineNamed(std::string_view name) const;
+  struct Query {
+    std::string text;                 ///< empty: every line
+    std::optional<std::string> feed;  ///< absent: of all feeds
+    std::size_t offset = 0;           ///< hits that are passed over
+    std::size_t limit = 0;            ///< the most lines that are wanted
+  };
+  struct Hits {
+    std::size_t total = 0;
+    std::vector<Line> lines;       ///< by feed, then as their agencies list them, from the offset on
+    std::vector<ErrorRef> errors;  ///< of feeds that could not be read, each with its feed
+  };
+  /// The lines in whose names, route identifier or agency the text occurs, whatever the case of its ASCII letters. An
+  /// error when the configuration cannot be read, or has no such feed. A line whose identifiers are longer than
+  /// `kLongestIdentifiers` bytes is no hit.
+  Outcome<Hits> find(const Query& query, const std::stop_token& stop = {}, const Progress& progress = {}) const;
+
+  struct Description {
+    std::optional<Line> line;  ///< absent when it is not found
+    bool isGone = false;       ///< the feeds that could have it do not
+  };
+  struct Descriptions {
+    std::vector<Description> lines;  ///< one for each identifier
+    std::vector<ErrorRef> errors;    ///< of feeds that could not be read, or are not set up, once each, with its feed
+  };
+  /// The lines of these identifiers, also of those that their agencies have renumbered since; one that is only a number
+  /// may be of any feed. An error when the configuration cannot be read.
+  Outcome<Descriptions> describe(const std::vector<MapItemIdentifierRef>& identifiers, const std::stop_token& stop = {},
+                                 const Progress& progress = {}) const;
+
+  static constexpr std::size_t kLongestIdentifiers = 64 << 10;
 
  private:
-  using Filter = std::function<bool(const StaticFeed& feed, const StaticLine& line)>;
-  Outcome<Lines> lines(const Filter& isWanted, const std::stop_token& stop) const;
-
   const FeedLibrary& _library;
 };
 

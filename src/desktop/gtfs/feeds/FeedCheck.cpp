@@ -51,14 +51,16 @@ bool FeedCheckReport::isOtherFeed() const {
          alertsError->domain() == kTransitLineServiceErrorDomain;
 }
 
-FeedCheckReport checkFeed(const Feed& feed, const FeedCache& cache, const std::stop_token& stop) {
+FeedCheckReport checkFeed(const Feed& feed, const FeedCache& cache, const std::stop_token& stop,
+                          const FeedCheckProgress& progress) {
   FeedCheckReport report;
   report.name = feed.name;
-  const auto fresh = StaticFeedStore(cache).readAnew(feed, stop);
+  const auto fresh = StaticFeedStore(cache).readAnew(feed, stop, progress.receives);
   report.staticError = fresh.error();
   if (fresh)
     report.staticFeed = {fresh->feed.agencyCount(), fresh->feed.lineCount(), fresh->trips.count(),
                          std::string(fresh->feed.language()), fresh->skipped};
+  if (progress.beginsAlerts) progress.beginsAlerts();
   const auto alerts = AlertsStore(cache).fetch(feed, stop);
   report.alertsError = alerts.error();
   if (!alerts) return report;

@@ -1,5 +1,6 @@
 #pragma once
 
+#include <functional>
 #include <optional>
 #include <stop_token>
 #include <string>
@@ -56,7 +57,15 @@ struct FeedCheckReport {
   bool isOtherFeed() const;
 };
 
+/// Hears when a half of a feed is begun with, and of the static one's bytes as they come. Called on the thread that
+/// checks.
+struct FeedCheckProgress {
+  std::function<void()> beginsAlerts;
+  std::function<void(std::size_t bytes)> receives;
+};
+
 /// Reads both halves of a feed from their sources, whatever the cache holds, and checks them. Blocks its thread.
-FeedCheckReport checkFeed(const Feed& feed, const FeedCache& cache, const std::stop_token& stop = {});
+FeedCheckReport checkFeed(const Feed& feed, const FeedCache& cache, const std::stop_token& stop = {},
+                          const FeedCheckProgress& progress = {});
 
 }  // namespace nimbo

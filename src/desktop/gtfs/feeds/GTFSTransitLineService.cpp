@@ -171,6 +171,8 @@ std::vector<MapItemIdentifierRef> GTFSTransitLineService::goneLines() const {
   return _shared->goneLines;
 }
 
+const FeedLibrary& GTFSTransitLineService::library() const { return _shared->library; }
+
 std::map<std::string, Date> GTFSTransitLineService::asOf() const {
   const std::lock_guard guard(_shared->lock);
   return _shared->asOf;

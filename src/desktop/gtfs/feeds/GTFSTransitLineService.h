@@ -24,6 +24,9 @@ class GTFSTransitLineService final : public TransitLineService {
   /// Ends a running lookup early; its handler is not called. Main thread.
   ~GTFSTransitLineService() override;
 
+  /// The feeds that lookups read, with what is coming of them. As long as this lives.
+  const FeedLibrary& library() const;
+
   /// The language of incidents' texts for lookups from now on, a BCP 47 tag; "en" until set. Any thread.
   void setLanguage(std::string tag);
 

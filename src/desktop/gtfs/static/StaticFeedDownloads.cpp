@@ -160,6 +160,16 @@ Outcome<LoadedStaticFeed> StaticFeedDownloads::load(const Feed& feed, const std:
                : transitLineServiceError(TransitLineServiceError::internal, "The program is ending.", feed.name);
 }
 
+std::vector<StaticFeedDownloads::Progress> StaticFeedDownloads::underWay() const {
+  const std::lock_guard guard(_lock);
+  std::vector<Progress> all;
+  for (const auto& [name, download] : _downloads) {
+    const std::lock_guard downloadGuard(download->lock);
+    if (!download->result) all.push_back({name, download->received});
+  }
+  return all;
+}
+
 ErrorRef StaticFeedDownloads::firstUnderWay() const {
   const std::lock_guard guard(_lock);
   for (const auto& [name, download] : _downloads) {

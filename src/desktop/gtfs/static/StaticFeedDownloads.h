@@ -3,6 +3,8 @@
 #include <map>
 #include <memory>
 #include <mutex>
+#include <string>
+#include <vector>
 
 #include "desktop/gtfs/static/StaticFeedStore.h"
 
@@ -21,6 +23,14 @@ class StaticFeedDownloads {
   /// Blocks its thread while the feed is not in the cache, until `stop` is requested: then the error is that of
   /// `firstUnderWay`. Throws std::system_error when a feed that is not in the cache needs a thread that cannot start.
   Outcome<LoadedStaticFeed> load(const Feed& feed, const std::stop_token& stop);
+
+  /// A download that has not ended.
+  struct Progress {
+    std::string feed;
+    std::size_t received = 0;  ///< bytes
+  };
+  /// The downloads under way, of feeds that were here before too.
+  std::vector<Progress> underWay() const;
 
   /// An error that says of a feed which was never here how far it is; null when none is coming.
   ErrorRef firstUnderWay() const;

@@ -178,9 +178,10 @@ Outcome<std::optional<FreshStaticFeed>> StaticFeedStore::fetch(const Feed& feed,
   return std::optional(std::move(*fresh));
 }
 
-Outcome<FreshStaticFeed> StaticFeedStore::readAnew(const Feed& feed, const std::stop_token& stop) const {
+Outcome<FreshStaticFeed> StaticFeedStore::readAnew(const Feed& feed, const std::stop_token& stop,
+                                                   const Progress& progress) const {
   if (feed.staticFeed.isRemote()) {
-    auto fetched = fetch(feed, {}, stop, {});
+    auto fetched = fetch(feed, {}, stop, progress);
     if (!fetched) return fetched.error();
     return std::move(**fetched);  // without validators nothing is unchanged
   }

@@ -48,7 +48,7 @@ class StaticFeedStore {
   static SelectorMatcher::TripLookup lookupIn(const Feed& feed, const TripRoutes& trips);
 
   /// From the source.
-  Outcome<FreshStaticFeed> readAnew(const Feed& feed, const std::stop_token& stop) const;
+  Outcome<FreshStaticFeed> readAnew(const Feed& feed, const std::stop_token& stop, const Progress& progress = {}) const;
 
  private:
   std::optional<StaticFeed> readCache(const Feed& feed) const;

@@ -1,0 +1,19 @@
+#pragma once
+
+#include "desktop/gtfs/feeds/FeedCatalog.h"
+#include "desktop/gtfs/feeds/FeedCheck.h"
+#include "platform/foundation/Outcome.h"
+#include "protocol/Feeds.h"
+
+// What is known of feeds, as the protocol has it.
+namespace nimbo {
+
+/// Of each name come 500 characters.
+protocol::FeedLine writtenLine(const FeedCatalog::Line& line);
+
+protocol::FeedReport writtenReport(const FeedCheckReport& report);
+
+/// The feed of a definition, or what is wrong with that.
+Outcome<Feed> feedOf(const protocol::FeedDefinition& definition);
+
+}  // namespace nimbo
