@@ -6,6 +6,7 @@
 
 #include "desktop/gtfs/feeds/FeedConfiguration.h"
 #include "desktop/gtfs/feeds/SampleCity.h"
+#include "desktop/gtfs/feeds/TransitLineServiceError.h"
 
 namespace nimbo {
 
@@ -37,9 +38,21 @@ std::string plainNameOfLocale(std::string_view locale) {
 }
 
 /// "de_AT" as "de-AT".
-std::string languageTag(std::string locale) {
+std::string tagOfLocale(std::string locale) {
   std::replace(locale.begin(), locale.end(), '_', '-');
   return locale;
+}
+
+class NoTransitLines final : public TransitLineService {
+  void lookup(const std::vector<MapItemIdentifierRef>&, Handler handler) override {
+    Platform::current().mainRunLoop().dispatchAsync([handler = std::move(handler)] {
+      handler({}, transitLineServiceError(TransitLineServiceError::internal, "This program looks no lines up."));
+    });
+  }
+};
+
+std::unique_ptr<TransitLineService> orNone(std::unique_ptr<TransitLineService> lines) {
+  return lines ? std::move(lines) : std::make_unique<NoTransitLines>();
 }
 
 }  // namespace
@@ -73,11 +86,11 @@ DesktopPlatform::DesktopPlatform(Options options)
       _database(std::make_shared<StateDatabase>(_paths.state, _clock, options.notice ? options.notice : &logNotice)),
       _sharedSettings(_database),
       _analytics(_database),
-      _transitLines(_paths),
+      _transitLines(orNone(std::move(options.transitLines))),
       _favoritesEditor(_database, [folder = _paths.config] { return firstFavorites(folder); }),
-      _favorites(_favoritesEditor, _transitLines),
+      _favorites(_favoritesEditor, *_transitLines),
       _memoryPressure(options.runLoop),
-      _drawing(std::make_shared<LateDrawing>(languageTag(_locale))),
+      _drawing(std::make_shared<LateDrawing>(languageTag())),
       _platform(std::make_unique<Platform>(PlatformServices{.clock = _clock,
                                                             .mainRunLoop = options.runLoop,
                                                             .log = *_log,
@@ -96,10 +109,10 @@ DesktopPlatform::DesktopPlatform(Options options)
                                                             .compressor = _compressor,
                                                             .images = *_drawing,
                                                             .text = *_drawing,
-                                                            .shieldRenderer = _drawing})) {
-  _transitLines.setLanguage(languageTag(_locale));
-}
+                                                            .shieldRenderer = _drawing})) {}
 
 DesktopPlatform::~DesktopPlatform() = default;
+
+std::string DesktopPlatform::languageTag() const { return tagOfLocale(_locale); }
 
 }  // namespace nimbo

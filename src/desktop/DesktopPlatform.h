@@ -7,7 +7,6 @@
 #include "desktop/archive/Bzip2.h"
 #include "desktop/archive/CBORKeyedArchive.h"
 #include "desktop/drawing/LateDrawing.h"
-#include "desktop/gtfs/feeds/GTFSTransitLineService.h"
 #include "desktop/store/FavoritesEditor.h"
 #include "desktop/store/GuardedFavorites.h"
 #include "desktop/store/SQLiteAnalyticsPipeline.h"
@@ -22,6 +21,7 @@
 #include "desktop/system/SystemClock.h"
 #include "desktop/system/SystemLog.h"
 #include "platform/Platform.h"
+#include "platform/TransitLineService.h"
 #include "platform/VirtualTime.h"
 
 namespace nimbo {
@@ -35,6 +35,8 @@ class DesktopPlatform {
     /// BCP 47 tag or POSIX name; empty: the environment's.
     std::string locale;
     GLibRunLoop& runLoop;
+    /// Answers for lines; null in a program that looks none up, where lookups end in an error.
+    std::unique_ptr<TransitLineService> transitLines;
     /// The clock in place of the machine's, or null.
     VirtualTime* virtualTime = nullptr;
     ActivityLauncher& activityLauncher;
@@ -49,7 +51,8 @@ class DesktopPlatform {
 
   FavoritesEditor& favoritesEditor() { return _favoritesEditor; }
   SQLiteAnalyticsPipeline& analytics() { return _analytics; }
-  GTFSTransitLineService& transitLines() { return _transitLines; }
+  /// BCP 47.
+  std::string languageTag() const;
 
   /// The first language of LANGUAGE ("de_AT:fr") that has texts here, else its first; without it the locale of LC_ALL,
   /// LC_MESSAGES or LANG, in this order. "en" where none of these is set or it is "C" or "POSIX", whatever LANGUAGE
@@ -67,7 +70,7 @@ class DesktopPlatform {
   std::shared_ptr<StateDatabase> _database;
   SQLiteSharedSettings _sharedSettings;
   SQLiteAnalyticsPipeline _analytics;
-  GTFSTransitLineService _transitLines;
+  std::unique_ptr<TransitLineService> _transitLines;
   FavoritesEditor _favoritesEditor;
   GuardedFavorites _favorites;
   LinuxNetworkFailureDiagnosis _network;

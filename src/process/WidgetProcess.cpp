@@ -133,7 +133,7 @@ void WidgetProcess::makePlatform(const std::string& locale) {
                                                  notify(_connection, protocol::kLog,
                                                         {.level = "error", .category = category, .message = text});
                                                });
-  _platform = std::make_unique<DesktopPlatform>(
+  _platform = std::make_unique<WidgetPlatform>(
       DesktopPlatform::Options{.paths = _options.paths,
                                .locale = locale,
                                .runLoop = _runLoop,

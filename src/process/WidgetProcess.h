@@ -3,12 +3,12 @@
 #include <memory>
 #include <optional>
 
-#include "desktop/DesktopPlatform.h"
 #include "desktop/rpc/JSONRPCConnection.h"
 #include "desktop/system/Paths.h"
 #include "platform/VirtualTime.h"
 #include "process/FeedRequests.h"
 #include "process/RemoteHost.h"
+#include "process/WidgetPlatform.h"
 #include "protocol/Methods.h"
 #include "widget/NBTransitIncidentsViewController.h"
 
@@ -88,7 +88,7 @@ class WidgetProcess {
   GLibRunLoop _runLoop;
   JSONRPCConnection _connection;
   RemoteHost _host;
-  std::unique_ptr<DesktopPlatform> _platform;   // null until initialized, or asked for feeds
+  std::unique_ptr<WidgetPlatform> _platform;    // null until initialized, or asked for feeds
   std::unique_ptr<FeedRequests> _feedRequests;  // with the platform, on which it works
   std::shared_ptr<NBTransitIncidentsViewController> _controller;
   Stage _stage = Stage::created;

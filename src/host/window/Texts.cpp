@@ -4,6 +4,7 @@
 #include "desktop/gtfs/feeds/TransitLineServiceError.h"
 #include "desktop/store/FavoritesEditor.h"
 #include "desktop/store/StateDatabaseFile.h"
+#include "desktop/strings/ICUStringTables.h"
 #include "desktop/system/AtomicFile.h"
 #include "desktop/system/LatePart.h"
 #include "platform/Localization.h"
