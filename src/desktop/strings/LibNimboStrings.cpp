@@ -3,6 +3,7 @@
 #include <unicode/brkiter.h>
 #include <unicode/datefmt.h>
 #include <unicode/msgfmt.h>
+#include <unicode/normalizer2.h>
 #include <unicode/utext.h>
 
 #include <algorithm>
@@ -101,6 +102,36 @@ class ICUDateFormat final : public DateFormat {
   std::unique_ptr<icu::DateFormat> _format;
 };
 
+/// Latin letters whose stroke or missing dot Unicode does not take for an accent.
+std::u16string_view plainLetter(UChar32 letter) {
+  switch (letter) {
+    case u'æ':
+      return u"ae";
+    case u'đ':
+      return u"d";
+    case u'ħ':
+      return u"h";
+    case u'ı':
+      return u"i";
+    case u'ł':
+      return u"l";
+    case u'ø':
+      return u"o";
+    case u'œ':
+      return u"oe";
+    case u'ŧ':
+      return u"t";
+    default:
+      return {};
+  }
+}
+
+/// Marks of the lower classes make another letter of the one before them (Kana, Indic scripts).
+bool isAccent(UChar32 character) {
+  constexpr std::uint8_t kLeastClass = 10;
+  return u_getCombiningClass(character) >= kLeastClass && u_hasBinaryProperty(character, UCHAR_DIACRITIC);
+}
+
 class ICUStrings final : public StringsPart {
   std::unique_ptr<PatternFormat> makePatternFormat(const std::string& languageTag) override {
     return std::make_unique<ICUPatternFormat>(languageTag);
@@ -124,6 +155,28 @@ class ICUStrings final : public StringsPart {
     const auto wanted = static_cast<std::int32_t>(position);
     const std::int32_t found = clusters->isBoundary(wanted) ? wanted : clusters->preceding(wanted);
     return static_cast<std::size_t>(std::max(found, 0));
+  }
+  std::string searchKey(std::string_view text) override {
+    UErrorCode status = U_ZERO_ERROR;
+    const icu::Normalizer2* const fold = icu::Normalizer2::getNFKCCasefoldInstance(status);
+    const icu::Normalizer2* const apart = icu::Normalizer2::getNFDInstance(status);
+    const icu::Normalizer2* const together = icu::Normalizer2::getNFCInstance(status);
+    check(status);
+    const icu::StringPiece bytes(text.data(), static_cast<std::int32_t>(text.size()));
+    const icu::UnicodeString letters =
+        apart->normalize(fold->normalize(icu::UnicodeString::fromUTF8(bytes), status), status);
+    icu::UnicodeString kept;
+    for (std::int32_t at = 0; at < letters.length(); at = letters.moveIndex32(at, 1)) {
+      const UChar32 character = letters.char32At(at);
+      if (isAccent(character)) continue;
+      if (const std::u16string_view plain = plainLetter(character); !plain.empty())
+        kept.append(plain.data(), static_cast<std::int32_t>(plain.size()));
+      else
+        kept.append(character);
+    }
+    const icu::UnicodeString key = together->normalize(kept, status);
+    check(status);
+    return utf8(key);
   }
 };
 

@@ -29,7 +29,7 @@ class DateFormat {
   virtual std::string textOf(Date date, Place place) = 0;
 };
 
-/// What libnimbo-strings does, the part with ICU (system/LatePart.h). Main thread only, but for `clusterBoundary`.
+/// What libnimbo-strings does, the part with ICU (system/LatePart.h). Main thread only where nothing else is said.
 class StringsPart {
  public:
   virtual ~StringsPart() = default;
@@ -40,6 +40,9 @@ class StringsPart {
   /// The last boundary between grapheme clusters of a UTF-8 text at `position` or before it. Any thread. Throws
   /// std::runtime_error.
   virtual std::size_t clusterBoundary(std::string_view text, std::size_t position) = 0;
+  /// A UTF-8 text as searches compare it: without case and accents, letters of any script in one form ("Zürich" and
+  /// "ZURICH" alike). Bytes that are no UTF-8 become U+FFFD. Any thread. Throws std::runtime_error.
+  virtual std::string searchKey(std::string_view text) = 0;
 };
 
 /// Opens the part with the first call. Throws LatePartMissing.

@@ -207,6 +207,18 @@ TEST(StringTables, KeepNamesFromRightToLeftInOrder) {
     EXPECT_EQ(english.commaDelimitedList({text}), text);
 }
 
+TEST(SearchKey, IsOneForTextsThatARiderTakesForTheSame) {
+  const char* const alike[][2] = {{"Zürich", "ZURICH"},       {"ВИТОША", "витоша"}, {"Łódź", "lodz"},
+                                  {"Straße", "STRASSE"},      {"Αθήνα", "ΑΘΗΝΑ"},   {"İzmir", "izmir"},
+                                  {"København", "kobenhavn"}, {"ＪＲ線", "jr線"},   {"Hà Nội", "ha noi"},
+                                  {"مُحَمَّد", "محمد"},           {"e\u0301", "é"}};
+  for (const auto& [text, other] : alike)
+    EXPECT_EQ(stringsPart().searchKey(text), stringsPart().searchKey(other)) << text;
+  const char* const different[][2] = {{"か", "が"}, {"दिन", "दन"}, {"A", "B"}, {"U1", "U10"}};
+  for (const auto& [text, other] : different) EXPECT_NE(stringsPart().searchKey(text), stringsPart().searchKey(other));
+  EXPECT_EQ(stringsPart().searchKey("A\xFF"), "a\uFFFD");
+}
+
 TEST(StringTables, FallBackToTheLanguageAndThenToEnglish) {
   const std::map<std::string, std::vector<std::string>> locales{
       {"Keine Favoriten", {"de-AT", "de_CH.UTF-8", "de_DE@euro", "DE-Latn-AT"}},
