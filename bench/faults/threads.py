@@ -8,7 +8,8 @@ import json, os, subprocess, sys, time
 
 from city import LINES, City, entity, header, period, titled
 
-# Stands before the C library's own in the widget process, and lets the given number of threads start.
+# Stands before the C library's own in the widget process, and lets the given number of threads start, besides those of
+# GLib: Pango starts one for each font, and a program in which GLib cannot start one is ended by it.
 SOURCE = r"""
 #define _GNU_SOURCE
 #include <dlfcn.h>
@@ -18,8 +19,10 @@ SOURCE = r"""
 #include <string.h>
 int pthread_create(pthread_t* thread, const pthread_attr_t* attributes, void* (*run)(void*), void* argument) {
   static int started;
+  Dl_info caller;
   int (*real)(pthread_t*, const pthread_attr_t*, void* (*)(void*), void*) = dlsym(RTLD_NEXT, "pthread_create");
-  if (!strcmp(program_invocation_short_name, "nimbo-transit-widget") &&
+  int ours = !dladdr(__builtin_return_address(0), &caller) || !strstr(caller.dli_fname, "libglib");
+  if (ours && !strcmp(program_invocation_short_name, "nimbo-transit-widget") &&
       __atomic_add_fetch(&started, 1, __ATOMIC_RELAXED) > atoi(getenv("FAULT_THREADS")))
     return EAGAIN;
   return real(thread, attributes, run, argument);
