@@ -19,7 +19,7 @@ _nimbo_transit() {
   local command="" i
   for ((i = 1; i < cword; i++)); do
     case ${words[i]} in
-      --config | --state | --static | --alerts | --now | --virtual-time | --size | --scale | --text-size | --locale) ((i++)) ;;
+      --config | --state | --static | --alerts | --format | --now | --virtual-time | --size | --scale | --text-size | --locale) ((i++)) ;;
       -*) ;;
       *)
         case $command in
@@ -39,16 +39,17 @@ _nimbo_transit() {
         accessibilityExtraExtraExtraLarge" -- "$cur"))
       return
       ;;
+    --format) COMPREPLY=($(compgen -W "text json" -- "$cur")); return ;;
     --now | --virtual-time | --size | --scale | --locale) return ;;
   esac
 
   local options="--help --config --state" names=""
   case $command in
     "") options+=" --version" names="status update render script feed lines favorite settings analytics decode" ;;
-    status) options+=" --expanded --json --now --waybar --watch" ;;
+    status) options+=" --expanded --lines --planned --saved --json --format --exit-code --now --waybar --watch" ;;
     render) options+=" --expanded --size --scale --text-size --dark --locale --now" ;;
     script) options+=" --virtual-time" ;;
-    analytics) options+=" --json" ;;
+    analytics | lines | "feed list" | "favorite list") options+=" --json" ;;
     feed) names="add remove list check" ;;
     "feed add") options+=" --static --alerts --combined" ;;
     "feed remove" | "feed check") names=$(_nimbo_transit_names feed list | sed -n 's/^\([^ ]*\)$/\1/p') ;;

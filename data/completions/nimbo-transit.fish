@@ -71,6 +71,11 @@ for command in status render
     complete -c nimbo-transit -n "__nimbo_transit_at $command" -l expanded -d 'A row for each incident'
     complete -c nimbo-transit -n "__nimbo_transit_at $command" -l now -x -d 'Judge by this ISO date'
 end
+complete -c nimbo-transit -n '__nimbo_transit_at status' -l lines -d 'Each favorite line with its state'
+complete -c nimbo-transit -n '__nimbo_transit_at status' -l planned -d 'What is to come within seven days'
+complete -c nimbo-transit -n '__nimbo_transit_at status' -l saved -d 'The rows of the last time, without a fetch'
+complete -c nimbo-transit -n '__nimbo_transit_at status' -l format -x -a 'text json' -d 'Form of what is printed'
+complete -c nimbo-transit -n '__nimbo_transit_at status' -l exit-code -d 'The exit status tells the state'
 complete -c nimbo-transit -n '__nimbo_transit_at status' -l json -d 'The snapshot as JSON'
 complete -c nimbo-transit -n '__nimbo_transit_at status' -l waybar -d 'A line for a status bar'
 complete -c nimbo-transit -n '__nimbo_transit_at status' -l watch -d 'Go on printing lines'
@@ -85,6 +90,9 @@ complete -c nimbo-transit -n '__nimbo_transit_at script' -F
 complete -c nimbo-transit -n '__nimbo_transit_at script' -l virtual-time -x -d 'Time stands still at this ISO date'
 complete -c nimbo-transit -n '__nimbo_transit_at decode' -F
 complete -c nimbo-transit -n '__nimbo_transit_at analytics' -l json -d 'One JSON object a line'
+for command in lines 'feed list' 'favorite list'
+    complete -c nimbo-transit -n "__nimbo_transit_at $command" -l json -d 'As JSON'
+end
 
 complete -c nimbo-transit -n '__nimbo_transit_at feed' -a 'add remove list check'
 complete -c nimbo-transit -n '__nimbo_transit_at feed add' -l static -r -F -d 'GTFS: folder, zip file or address'

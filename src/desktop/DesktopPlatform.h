@@ -53,6 +53,7 @@ class DesktopPlatform {
   SQLiteAnalyticsPipeline& analytics() { return _analytics; }
   /// BCP 47.
   std::string languageTag() const;
+  SQLiteSharedSettings& sharedSettings() { return _sharedSettings; }
 
   /// The first language of LANGUAGE ("de_AT:fr") that has texts here, else its first; without it the locale of LC_ALL,
   /// LC_MESSAGES or LANG, in this order. "en" where none of these is set or it is "C" or "POSIX", whatever LANGUAGE

@@ -47,7 +47,7 @@ int runFavoriteAdd(const CommandContext& context, const std::vector<std::string>
 int runFavoriteRemove(const CommandContext& context, const std::vector<std::string>& lines);
 /// `position` counts from 1.
 int runFavoriteMove(const CommandContext& context, const std::string& line, int position);
-int runFavoriteList(const CommandContext& context);
+int runFavoriteList(const CommandContext& context, bool json);
 
 struct FeedOptions {
   std::string name;
@@ -60,15 +60,15 @@ struct FeedOptions {
 /// feed's.
 int runFeedAdd(const CommandContext& context, const FeedOptions& options);
 int runFeedRemove(const CommandContext& context, const std::string& name);
-int runFeedList(const CommandContext& context);
+int runFeedList(const CommandContext& context, bool json);
 /// Reads a feed, or with an empty name every one, and prints what it holds. Fails when one cannot be read.
 int runFeedCheck(const CommandContext& context, const std::string& name);
 
 /// Prints the lines of all feeds that contain `text`, one a line, as FEED:ROUTE_ID, names and agency.
-int runLines(const CommandContext& context, const std::string& text);
+int runLines(const CommandContext& context, const std::string& text, bool json);
 
-/// Prints a line each.
-void printLines(const std::vector<TransitLineRef>& lines);
+/// Prints a line each, or an array as docs/formats.md has it.
+void printLines(const std::vector<TransitLineRef>& lines, bool json);
 
 /// Prints a setting: "true", "false", the text (as it is but to a terminal), or the bytes as base64. Fails when it is
 /// not set.
@@ -87,10 +87,16 @@ int runDecode(const CommandContext& context, const std::string& file);
 struct StatusOptions {
   bool expanded = false;
   bool json = false;               ///< the snapshot of docs/protocol.md instead of text
+  bool lines = false;              ///< each favourite line with its state, instead of the rows
+  bool planned = false;            ///< what is to come within seven days, instead of the rows
+  bool saved = false;              ///< the rows of the last time, without a fetch
+  bool exitCode = false;           ///< the exit status tells the state
+  std::string format = "text";     ///< "json": the state of each favourite line as docs/formats.md has it
   std::optional<std::string> now;  ///< ISO date by which incidents are judged
 };
 
-/// Prints how the favourite lines run. Fails, after printing the error row, when the update failed.
+/// Prints how the favourite lines run. Fails, after printing the error row, when the update failed; with `exitCode`
+/// the status tells the state then too.
 int runStatus(const CommandContext& context, const StatusOptions& options);
 
 /// Fetches and saves the rows for the next start of the widget. A failed fetch fails, and leaves the rows of the last

@@ -79,12 +79,12 @@ int runFavoriteMove(const CommandContext& context, const std::string& name, int 
   return kExitSuccess;
 }
 
-int runFavoriteList(const CommandContext& context) {
+int runFavoriteList(const CommandContext& context, bool json) {
   HostPlatform platform(context);
   const auto lines = favoriteLines(platform);
-  printLines(lines);
+  printLines(lines, json);
   require(platform->favoritesEditor().list().error());
-  if (lines.empty()) std::cout << "No favorite lines. Add some with \"favorite add FEED:ROUTE_ID\".\n";
+  if (lines.empty() && !json) std::cout << "No favorite lines. Add some with \"favorite add FEED:ROUTE_ID\".\n";
   tellGoneLines(context, lines);
   return kExitSuccess;
 }

@@ -1,5 +1,6 @@
 #include <algorithm>
 #include <iostream>
+#include <nlohmann/json.hpp>
 #include <vector>
 
 #include "desktop/gtfs/feeds/FeedCache.h"
@@ -57,20 +58,37 @@ bool printCheck(const protocol::FeedReport& report) {
   return faults.empty();
 }
 
-/// The parts of a line as columns: how it is written, its shield's text, its name, its agency.
-std::vector<std::string> columnsOfLine(const TransitLine& line) {
+/// The parts of a line: how it is written, its shield's text, its name, its agency.
+std::vector<std::string> partsOfLine(const TransitLine& line) {
   const auto& locator = line.identifier()->locator();
   const auto& artwork = line.artwork();
-  const std::string shortName = locator ? locator->shortName : "";
   const std::string fullName =
       artwork && artwork->accessibilityText() ? *artwork->accessibilityText() : line.name().value_or("");
-  return {printableText(writtenNameOfLine(*line.identifier())), printableText(shortName), printableText(fullName),
-          printableText(line.system() ? line.system()->name().value_or("") : "")};
+  return {writtenNameOfLine(*line.identifier()), locator ? locator->shortName : "", fullName,
+          line.system() ? line.system()->name().value_or("") : ""};
+}
+
+std::vector<std::string> columnsOfLine(const TransitLine& line) {
+  std::vector<std::string> columns = partsOfLine(line);
+  for (std::string& column : columns) column = printableText(column);
+  return columns;
+}
+
+nlohmann::json jsonOfLine(const TransitLine& line) {
+  const std::vector<std::string> parts = partsOfLine(line);
+  return {{"id", parts[0]}, {"shortName", parts[1]}, {"name", parts[2]}, {"agency", parts[3]}};
 }
 
 }  // namespace
 
-void printLines(const std::vector<TransitLineRef>& lines) {
+void printLines(const std::vector<TransitLineRef>& lines, bool asJSON) {
+  if (asJSON) {
+    auto array = nlohmann::json::array();
+    for (const TransitLineRef& line : lines) array.push_back(jsonOfLine(*line));
+    std::cout << printableJSON(array.dump(2, ' ', false, nlohmann::json::error_handler_t::replace)) << "\n";
+    return;
+  }
+
   std::vector<std::vector<std::string>> table;
   std::vector<int> widths(4);
   for (const TransitLineRef& line : lines) {
@@ -114,9 +132,19 @@ int runFeedRemove(const CommandContext& context, const std::string& name) {
   return kExitSuccess;
 }
 
-int runFeedList(const CommandContext& context) {
+int runFeedList(const CommandContext& context, bool json) {
   const HostPlatform platform(context);
   const auto feeds = require(FeedConfiguration(context.paths.config).feeds());
+  if (json) {
+    auto array = nlohmann::json::array();
+    for (const Feed& feed : feeds)
+      array.push_back({{"name", feed.name},
+                       {"static", feed.staticFeed.publicText()},
+                       {"alerts", feed.alerts.publicText()},
+                       {"combined", feed.isCombined}});
+    std::cout << printableJSON(array.dump(2, ' ', false, nlohmann::json::error_handler_t::replace)) << "\n";
+    return kExitSuccess;
+  }
   for (const Feed& feed : feeds)
     std::cout << printableText(feed.name) << "\n  static: " << printableText(feed.staticFeed.publicText())
               << "\n  alerts: " << printableText(feed.alerts.publicText()) << "\n";
@@ -137,7 +165,7 @@ int runFeedCheck(const CommandContext& context, const std::string& name) {
   return kExitSuccess;
 }
 
-int runLines(const CommandContext& context, const std::string& text) {
+int runLines(const CommandContext& context, const std::string& text, bool json) {
   WidgetWithProgress widget(context);
   std::vector<TransitLineRef> lines;
   protocol::FoundLines page;
@@ -145,7 +173,7 @@ int runLines(const CommandContext& context, const std::string& text) {
     page = widget.call(protocol::kFindLines, {.query = text, .offset = lines.size()});
     for (const protocol::FeedLine& line : page.lines) lines.push_back(lineOf(line));
   } while (!page.lines.empty() && lines.size() < page.total);
-  printLines(lines);
+  printLines(lines, json);
   for (const protocol::FetchError& failure : page.failures) printMessage(failure.reason);
   if (!page.failures.empty()) return kExitFailure;
   if (lines.empty()) throw CommandFailure("no line contains \"" + text + "\"");

@@ -40,9 +40,15 @@ protocol::InitializeParams initializationOf(const WidgetPresentation& presentati
                                      .kind = std::string(protocol::Bundle::kApplication), .identifier = application})}};
 }
 
-std::optional<std::string> failureOfUpdate(const protocol::UpdateResult& answer) {
-  if (answer.updateResult != WidgetUpdateResult::Failed) return std::nullopt;
-  return answer.reason.value_or("the update failed");
+std::optional<std::string> failureOfUpdate(WidgetClient& client) {
+  while (true) {
+    const protocol::UpdateResult answer = client.call(protocol::kPerformUpdate);
+    if (answer.updateResult != WidgetUpdateResult::Failed) return std::nullopt;
+    const std::string reason = answer.reason.value_or("the update failed");
+    // The download has a limit of its own.
+    if (!answer.isDownloading) return reason;
+    printMessage(reason);
+  }
 }
 
 OnScreenWidget::OnScreenWidget(const CommandContext& context, const WidgetPresentation& presentation,
@@ -54,7 +60,7 @@ OnScreenWidget::OnScreenWidget(const CommandContext& context, const WidgetPresen
     _client.call(step);
 }
 
-std::optional<std::string> OnScreenWidget::update() { return failureOfUpdate(_client.call(protocol::kPerformUpdate)); }
+std::optional<std::string> OnScreenWidget::update() { return failureOfUpdate(_client); }
 
 void OnScreenWidget::expand() {
   if (_client.call(protocol::kSnapshot).largestAvailableDisplayMode == WidgetDisplayMode::Expanded)
@@ -62,8 +68,8 @@ void OnScreenWidget::expand() {
 }
 
 void OnScreenWidget::close() {
-  for (const auto& step : {protocol::kViewWillDisappear, protocol::kViewDidDisappear, protocol::kShutdown})
-    _client.call(step);
+  _client.call(protocol::kViewWillDisappear);
+  for (const auto& step : {protocol::kViewDidDisappear, protocol::kShutdown}) _client.call(step);
 }
 
 }  // namespace nimbo

@@ -34,8 +34,9 @@ protocol::DisplayModes displayModesOf(const WidgetPresentation& presentation);
 /// What presents the widget so, in the compact mode.
 protocol::InitializeParams initializationOf(const WidgetPresentation& presentation);
 
-/// Why an update failed; absent when it did not.
-std::optional<std::string> failureOfUpdate(const protocol::UpdateResult& answer);
+/// Has the widget fetch, again while a static feed that has never been here is still coming. Absent when it succeeded,
+/// else why it failed.
+std::optional<std::string> failureOfUpdate(WidgetClient& client);
 
 /// A widget process that is on the screen as long as this lives: it appears on construction, disappears, and so saves
 /// its rows, on `close`. Operations throw WidgetClientFailure.
@@ -45,10 +46,12 @@ class OnScreenWidget {
   OnScreenWidget(const CommandContext& context, const WidgetPresentation& presentation,
                  const PictureMemory* pictures = nullptr);
 
-  /// Waits for the fetch that runs. Absent when it succeeded, else why it failed.
+  /// Waits for the fetch that runs; also for a static feed that has never been here, since a process that ends throws
+  /// away what has come of it. Absent when it succeeded, else why it failed.
   std::optional<std::string> update();
   /// Switches to the expanded mode where the widget offers it; else the compact row says it all.
   void expand();
+  protocol::Lines lines() { return _client.call(protocol::kLines); }
   protocol::Snapshot snapshot() { return _client.call(protocol::kSnapshot); }
   protocol::Rendered render() { return _client.call(protocol::kRender); }
   void close();

@@ -5,10 +5,12 @@
 
 #include <algorithm>
 #include <csignal>
+#include <ctime>
 #include <iostream>
 #include <nlohmann/json.hpp>
 #include <vector>
 
+#include "host/LineStatus.h"
 #include "host/OnScreenWidget.h"
 #include "host/StatusWatch.h"
 #include "host/TerminalText.h"
@@ -79,6 +81,9 @@ std::string tooltipOf(const protocol::Snapshot& snapshot) {
   if (snapshot.error) addLine(markupText(snapshot.error->reason));
   for (const auto& [line, title] : snapshot.knownIncidents)
     addLine(markupText(line).append(": ").append(markupText(title)));
+  if (snapshot.updated && !snapshot.error)
+    addLine("<i>" + updatedText(*snapshot.updated, dateFromUnixTime(static_cast<TimeInterval>(std::time(nullptr)))) +
+            "</i>");
   for (const std::string& line : snapshot.goneLines) addLine("<i>" + markupText(goneLineText(line)) + "</i>");
   return tooltip;
 }

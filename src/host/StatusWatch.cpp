@@ -15,7 +15,8 @@ StatusWatch::~StatusWatch() {
   for (auto* timer : {&_restart, &_update}) cancel(*timer);
   if (!_widget) return;
   // The process does what it was asked before it finds its input closed.
-  for (const auto& step : {protocol::kViewWillDisappear, protocol::kViewDidDisappear}) _widget->ask(step);
+  _widget->ask(protocol::kViewWillDisappear);
+  _widget->ask(protocol::kViewDidDisappear);
 }
 
 void StatusWatch::cancel(std::shared_ptr<Timer>& timer) {
@@ -31,7 +32,8 @@ void StatusWatch::start() {
     return restartAfter(failure.what());
   }
   WidgetClient& client = _widget->client();
-  client.connection().setHandler(protocol::kFrame.name, [this](const json&, const JSONRPCResponder&) { look(); });
+  for (const char* heard : {protocol::kFrame.name, protocol::kUpdated.name})
+    client.connection().setHandler(heard, [this](const json&, const JSONRPCResponder&) { look(); });
   client.setNoticeHandler(_context.tell);
   _widget->ask(protocol::kInitialize, initializationOf(_presentation));
   for (const auto& step : {protocol::kLoadView, protocol::kViewWillAppear, protocol::kViewDidAppear})

@@ -6,6 +6,8 @@
 #include <algorithm>
 #include <cmath>
 #include <cstdlib>
+#include <map>
+#include <set>
 #include <vector>
 
 #include "host/TerminalText.h"
@@ -50,18 +52,46 @@ std::string imageText(const std::string& name) {
   return "•";
 }
 
-std::string artworkText(const protocol::TransitItem& item, const TerminalStyle& style) {
+/// Full names of lines by their short ones, as far as they are shown.
+using NamesOfShields = std::map<std::string, std::set<std::string>>;
+
+void addName(const protocol::Shield& shield, NamesOfShields& names) {
+  if (shield.text) names[*shield.text].insert(shield.accessibilityText.value_or(""));
+}
+
+NamesOfShields namesOfShields(const protocol::Snapshot& snapshot) {
+  NamesOfShields names;
+  for (const protocol::Row& row : snapshot.rows) {
+    if (!row.item) continue;
+    if (const auto* summary = std::get_if<protocol::SummaryItem>(&*row.item))
+      for (const protocol::Shield& shield : summary->artworks) addName(shield, names);
+    else if (const auto& artwork = std::get<protocol::TransitItem>(*row.item).artwork; artwork && artwork->shield)
+      addName(*artwork->shield, names);
+  }
+  return names;
+}
+
+/// The shield, with the line's full name in it where another line has the same short one.
+protocol::Shield toldApart(protocol::Shield shield, const NamesOfShields& names) {
+  const auto found = shield.text ? names.find(*shield.text) : names.end();
+  if (found != names.end() && found->second.size() > 1 && shield.accessibilityText)
+    shield.text = shield.accessibilityText;
+  return shield;
+}
+
+std::string artworkText(const protocol::TransitItem& item, const NamesOfShields& names, const TerminalStyle& style) {
   const auto& artwork = item.artwork;
   if (!artwork || item.artworkHidden) return {};
   const bool dimmed = artwork->alpha < 1;
   if (artwork->image) return styled(imageText(textOf(artwork->image)), dimmed ? kFaint : kBold, style);
-  return artwork->shield ? shieldText(*artwork->shield, dimmed, style) : std::string();
+  return artwork->shield ? shieldText(toldApart(*artwork->shield, names), dimmed, style) : std::string();
 }
 
-std::string shieldsText(const std::vector<protocol::Shield>& shields, const TerminalStyle& style) {
+std::string shieldsText(const std::vector<protocol::Shield>& shields, const NamesOfShields& names,
+                        const TerminalStyle& style) {
   std::string text;
   for (const protocol::Shield& shield : shields) {
-    const std::string one = shieldText(shield, false, style);
+    const std::string one = shieldText(toldApart(shield, names), false, style);
     if (!one.empty()) text += (text.empty() ? "" : " ") + one;
   }
   return text;
@@ -83,16 +113,31 @@ std::string titleText(const std::string& title, const std::string& artwork, cons
   return text;
 }
 
-std::string textOfItem(const protocol::TransitItem& item, const TerminalStyle& style) {
-  std::string text = titleText(textOf(item.primaryText), artworkText(item, style), style);
-  for (const std::string& line : foldedText(textOf(item.secondaryText), style.columns - kIndent))
-    text += std::string(kIndent, ' ') + line + "\n";
-  return text;
+std::string indented(const std::string& text, const TerminalStyle& style) {
+  std::string lines;
+  for (const std::string& line : foldedText(text, style.columns - kIndent))
+    lines += std::string(kIndent, ' ') + line + "\n";
+  return lines;
 }
 
-std::string textOfItem(const protocol::SummaryItem& item, const TerminalStyle& style) {
+/// What rows need to know besides their items.
+struct RowContext {
+  const TerminalStyle& style;
+  const NamesOfShields& names;
+  const std::function<std::string(const std::string& title)>& timeOf;
+};
+
+std::string textOfItem(const protocol::TransitItem& item, const RowContext& context) {
+  const auto& [style, names, timeOf] = context;
+  std::string text = titleText(textOf(item.primaryText), artworkText(item, names, style), style);
+  text += indented(textOf(item.secondaryText), style);
+  return timeOf ? text + indented(timeOf(item.primaryText.value_or("")), style) : text;
+}
+
+std::string textOfItem(const protocol::SummaryItem& item, const RowContext& context) {
+  const auto& [style, names, timeOf] = context;
   const std::string text = titleText(textOf(item.primaryText), "", style);
-  const std::string shields = shieldsText(item.artworks, style);
+  const std::string shields = shieldsText(item.artworks, names, style);
   return shields.empty() ? text : text + std::string(kIndent, ' ') + shields + "\n";
 }
 
@@ -113,15 +158,20 @@ TerminalStyle TerminalStyle::ofStandardOutput() {
   return style;
 }
 
-std::string rowsAsText(const protocol::Snapshot& snapshot, const TerminalStyle& style) {
+std::string shieldAsText(const protocol::Shield& shield, const TerminalStyle& style) {
+  return shieldText(shield, false, style);
+}
+
+std::string rowsAsText(const protocol::Snapshot& snapshot, const TerminalStyle& style,
+                       const std::function<std::string(const std::string& title)>& timeOf) {
   std::string text;
+  const NamesOfShields names = namesOfShields(snapshot);
+  const RowContext context{style, names, timeOf};
   for (const protocol::Row& row : snapshot.rows)
-    if (row.item) text += std::visit([&](const auto& item) { return textOfItem(item, style); }, *row.item);
+    if (row.item) text += std::visit([&](const auto& item) { return textOfItem(item, context); }, *row.item);
   if (!snapshot.goneLines.empty()) {
     text += titleText(goneLinesTitle(snapshot.goneLines), styled("⚠", kBold, style), style);
-    for (const std::string& line : snapshot.goneLines)
-      for (const std::string& part : foldedText(printableText(line), style.columns - kIndent))
-        text += std::string(kIndent, ' ') + part + "\n";
+    for (const std::string& line : snapshot.goneLines) text += indented(printableText(line), style);
   }
   return text;
 }

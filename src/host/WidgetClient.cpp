@@ -88,8 +88,9 @@ WidgetClient::WidgetClient(GLibRunLoop& runLoop, const std::vector<std::string>&
   _connection->setClosedHandler([this] { _running = false; });
   handleOpening(protocol::kOpenURL);
   handleOpening(protocol::kOpenUserActivity);
-  for (const char* heard : {protocol::kPreferredContentSizeDidChange.name,
-                            protocol::kLargestAvailableDisplayModeDidChange.name, protocol::kLog.name})
+  for (const char* heard :
+       {protocol::kPreferredContentSizeDidChange.name, protocol::kLargestAvailableDisplayModeDidChange.name,
+        protocol::kUpdated.name, protocol::kLog.name})
     _connection->setHandler(heard, [](const json&, const JSONRPCResponder&) {});
   _connection->setHandler(protocol::kNotice.name, [this](const json& params, const JSONRPCResponder&) {
     const std::string message = protocol::read<protocol::NoticeParams>(params).message;

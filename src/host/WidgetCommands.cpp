@@ -3,9 +3,12 @@
 #include <cstring>
 #include <fstream>
 #include <iostream>
+#include <set>
 
 #include "desktop/drawing/DrawingPart.h"
 #include "host/Commands.h"
+#include "host/HostPlatform.h"
+#include "host/LineStatus.h"
 #include "host/OnScreenWidget.h"
 #include "host/ScriptPlayer.h"
 #include "host/TerminalRows.h"
@@ -30,22 +33,108 @@ std::string knownIncidentsText(const protocol::Snapshot& snapshot) {
 
 }  // namespace
 
-int runStatus(const CommandContext& context, const StatusOptions& options) {
+namespace {
+
+Date nowOf(const StatusOptions& options) {
+  const auto date = options.now ? dateFromISOText(*options.now) : std::nullopt;
+  return date.value_or(std::chrono::time_point_cast<Date::duration>(std::chrono::system_clock::now()));
+}
+
+/// The time of the incidents in force that have this title; empty where they differ in it, or none has.
+std::string timeOfIncident(const std::string& title, const protocol::Lines& lines, Date now) {
+  std::set<std::string> times;
+  for (const protocol::LineReport& line : lines.lines)
+    for (const protocol::LineIncident& incident : line.incidents)
+      if (incident.title == title) times.insert(periodText(incident.from, incident.until, now));
+  return times.size() == 1 ? *times.begin() : std::string();
+}
+
+void printRows(const protocol::Snapshot& snapshot, const StatusOptions& options, const protocol::Lines& lines) {
+  if (options.json) {
+    std::cout << printableJSON(protocol::write(snapshot).dump(2)) << "\n";
+    return;
+  }
+  const Date now = nowOf(options);
+  std::function<std::string(const std::string&)> timeOf;
+  if (options.expanded) timeOf = [&](const std::string& title) { return timeOfIncident(title, lines, now); };
+  std::cout << rowsAsText(snapshot, TerminalStyle::ofStandardOutput(), timeOf) << knownIncidentsText(snapshot);
+  if (snapshot.updated) std::cout << updatedText(*snapshot.updated, now) << "\n";
+}
+
+/// Room for all rows that there may be.
+WidgetPresentation presentationForStatus(const StatusOptions& options) {
+  constexpr int kMostRows = 900;  // a length has a limit in the protocol
   WidgetPresentation presentation;
+  presentation.expandedHeight = kMostRows * presentation.compactHeight;
   presentation.virtualTime = options.now;
-  OnScreenWidget widget(context, presentation);
+  return presentation;
+}
+
+/// The rows of the last time.
+int runSavedStatus(const CommandContext& context, const StatusOptions& options) {
+  if (!HostPlatform(context)->sharedSettings().groupStore()->valueForKey("Nimbo.TransitWidget.savedUIData"))
+    throw CommandFailure("no rows are kept yet. \"status\" and \"update\" keep them.");
+  std::vector<std::string> arguments = context.widgetArguments;
+  if (options.now) arguments.insert(arguments.end(), {"--virtual-time", *options.now});
+  WidgetClient client(context.runLoop, arguments);
+  client.setNoticeHandler(context.tell);
+  protocol::InitializeParams initialization = initializationOf(presentationForStatus(options));
+  if (options.expanded) initialization.activeDisplayMode = WidgetDisplayMode::Expanded;
+  client.call(protocol::kInitialize, initialization);
+  client.call(protocol::kLoadView);
+  const protocol::Snapshot snapshot = client.call(protocol::kSnapshot);
+  printRows(snapshot, options, {});
+  return kExitSuccess;
+}
+
+}  // namespace
+
+int runStatus(const CommandContext& context, const StatusOptions& options) {
+  if (options.saved) return runSavedStatus(context, options);
+  OnScreenWidget widget(context, presentationForStatus(options));
   const std::optional<std::string> failure = widget.update();
   if (options.expanded) widget.expand();
   const protocol::Snapshot snapshot = widget.snapshot();
-  if (options.json)
-    std::cout << printableJSON(protocol::write(snapshot).dump(2)) << "\n";
+  const protocol::Lines lines = widget.lines();
+  const TerminalStyle style = TerminalStyle::ofStandardOutput();
+  if (options.format == "json")
+    std::cout << printableJSON(statusAsJSON(lines).dump(2)) << "\n";
+  else if (options.lines)
+    std::cout << linesAsText(lines, nowOf(options), style);
+  else if (options.planned)
+    std::cout << plannedAsText(lines, style);
   else
-    std::cout << rowsAsText(snapshot, TerminalStyle::ofStandardOutput()) << knownIncidentsText(snapshot);
+    printRows(snapshot, options, lines);
   widget.close();
   tellGoneLines(snapshot);
+  if (options.exitCode) {
+    if (failure) printMessage(*failure);
+    return exitCodeOfState(overallState(lines));
+  }
   if (failure) throw CommandFailure(*failure);
   return kExitSuccess;
 }
+
+namespace {
+
+/// Waits until no static feed is being downloaded any more, which ends with the process, and says so.
+void waitForDownloads(WidgetClient& client, GLibRunLoop& runLoop) {
+  constexpr TimeInterval kLook = 0.2;
+  constexpr int kLooks = 660 * 5;  // a minute more than a download takes at most
+  bool isSaid = false;
+  for (int i = 0; i < kLooks; ++i) {
+    const protocol::Downloads under = client.call(protocol::kDownloads);
+    if (under.downloads.empty()) return;
+    if (!std::exchange(isSaid, true))
+      printMessage("waiting for the static feed of \"" + under.downloads.front().feed + "\"");
+    bool isOver = false;
+    const auto timer = runLoop.scheduleTimer(kLook, false, [&isOver](Timer&) { isOver = true; });
+    client.waitUntil([&isOver] { return isOver; });
+  }
+  throw CommandFailure("a static feed is still being downloaded, and will be asked for again");
+}
+
+}  // namespace
 
 int runUpdate(const CommandContext& context) {
   WidgetClient client(context.runLoop, context.widgetArguments);
@@ -55,9 +144,12 @@ int runUpdate(const CommandContext& context) {
   client.call(protocol::kInitialize);
   for (const auto& step : {protocol::kLoadView, protocol::kViewWillAppear}) client.call(step);
   // The rows of the last time stay when there are no newer ones.
-  if (const auto failure = failureOfUpdate(client.call(protocol::kPerformUpdate))) throw CommandFailure(*failure);
-  for (const auto& step : {protocol::kViewWillDisappear, protocol::kViewDidDisappear, protocol::kShutdown})
-    client.call(step);
+  if (const auto failure = failureOfUpdate(client)) throw CommandFailure(*failure);
+  if (const auto failure = client.call(protocol::kViewWillDisappear).failure)
+    throw CommandFailure("the rows cannot be kept: " + *failure);
+  client.call(protocol::kViewDidDisappear);
+  waitForDownloads(client, context.runLoop);
+  client.call(protocol::kShutdown);
   return kExitSuccess;
 }
 

@@ -82,7 +82,23 @@ void CommandLine::addWidgetCommands() {
   CLI::Option* now =
       status->add_option("--now", _status.now, "ISO date by which incidents are judged")->check(checkDate);
   CLI::Option* waybar = status->add_flag("--waybar", _waybar, "One line of JSON for a status bar");
-  waybar->excludes(expanded)->excludes(json);
+  CLI::Option* lines = status->add_flag("--lines", _status.lines, "Each favorite line with its state");
+  CLI::Option* planned =
+      status->add_flag("--planned", _status.planned, "What is to come within seven days, by line and day");
+  CLI::Option* saved =
+      status->add_flag("--saved", _status.saved, "The rows of the last time with their date, without a fetch");
+  CLI::Option* format = status->add_option("--format", _status.format, "text, or json: the state of each favorite line")
+                            ->check(CLI::IsMember({"text", "json"}));
+  CLI::Option* exitCode = status->add_flag("--exit-code", _status.exitCode,
+                                           "Exit with 0 for good service, 3 affected, 4 unknown, 5 no favorites");
+  for (CLI::Option* other : {expanded, json, lines, planned, saved, format, exitCode}) waybar->excludes(other);
+  for (CLI::Option* other : {expanded, json, lines, planned, saved}) format->excludes(other);
+  lines->excludes(planned);
+  for (CLI::Option* other : {expanded, json, saved}) {
+    lines->excludes(other);
+    planned->excludes(other);
+  }
+  saved->excludes(exitCode);
   status->add_flag("--watch", _watch, "Go on printing a line whenever it changes")->needs(waybar)->excludes(now);
 
   add(_app, "update", "Fetch, and keep the rows for the widget's next start",
@@ -128,13 +144,16 @@ void CommandLine::addFeedCommands() {
   CLI::App* remove = add(*feed, "remove", "Forget a feed",
                          [this](const CommandContext& context) { return runFeedRemove(context, _feed.name); });
   remove->add_option("NAME", _feed.name, "Name of the feed")->required();
-  add(*feed, "list", "List the feeds", [](const CommandContext& context) { return runFeedList(context); });
+  add(*feed, "list", "List the feeds", [this](const CommandContext& context) {
+    return runFeedList(context, _json);
+  })->add_flag("--json", _json, "As JSON");
   CLI::App* check = add(*feed, "check", "Read feeds and count what they hold, and what fits nothing",
                         [this](const CommandContext& context) { return runFeedCheck(context, _feed.name); });
   check->add_option("NAME", _feed.name, "Name of the feed; all without one");
 
   CLI::App* lines = add(_app, "lines", "List the lines of all feeds",
-                        [this](const CommandContext& context) { return runLines(context, _text); });
+                        [this](const CommandContext& context) { return runLines(context, _text, _json); });
+  lines->add_flag("--json", _json, "As JSON");
   lines->add_option("TEXT", _text, "Only lines whose name, agency or identifier contains this");
 }
 
@@ -151,8 +170,9 @@ void CommandLine::addFavoriteCommands() {
   });
   move->add_option("FEED:ROUTE_ID", _text, "A line as \"favorite list\" prints it")->required();
   move->add_option("POSITION", _value, "1 is the first")->required()->check(checkPosition);
-  add(*favorite, "list", "List the favorite lines in their order",
-      [](const CommandContext& context) { return runFavoriteList(context); });
+  add(*favorite, "list", "List the favorite lines in their order", [this](const CommandContext& context) {
+    return runFavoriteList(context, _json);
+  })->add_flag("--json", _json, "As JSON");
 }
 
 void CommandLine::addStateCommands() {

@@ -4,12 +4,14 @@
 #include <utility>
 
 #include "desktop/drawing/DrawingPart.h"
+#include "desktop/gtfs/feeds/TransitLineServiceError.h"
 #include "desktop/gtfs/static/LineItems.h"
 #include "desktop/rpc/Base64.h"
 #include "platform/foundation/Version.h"
 #include "platform/ui/Color.h"
 #include "process/HandoffDecoder.h"
 #include "process/HostLogSink.h"
+#include "process/LineReports.h"
 #include "process/PictureOutput.h"
 #include "process/Snapshot.h"
 #include "protocol/Coding.h"
@@ -21,6 +23,14 @@ using nlohmann::json;
 namespace {
 
 constexpr int kProtocolVersion = 1;
+
+/// Setting: when the fetch ended that the saved rows are of.
+constexpr std::string_view kSavedRowsDateKey = "Nimbo.TransitWidget.savedUIDate";
+
+bool isDownloading(const Error& error) {
+  return error.domain() == kTransitLineServiceErrorDomain &&
+         error.code() == static_cast<std::int64_t>(TransitLineServiceError::downloading);
+}
 
 /// Room at both sides of the rows, in points.
 constexpr Insets kLayoutMargins{0, 16, 0, 16};
@@ -60,6 +70,8 @@ WidgetProcess::WidgetProcess(Options options, int input, int output)
   addFeedMethod(protocol::kDescribeLines, &FeedRequests::describeLines);
   addFeedMethod(protocol::kCheckFeed, &FeedRequests::checkFeed);
   addMethod(protocol::kCancel, &WidgetProcess::cancel);
+  addMethod(protocol::kLines, &WidgetProcess::lines);
+  addMethod(protocol::kDownloads, &WidgetProcess::downloads);
   addViewMethod(protocol::kViewWillAppear, &WidgetProcess::viewWillAppear);
   addViewMethod(protocol::kViewDidAppear, &WidgetProcess::viewDidAppear);
   addViewMethod(protocol::kViewWillDisappear, &WidgetProcess::viewWillDisappear);
@@ -150,6 +162,8 @@ protocol::Initialized WidgetProcess::initialize(const protocol::InitializeParams
   _feedRequests.reset();
   _platform.reset();
   makePlatform(params.locale.value_or(""));
+  // When the lines were looked up is told, also where they run as before.
+  _platform->transitLines().setAnswerObserver([this] { notify(_connection, protocol::kUpdated, {}); });
   Environment& environment = Environment::current();
   environment.setContentSizeCategory(params.textSize);
   environment.setScreenScale(params.scale);
@@ -195,11 +209,22 @@ protocol::Nothing WidgetProcess::viewDidAppear(const Nothing&) {
   return {};
 }
 
-protocol::Nothing WidgetProcess::viewWillDisappear(const Nothing&) {
+protocol::Kept WidgetProcess::viewWillDisappear(const Nothing&) {
   requireStage({Stage::appearing, Stage::visible}, protocol::kViewWillDisappear.name);
   _stage = Stage::disappearing;
   _controller->viewWillDisappear(false);
+  SQLiteSharedSettings& settings = _platform->sharedSettings();
+  if (const ErrorRef failure = settings.lastFailure()) return {failure->reason()};
+  if (const auto updated = updatedAt())
+    settings.groupStore()->setValue_forKey(isoTextOfDate(*updated), kSavedRowsDateKey);
   return {};
+}
+
+std::optional<Date> WidgetProcess::updatedAt() const {
+  // While no fetch has ended, the rows are those of the last time.
+  if (_controller->transitLineItemResult()) return _platform->transitLines().updatedAt();
+  const auto kept = _platform->sharedSettings().groupStore()->stringForKey(kSavedRowsDateKey);
+  return kept ? dateFromISOText(*kept) : std::nullopt;
 }
 
 protocol::Nothing WidgetProcess::viewDidDisappear(const Nothing&) {
@@ -218,8 +243,11 @@ void WidgetProcess::performUpdate(const JSONRPCResponder& responder) {
   if (!_controller) throw JSONRPCFailure(JSONRPCError::kInvalidState, "performUpdate needs \"initialize\" first");
   _controller->widgetPerformUpdateWithCompletionHandler([this, responder](WidgetUpdateResult result) {
     protocol::UpdateResult answer{.updateResult = result};
-    _controller->transitLineItemResult()->withValue_orError(
-        [](const ObjectRef&) {}, [&](const ErrorRef& error) { answer.reason = error->reason(); });
+    _controller->transitLineItemResult()->withValue_orError([](const ObjectRef&) {},
+                                                            [&](const ErrorRef& error) {
+                                                              answer.reason = error->reason();
+                                                              if (isDownloading(*error)) answer.isDownloading = true;
+                                                            });
     responder.answer(protocol::write(answer));
   });
 }
@@ -283,7 +311,21 @@ protocol::Snapshot WidgetProcess::snapshot(const Nothing&) {
   for (const auto& identifier : _platform->transitLines().goneLines())
     snapshot.goneLines.push_back(writtenNameOfLine(*identifier));
   snapshot.asOf = _platform->transitLines().asOf();
+  snapshot.updated = updatedAt();
   return snapshot;
+}
+
+protocol::Lines WidgetProcess::lines(const Nothing&) {
+  if (!_controller) throw JSONRPCFailure(JSONRPCError::kInvalidState, "lines needs \"initialize\" first");
+  return lineReports(_platform->favoritesEditor(), _platform->transitLines());
+}
+
+protocol::Downloads WidgetProcess::downloads(const Nothing&) {
+  protocol::Downloads result;
+  if (_platform)
+    for (auto& [feed, received] : _platform->transitLines().library().downloads().underWay())
+      result.downloads.push_back({feed, received});
+  return result;
 }
 
 protocol::Rendered WidgetProcess::render(const protocol::RenderParams& params) {

@@ -53,7 +53,7 @@ class WidgetProcess {
   Nothing loadView(const Nothing&);
   Nothing viewWillAppear(const Nothing&);
   Nothing viewDidAppear(const Nothing&);
-  Nothing viewWillDisappear(const Nothing&);
+  protocol::Kept viewWillDisappear(const Nothing&);
   Nothing viewDidDisappear(const Nothing&);
   Nothing didReceiveMemoryWarning(const Nothing&);
   Nothing setActiveDisplayMode(const protocol::ActiveDisplayModeParams& params);
@@ -62,6 +62,8 @@ class WidgetProcess {
   protocol::Selected selectRow(const protocol::RowParams& params);
   protocol::Highlighted highlightRow(const protocol::HighlightParams& params);
   protocol::Snapshot snapshot(const Nothing&);
+  protocol::Lines lines(const Nothing&);
+  protocol::Downloads downloads(const Nothing&);
   protocol::Rendered render(const protocol::RenderParams& params);
   Nothing setAppearance(const protocol::AppearanceParams& params);
   Nothing setScale(const protocol::ScaleParams& params);
@@ -72,6 +74,8 @@ class WidgetProcess {
   void performUpdate(const JSONRPCResponder& responder);
 
   void makePlatform(const std::string& locale);
+  /// When the fetch ended that the rows are of; absent where that is not known.
+  std::optional<Date> updatedAt() const;
   /// Throws JSONRPCFailure for a row that is none.
   IndexPath existingRow(std::uint32_t section, std::uint32_t row) const;
   /// Tells the controller of the host's mode, unless it knows.

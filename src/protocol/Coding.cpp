@@ -85,7 +85,10 @@ constexpr std::tuple kFields<Initialized>{Field{"name", &Initialized::name}, Fie
                                           Field{"protocol", &Initialized::protocol}};
 template <>
 constexpr std::tuple kFields<UpdateResult>{Field{"updateResult", &UpdateResult::updateResult},
-                                           Field{"reason", &UpdateResult::reason, kMayBeLeftOut}};
+                                           Field{"reason", &UpdateResult::reason, kMayBeLeftOut},
+                                           Field{"downloading", &UpdateResult::isDownloading, kMayBeLeftOut}};
+template <>
+constexpr std::tuple kFields<Kept>{Field{"failure", &Kept::failure, kMayBeLeftOut}};
 template <>
 constexpr std::tuple kFields<ActiveDisplayModeParams>{
     Field{"mode", &ActiveDisplayModeParams::mode},
@@ -200,7 +203,33 @@ constexpr std::tuple kFields<Snapshot>{Field{"displayMode", &Snapshot::displayMo
                                        Field{"updateDates", &Snapshot::updateDates},
                                        Field{"knownIncidents", &Snapshot::knownIncidents},
                                        Field{"goneLines", &Snapshot::goneLines},
-                                       Field{"asOf", &Snapshot::asOf}};
+                                       Field{"asOf", &Snapshot::asOf},
+                                       Field{"updated", &Snapshot::updated}};
+
+template <>
+constexpr std::tuple kFields<LineIncident>{Field{"id", &LineIncident::id},
+                                           Field{"title", &LineIncident::title},
+                                           Field{"text", &LineIncident::text},
+                                           Field{"from", &LineIncident::from},
+                                           Field{"until", &LineIncident::until},
+                                           Field{"url", &LineIncident::url},
+                                           Field{"severity", &LineIncident::severity},
+                                           Field{"effect", &LineIncident::effect},
+                                           Field{"cause", &LineIncident::cause}};
+template <>
+constexpr std::tuple kFields<LineReport>{
+    Field{"id", &LineReport::id},          Field{"muid", &LineReport::muid},
+    Field{"name", &LineReport::name},      Field{"agency", &LineReport::agency},
+    Field{"shield", &LineReport::shield},  Field{"state", &LineReport::state},
+    Field{"reason", &LineReport::reason},  Field{"incidents", &LineReport::incidents},
+    Field{"planned", &LineReport::planned}};
+template <>
+constexpr std::tuple kFields<Lines>{Field{"updated", &Lines::updated}, Field{"lines", &Lines::lines},
+                                    Field{"error", &Lines::error, kMayBeLeftOut}};
+template <>
+constexpr std::tuple kFields<Download>{Field{"feed", &Download::feed}, Field{"received", &Download::received}};
+template <>
+constexpr std::tuple kFields<Downloads>{Field{"downloads", &Downloads::downloads}};
 
 template <>
 constexpr std::tuple kFields<Incident>{Field{"muid", &Incident::muid},
@@ -565,6 +594,7 @@ NIMBO_MESSAGE(DisplayModes);
 NIMBO_MESSAGE(InitializeParams);
 NIMBO_MESSAGE(Initialized);
 NIMBO_MESSAGE(UpdateResult);
+NIMBO_MESSAGE(Kept);
 NIMBO_MESSAGE(ActiveDisplayModeParams);
 NIMBO_MESSAGE(TransitionParams);
 NIMBO_MESSAGE(TextSizeParams);
@@ -575,6 +605,10 @@ NIMBO_MESSAGE(Selected);
 NIMBO_MESSAGE(HighlightParams);
 NIMBO_MESSAGE(Highlighted);
 NIMBO_MESSAGE(Snapshot);
+NIMBO_MESSAGE(Lines);
+NIMBO_MESSAGE(LineReport);
+NIMBO_MESSAGE(LineIncident);
+NIMBO_MESSAGE(Downloads);
 NIMBO_MESSAGE(RenderParams);
 NIMBO_MESSAGE(Rendered);
 NIMBO_MESSAGE(AdvanceParams);

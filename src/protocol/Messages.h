@@ -53,6 +53,12 @@ struct Initialized {
 struct UpdateResult {
   WidgetUpdateResult updateResult = WidgetUpdateResult::NewData;
   std::optional<std::string> reason;  ///< of a failure
+  std::optional<bool> isDownloading;  ///< true where it is for want of a static feed that is still coming
+};
+
+/// What became of the rows that are kept for the next start.
+struct Kept {
+  std::optional<std::string> failure;  ///< why they could not be kept; absent: they are
 };
 
 struct ActiveDisplayModeParams {

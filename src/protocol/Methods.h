@@ -2,6 +2,7 @@
 
 #include "protocol/Feeds.h"
 #include "protocol/Handoff.h"
+#include "protocol/Lines.h"
 #include "protocol/Messages.h"
 #include "protocol/Snapshot.h"
 
@@ -25,7 +26,7 @@ inline constexpr Method<InitializeParams, Initialized> kInitialize{"initialize"}
 inline constexpr Method<Nothing> kLoadView{"loadView"};
 inline constexpr Method<Nothing> kViewWillAppear{"viewWillAppear"};
 inline constexpr Method<Nothing> kViewDidAppear{"viewDidAppear"};
-inline constexpr Method<Nothing> kViewWillDisappear{"viewWillDisappear"};
+inline constexpr Method<Nothing, Kept> kViewWillDisappear{"viewWillDisappear"};
 inline constexpr Method<Nothing> kViewDidDisappear{"viewDidDisappear"};
 inline constexpr Method<Nothing> kDidReceiveMemoryWarning{"didReceiveMemoryWarning"};
 inline constexpr Method<Nothing, UpdateResult> kPerformUpdate{"performUpdate", true};
@@ -37,6 +38,8 @@ inline constexpr Method<ScaleParams> kSetScale{"setScale"};
 inline constexpr Method<RowParams, Selected> kSelectRow{"selectRow"};
 inline constexpr Method<HighlightParams, Highlighted> kHighlightRow{"highlightRow"};
 inline constexpr Method<Nothing, Snapshot> kSnapshot{"snapshot"};
+inline constexpr Method<Nothing, Lines> kLines{"lines"};
+inline constexpr Method<Nothing, Downloads> kDownloads{"downloads"};
 inline constexpr Method<RenderParams, Rendered> kRender{"render"};
 inline constexpr Method<AdvanceParams, Advanced> kAdvanceTime{"advanceTime"};
 inline constexpr Method<DecodeParams, Handoff> kDecode{"decode"};
@@ -55,6 +58,7 @@ inline constexpr Notification<PreferredSizeParams> kPreferredContentSizeDidChang
 inline constexpr Notification<LargestDisplayModeParams> kLargestAvailableDisplayModeDidChange{
     "largestAvailableDisplayModeDidChange"};
 inline constexpr Notification<Nothing> kFrame{"frame"};
+inline constexpr Notification<Nothing> kUpdated{"updated"};
 inline constexpr Notification<NoticeParams> kNotice{"notice"};
 inline constexpr Notification<ProgressParams> kProgress{"progress"};
 inline constexpr Notification<LogParams> kLog{"log"};

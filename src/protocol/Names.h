@@ -7,6 +7,7 @@
 
 #include "platform/foundation/Presentation.h"
 #include "protocol/Feeds.h"
+#include "protocol/Lines.h"
 #include "protocol/Snapshot.h"
 
 namespace nimbo::protocol {
@@ -38,6 +39,10 @@ template <>
 inline constexpr std::array<std::string_view, 2> kNames<FetchResult>{"success", "error"};
 template <>
 inline constexpr std::array<std::string_view, 2> kNames<FeedPart>{"static", "alerts"};
+template <>
+inline constexpr std::array<std::string_view, 3> kNames<LineState>{"good", "affected", "unknown"};
+template <>
+inline constexpr std::array<std::string_view, 4> kNames<Severity>{"unknown_severity", "info", "warning", "severe"};
 
 template <class Enumeration>
 constexpr std::string_view nameOf(Enumeration value) {

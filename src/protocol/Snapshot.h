@@ -109,6 +109,8 @@ struct Snapshot {
   std::vector<std::string> goneLines;         ///< "FEED:ROUTE_ID"
   /// When the publishers made the alerts that the last successful fetch went by, by the names of the feeds that say so.
   std::map<std::string, Date> asOf;
+  /// When the fetch ended that the rows are of, in this process or an earlier one; absent where that is not known.
+  std::optional<Date> updated;
 };
 
 }  // namespace nimbo::protocol

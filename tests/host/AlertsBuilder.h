@@ -22,6 +22,8 @@ class AlertsBuilder {
     std::int64_t start = 0;  ///< seconds since 1970; 0: open
     std::int64_t end = 0;
     std::int32_t effect = 8;  ///< UNKNOWN_EFFECT
+    std::int32_t cause = 1;   ///< UNKNOWN_CAUSE
+    std::int32_t severity = 1;
   };
 
   static std::string feed(Date timestamp, const std::vector<Alert>& alerts) {
@@ -49,7 +51,9 @@ class AlertsBuilder {
       if (alert.end != 0) period.add_uint64(2, static_cast<std::uint64_t>(alert.end));
     }
     for (const std::string& route : alert.routes) protozero::pbf_writer(body, 5).add_string(2, route);
+    body.add_enum(6, alert.cause);
     body.add_enum(7, alert.effect);
+    body.add_enum(14, alert.severity);
     for (const auto& [field, text] : {std::pair{10u, &alert.header}, {11u, &alert.description}}) {
       if (text->empty()) continue;
       protozero::pbf_writer translated(body, field);

@@ -29,7 +29,8 @@ TEST(CommandLine, ShowsTheSampleCityBeforeAnythingIsSetUp) {
   EXPECT_EQ(compact.status, 0) << compact.errors;
   EXPECT_THAT(compact.output, HasSubstr("Advisories"));
   EXPECT_THAT(compact.output, Not(HasSubstr("\x1b"))) << "no colours but on a terminal";
-  EXPECT_THAT(programs.run({"status", "--expanded"}).output, HasSubstr("More Advisories"));
+  EXPECT_THAT(programs.run({"status", "--expanded"}).output,
+              AllOf(HasSubstr("Harbour Square"), Not(HasSubstr("More"))));
   const json snapshot = json::parse(programs.run({"status", "--json"}).output);
   EXPECT_EQ(snapshot["rows"][0]["class"], "NBTransitSummaryItem");
 }
@@ -282,10 +283,13 @@ TEST(CommandLine, PrintsALineForAStatusBar) {
   programs.run({"favorite", "add", "city:m1"});
   EXPECT_EQ(bar()["class"], "good");
   programs.publish({{"a", {"m1"}, "Lift <&> \"stairs\"", "On two lines"}});
-  EXPECT_EQ(bar(), (json{{"class", "advisories"},
-                         {"alt", "advisories"},
-                         {"text", "[1] Lift &lt;&amp;&gt; &quot;stairs&quot;"},
-                         {"tooltip", "<b>[1] Lift &lt;&amp;&gt; &quot;stairs&quot;</b>\nOn two lines"}}));
+  json lift = bar();
+  EXPECT_THAT(lift["tooltip"].get<std::string>(),
+              testing::StartsWith("<b>[1] Lift &lt;&amp;&gt; &quot;stairs&quot;</b>\nOn two lines\n<i>Updated "));
+  lift.erase("tooltip");
+  EXPECT_EQ(
+      lift,
+      (json{{"class", "advisories"}, {"alt", "advisories"}, {"text", "[1] Lift &lt;&amp;&gt; &quot;stairs&quot;"}}));
   programs.folder.write("feed/routes.txt", "route_id,agency_id,route_short_name,route_type\nm2,M,2,1\n");
   programs.run({"favorite", "add", "city:m2"});
   programs.publish({});
@@ -296,6 +300,92 @@ TEST(CommandLine, PrintsALineForAStatusBar) {
   programs.publishBytes("<no feed>");
   EXPECT_EQ(bar()["alt"], "error");
   EXPECT_THAT(bar()["tooltip"].get<std::string>(), AllOf(HasSubstr("alerts.pb"), Not(HasSubstr("<no"))));
+}
+
+TEST(CommandLine, TellsTheStateOfEachLine) {
+  const Programs programs;
+  const std::string feed = programs.folder.path() / "feed";
+  const std::int64_t now = Programs::unixNow(), hour = 3600, day = 24 * hour;
+  const auto print = [&](std::vector<std::string> options) {
+    options.insert(options.begin(), {"status", kNow});
+    return programs.run(options);
+  };
+  const auto look = [&] {
+    const ProgramRun run = print({"--format", "json", "--exit-code"});
+    const json status = json::parse(run.output);
+    std::string text = std::to_string(run.status) + " " + status["state"].get<std::string>();
+    for (const json& line : status["lines"])
+      text += ", " + line["id"].get<std::string>() + " " + line["state"].get<std::string>();
+    return text;
+  };
+  programs.setUpCity({}, {});
+  EXPECT_EQ(look(), "5 none");
+  programs.run({"favorite", "add", "city:m1", "city:b10"});
+  EXPECT_EQ(look(), "0 good, city:m1 good, city:b10 good");
+
+  programs.publish({{"a", {"m1"}, "Works", "Slow.", now - hour, now + hour, 4, 10, 2},
+                    {"b", {"m1"}, "Strike", "", now - hour, 0, 1, 4, 4},
+                    {"c", {"m1", "b10"}, "Night works", "", now + day, now + 2 * day},
+                    {"d", {"b10"}, "Far off", "", now + 8 * day, 0},
+                    {"e", {"b10"}, "Over", "", now - day, now - hour}});
+  EXPECT_EQ(look(), "3 affected, city:m1 affected, city:b10 good");
+  const json status = json::parse(print({"--format", "json"}).output);
+  EXPECT_EQ(status["updated"], "2026-01-05T12:00:00Z");
+  const json& line = status["lines"][0];
+  EXPECT_EQ(line["incidents"][0]["title"], "Strike") << "the gravest first";
+  json works = line["incidents"][1];
+  EXPECT_NE(works["id"], line["incidents"][0]["id"]);
+  works.erase("id");
+  EXPECT_EQ(works, json::parse(R"({"title": "Works", "text": "Slow.", "from": "2026-01-05T11:00:00Z",
+                                   "until": "2026-01-05T13:00:00Z", "url": null, "severity": "info",
+                                   "effect": "detour", "cause": "construction"})"));
+  for (const json& each : status["lines"]) {
+    EXPECT_EQ(each["planned"].size(), 1U);
+    EXPECT_EQ(each["planned"][0]["title"], "Night works");
+    EXPECT_EQ(each["reason"], nullptr);
+  }
+  EXPECT_THAT(print({"--lines"}).output,
+              AllOf(HasSubstr("⚠ [1] Harbour Line: 2 incidents\n  Strike (since "), HasSubstr("✓ [10]"),
+                    HasSubstr("  planned: Night works (from 2026-01-06")));
+  EXPECT_THAT(print({"--planned"}).output,
+              AllOf(HasSubstr("Night works"), Not(HasSubstr("Far off")), Not(HasSubstr("Strike"))));
+  EXPECT_THAT(print({"--expanded"}).output, AllOf(HasSubstr("Works"), HasSubstr("since "), HasSubstr("\nUpdated ")));
+
+  // A feed that fails leaves the lines of the others what they are.
+  programs.run({"feed", "add", "town", "--static", feed, "--alerts", "/none"});
+  programs.run({"favorite", "add", "town:m2"});
+  EXPECT_EQ(look(), "4 unknown, city:m1 affected, city:b10 good, town:m2 unknown");
+  EXPECT_THAT(print({"--lines"}).output, HasSubstr("? [2] Castle Line: not known: Cannot read /none"));
+  EXPECT_THAT(print({"--planned"}).output, AllOf(HasSubstr("not known"), HasSubstr("Night works")));
+  programs.run({"feed", "remove", "town"});
+  EXPECT_EQ(look(), "4 unknown, city:m1 affected, city:b10 good, town:m2 unknown");
+  programs.run({"favorite", "remove", "town:m2"});
+  programs.folder.write("feed/routes.txt", "route_id,agency_id,route_short_name,route_type\nm1,M,1,1\n");
+  EXPECT_EQ(look(), "4 unknown, city:m1 affected, city:b10 unknown");
+}
+
+TEST(CommandLine, ShowsTheRowsOfTheLastTimeWithoutAFetch) {
+  const Programs programs;
+  EXPECT_EQ(programs.run({"status", "--saved"}).status, 1) << "there are none";
+  programs.setUpCity({"m1"}, {{"a", {"m1"}, "Works", "Slow."}});
+  programs.run({"status", kNow});
+  programs.publish({{"a", {"m1"}, "Strike", "None."}});
+  const ProgramRun saved = programs.run({"status", "--saved"});
+  EXPECT_EQ(saved.status, 0) << saved.errors;
+  EXPECT_THAT(saved.output, AllOf(HasSubstr("Works"), HasSubstr("\nUpdated 2026-01-05 ")));
+}
+
+TEST(CommandLine, ListsAsJSON) {
+  const Programs programs;
+  programs.setUpCity({"m1"}, {});
+  const json line = {{"id", "city:m1"}, {"shortName", "1"}, {"name", "1, Harbour Line"}, {"agency", "Metro"}};
+  EXPECT_EQ(json::parse(programs.run({"lines", "--json", "harb"}).output), json::array({line}));
+  EXPECT_EQ(json::parse(programs.run({"favorite", "list", "--json"}).output), json::array({line}));
+  EXPECT_EQ(json::parse(programs.run({"feed", "list", "--json"}).output),
+            json::array({{{"name", "city"},
+                          {"static", programs.folder.path() / "feed"},
+                          {"alerts", programs.alertsFile()},
+                          {"combined", false}}}));
 }
 
 TEST(CommandLine, UpdatesTheRowsForTheNextStart) {

@@ -54,6 +54,29 @@ TEST(WidgetProcess, ShowsTheRowsThatTheFeedCallsFor) {
   }
 }
 
+TEST(WidgetProcess, TellsTheStateOfLinesByItsLastFetch) {
+  Programs programs;
+  programs.setUpCity({"m1"}, {{"a", {"m1"}, "Works", "Slow."}});
+  const json look = request("lines"), fetch = request("performUpdate");
+  const auto of = [&](const std::vector<json>& events) {
+    std::vector<std::string> seen;
+    for (const json& line : programs.play(events))
+      if (line.contains("result") && line["result"].contains("lines"))
+        for (const json& report : line["result"]["lines"])
+          seen.push_back(report["state"].get<std::string>() +
+                         (report["reason"].is_null() ? "" : " " + report["reason"]["code"].dump()));
+    return seen;
+  };
+  const json start = appearing()[0];
+  EXPECT_THAT(of({start, look, fetch, look}), ElementsAre("unknown 22", "affected"));
+  // An incident that ends is over without a fetch.
+  programs.publish({{"a", {"m1"}, "Works", "Slow.", 0, Programs::unixNow() + 60}});
+  EXPECT_THAT(of({start, fetch, look, request("advanceTime", {{"seconds", 61}}), look}),
+              ElementsAre("affected", "good"));
+  programs.publishBytes("no feed");
+  EXPECT_THAT(of({start, fetch, look}), ElementsAre("unknown 7"));
+}
+
 TEST(WidgetProcess, ChangesItsRowsOnTheSecond) {
   Programs programs;
   const std::int64_t now = Programs::unixNow();

@@ -10,7 +10,8 @@ namespace {
 
 class Store final : public SharedSettingsStore {
  public:
-  explicit Store(std::shared_ptr<StateDatabase> database) : _database(std::move(database)) {}
+  Store(std::shared_ptr<StateDatabase> database, std::shared_ptr<SQLiteSharedSettings::Failure> failure)
+      : _database(std::move(database)), _failure(std::move(failure)) {}
 
   std::optional<Value> valueForKey(std::string_view key) const override {
     std::optional<Value> value;
@@ -27,7 +28,7 @@ class Store final : public SharedSettingsStore {
   }
 
   ErrorRef setValue_forKey(const Value& value, std::string_view key) override {
-    return _database->write([&](SQLiteConnection& connection) -> ErrorRef {
+    return change([&](SQLiteConnection& connection) -> ErrorRef {
       SQLiteStatement insert = connection.prepare("INSERT OR REPLACE INTO settings(key, value) VALUES (?, ?)");
       insert.bind(1, key);
       if (const auto* yes = std::get_if<bool>(&value))
@@ -42,7 +43,7 @@ class Store final : public SharedSettingsStore {
   }
 
   ErrorRef removeValueForKey(std::string_view key) override {
-    return _database->write([&](SQLiteConnection& connection) -> ErrorRef {
+    return change([&](SQLiteConnection& connection) -> ErrorRef {
       SQLiteStatement remove = connection.prepare("DELETE FROM settings WHERE key = ?");
       remove.bind(1, key);
       remove.step();
@@ -51,6 +52,12 @@ class Store final : public SharedSettingsStore {
   }
 
  private:
+  ErrorRef change(const StateDatabase::Work& work) {
+    ErrorRef error = _database->write(work);
+    const std::lock_guard guard(_failure->lock);
+    return _failure->error = std::move(error);
+  }
+
   static std::optional<Value> valueOfRow(const SQLiteStatement& row) {
     switch (row.type(0)) {
       case SQLiteStatement::ColumnType::integer:
@@ -67,6 +74,7 @@ class Store final : public SharedSettingsStore {
   }
 
   std::shared_ptr<StateDatabase> _database;
+  std::shared_ptr<SQLiteSharedSettings::Failure> _failure;
 };
 
 }  // namespace
@@ -75,6 +83,8 @@ SQLiteSharedSettings::SQLiteSharedSettings(std::shared_ptr<StateDatabase> databa
   if (!_database) throw std::invalid_argument("shared settings need a database");
 }
 
-std::shared_ptr<SharedSettingsStore> SQLiteSharedSettings::groupStore() { return std::make_shared<Store>(_database); }
+std::shared_ptr<SharedSettingsStore> SQLiteSharedSettings::groupStore() {
+  return std::make_shared<Store>(_database, _failure);
+}
 
 }  // namespace nimbo

@@ -87,7 +87,9 @@ class ICUPatternFormat final : public PatternFormat {
 
 class ICUDateFormat final : public DateFormat {
  public:
-  explicit ICUDateFormat(std::unique_ptr<icu::DateFormat> format) : _format(std::move(format)) {}
+  /// Neither is null.
+  ICUDateFormat(std::unique_ptr<icu::DateFormat> format, std::unique_ptr<icu::DateFormat> day)
+      : _format(std::move(format)), _day(std::move(day)) {}
 
   std::string textOf(Date date, Place place) override {
     UErrorCode ignored = U_ZERO_ERROR;  // the date is right in any context
@@ -95,11 +97,20 @@ class ICUDateFormat final : public DateFormat {
                                                   : UDISPCTX_CAPITALIZATION_FOR_MIDDLE_OF_SENTENCE,
                         ignored);
     icu::UnicodeString text;
-    return utf8(_format->format(static_cast<UDate>(date.time_since_epoch().count()) / 1000, text));
+    return utf8(_format->format(udate(date), text));
+  }
+
+  std::string dayOf(Date date) override {
+    UErrorCode ignored = U_ZERO_ERROR;  // as above
+    _day->setContext(UDISPCTX_CAPITALIZATION_FOR_BEGINNING_OF_SENTENCE, ignored);
+    icu::UnicodeString text;
+    return utf8(_day->format(udate(date), text));
   }
 
  private:
-  std::unique_ptr<icu::DateFormat> _format;
+  static UDate udate(Date date) { return static_cast<UDate>(date.time_since_epoch().count()) / 1000; }
+
+  std::unique_ptr<icu::DateFormat> _format, _day;
 };
 
 /// Latin letters whose stroke or missing dot Unicode does not take for an accent.
@@ -139,8 +150,10 @@ class ICUStrings final : public StringsPart {
   std::unique_ptr<DateFormat> makeDateFormat(const std::string& locale) override {
     std::unique_ptr<icu::DateFormat> format(icu::DateFormat::createDateTimeInstance(
         icu::DateFormat::kLongRelative, icu::DateFormat::kShort, icu::Locale::createCanonical(locale.c_str())));
-    if (!format) return nullptr;
-    return std::make_unique<ICUDateFormat>(std::move(format));
+    std::unique_ptr<icu::DateFormat> day(
+        icu::DateFormat::createDateInstance(icu::DateFormat::kFull, icu::Locale::createCanonical(locale.c_str())));
+    if (!format || !day) return nullptr;
+    return std::make_unique<ICUDateFormat>(std::move(format), std::move(day));
   }
   std::size_t clusterBoundary(std::string_view text, std::size_t position) override {
     UErrorCode status = U_ZERO_ERROR;

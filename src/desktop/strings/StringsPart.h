@@ -27,6 +27,8 @@ class DateFormat {
   /// Where in a sentence a date stands.
   enum class Place { beginning, middle };
   virtual std::string textOf(Date date, Place place) = 0;
+  /// The day alone, as a heading.
+  virtual std::string dayOf(Date date) = 0;
 };
 
 /// What libnimbo-strings does, the part with ICU (system/LatePart.h). Main thread only where nothing else is said.

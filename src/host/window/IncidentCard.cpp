@@ -6,6 +6,7 @@
 #include <algorithm>
 
 #include "host/FeedAnswers.h"
+#include "host/window/LineStates.h"
 #include "host/window/ShieldImage.h"
 #include "host/window/Texts.h"
 #include "host/window/WidgetTexts.h"
@@ -20,6 +21,12 @@ namespace {
 /// More lines than that are a wall.
 constexpr std::size_t kLineLimit = 8;
 constexpr std::int64_t kCardShieldSize = 3;
+
+const char* styleOfSeverity(protocol::Severity severity) {
+  return severity == protocol::Severity::severe    ? "severity-severe"
+         : severity == protocol::Severity::warning ? "severity-warning"
+                                                   : "severity-info";
+}
 
 /// The side on which a publisher's text begins is that of its own direction, not of the interface's.
 void alignByDirection(Gtk::Label& label) {
@@ -55,6 +62,7 @@ IncidentCard::IncidentCard(const PageContext& context, const TransitIncidents& p
 
   const std::string title = IncidentStringProvider::cellTitleForIncident(&incident);
   addText(_box, title, "item-heading");
+  addMarks();
   if (incident.isBlockingIncident()) addSaid(LocalizedString("Window_Incident_Blocking"), "failed");
   addDates(periods);
   addTexts(incident);
@@ -79,6 +87,17 @@ void IncidentCard::addText(Gtk::Box& box, const std::string& text, const char* s
   alignByDirection(*label);
   label->add_css_class(style);
   box.append(*label);
+}
+
+void IncidentCard::addMarks() {
+  const protocol::LineIncident* known = incidentNumbered(_context.lines, _incident->muid());
+  if (!known) return;
+  if (known->severity != protocol::Severity::unknown) add_css_class(styleOfSeverity(known->severity));
+  std::string text;
+  for (const std::string& words :
+       {textOfSeverity(known->severity), textOfEffect(known->effect), textOfCause(known->cause)})
+    if (!words.empty()) text += (text.empty() ? "" : " · ") + words;
+  addSaid(text, "item-caption");
 }
 
 void IncidentCard::addTexts(const TransitIncident& incident) {
@@ -150,8 +169,8 @@ bool isInForce(const TransitIncident& incident, Date now) {
   return (!incident.startDate() || *incident.startDate() <= now) && (!incident.endDate() || *incident.endDate() >= now);
 }
 
-/// The incidents in their order, each with all its periods.
-std::vector<TransitIncidents> groupedByNumber(const TransitIncidents& incidents) {
+/// The incidents in their order, the gravest first, each with all its periods.
+std::vector<TransitIncidents> groupedByNumber(const TransitIncidents& incidents, const protocol::Lines& lines) {
   std::vector<TransitIncidents> groups;
   for (const TransitIncidentRef& incident : incidents) {
     const auto group = std::find_if(groups.begin(), groups.end(), [&](const TransitIncidents& periods) {
@@ -162,6 +181,12 @@ std::vector<TransitIncidents> groupedByNumber(const TransitIncidents& incidents)
     else
       groups.push_back({incident});
   }
+  const auto severityOf = [&](const TransitIncidents& periods) {
+    const protocol::LineIncident* known = incidentNumbered(lines, periods.front()->muid());
+    return known ? known->severity : protocol::Severity::unknown;
+  };
+  std::stable_sort(groups.begin(), groups.end(),
+                   [&](const auto& a, const auto& b) { return severityOf(a) > severityOf(b); });
   const Date now = Platform::current().clock().now();
   std::stable_partition(groups.begin(), groups.end(), [now](const TransitIncidents& periods) {
     return std::any_of(periods.begin(), periods.end(), [now](const auto& period) { return isInForce(*period, now); });
@@ -176,7 +201,7 @@ IncidentCards::IncidentCards(const PageContext& context, const TransitIncidents&
   // Cards are stops for the keyboard, which also brings one that is out of sight into view.
   add_css_class("cards");
   set_selection_mode(Gtk::SelectionMode::NONE);
-  for (const TransitIncidents& periods : groupedByNumber(incidents)) {
+  for (const TransitIncidents& periods : groupedByNumber(incidents, context.lines)) {
     _cards.push_back(Gtk::make_managed<IncidentCard>(context, periods, line));
     append(*_cards.back());
   }

@@ -30,6 +30,8 @@ class IncidentCard final : public Gtk::ListBoxRow {
   static void addText(Gtk::Box& box, const std::string& text, const char* style);
   /// Adds a text of the incident, which is also said to a screen reader.
   void addSaid(const std::string& text, const char* style);
+  /// Says how grave it is, its effect and its cause, where the widget told that.
+  void addMarks();
   void addTexts(const TransitIncident& incident);
   void addDates(const TransitIncidents& periods);
   void addLink(const std::string& url);

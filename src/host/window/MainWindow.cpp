@@ -5,10 +5,15 @@
 #include <gtkmm/eventcontrollerkey.h>
 #include <gtkmm/gestureclick.h>
 
+#include <algorithm>
+#include <iterator>
+
 #include "desktop/rpc/Base64.h"
+#include "host/FeedAnswers.h"
 #include "host/window/FavoritesPage.h"
 #include "host/window/FeedsPage.h"
 #include "host/window/IncidentPages.h"
+#include "host/window/LineStates.h"
 #include "host/window/WidgetTexts.h"
 #include "platform/Localization.h"
 
@@ -52,7 +57,7 @@ Glib::RefPtr<Gio::MenuModel> makeMainMenu() {
 }
 
 MainWindow::MainWindow(const CommandContext& command, HostPlatform& platform, DesktopPreferences& preferences)
-    : _context{command, platform, preferences, *this, _asOf},
+    : _context{command, platform, preferences, *this, _asOf, _lines},
       _widgetPage(new WidgetPage(_context)),
       _pages(std::unique_ptr<Page>(_widgetPage)) {
   _context.process = &_widgetPage->process();
@@ -160,6 +165,19 @@ void MainWindow::open(const OpenRequest& request) {
     void operator()(const ShowIncidents& show) {
       window.push(std::make_unique<IncidentListPage>(window._context, show.incidents));
     }
+    void operator()(const ShowFavoriteLine& show) {
+      window._widgetPage->withLines(
+          [&window = window, show](const protocol::Lines& lines) { window.openLine(show, lines); });
+    }
+    void operator()(const ShowIncident& show) {
+      window._widgetPage->withLines(
+          [&window = window, show](const protocol::Lines& lines) { window.openIncident(show, lines); });
+    }
+    void operator()(const ShowPlanned&) {
+      window._widgetPage->withLines([&window = window](const protocol::Lines& lines) {
+        window.push(std::make_unique<PlannedPage>(window._context, lines));
+      });
+    }
     void operator()(const ShowHandoff& show) {
       window._decoding =
           window._context.process->ask(protocol::kDecode, {base64(show.payload)},
@@ -172,6 +190,37 @@ void MainWindow::open(const OpenRequest& request) {
     }
   };
   std::visit(Opener{*this}, request);
+}
+
+void MainWindow::openLine(const ShowFavoriteLine& show, const protocol::Lines& lines) {
+  const auto line = std::find_if(lines.lines.begin(), lines.lines.end(),
+                                 [&](const protocol::LineReport& report) { return report.id == show.identifier; });
+  if (line != lines.lines.end()) return push(std::make_unique<LinePage>(_context, *line, lines));
+  _lineLookup =
+      _context.process->ask(protocol::kDescribeLines, {.lines = {{.id = show.identifier}}},
+                            [this, show](const Outcome<protocol::DescribedLines>& described) {
+                              if (described && !described->lines.empty() && described->lines.front().line)
+                                push(std::make_unique<LinePage>(_context, lineOf(*described->lines.front().line)));
+                              else
+                                tell(LocalizedFormat(LocalizedString("Window_Line_None"), {show.identifier}));
+                            });
+}
+
+void MainWindow::openIncident(const ShowIncident& show, const protocol::Lines& lines) {
+  const std::string id = std::to_string(show.muid);
+  std::vector<protocol::LineIncident> periods;
+  bool isUnknown = lines.error.has_value();
+  for (const protocol::LineReport& line : lines.lines) {
+    isUnknown = isUnknown || line.state == protocol::LineState::unknown;
+    if (!periods.empty()) continue;
+    for (const auto* list : {&line.incidents, &line.planned})
+      std::copy_if(list->begin(), list->end(), std::back_inserter(periods),
+                   [&](const protocol::LineIncident& incident) { return incident.id == id; });
+  }
+  if (!periods.empty())
+    push(std::make_unique<IncidentListPage>(_context, incidentsOf(periods, lines)));
+  else
+    tell(LocalizedString(isUnknown ? "Window_Incident_Unknown" : "Window_Incident_Over"));
 }
 
 void MainWindow::tell(const std::string& message) {

@@ -32,8 +32,12 @@ class MainWindow final : public Gtk::ApplicationWindow, public Navigator {
   void addActions();
   void showFront();
   void push(std::unique_ptr<Page> page);
+  void openLine(const ShowFavoriteLine& show, const protocol::Lines& lines);
+  void openIncident(const ShowIncident& show, const protocol::Lines& lines);
 
   std::map<std::string, Date> _asOf;
+  protocol::Lines _lines;
+  std::shared_ptr<WidgetHostProcess::Question> _lineLookup;
   PageContext _context;
   Gtk::HeaderBar _header;
   Gtk::Button _back;

@@ -2,6 +2,8 @@
 
 #include <glib.h>
 
+#include <charconv>
+
 #include "desktop/rpc/Base64.h"
 #include "host/FeedAnswers.h"
 #include "platform/Localization.h"
@@ -15,7 +17,7 @@ namespace nimbo {
 namespace {
 
 constexpr std::string_view kOpenErrorDomain = "org.nimbo.Open";
-constexpr std::string_view kActivityHost = "activity";
+constexpr std::string_view kActivityHost = "activity", kLineHost = "line", kIncidentHost = "incident";
 
 ErrorRef refusal(std::string_view key, const std::string& detail) {
   return Error::errorWithDomain_code_reason(std::string(kOpenErrorDomain), 0,
@@ -107,6 +109,14 @@ Outcome<OpenRequest> openRequestOfURL(std::string_view text) {
   const auto parts = partsOf(url);
   if (!parts || parts->scheme != kHostApplicationURLScheme) return refusal("Window_Open_BadURL", url);
   if (parts->host == kActivityHost) return requestOfActivityURL(*parts);
+  const auto id = parts->query.find("id");
+  if (id != parts->query.end() && parts->host == kLineHost) return OpenRequest(ShowFavoriteLine{id->second});
+  if (id != parts->query.end() && parts->host == kIncidentHost) {
+    std::uint64_t number = 0;
+    const char* end = id->second.data() + id->second.size();
+    if (const auto [stop, error] = std::from_chars(id->second.data(), end, number); error == std::errc() && stop == end)
+      return OpenRequest(ShowIncident{number});
+  }
   if (!parts->host.empty()) return refusal("Window_Open_BadURL", url);
   // Without favourites the widget opens the transit map, whose place here is the lines to choose from.
   if (parts->query.contains("favorites") || parts->query.contains("t")) return OpenRequest(ShowFavorites());

@@ -28,6 +28,17 @@ struct ShowIncidents {
   TransitIncidents incidents;
 };
 
+/// A line that is named "FEED:ROUTE_ID".
+struct ShowFavoriteLine {
+  std::string identifier;
+};
+/// The incident of a favourite line that has this number.
+struct ShowIncident {
+  std::uint64_t muid = 0;
+};
+/// What is to come on the favourite lines.
+struct ShowPlanned {};
+
 /// What a hand-off holds, which the widget process has to read first.
 struct ShowHandoff {
   bool isLine = false;  ///< a line is expected, else a list of incidents
@@ -35,10 +46,12 @@ struct ShowHandoff {
 };
 
 /// A place in the application that somebody asks for: a row of the widget, another program, or a user.
-using OpenRequest = std::variant<ShowWidget, ShowFavorites, ShowFeeds, ShowLine, ShowIncidents, ShowHandoff>;
+using OpenRequest = std::variant<ShowWidget, ShowFavorites, ShowFeeds, ShowLine, ShowIncidents, ShowHandoff,
+                                 ShowFavoriteLine, ShowIncident, ShowPlanned>;
 
 /// What a URL of the application's scheme asks for: "nimbo://?favorites=2&t=r" and "nimbo://?t=r" for the favourites,
-/// "nimbo://" for the widget screen, or a hand-off as "nimbo://activity?type=TYPE&KEY=BASE64", percent-encoded. Errors
+/// "nimbo://" for the widget screen, "nimbo://line?id=FEED:ROUTE_ID" for a line, "nimbo://incident?id=NUMBER" for an
+/// incident of the favourites, or a hand-off as "nimbo://activity?type=TYPE&KEY=BASE64", percent-encoded. Errors
 /// tell the user what is wrong with it.
 Outcome<OpenRequest> openRequestOfURL(std::string_view url);
 

@@ -10,6 +10,7 @@
 #include "host/window/OpenRequest.h"
 #include "host/window/WidgetHostProcess.h"
 #include "platform/foundation/Date.h"
+#include "protocol/Lines.h"
 
 namespace nimbo {
 
@@ -31,6 +32,8 @@ struct PageContext {
   Navigator& navigator;
   /// When publishers made their alerts, by the names of the feeds, as the widget said last.
   std::map<std::string, Date>& asOf;
+  /// What is known of the favourite lines, as the widget said last.
+  protocol::Lines& lines;
   /// Whom to ask about feeds. The widget screen's; null until that is made.
   WidgetHostProcess* process = nullptr;
 

@@ -124,7 +124,16 @@ const char* keyOfCode(TransitLineServiceError code) {
       return "Window_Error_ForeignAlerts";
     case downloading:
       return "Window_Error_Downloading";
+    case notFound:
+      return "Window_Error_NotFound";
+    case cutOff:
+      return "Window_Error_CutOff";
+    case tripsMissing:
+      return "Window_Error_TripsMissing";
     case unknownLine:
+      return "Window_Error_LineGone";
+    case notAsked:
+      return "Window_Error_NotAsked";
     case internal:
       break;
   }

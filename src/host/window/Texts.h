@@ -20,6 +20,8 @@ class DateText {
   explicit DateText(const std::string& locale);
 
   std::string textOf(Date date, DateFormat::Place place = DateFormat::Place::middle) const;
+  /// The day alone: "Monday, 5 January 2026".
+  std::string dayOf(Date date) const { return _format ? _format->dayOf(date) : isoTextOfDate(date).substr(0, 10); }
   /// From when until when something lasts, as one phrase; empty when neither is known.
   std::string textOfPeriod(std::optional<Date> start, std::optional<Date> end, Date now) const;
 

@@ -46,6 +46,8 @@ WidgetContent WidgetContent::ofSnapshot(const protocol::Snapshot& snapshot) {
   content.isExpanded = snapshot.expanded;
   content.goneLines = snapshot.goneLines;
   content.asOf = snapshot.asOf;
+  content.updated = snapshot.updated;
+  content.isFetched = snapshot.result.has_value();
   for (const auto& [line, title] : snapshot.knownIncidents) content.known.push_back(CommaDelimitedList({line, title}));
   if (snapshot.error) content.failure = errorOf(*snapshot.error);
   return content;

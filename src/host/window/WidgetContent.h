@@ -2,13 +2,14 @@
 
 #include <map>
 #include <memory>
+#include <optional>
 #include <string>
 #include <vector>
 
 #include "host/PictureMemory.h"
 #include "platform/foundation/Date.h"
 #include "platform/foundation/Error.h"
-#include "protocol/Snapshot.h"
+#include "protocol/Lines.h"
 
 namespace nimbo {
 
@@ -29,6 +30,9 @@ struct WidgetContent {
   ErrorRef failure;                    ///< of the last fetch; null without one
   std::vector<std::string> known;      ///< incidents of other feeds, with a failure, each as one line of text
   std::map<std::string, Date> asOf;    ///< when the publishers made their alerts, by the names of the feeds
+  std::optional<Date> updated;         ///< when the fetch ended that the rows are of
+  bool isFetched = false;              ///< whether a fetch of this process has ended
+  protocol::Lines lines;               ///< the favorites, by that fetch
 
   /// Takes rows and modes from a snapshot.
   static WidgetContent ofSnapshot(const protocol::Snapshot& snapshot);

@@ -109,7 +109,7 @@ void WidgetHostProcess::start() {
     _widget = std::make_unique<WatchedWidget>(
         _runLoop, _arguments, kAnswerPatience, [this](const std::string& reason) { replace(reason); }, &*_pictures);
   } catch (const std::runtime_error& failure) {
-    return giveUp(failure.what());
+    return giveUp(Failure::cannotStart, failure.what());
   }
   _processMark = std::make_shared<bool>(true);
   _told = _presentation;
@@ -131,6 +131,9 @@ void WidgetHostProcess::setUpConnection() {
   WidgetClient& client = _widget->client();
   client.connection().setHandler(protocol::kFrame.name,
                                  [this](const auto&, const JSONRPCResponder&) { askForContent(); });
+  client.connection().setHandler(protocol::kUpdated.name, [this](const auto&, const JSONRPCResponder&) {
+    _widget->ask(protocol::kLines, {}, [this](const protocol::Lines& lines) { _delegate.widgetLinesDidChange(lines); });
+  });
   client.setNoticeHandler([this](const std::string& message) { _delegate.widgetTells(message); });
   client.setOpenHandler([this](const WidgetClient::Opening& opening) { return _delegate.widgetOpens(opening); });
 }
@@ -166,16 +169,16 @@ void WidgetHostProcess::replace(const std::string& reason) {
   std::erase_if(_crashes, [&](Date crash) { return intervalBetween(crash, now) > kCrashWindow; });
   _crashes.push_back(now);
   if (_crashes.size() >= kCrashLimit)
-    return giveUp("its process had to be started " + std::to_string(kCrashLimit) +
-                  " times within a minute, the last time since " + reason +
-                  ". Start the window in a terminal with NIMBO_LOG=debug to see why.");
+    return giveUp(Failure::keepsFailing, "its process had to be started " + std::to_string(kCrashLimit) +
+                                             " times within a minute, the last time since " + reason +
+                                             ". Start the window in a terminal with NIMBO_LOG=debug to see why.");
   if (_visible) start();
 }
 
-void WidgetHostProcess::giveUp(const std::string& reason) {
-  writeLog(kLog, LogLevel::error, "No widget process: %@", {reason});
+void WidgetHostProcess::giveUp(Failure failure, const std::string& detail) {
+  writeLog(kLog, LogLevel::error, "No widget process: %@", {detail});
   _gaveUp = true;
-  _delegate.widgetDidFail(reason);
+  _delegate.widgetDidFail(failure, detail);
 }
 
 void WidgetHostProcess::restart() {
@@ -204,17 +207,22 @@ void WidgetHostProcess::askForContent() {
     else
       _widget->fail("it has not drawn what it says");
   });
-  _widget->ask(protocol::kSnapshot, {}, [this, picture](const protocol::Snapshot& snapshot) {
+  const auto content = std::make_shared<WidgetContent>();
+  _widget->ask(protocol::kSnapshot, {}, [content, picture](const protocol::Snapshot& snapshot) {
+    *content = WidgetContent::ofSnapshot(snapshot);
+    content->picture = picture;
+  });
+  _widget->ask(protocol::kLines, {}, [this, content](const protocol::Lines& lines) {
     _awaitsContent = false;
-    if (!picture->pixels.empty()) show(picture, snapshot);
+    content->lines = lines;
+    if (!content->picture->pixels.empty()) show(content);
     if (_contentIsStale) askForContent();
   });
 }
 
-void WidgetHostProcess::show(const std::shared_ptr<const WidgetPicture>& picture, const protocol::Snapshot& snapshot) {
-  auto content = std::make_shared<WidgetContent>(WidgetContent::ofSnapshot(snapshot));
-  content->picture = picture;
-  _contentHeight = picture->layout.height / picture->layout.scale;
+void WidgetHostProcess::show(const std::shared_ptr<WidgetContent>& content) {
+  const protocol::Rendered& layout = content->picture->layout;
+  _contentHeight = layout.height / layout.scale;
   tellPresentation();
   // The expanded mode ends with the rows that need it, and comes back with them; rows that could not take it are
   // compact without being told. What was asked for before the last mode was told decides nothing.
@@ -224,7 +232,7 @@ void WidgetHostProcess::show(const std::shared_ptr<const WidgetPicture>& picture
   }
   if (content->failure)
     retryLater();
-  else if (snapshot.result)
+  else if (content->isFetched)
     endRetries();
   _delegate.widgetDidChange(content);
 }

@@ -22,14 +22,19 @@ namespace nimbo {
 /// Main thread only.
 class WidgetHostProcess {
  public:
+  /// Why there is no process.
+  enum class Failure { cannotStart, keepsFailing };
+
   /// Hears of the process, in calls of its own. Outlives it.
   class Delegate {
    public:
     virtual ~Delegate() = default;
     /// The widget shows something else; until the next call that is what to show, whatever becomes of the process.
     virtual void widgetDidChange(const WidgetContentRef& content) = 0;
-    /// The process is not started again by itself; `reason` says why. `restart` is the way out.
-    virtual void widgetDidFail(const std::string& reason) = 0;
+    /// A fetch has ended, which may have left the widget as it was.
+    virtual void widgetLinesDidChange(const protocol::Lines& lines) = 0;
+    /// The process is not started again by itself; `detail` says why, for developers. `restart` is the way out.
+    virtual void widgetDidFail(Failure failure, const std::string& detail) = 0;
     /// Something that the user must be told.
     virtual void widgetTells(const std::string& message) = 0;
     /// A fetch of the user's has begun or ended.
@@ -88,7 +93,7 @@ class WidgetHostProcess {
   void stopLater();
   /// Starts another process after one that failed, or gives up.
   void replace(const std::string& reason);
-  void giveUp(const std::string& reason);
+  void giveUp(Failure failure, const std::string& detail);
   void setUpConnection();
   static ErrorRef failure(std::string reason);
   /// Starts a process where there is none, and keeps it for the question. False when there is none to be had, which the
@@ -101,7 +106,7 @@ class WidgetHostProcess {
   void askOfRow(const protocol::Method<Params, Result>& method, const Params& params);
   /// Tells the process what it does not know of the presentation.
   void tellPresentation();
-  void show(const std::shared_ptr<const WidgetPicture>& picture, const protocol::Snapshot& snapshot);
+  void show(const std::shared_ptr<WidgetContent>& content);
   void setExpandedMode(bool expanded);
   void setUpdating(bool updating);
   /// Sees to the next attempt after a fetch that failed.

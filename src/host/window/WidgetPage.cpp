@@ -1,11 +1,13 @@
 #include "host/window/WidgetPage.h"
 
 #include <gdkmm/toplevel.h>
+#include <gio/gio.h>
 #include <gtkmm/image.h>
 #include <gtkmm/native.h>
 
 #include <utility>
 
+#include "desktop/gtfs/feeds/TransitLineServiceError.h"
 #include "desktop/rpc/Base64.h"
 #include "host/window/Texts.h"
 #include "host/window/WidgetTexts.h"
@@ -18,6 +20,9 @@ namespace {
 
 /// Setting: whether the user last had a row for each incident.
 constexpr std::string_view kExpandedKey = "Nimbo.Window.expanded";
+
+/// As many rows as a picture has room for at twice the scale; the page scrolls.
+constexpr int kMostRows = 64;
 
 /// Pixels of the sign that the widget is waited for.
 constexpr int kWaitingSize = 32;
@@ -43,10 +48,17 @@ Gtk::Widget* makePlace(const char* icon, const std::string& name) {
   return row;
 }
 
+/// Whether no server can be reached, whichever it was.
+bool isOffline(const Error& error) {
+  return error.domain() == kTransitLineServiceErrorDomain &&
+         error.code() == static_cast<std::int64_t>(TransitLineServiceError::unreachable) &&
+         !g_network_monitor_get_network_available(g_network_monitor_get_default());
+}
+
 /// Why a fetch failed, of which feed, and what is known of the others.
 std::string textOfFailedFetch(const WidgetContent& content) {
   const Error& error = *content.failure;
-  std::string text = textOfError(error);
+  std::string text = isOffline(error) ? LocalizedString("TransitWidgetLoadingError_No_Internet") : textOfError(error);
   if (!error.feed().empty()) text = LocalizedFormat(LocalizedString("Window_Feed_Failed"), {error.feed(), text});
   if (!content.known.empty()) text += "\n\n" + LocalizedString("Window_Feed_Known");
   for (const std::string& incident : content.known) text += "\n" + incident;
@@ -62,6 +74,7 @@ WidgetPage::WidgetPage(const PageContext& context)
       _wantsExpanded(Platform::current().sharedSettings().groupStore()->boolForKey(kExpandedKey)) {
   buildGone();
   buildCard();
+  buildLines();
   buildPlaces();
   _process.setPresentation(presentation());
   _process.setExpanded(_wantsExpanded);
@@ -120,7 +133,11 @@ void WidgetPage::buildCard() {
   auto* button = Gtk::make_managed<Gtk::Button>(LocalizedString("Window_TryAgain"));
   button->set_halign(Gtk::Align::START);
   button->signal_clicked().connect([this] { tryAgain(); });
+  _failureDetail.set_xalign(0);
+  _failureDetail.add_css_class("item-caption");
+  _failureDetail.set_selectable();
   _failure.append(_failureReason);
+  _failure.append(_failureDetail);
   _failure.append(*button);
   _failure.hide();
 
@@ -132,6 +149,42 @@ void WidgetPage::buildCard() {
     _card.append(*child);
   content().append(_card);
   showExpandButton();
+}
+
+void WidgetPage::buildLines() {
+  _updated.set_xalign(0);
+  _updated.add_css_class("item-caption");
+  _updated.hide();
+  content().append(_updated);
+  _planned.add_css_class("flat");
+  _planned.set_halign(Gtk::Align::START);
+  _planned.signal_clicked().connect([this] { _context.navigator.open(ShowPlanned()); });
+  _planned.hide();
+  content().append(_planned);
+  content().append(_lines);
+}
+
+void WidgetPage::showLines(const protocol::Lines& lines, std::optional<Date> updated) {
+  _context.lines = lines;
+  _lines.show(lines);
+  const std::size_t planned = countOfPlanned(lines);
+  _planned.set_label(LocalizedFormat(LocalizedString("Window_Planned_Count"), {std::uint64_t{planned}}));
+  _planned.set_visible(planned > 0);
+  if (updated)
+    _updated.set_text(
+        LocalizedFormat(LocalizedString("Window_Updated"), {DateText(_context.preferences.locale()).textOf(*updated)}));
+  _updated.set_visible(updated.has_value());
+}
+
+void WidgetPage::withLines(std::function<void(const protocol::Lines&)> completion) {
+  if (_content && _content->isFetched) return completion(_context.lines);
+  _linesQuestion = _process.ask(protocol::kPerformUpdate, {}, [this, completion = std::move(completion)](const auto&) {
+    _linesQuestion = _process.ask(protocol::kLines, {}, [this, completion](const Outcome<protocol::Lines>& lines) {
+      if (!lines) return _context.navigator.tell(textOfError(*lines.error()));
+      _context.lines = *lines;
+      completion(*lines);
+    });
+  });
 }
 
 void WidgetPage::buildPlaces() {
@@ -187,7 +240,7 @@ WidgetPresentation WidgetPage::presentation() const {
   WidgetPresentation presentation;
   presentation.width = _width;
   presentation.compactHeight = WidgetPresentation::rowHeightForTextSize(preferences.textSize());
-  presentation.expandedHeight = 4 * presentation.compactHeight;
+  presentation.expandedHeight = kMostRows * presentation.compactHeight;
   presentation.scale = get_scale_factor();
   presentation.textSize = preferences.textSize();
   presentation.appearance = preferences.appearance();
@@ -215,16 +268,18 @@ void WidgetPage::widgetDidChange(const WidgetContentRef& content) {
   _view.setContent(content);
   _waiting.hide();
   if (content->failure)
-    showFailure(textOfFailedFetch(*content));
+    showFailure(textOfFailedFetch(*content), content->failure->reason());
   else
     _failure.hide();
+  showLines(content->lines, content->failure ? std::nullopt : content->updated);
   _goneText.set_text(LocalizedFormat(LocalizedString("Window_Widget_Gone"), {CommaDelimitedList(content->goneLines)}));
   _gone.set_visible(!content->goneLines.empty());
   showExpandButton();
 }
 
-void WidgetPage::showFailure(const std::string& text) {
+void WidgetPage::showFailure(const std::string& text, const std::string& detail) {
   if (_failureReason.get_text().raw() != text) _failureReason.set_text(text);
+  if (_failureDetail.get_text().raw() != detail) _failureDetail.set_text(detail);
   _failure.show();
 }
 
@@ -235,9 +290,13 @@ void WidgetPage::tryAgain() {
   _process.restart();
 }
 
-void WidgetPage::widgetDidFail(const std::string& reason) {
+void WidgetPage::widgetDidFail(WidgetHostProcess::Failure failure, const std::string& detail) {
   _processFailed = true;
-  showFailure(LocalizedFormat(LocalizedString("Window_Widget_Failed"), {reason}));
+  const std::string reason = failure == WidgetHostProcess::Failure::cannotStart
+                                 ? LocalizedString("Window_Widget_CannotStart")
+                                 : LocalizedFormat(LocalizedString("Window_Widget_KeepsFailing"),
+                                                   {std::uint64_t{WidgetHostProcess::kCrashLimit}});
+  showFailure(LocalizedFormat(LocalizedString("Window_Widget_Failed"), {reason}), detail);
   _waiting.hide();
 }
 

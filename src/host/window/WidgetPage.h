@@ -5,6 +5,7 @@
 #include <gtkmm/listbox.h>
 #include <gtkmm/spinner.h>
 
+#include "host/window/LineStates.h"
 #include "host/window/Page.h"
 #include "host/window/PageContext.h"
 #include "host/window/WidgetHostProcess.h"
@@ -22,8 +23,13 @@ class WidgetPage final : public Page, private WidgetHostProcess::Delegate {
   void update() { _process.update(); }
   WidgetHostProcess& process() { return _process; }
 
+  /// Gives what is known of the favourite lines: by the last fetch, else once one has ended.
+  void withLines(std::function<void(const protocol::Lines&)> completion);
+
  private:
   void buildCard();
+  void buildLines();
+  void showLines(const protocol::Lines& lines, std::optional<Date> updated);
   void buildGone();
   void buildPlaces();
   void watchVisibility();
@@ -34,10 +40,12 @@ class WidgetPage final : public Page, private WidgetHostProcess::Delegate {
 
   /// What to do about the failure that is told of.
   void tryAgain();
-  void showFailure(const std::string& text);
+  /// `detail` is for whoever is told of the failure.
+  void showFailure(const std::string& text, const std::string& detail);
 
   void widgetDidChange(const WidgetContentRef& content) override;
-  void widgetDidFail(const std::string& reason) override;
+  void widgetLinesDidChange(const protocol::Lines& lines) override { showLines(lines, lines.updated); }
+  void widgetDidFail(WidgetHostProcess::Failure failure, const std::string& detail) override;
   void widgetTells(const std::string& message) override;
   void widgetIsUpdating(bool updating) override;
   bool widgetOpens(const WidgetClient::Opening& opening) override;
@@ -55,11 +63,15 @@ class WidgetPage final : public Page, private WidgetHostProcess::Delegate {
   WidgetView _view;
   Gtk::Spinner _waiting;
   Gtk::Box _failure{Gtk::Orientation::VERTICAL, 8};
-  Gtk::Label _failureReason;
+  Gtk::Label _failureReason, _failureDetail;
   Gtk::Box _gone{Gtk::Orientation::VERTICAL, 8};
   Gtk::Label _goneText;
+  Gtk::Label _updated;
+  Gtk::Button _planned;
+  LineStates _lines{_context};
   Gtk::Box _sampleNotice{Gtk::Orientation::VERTICAL, 8};
   Gtk::ListBox _places;
+  std::shared_ptr<WidgetHostProcess::Question> _linesQuestion;
   std::vector<sigc::connection> _connections;
   std::shared_ptr<bool> _alive = std::make_shared<bool>(true);
 };

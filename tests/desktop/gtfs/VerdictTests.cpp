@@ -114,7 +114,7 @@ TEST_F(VerdictTest, ABodyIsAFeedWhenItHasAHeaderWithAVersion) {
 
 TEST_F(VerdictTest, AnAlertThatBreaksOffCountsWithWhatWasRead) {
   const std::string noService = "\x38\x01", noEffect = "\x38\x0A";
-  const std::string unknownAlert = unknown(Code::badAlerts);
+  const std::string unknownAlert = unknown(Code::cutOff);
   const struct {
     const char* what;
     std::string entity, verdict;
@@ -142,7 +142,7 @@ TEST_F(VerdictTest, AnAlertThatBreaksOffCountsWithWhatWasRead) {
 TEST_F(VerdictTest, AnAlertByTripAloneNeedsTheTrips) {
   const std::string trip = "informed_entity { trip { trip_id: 'trip-1' } } ";
   const std::string over = "active_period { end: " + std::to_string(kNow - 5) + " } ";
-  const std::string noTrips = unknown(Code::badStaticFeed);
+  const std::string noTrips = unknown(Code::tripsMissing);
   const struct {
     const char* what;
     const char* trips;
@@ -241,7 +241,7 @@ TEST_F(ServedVerdictTest, ACompressedAnswerWithoutItsTrailerIsCutOff) {
                                                         {"more behind it", packed + "?"},
                                                         {"nothing", ""},
                                                         {"not packed", feedBytes("")}};
-  for (const auto& [what, body] : broken) EXPECT_EQ(verdictBy(head, body), unknown(Code::unreachable)) << what;
+  for (const auto& [what, body] : broken) EXPECT_EQ(verdictBy(head, body), unknown(Code::cutOff)) << what;
   EXPECT_EQ(verdictBy("200 OK\r\nContent-Encoding: br", packed), unknown(Code::serverFailure));
   EXPECT_EQ(verdictBy(head, packed), "good");
   EXPECT_EQ(verdictBy(head, packed + gzip(feedBytes(alert("a", "T", route("r1"))))), "affected: T");

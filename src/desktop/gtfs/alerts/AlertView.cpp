@@ -10,6 +10,10 @@ std::int32_t causeOf(std::uint64_t number) {
   return number >= kLeastCause && number <= kGreatestCause ? static_cast<std::int32_t>(number) : kUnknownCause;
 }
 
+std::int32_t severityOf(std::uint64_t number) {
+  return number > kUnknownSeverity && number <= kSeveritySevere ? static_cast<std::int32_t>(number) : kUnknownSeverity;
+}
+
 AlertEffect effectOf(std::uint64_t number) {
   constexpr auto kLeast = static_cast<std::uint64_t>(AlertEffect::noService);
   constexpr auto kGreatest = static_cast<std::uint64_t>(AlertEffect::accessibilityIssue);
@@ -54,7 +58,7 @@ bool readField(protozero::pbf_message<AlertField>& message, std::string_view ale
       take(view.content.effectDetail, takeView(message));
       break;
     case AlertField::severityLevel:
-      view.isSevere = takeNumber(message) == kSeveritySevere;
+      view.severity = severityOf(takeNumber(message));
       break;
     default:
       message.skip();

@@ -39,13 +39,13 @@ struct AlertView {
   std::string_view body;  ///< the message, up to where it breaks off
   AlertContent content;
   std::size_t selectors = 0;
-  bool isSevere = false;
-  bool isDamaged = false;  ///< it breaks off, or one of its selectors does
+  std::int32_t severity = kUnknownSeverity;  ///< one of those that are known
+  bool isDamaged = false;                    ///< it breaks off, or one of its selectors does
 
   /// Whether the alert changes nothing for most riders: it has no effect or is about accessibility, and is not severe,
   /// which is not known of one that breaks off.
   bool isMinor() const {
-    return !isSevere && !isDamaged &&
+    return severity != kSeveritySevere && !isDamaged &&
            (content.effect == AlertEffect::noEffect || content.effect == AlertEffect::accessibilityIssue);
   }
 };

@@ -60,8 +60,11 @@ bool areApart(const Languages& languages, const Languages& others) {
 }  // namespace
 
 ErrorRef alertBreaksOff(const std::string& place) {
-  return badAlerts(
-      place, "one of its alerts breaks off before it says what it is about. Try again later, or tell the publisher.");
+  return transitLineServiceError(TransitLineServiceError::cutOff,
+                                 "The alerts feed " + place +
+                                     " cannot be used: one of its alerts breaks off before it says what it is about. "
+                                     "Try again later, or tell the publisher.",
+                                 place);
 }
 
 void AlertsFeed::readHeader(std::string_view body) {

@@ -26,6 +26,8 @@ struct Incident {
   std::string key;  // the least of its alerts
   AlertTexts texts;
   AlertEffect effect;
+  std::int32_t cause;
+  std::int32_t severity;  // the greatest of its alerts
   struct OnLine {
     std::vector<AlertPeriod> periods;
     bool isWholeLine = false;
@@ -164,6 +166,7 @@ class IncidentBuilder {
       return;
     }
     Incident& incident = _incidents[*index];
+    incident.severity = std::max(incident.severity, view.severity);
     for (const auto& [place, isWholeLine] : _lines) {
       Incident::OnLine& onLine = incident.lines[place];
       onLine.periods.insert(onLine.periods.end(), mattering.begin(), mattering.end());
@@ -272,7 +275,7 @@ class IncidentBuilder {
     const auto [place, isNew] = _incidentOfTexts.try_emplace(
         {texts->title, texts->description.value_or(""), texts->linkURL.value_or(""), content.cause, content.effect},
         _incidents.size());
-    if (isNew) _incidents.push_back({keyOf(alert), *texts, content.effect, {}});
+    if (isNew) _incidents.push_back({keyOf(alert), *texts, content.effect, content.cause, view.severity, {}});
     _incidentOfContent.emplace(content, place->second);
     _sizesOfContents.insert(content.sizeHash());
     return place->second;
@@ -299,6 +302,9 @@ class IncidentBuilder {
     fields.messageForRoutePlanning = fields.messageForRouteStepping = fields.messageForNonRoutable = fields.title;
     fields.iconType = static_cast<std::int32_t>(incident.effect);
     fields.linkURL = incident.texts.linkURL;
+    fields.effect = incident.effect;
+    fields.cause = incident.cause;
+    fields.severity = incident.severity;
     for (const auto& [place, onLine] : incident.lines)
       fields.affectedEntities.push_back(std::make_shared<const BasicAffectedEntity>(_query.lines[place].muid));
     const auto shared = std::make_shared<const AlertIncident::Fields>(std::move(fields));

@@ -5,6 +5,7 @@
 #include <vector>
 
 #include "desktop/gtfs/alerts/AlertsFeed.h"
+#include "desktop/gtfs/alerts/RealtimeFields.h"
 #include "desktop/gtfs/alerts/SelectorMatcher.h"
 #include "desktop/gtfs/alerts/Verdict.h"
 #include "desktop/gtfs/feeds/SkipReport.h"
@@ -16,7 +17,11 @@ namespace nimbo {
 /// One period of an alert as an incident. Alerts come with hundreds of periods: all of one alert share its texts.
 class AlertIncident final : public FieldsTransitIncident {
  public:
-  using Fields = TransitIncidentFields;
+  struct Fields : TransitIncidentFields {
+    AlertEffect effect = AlertEffect::unknownEffect;
+    std::int32_t cause = kUnknownCause;
+    std::int32_t severity = kUnknownSeverity;
+  };
 
   /// `alert` is not null; its dates and its blocking flag play no part.
   AlertIncident(std::shared_ptr<const Fields> alert, std::optional<Date> startDate, std::optional<Date> endDate,

@@ -68,8 +68,8 @@ enum class AlertEffect : std::int32_t {
 inline constexpr std::int32_t kLeastCause = 1, kGreatestCause = 13;
 inline constexpr std::int32_t kUnknownCause = 1;
 
-/// Alert.SeverityLevel.
-inline constexpr std::int32_t kSeveritySevere = 4;
+/// Alert.SeverityLevel: the one for those that are not known, and the greatest.
+inline constexpr std::int32_t kUnknownSeverity = 1, kSeveritySevere = 4;
 
 // How GTFS-Realtime messages are gone through: fields of an unexpected wire type are passed over like unknown ones, but
 // for those that say good service where they are missing.

@@ -22,11 +22,14 @@ struct GTFSTransitLineService::Shared {
   std::vector<MapItemIdentifierRef> goneLines;
   std::map<std::string, Date> asOf;
   std::vector<KnownIncident> known;
+  std::vector<LineVerdict> verdicts;
+  std::optional<Date> updatedAt;
 };
 
 namespace {
 
 using KnownIncident = GTFSTransitLineService::KnownIncident;
+using LineVerdict = GTFSTransitLineService::LineVerdict;
 
 /// More than anybody reads beside an error.
 constexpr std::size_t kMostKnownIncidents = 20;
@@ -38,9 +41,17 @@ struct FeedPart {
   std::vector<std::size_t> places;
 };
 
-/// Sorts identifiers by feed; one that is only a number may be of any.
-Outcome<std::vector<FeedPart>> partsOf(const std::vector<MapItemIdentifierRef>& identifiers,
-                                       const FeedLibrary& library) {
+/// The error with the name of the feed that it happened to.
+ErrorRef ofFeed(const Error& error, const std::string& name) {
+  auto userInfo = error.userInfo()->entries();
+  userInfo.emplace(kErrorFeedKey, box(name));
+  return Error::errorWithDomain_code_userInfo(error.domain(), error.code(), std::move(userInfo));
+}
+
+/// Sorts identifiers by feed; one that is only a number may be of any. `reasons` gets an error for each that is of a
+/// feed which is not set up.
+Outcome<std::vector<FeedPart>> partsOf(const std::vector<MapItemIdentifierRef>& identifiers, const FeedLibrary& library,
+                                       std::vector<ErrorRef>& reasons) {
   const auto sources = library.sources();
   if (!sources) return sources.error();
   std::vector<FeedPart> parts;
@@ -54,7 +65,7 @@ Outcome<std::vector<FeedPart>> partsOf(const std::vector<MapItemIdentifierRef>& 
       part.places.push_back(i);
       found = true;
     }
-    if (!found) return library.sourceNamed(locator->feed).error();
+    if (!found) reasons[i] = ofFeed(*library.sourceNamed(locator->feed).error(), locator->feed);
   }
   std::erase_if(parts, [](const FeedPart& part) { return part.identifiers.empty(); });
   return parts;
@@ -70,15 +81,9 @@ Outcome<FeedAnswer> lookUpPart(const FeedPart& part, const std::string& language
   }
 }
 
-/// The error with the name of the feed that it happened to.
-ErrorRef ofFeed(const Error& error, const std::string& name) {
-  auto userInfo = error.userInfo()->entries();
-  userInfo.emplace(kErrorFeedKey, box(name));
-  return Error::errorWithDomain_code_userInfo(error.domain(), error.code(), std::move(userInfo));
-}
-
 struct Answer {
-  TransitLineItems items;  ///< one for each identifier, null for lines that are gone
+  TransitLineItems items;         ///< one for each identifier, null for lines that are gone or unknown
+  std::vector<ErrorRef> reasons;  ///< one for each, null but for lines of feeds that failed
   std::map<std::string, Date> asOf;
   ErrorRef error;                    ///< of the first feed that failed; null without one
   std::vector<KnownIncident> known;  ///< of the other feeds, with an error
@@ -101,7 +106,8 @@ std::vector<KnownIncident> incidentsInForce(const TransitLineItems& items) {
 
 Outcome<Answer> lookUpAll(const std::vector<MapItemIdentifierRef>& identifiers, const FeedLibrary& library,
                           const std::string& language, const std::stop_token& stop) {
-  const auto parts = partsOf(identifiers, library);
+  Answer all{TransitLineItems(identifiers.size()), std::vector<ErrorRef>(identifiers.size()), {}, nullptr, {}};
+  const auto parts = partsOf(identifiers, library, all.reasons);
   if (!parts) return parts.error();
   std::vector<std::future<Outcome<FeedAnswer>>> others;
   // Deferred where no thread can start: then one feed waits for another.
@@ -112,19 +118,43 @@ Outcome<Answer> lookUpAll(const std::vector<MapItemIdentifierRef>& identifiers, 
   if (!parts->empty()) answers.push_back(lookUpPart(parts->front(), language, stop));
   for (auto& other : others) answers.push_back(other.get());
 
-  Answer all{TransitLineItems(identifiers.size()), {}, nullptr, {}};
   for (std::size_t i = 0; i < answers.size(); ++i) {
+    const FeedPart& part = (*parts)[i];
     if (!answers[i]) {
-      if (!all.error) all.error = ofFeed(*answers[i].error(), (*parts)[i].source->name());
+      const ErrorRef error = ofFeed(*answers[i].error(), part.source->name());
+      for (const std::size_t place : part.places) all.reasons[place] = error;
       continue;
     }
-    const FeedPart& part = (*parts)[i];
     for (std::size_t k = 0; k < answers[i]->items.size(); ++k)
       if (TransitLineItemRef& item = all.items[part.places[k]]; !item) item = answers[i]->items[k];
     if (answers[i]->asOf) all.asOf.emplace(part.source->name(), *answers[i]->asOf);
   }
+  for (std::size_t i = 0; i < all.items.size(); ++i) {
+    // A line that is only a number may be of another feed than the one that failed.
+    if (all.items[i]) all.reasons[i] = nullptr;
+    if (!all.error) all.error = all.reasons[i];
+  }
   if (all.error) all.known = incidentsInForce(all.items);
   return all;
+}
+
+ErrorRef gone(const MapItemIdentifier& identifier) {
+  const std::string name = writtenNameOfLine(identifier);
+  return transitLineServiceError(TransitLineServiceError::unknownLine,
+                                 "The line " + name + " is not in its feed any more. Choose it anew.", name);
+}
+
+/// `failure` is the reason of lines that have no other; null: they are gone.
+std::vector<LineVerdict> verdictsOf(const std::vector<MapItemIdentifierRef>& identifiers, const Answer& answer,
+                                    const ErrorRef& failure) {
+  std::vector<LineVerdict> verdicts;
+  for (std::size_t i = 0; i < identifiers.size(); ++i) {
+    const TransitLineItemRef item = answer.items.empty() ? nullptr : answer.items[i];
+    ErrorRef reason = answer.reasons.empty() ? nullptr : answer.reasons[i];
+    if (!item && !reason) reason = failure ? failure : gone(*identifiers[i]);
+    verdicts.push_back({identifiers[i], item, reason});
+  }
+  return verdicts;
 }
 
 /// The lines that are left out, taken out of `items`.
@@ -145,7 +175,7 @@ ErrorRef allGone(const std::vector<MapItemIdentifierRef>& gone) {
   for (const MapItemIdentifierRef& identifier : gone) names += " " + writtenNameOfLine(*identifier);
   return transitLineServiceError(
       TransitLineServiceError::unknownLine,
-      "No line of the favorites is in its feed any more:" + names + ". Choose the lines anew.");
+      "No line of the favorites is in its feed any more:" + names + ". Choose the lines anew.", names.substr(1));
 }
 
 ErrorRef tooLate(const FeedLibrary& library) {
@@ -171,6 +201,16 @@ std::vector<MapItemIdentifierRef> GTFSTransitLineService::goneLines() const {
   return _shared->goneLines;
 }
 
+std::vector<LineVerdict> GTFSTransitLineService::verdicts() const {
+  const std::lock_guard guard(_shared->lock);
+  return _shared->verdicts;
+}
+
+std::optional<Date> GTFSTransitLineService::updatedAt() const {
+  const std::lock_guard guard(_shared->lock);
+  return _shared->updatedAt;
+}
+
 const FeedLibrary& GTFSTransitLineService::library() const { return _shared->library; }
 
 std::map<std::string, Date> GTFSTransitLineService::asOf() const {
@@ -183,16 +223,23 @@ std::vector<KnownIncident> GTFSTransitLineService::knownIncidents() const {
   return _shared->known;
 }
 
-void GTFSTransitLineService::lookup(const std::vector<MapItemIdentifierRef>& identifiers, Handler handler) {
+void GTFSTransitLineService::lookup(const std::vector<MapItemIdentifierRef>& identifiers, Handler answer) {
+  const Handler handler = [answered = _answered, answer = std::move(answer)](const auto& items, const auto& error) {
+    if (answered) answered();
+    answer(items, error);
+  };
   std::stop_source giveUp;
-  const auto due = DueAnswer::start([shared = _shared, serviceStop = _stop.get_token(), giveUp, handler]() mutable {
-    giveUp.request_stop();
-    {
-      const std::lock_guard guard(shared->lock);
-      shared->known.clear();
-    }
-    if (!serviceStop.stop_requested()) handler({}, tooLate(shared->library));
-  });
+  const auto due =
+      DueAnswer::start([shared = _shared, serviceStop = _stop.get_token(), giveUp, identifiers, handler]() mutable {
+        giveUp.request_stop();
+        const ErrorRef error = tooLate(shared->library);
+        {
+          const std::lock_guard guard(shared->lock);
+          shared->known.clear();
+          shared->verdicts = verdictsOf(identifiers, {}, error);
+        }
+        if (!serviceStop.stop_requested()) handler({}, error);
+      });
   const auto work = [shared = _shared, due, giveUp, serviceStop = _stop.get_token(), identifiers, handler] {
     if (due->isClaimed()) return;
     const std::stop_callback endWithService(serviceStop, [giveUp = giveUp]() mutable { giveUp.request_stop(); });
@@ -208,6 +255,7 @@ void GTFSTransitLineService::lookup(const std::vector<MapItemIdentifierRef>& ide
       auto outcome = lookUpAll(identifiers, shared->library, language, stop);
       if (due->isClaimed()) return;
       error = outcome ? outcome->error : outcome.error();
+      auto verdicts = verdictsOf(identifiers, outcome ? *outcome : Answer(), outcome ? nullptr : error);
       std::vector<MapItemIdentifierRef> gone;
       if (!error) {
         items = std::move(outcome->items);
@@ -215,6 +263,8 @@ void GTFSTransitLineService::lookup(const std::vector<MapItemIdentifierRef>& ide
         if (items.empty() && !gone.empty()) error = allGone(gone);
       }
       const std::lock_guard guard(shared->lock);
+      shared->verdicts = std::move(verdicts);
+      if (!error) shared->updatedAt = currentDate();
       shared->known = outcome ? std::move(outcome->known) : std::vector<KnownIncident>();
       if (outcome && !outcome->error) {
         shared->goneLines = std::move(gone);
@@ -223,6 +273,8 @@ void GTFSTransitLineService::lookup(const std::vector<MapItemIdentifierRef>& ide
     } catch (const std::exception& exception) {
       error = transitLineServiceError(TransitLineServiceError::internal,
                                       std::string("Looking up the lines failed: ") + exception.what() + ".");
+      const std::lock_guard guard(shared->lock);
+      shared->verdicts = verdictsOf(identifiers, {}, error);
     }
     if (stop.stop_requested()) return;
     Platform::current().mainRunLoop().dispatchAsync([due, serviceStop, handler, items = std::move(items), error] {

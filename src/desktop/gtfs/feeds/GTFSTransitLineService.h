@@ -1,8 +1,10 @@
 #pragma once
 
+#include <functional>
 #include <map>
 #include <memory>
 #include <mutex>
+#include <optional>
 #include <stop_token>
 #include <string>
 #include <vector>
@@ -30,6 +32,9 @@ class GTFSTransitLineService final : public TransitLineService {
   /// The language of incidents' texts for lookups from now on, a BCP 47 tag; "en" until set. Any thread.
   void setLanguage(std::string tag);
 
+  /// Hears of each answer, before its handler does, on the main thread. For lookups from now on; main thread.
+  void setAnswerObserver(std::function<void()> observer) { _answered = std::move(observer); }
+
   /// Errors are of kTransitLineServiceErrorDomain and carry a reason for the user. A lookup of which no line is known
   /// any more is an error too.
   void lookup(const std::vector<MapItemIdentifierRef>& identifiers, Handler handler) override;
@@ -45,6 +50,17 @@ class GTFSTransitLineService final : public TransitLineService {
   /// Those of the last lookup, where it failed; the first ones, when they are many. Any thread.
   std::vector<KnownIncident> knownIncidents() const;
 
+  /// What is known of a line that was asked for.
+  struct LineVerdict {
+    MapItemIdentifierRef identifier;
+    TransitLineItemRef item;  ///< null where nothing is known
+    ErrorRef unknownReason;   ///< null where something is
+  };
+  /// What the last lookup found out, also where it failed for other lines; empty before the first one. Any thread.
+  std::vector<LineVerdict> verdicts() const;
+  /// When the last lookup that succeeded was answered; absent before that. Any thread.
+  std::optional<Date> updatedAt() const;
+
   /// When the publishers made the alerts that the last lookup which succeeded went by, by the names of their feeds;
   /// without those that do not say. Any thread.
   std::map<std::string, Date> asOf() const;
@@ -52,6 +68,7 @@ class GTFSTransitLineService final : public TransitLineService {
  private:
   struct Shared;
   std::shared_ptr<Shared> _shared;
+  std::function<void()> _answered;
   std::stop_source _stop;
   SerialQueue _queue;
 };

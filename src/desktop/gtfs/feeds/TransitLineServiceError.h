@@ -37,6 +37,10 @@ enum class TransitLineServiceError : std::int64_t {
   otherFeed = 19,        ///< a GTFS-Realtime feed that holds no alerts but something else
   foreignAlerts = 20,    ///< the alerts name routes of another static feed
   downloading = 21,      ///< a static feed that has never been here is still coming
+  notAsked = 22,         ///< the line has not been looked up yet
+  notFound = 23,         ///< the server has nothing at the address
+  cutOff = 24,           ///< not all of an answer has come
+  tripsMissing = 25,     ///< the trips that an alert is about cannot be had
 };
 
 /// An error of `kTransitLineServiceErrorDomain`. The subject is the feed's name, or its place without secrets.

@@ -149,7 +149,7 @@ struct Failure {
   std::string what;
 };
 
-Failure cutOff() { return {Code::unreachable, "the connection broke before everything had come. Try again later."}; }
+Failure cutOff() { return {Code::cutOff, "the connection broke before everything had come. Try again later."}; }
 
 Failure failureOf(CURLcode result, const Transfer& transfer) {
   const std::string limit = std::to_string(transfer.request.limit >> 20) + " MiB";
@@ -201,7 +201,7 @@ Failure failureOfStatus(long status) {
   const std::string answered = "its server answers with status " + std::to_string(status) + ". ";
   if (status == 401 || status == 403)
     return {Code::keyNeeded, answered + "The address may need a key from the publisher."};
-  if (status == 404 || status == 410) return {Code::serverFailure, answered + "Check the address."};
+  if (status == 404 || status == 410) return {Code::notFound, answered + "Check the address."};
   return {Code::serverFailure, answered + "Try again later."};
 }
 

@@ -87,7 +87,7 @@ bool writeAll(const FileDescriptor& file, std::string_view bytes) {
 ErrorRef noTrips(const Feed& feed, const std::string& why) {
   const std::string place = feed.staticFeed.publicText();
   return transitLineServiceError(
-      TransitLineServiceError::badStaticFeed,
+      TransitLineServiceError::tripsMissing,
       "An alert names a trip alone, and the trips of the static feed " + place + " cannot be had: " + why + ".", place);
 }
 

@@ -1,0 +1,193 @@
+#include "host/window/LineStates.h"
+
+#include <gtkmm/box.h>
+#include <gtkmm/label.h>
+#include <gtkmm/listboxrow.h>
+
+#include <charconv>
+#include <set>
+
+#include "host/FeedAnswers.h"
+#include "host/window/ShieldImage.h"
+#include "host/window/WidgetTexts.h"
+#include "platform/Localization.h"
+
+namespace nimbo {
+
+namespace {
+
+constexpr std::int64_t kShieldSize = 5;
+constexpr int kShieldColumn = 60;
+
+std::uint64_t numberOf(const protocol::LineIncident& incident) {
+  std::uint64_t number = 0;
+  std::from_chars(incident.id.data(), incident.id.data() + incident.id.size(), number);
+  return number;
+}
+
+struct WordKey {
+  std::string_view word;
+  const char* key;  // of its text
+};
+constexpr WordKey kEffects[] = {
+    {"no_service", "Window_Effect_no_service"},
+    {"reduced_service", "Window_Effect_reduced_service"},
+    {"significant_delays", "Window_Effect_significant_delays"},
+    {"detour", "Window_Effect_detour"},
+    {"additional_service", "Window_Effect_additional_service"},
+    {"modified_service", "Window_Effect_modified_service"},
+    {"stop_moved", "Window_Effect_stop_moved"},
+    {"no_effect", "Window_Effect_no_effect"},
+    {"accessibility_issue", "Window_Effect_accessibility_issue"},
+};
+constexpr WordKey kCauses[] = {
+    {"technical_problem", "Window_Cause_technical_problem"},
+    {"strike", "Window_Cause_strike"},
+    {"demonstration", "Window_Cause_demonstration"},
+    {"accident", "Window_Cause_accident"},
+    {"holiday", "Window_Cause_holiday"},
+    {"weather", "Window_Cause_weather"},
+    {"maintenance", "Window_Cause_maintenance"},
+    {"construction", "Window_Cause_construction"},
+    {"police_activity", "Window_Cause_police_activity"},
+    {"medical_emergency", "Window_Cause_medical_emergency"},
+    {"special_event", "Window_Cause_special_event"},
+};
+
+template <std::size_t Count>
+std::string textOfWord(const WordKey (&words)[Count], const std::string& word) {
+  for (const WordKey& known : words)
+    if (known.word == word) return LocalizedString(known.key);
+  return {};
+}
+
+bool hasIncident(const protocol::LineReport& line, const std::string& id) {
+  for (const auto* list : {&line.incidents, &line.planned})
+    for (const protocol::LineIncident& incident : *list)
+      if (incident.id == id) return true;
+  return false;
+}
+
+}  // namespace
+
+TransitIncidents incidentsOf(const std::vector<protocol::LineIncident>& incidents, const protocol::Lines& all) {
+  TransitIncidents result;
+  for (const protocol::LineIncident& incident : incidents) {
+    TransitIncidentFields fields{.muid = numberOf(incident),
+                                 .title = incident.title,
+                                 .fullDescription = incident.text,
+                                 .startDate = incident.from,
+                                 .endDate = incident.until,
+                                 .linkURL = incident.url};
+    for (const protocol::LineReport& line : all.lines)
+      if (hasIncident(line, incident.id))
+        fields.affectedEntities.push_back(std::make_shared<const BasicAffectedEntity>(line.muid));
+    result.push_back(std::make_shared<const BasicTransitIncident>(std::move(fields)));
+  }
+  return result;
+}
+
+const protocol::LineIncident* incidentNumbered(const protocol::Lines& lines, std::uint64_t muid) {
+  const std::string id = std::to_string(muid);
+  for (const protocol::LineReport& line : lines.lines)
+    for (const auto* list : {&line.incidents, &line.planned})
+      for (const protocol::LineIncident& incident : *list)
+        if (incident.id == id) return &incident;
+  return nullptr;
+}
+
+std::string textOfState(const protocol::LineReport& line) {
+  switch (line.state) {
+    case protocol::LineState::good:
+      return LocalizedString("TransitWidget_GoodService_Title");
+    case protocol::LineState::affected:
+      return LocalizedFormat(LocalizedString("Window_Line_Affected"), {std::uint64_t{line.incidents.size()}});
+    case protocol::LineState::unknown:
+      break;
+  }
+  const std::string reason =
+      line.reason ? textOfError(*errorOf(*line.reason)) : LocalizedString("TransitWidgetLoadingError_Unknown");
+  return LocalizedFormat(LocalizedString("Window_Line_Unknown"), {reason});
+}
+
+std::string textOfSeverity(protocol::Severity severity) {
+  static constexpr const char* kKeys[] = {"", "Window_Severity_info", "Window_Severity_warning",
+                                          "Window_Severity_severe"};
+  return severity == protocol::Severity::unknown ? "" : LocalizedString(kKeys[static_cast<std::size_t>(severity)]);
+}
+std::string textOfEffect(const std::string& effect) { return textOfWord(kEffects, effect); }
+std::string textOfCause(const std::string& cause) { return textOfWord(kCauses, cause); }
+
+const char* styleOfState(protocol::LineState state) {
+  return state == protocol::LineState::good ? "good" : state == protocol::LineState::affected ? "affected" : "failed";
+}
+
+std::string nameBesideShield(const protocol::LineReport& line) {
+  const std::string shortName = line.shield ? line.shield->text.value_or("") + ", " : ", ";
+  return line.name.starts_with(shortName) ? line.name.substr(shortName.size()) : line.name;
+}
+
+std::size_t countOfPlanned(const protocol::Lines& lines) {
+  std::set<std::string> planned;
+  for (const protocol::LineReport& line : lines.lines)
+    for (const protocol::LineIncident& incident : line.planned) planned.insert(incident.id);
+  return planned.size();
+}
+
+LineStates::LineStates(const PageContext& context) : _context(context) {
+  add_css_class("card");
+  set_selection_mode(Gtk::SelectionMode::NONE);
+  signal_row_activated().connect([this](Gtk::ListBoxRow* row) {
+    _context.navigator.open(ShowFavoriteLine{_identifiers.at(static_cast<std::size_t>(row->get_index()))});
+  });
+  hide();
+}
+
+void LineStates::show(const protocol::Lines& lines) {
+  int focused = -1;
+  for (int i = 0; const Gtk::ListBoxRow* row = get_row_at_index(i); ++i)
+    if (row->has_focus()) focused = i;
+  while (Gtk::ListBoxRow* row = get_row_at_index(0)) remove(*row);
+  _identifiers.clear();
+  const DateText dates(_context.preferences.locale());
+  for (const protocol::LineReport& line : lines.lines) {
+    _identifiers.push_back(line.id);
+    append(*makeRow(line, dates));
+  }
+  set_visible(!lines.lines.empty());
+  if (Gtk::ListBoxRow* row = focused < 0 ? nullptr : get_row_at_index(focused)) row->grab_focus();
+}
+
+Gtk::Widget* LineStates::makeRow(const protocol::LineReport& line, const DateText& dates) const {
+  auto* row = Gtk::make_managed<Gtk::ListBoxRow>();
+  auto* box = Gtk::make_managed<Gtk::Box>(Gtk::Orientation::HORIZONTAL, 8);
+  box->add_css_class("item");
+  auto* shield = Gtk::make_managed<Gtk::Box>();
+  shield->set_size_request(kShieldColumn, -1);
+  shield->append(*Gtk::make_managed<ShieldImage>(_context.preferences, artworkOf(line.shield), kShieldSize));
+  box->append(*shield);
+  auto* texts = Gtk::make_managed<Gtk::Box>(Gtk::Orientation::VERTICAL, 2);
+  std::vector<std::string> said{line.name};
+  const auto add = [&](const std::string& text, const char* style) {
+    if (text.empty()) return;
+    auto* label = Gtk::make_managed<Gtk::Label>(text);
+    label->add_css_class(style);
+    label->set_xalign(0);
+    texts->append(*label);
+    if (said.size() > 1 || text != nameBesideShield(line)) said.push_back(text);
+  };
+  add(nameBesideShield(line), "item-text");
+  add(textOfState(line), styleOfState(line.state));
+  if (!line.planned.empty()) {
+    const protocol::LineIncident& next = line.planned.front();
+    add(LocalizedFormat(LocalizedString("Window_Line_Planned"), {dates.textOf(*next.from), next.title}),
+        "item-caption");
+  }
+  box->append(*texts);
+  row->set_child(*box);
+  setAccessibleLabel(*row, CommaDelimitedList(said));
+  wrapTexts(*row);
+  return row;
+}
+
+}  // namespace nimbo

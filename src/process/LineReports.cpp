@@ -1,0 +1,129 @@
+#include "process/LineReports.h"
+
+#include <algorithm>
+#include <unordered_map>
+
+#include "desktop/gtfs/alerts/IncidentReader.h"
+#include "desktop/gtfs/feeds/TransitLineServiceError.h"
+#include "desktop/gtfs/static/LineItems.h"
+#include "platform/SystemServices.h"
+#include "process/Snapshot.h"
+
+namespace nimbo {
+
+namespace {
+
+using LineVerdict = GTFSTransitLineService::LineVerdict;
+
+constexpr TimeInterval kPlannedAhead = 7 * 86400;
+/// Bytes; an answer has 4 MiB, and a text in JSON may take twice its room.
+constexpr std::size_t kRoomForIncidents = 3 << 19;
+
+// Of the reference, by their numbers.
+constexpr const char* kEffects[] = {"unknown_effect", "no_service",         "reduced_service",  "significant_delays",
+                                    "detour",         "additional_service", "modified_service", "other_effect",
+                                    "unknown_effect", "stop_moved",         "no_effect",        "accessibility_issue"};
+constexpr const char* kCauses[] = {
+    "unknown_cause", "unknown_cause",   "other_cause",       "technical_problem", "strike",
+    "demonstration", "accident",        "holiday",           "weather",           "maintenance",
+    "construction",  "police_activity", "medical_emergency", "special_event"};
+
+template <std::size_t Count>
+std::string wordOf(const char* const (&words)[Count], std::int32_t number) {
+  return words[number > 0 && number < static_cast<std::int32_t>(Count) ? number : 0];
+}
+
+protocol::LineIncident incidentOf(const TransitIncident& incident) {
+  protocol::LineIncident result{.id = std::to_string(incident.muid()),
+                                .title = incident.title().value_or(""),
+                                .text = incident.fullDescription() ? incident.fullDescription() : incident.summary(),
+                                .from = incident.startDate(),
+                                .until = incident.endDate(),
+                                .url = incident.linkURL(),
+                                .effect = wordOf(kEffects, 0),
+                                .cause = wordOf(kCauses, 0)};
+  if (const auto* alert = dynamic_cast<const AlertIncident*>(&incident)) {
+    const AlertIncident::Fields& fields = alert->fields();
+    result.severity = static_cast<protocol::Severity>(fields.severity - kUnknownSeverity);
+    result.effect = wordOf(kEffects, static_cast<std::int32_t>(fields.effect));
+    result.cause = wordOf(kCauses, fields.cause);
+  }
+  return result;
+}
+
+/// Makes the reports of one answer.
+class Reports {
+ public:
+  void addVerdict(protocol::LineReport& report, const LineVerdict& verdict) {
+    if (verdict.unknownReason) {
+      report.reason = fetchErrorOf(*verdict.unknownReason);
+      return;
+    }
+    report.state = protocol::LineState::good;
+    for (const TransitIncidentRef& incident : verdict.item->incidents()) {
+      const auto start = incident->startDate(), end = incident->endDate();
+      if (end && *end < _now) continue;
+      if (!start || *start <= _now) {
+        report.state = protocol::LineState::affected;
+        add(report.incidents, *incident);
+      } else if (intervalBetween(_now, *start) <= kPlannedAhead) {
+        add(report.planned, *incident);
+      }
+    }
+    std::stable_sort(report.incidents.begin(), report.incidents.end(),
+                     [](const auto& a, const auto& b) { return a.severity > b.severity; });
+    std::stable_sort(report.planned.begin(), report.planned.end(),
+                     [](const auto& a, const auto& b) { return a.from < b.from; });
+  }
+
+ private:
+  void add(std::vector<protocol::LineIncident>& list, const TransitIncident& incident) {
+    protocol::LineIncident written = incidentOf(incident);
+    constexpr std::size_t kFrame = 300;  // keys and dates
+    const std::size_t size =
+        kFrame + written.title.size() + written.text.value_or("").size() + written.url.value_or("").size();
+    if (size > _room) return;
+    _room -= size;
+    list.push_back(std::move(written));
+  }
+
+  const Date _now = currentDate();
+  std::size_t _room = kRoomForIncidents;
+};
+
+}  // namespace
+
+protocol::Lines lineReports(const FavoritesEditor& editor, const GTFSTransitLineService& service) {
+  protocol::Lines result{.updated = service.updatedAt()};
+  const auto favorites = editor.left();
+  const ErrorRef damage = favorites ? editor.list().error() : favorites.error();
+  if (damage) result.error = fetchErrorOf(*damage);
+  if (!favorites) return result;
+  std::unordered_map<std::uint64_t, LineVerdict> verdicts;
+  for (LineVerdict& verdict : service.verdicts())
+    verdicts.emplace(verdict.identifier->muid(), damage ? LineVerdict{verdict.identifier, nullptr, damage} : verdict);
+  const ErrorRef notAsked = damage ? damage
+                                   : transitLineServiceError(TransitLineServiceError::notAsked,
+                                                             "The line has not been looked up yet. Update to see it.");
+  Reports reports;
+  for (const FavoriteRef& favorite : *favorites) {
+    const auto* kept = dynamic_cast<const FavoriteTransitLine*>(favorite.get());
+    if (!kept || !kept->transitLine()) continue;
+    const TransitLine& line = *kept->transitLine();
+    const auto found = verdicts.find(line.muid());
+    const LineVerdict verdict =
+        found == verdicts.end() ? LineVerdict{line.identifier(), nullptr, notAsked} : found->second;
+    const TransitLine& shown = verdict.item ? *verdict.item : line;
+    protocol::LineReport& report = result.lines.emplace_back();
+    report.id = writtenNameOfLine(*line.identifier());
+    report.muid = line.muid();
+    report.name = shown.artwork() ? shown.artwork()->accessibilityText().value_or("") : "";
+    if (report.name.empty()) report.name = shown.name().value_or(report.id);
+    if (shown.system()) report.agency = shown.system()->name();
+    if (shown.artwork()) report.shield = shieldOf(*shown.artwork());
+    reports.addVerdict(report, verdict);
+  }
+  return result;
+}
+
+}  // namespace nimbo

@@ -1,0 +1,13 @@
+#pragma once
+
+#include "desktop/gtfs/feeds/GTFSTransitLineService.h"
+#include "desktop/store/FavoritesEditor.h"
+#include "protocol/Lines.h"
+
+namespace nimbo {
+
+/// What the last lookup found out of each favorite line. A favorite that it did not ask for is unknown, as is every one
+/// that is left of damaged favorites. Texts of all incidents take 1.5 MiB at most; incidents beyond that are left out.
+protocol::Lines lineReports(const FavoritesEditor& favorites, const GTFSTransitLineService& service);
+
+}  // namespace nimbo
