@@ -161,6 +161,7 @@ void WidgetPage::buildLines() {
   _planned.signal_clicked().connect([this] { _context.navigator.open(ShowPlanned()); });
   _planned.hide();
   content().append(_planned);
+  content().append(_sampleNotice);
   content().append(_lines);
 }
 
@@ -198,7 +199,6 @@ void WidgetPage::buildPlaces() {
   button->signal_clicked().connect([this] { _context.navigator.open(ShowFeeds()); });
   _sampleNotice.append(*text);
   _sampleNotice.append(*button);
-  content().append(_sampleNotice);
 
   _places.add_css_class("card");
   _places.set_selection_mode(Gtk::SelectionMode::NONE);

@@ -106,6 +106,13 @@ class Window:
             # A page that is still to slide in stands beside the window.
             return box.width > 0 and box.height > 1 and box.x >= 0 and (box.x + box.width // 2, box.y + box.height // 2)
 
+        def is_in_view():
+            box, window = self.box(name, role), self.frame().get_extents(Atspi.CoordType.WINDOW)
+            if box.height <= 1 or box.y + box.height <= window.height:
+                return True
+            press("mousemove", str(window.width // 2), str(window.height // 2), "click", "5")
+
+        wait(f"{name} in view", is_in_view)
         places = [None, wait(f"a place of {name}", place)]
         # Until it stands still.
         wait(f"rest of {name}", lambda: places.append(wait(name, place)) or places[-1] == places[-2])

@@ -151,11 +151,26 @@ def tour(session, folder):
 
     for url, sight in (("http://example.org/", "“http://example.org/” cannot be opened here"),
                        ("nimbo://activity?type=org.nimbo.Map.Transit.Incident&bs=AAAA", "cannot be shown"),
+                       ("nimbo://line?id=town:none", "No line “town:none” is known"),
+                       ("nimbo://incident?id=1", "is over, or does not concern your lines"),
+                       ("nimbo://incident?id=x", "“nimbo://incident.id=x” cannot be opened here"),
+                       ("nimbo://line?id=town:m3", "Add this line to your favorites"),
+                       ("nimbo://line?id=town:m1", "The cows are gone"),
                        ("nimbo://?favorites=2&t=r", "Move 1, Harbour Line down"),
                        (sample_activity_url(os.path.join(folder, "sample")), "Trains every 12 minutes"),
                        ("nimbo://", "Good Service")):
         open_url(url)
         window.see(sight)
+
+    window.click("1, Harbour Line, 1 incident", "list item")
+    window.see_page("1, Harbour Line")
+    window.see("The cows are gone")
+    for change in "Remove 1, Harbour Line from", "Add 1, Harbour Line to", "Remove 1, Harbour Line from":
+        window.see(change)
+        window.click(f"{change} favorites")
+    press("key", "Escape")
+    wait("the line gone from the list", lambda: not window.find("1, Harbour Line, ", "list item"))
+    subprocess.run([command_line, "favorite", "add", "town:m1"], check=True)
 
     with socket.create_server(("127.0.0.1", 0)) as silent:
         subprocess.run([command_line, "feed", "remove", "other"], check=True)
