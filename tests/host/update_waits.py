@@ -1,0 +1,53 @@
+#!/usr/bin/python3
+"""What "update" does while static feeds are still coming, with this file as its widget.
+usage: update_waits.py NIMBO_TRANSIT"""
+import json
+import os
+import subprocess
+import sys
+import tempfile
+
+# What the widget answers to the first and the later requests of a method.
+ANSWERS = {
+    "performUpdate": [{"updateResult": "failed", "reason": "12 MiB have come.", "downloading": True},
+                      {"updateResult": "newData"}],
+    "downloads": [{"downloads": [{"feed": "metro", "received": 1}]}, {"downloads": []}],
+    "initialize": [{"name": "widget", "version": "1", "protocol": 1}],
+}
+
+
+def play_widget(failure):
+    asked = {"viewWillDisappear": 0}
+    for line in sys.stdin:
+        request = json.loads(line)
+        method = request["method"]
+        answers = [{"failure": failure}] if failure and method == "viewWillDisappear" else ANSWERS.get(method, [{}])
+        result = answers[min(asked.get(method, 0), len(answers) - 1)]
+        asked[method] = asked.get(method, 0) + 1
+        if method == "shutdown":
+            print(json.dumps(asked), file=sys.stderr)
+        print(json.dumps({"jsonrpc": "2.0", "id": request["id"], "result": result}), flush=True)
+
+
+if sys.argv[1] == "--widget":
+    play_widget(sys.argv[2])
+    sys.exit()
+
+with tempfile.TemporaryDirectory() as folder:
+    def update(failure=""):
+        widget = os.path.join(folder, "widget")
+        with open(widget, "w") as file:
+            file.write(f"#!/bin/sh\nexec /usr/bin/python3 '{__file__}' --widget '{failure}'\n")
+        os.chmod(widget, 0o700)
+        return subprocess.run([sys.argv[1], "--config", folder, "--state", folder, "update"], capture_output=True,
+                              text=True, env=dict(os.environ, NIMBO_TRANSIT_WIDGET=widget))
+
+    waited = update()
+    assert waited.returncode == 0, waited
+    *messages, asked = waited.stderr.splitlines()
+    assert messages == ["nimbo-transit: 12 MiB have come.",
+                        'nimbo-transit: waiting for the static feed of "metro"'], messages
+    asked = json.loads(asked)
+    assert asked["performUpdate"] == 2 and asked["downloads"] == 2, asked
+    unkept = update("The disk is full.")
+    assert unkept.returncode == 1 and unkept.stderr.endswith("\nnimbo-transit: the rows cannot be kept: The disk is full.\n")
