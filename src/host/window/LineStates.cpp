@@ -6,6 +6,7 @@
 
 #include <charconv>
 #include <set>
+#include <utility>
 
 #include "host/FeedAnswers.h"
 #include "host/window/ShieldImage.h"
@@ -134,6 +135,17 @@ std::size_t countOfPlanned(const protocol::Lines& lines) {
   return planned.size();
 }
 
+namespace {
+
+/// What comes next on a line; empty without anything.
+std::string textOfPlanned(const protocol::LineReport& line, const DateText& dates) {
+  if (line.planned.empty()) return {};
+  const protocol::LineIncident& next = line.planned.front();
+  return LocalizedFormat(LocalizedString("Window_Line_Planned"), {dates.textOf(*next.from), next.title});
+}
+
+}  // namespace
+
 LineStates::LineStates(const PageContext& context) : _context(context) {
   add_css_class("card");
   set_selection_mode(Gtk::SelectionMode::NONE);
@@ -144,12 +156,17 @@ LineStates::LineStates(const PageContext& context) : _context(context) {
 }
 
 void LineStates::show(const protocol::Lines& lines) {
+  const DateText dates(_context.preferences.locale());
+  std::string texts;
+  for (const protocol::LineReport& line : lines.lines)
+    for (const std::string& text : {line.id, line.name, textOfState(line), textOfPlanned(line, dates)})
+      texts += text + "\n";
+  if (std::exchange(_texts, texts) == texts) return;  // rows stay, with the focus and whatever is over them
   int focused = -1;
   for (int i = 0; const Gtk::ListBoxRow* row = get_row_at_index(i); ++i)
     if (row->has_focus()) focused = i;
   while (Gtk::ListBoxRow* row = get_row_at_index(0)) remove(*row);
   _identifiers.clear();
-  const DateText dates(_context.preferences.locale());
   for (const protocol::LineReport& line : lines.lines) {
     _identifiers.push_back(line.id);
     append(*makeRow(line, dates));
@@ -178,11 +195,7 @@ Gtk::Widget* LineStates::makeRow(const protocol::LineReport& line, const DateTex
   };
   add(nameBesideShield(line), "item-text");
   add(textOfState(line), styleOfState(line.state));
-  if (!line.planned.empty()) {
-    const protocol::LineIncident& next = line.planned.front();
-    add(LocalizedFormat(LocalizedString("Window_Line_Planned"), {dates.textOf(*next.from), next.title}),
-        "item-caption");
-  }
+  add(textOfPlanned(line, dates), "item-caption");
   box->append(*texts);
   row->set_child(*box);
   setAccessibleLabel(*row, CommaDelimitedList(said));

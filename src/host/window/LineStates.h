@@ -44,6 +44,7 @@ class LineStates final : public Gtk::ListBox {
 
   const PageContext& _context;
   std::vector<std::string> _identifiers;  // of the rows
+  std::string _texts;                     // in them
 };
 
 }  // namespace nimbo

@@ -156,6 +156,7 @@ void WidgetPage::buildLines() {
   _updated.add_css_class("item-caption");
   _updated.hide();
   content().append(_updated);
+  _planned.set_child(_plannedText);
   _planned.add_css_class("flat");
   _planned.set_halign(Gtk::Align::START);
   _planned.signal_clicked().connect([this] { _context.navigator.open(ShowPlanned()); });
@@ -169,7 +170,8 @@ void WidgetPage::showLines(const protocol::Lines& lines, std::optional<Date> upd
   _context.lines = lines;
   _lines.show(lines);
   const std::size_t planned = countOfPlanned(lines);
-  _planned.set_label(LocalizedFormat(LocalizedString("Window_Planned_Count"), {std::uint64_t{planned}}));
+  _plannedText.set_text(LocalizedFormat(LocalizedString("Window_Planned_Count"), {std::uint64_t{planned}}));
+  setAccessibleLabel(_planned, _plannedText.get_text());
   _planned.set_visible(planned > 0);
   if (updated)
     _updated.set_text(

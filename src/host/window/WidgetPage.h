@@ -66,7 +66,7 @@ class WidgetPage final : public Page, private WidgetHostProcess::Delegate {
   Gtk::Label _failureReason, _failureDetail;
   Gtk::Box _gone{Gtk::Orientation::VERTICAL, 8};
   Gtk::Label _goneText;
-  Gtk::Label _updated;
+  Gtk::Label _updated, _plannedText;
   Gtk::Button _planned;
   LineStates _lines{_context};
   Gtk::Box _sampleNotice{Gtk::Orientation::VERTICAL, 8};

@@ -115,7 +115,7 @@ class Window:
         wait(f"{name} in view", is_in_view)
         places = [None, wait(f"a place of {name}", place)]
         # Until it stands still.
-        wait(f"rest of {name}", lambda: places.append(wait(name, place)) or places[-1] == places[-2])
+        wait(f"rest of {name}", lambda: places.append(wait(name, place)) or places[-3:].count(places[-1]) == 3)
         press("mousemove", *map(str, places[-1]), "click", "1")
 
     def comes_to_front(self):
