@@ -59,20 +59,21 @@ class WatchedWidget {
   }
   /// A request that may be answered with an error; the error counts when there is no result. Answers its identifier.
   template <class Params, class Result>
-  std::int64_t call(const protocol::Method<Params, Result>& method, const Params& params,
-            std::function<void(const std::optional<std::type_identity_t<Result>>& result, const JSONRPCError& error)>
-                completion) {
+  std::int64_t call(
+      const protocol::Method<Params, Result>& method, const Params& params,
+      std::function<void(const std::optional<std::type_identity_t<Result>>& result, const JSONRPCError& error)>
+          completion) {
     return send(method.name, protocol::write(params), method.waitsForFeeds,
-         [this, name = method.name, completion = std::move(completion)](const nlohmann::json& json,
-                                                                        const std::optional<JSONRPCError>& error) {
-           std::optional<Result> result;
-           try {
-             if (!error) result = protocol::read<Result>(json);
-           } catch (const protocol::Malformed& malformed) {
-             return fail(nonsense(name, malformed));
-           }
-           completion(result, error.value_or(JSONRPCError()));
-         });
+                [this, name = method.name, completion = std::move(completion)](
+                    const nlohmann::json& json, const std::optional<JSONRPCError>& error) {
+                  std::optional<Result> result;
+                  try {
+                    if (!error) result = protocol::read<Result>(json);
+                  } catch (const protocol::Malformed& malformed) {
+                    return fail(nonsense(name, malformed));
+                  }
+                  completion(result, error.value_or(JSONRPCError()));
+                });
   }
   /// Gives the process up for what its host finds wrong with it.
   void fail(const std::string& reason);

@@ -154,7 +154,7 @@ void CommandLine::addFeedCommands() {
   CLI::App* lines = add(_app, "lines", "List the lines of all feeds",
                         [this](const CommandContext& context) { return runLines(context, _text, _json); });
   lines->add_flag("--json", _json, "As JSON");
-  lines->add_option("TEXT", _text, "Only lines whose name, agency or identifier contains this");
+  lines->add_option("TEXT", _text, "Only lines with these words in name, agency or identifier, the nearest first");
 }
 
 void CommandLine::addFavoriteCommands() {

@@ -3,7 +3,6 @@
 #include <mutex>
 #include <thread>
 
-#include "desktop/gtfs/feeds/FeedCatalog.h"
 #include "desktop/gtfs/feeds/FeedCheck.h"
 #include "desktop/gtfs/feeds/FeedMuid.h"
 #include "process/FeedMessages.h"
@@ -17,6 +16,9 @@ namespace nimbo {
 using nlohmann::json;
 
 namespace {
+
+/// Seconds for which the next request is waited for.
+constexpr TimeInterval kLeisure = 60;
 
 /// Bytes of lines in an answer, which may take four times as many as JSON.
 constexpr std::size_t kMostLineBytes = JSONRPCConnection::kMaximumLine / 8;
@@ -68,10 +70,11 @@ struct FeedRequests::Running {
 };
 
 FeedRequests::FeedRequests(const FeedLibrary& library, RunLoop& runLoop, JSONRPCConnection& connection)
-    : _library(library), _runLoop(runLoop), _connection(connection) {}
+    : _library(library), _catalog(library), _runLoop(runLoop), _connection(connection) {}
 
 FeedRequests::~FeedRequests() {
-  if (_second) _second->invalidate();
+  for (const auto& timer : {_second, _leisure})
+    if (timer) timer->invalidate();
   for (const auto& [number, running] : _running) running->thread.request_stop();
   for (const auto& [number, running] : _running) running->responder.fail(kCancelled);
 }
@@ -99,12 +102,18 @@ void FeedRequests::start(const JSONRPCResponder& responder, Work work) {
     });
   });
   _running.emplace(number, running);
+  if (_leisure) std::exchange(_leisure, nullptr)->invalidate();
   if (!_second) _second = _runLoop.scheduleTimer(1, true, [this](Timer&) { tellProgress(); });
 }
 
 void FeedRequests::finish(std::uint64_t number) {
   _running.erase(number);
-  if (_running.empty()) std::exchange(_second, nullptr)->invalidate();
+  if (!_running.empty()) return;
+  std::exchange(_second, nullptr)->invalidate();
+  _leisure = _runLoop.scheduleTimer(kLeisure, false, [this](Timer&) {
+    _leisure = nullptr;
+    _catalog.forget();
+  });
 }
 
 void FeedRequests::tellProgress() {
@@ -138,9 +147,9 @@ void FeedRequests::findLines(const protocol::FindLinesParams& params, const JSON
   start(responder, [this, params](Running& running, const std::stop_token& stop) {
     const FeedCatalog::Query query{params.query, params.feed, params.offset,
                                    std::min(params.limit, protocol::FindLinesParams::kMostLines)};
-    const auto found = FeedCatalog(_library).find(
-        query, stop,
-        [&](const std::string& feed, std::size_t done, std::size_t all) { running.reads(feed, done, all); });
+    const auto found = _catalog.find(query, stop, [&](const std::string& feed, std::size_t done, std::size_t all) {
+      running.reads(feed, done, all);
+    });
     if (!found) return protocol::write(protocol::FoundLines{.failures = {fetchErrorOf(*found.error())}});
     protocol::FoundLines answer{.total = found->total, .failures = writtenErrors(found->errors)};
     std::size_t size = 0;
@@ -164,7 +173,7 @@ void FeedRequests::describeLines(const protocol::DescribeLinesParams& params, co
                                "\" must have an \"id\" such as \"FEED:ROUTE_ID\", or else a \"muid\"");
   }
   start(responder, [this, identifiers](Running& running, const std::stop_token& stop) {
-    const auto found = FeedCatalog(_library).describe(
+    const auto found = _catalog.describe(
         identifiers, stop,
         [&](const std::string& feed, std::size_t done, std::size_t all) { running.reads(feed, done, all); });
     protocol::DescribedLines answer;

@@ -5,7 +5,7 @@
 #include <memory>
 #include <stop_token>
 
-#include "desktop/gtfs/feeds/FeedLibrary.h"
+#include "desktop/gtfs/feeds/FeedCatalog.h"
 #include "desktop/rpc/JSONRPCConnection.h"
 #include "platform/RunLoop.h"
 #include "protocol/Feeds.h"
@@ -13,7 +13,8 @@
 namespace nimbo {
 
 /// Answers what the host asks of feeds, each request on a thread of its own, since feeds may take as long as servers
-/// do. Of a request that runs for longer the host hears every second how far it is. Main thread only.
+/// do. What searches compare is kept for a minute after the last request. Of a request that runs for longer the host
+/// hears every second how far it is. Main thread only.
 class FeedRequests {
  public:
   /// The library, the loop and the connection outlive this.
@@ -41,11 +42,13 @@ class FeedRequests {
   void tellProgress();
 
   const FeedLibrary& _library;
+  FeedCatalog _catalog;
   RunLoop& _runLoop;
   JSONRPCConnection& _connection;
   std::map<std::uint64_t, std::shared_ptr<Running>> _running;
   std::uint64_t _nextNumber = 0;
-  std::shared_ptr<Timer> _second;  // while something runs
+  std::shared_ptr<Timer> _second;   // while something runs
+  std::shared_ptr<Timer> _leisure;  // until what is kept goes
   std::shared_ptr<bool> _alive = std::make_shared<bool>(true);
 };
 

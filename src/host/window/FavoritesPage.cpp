@@ -14,7 +14,7 @@ namespace nimbo {
 
 namespace {
 
-/// More lines than anybody reads: the search narrows them.
+/// Lines that are shown at once.
 constexpr std::size_t kLineLimit = 100;
 
 bool isUnknownFeed(const protocol::FetchError& failure) {
@@ -53,6 +53,11 @@ FavoritesPage::FavoritesPage(const PageContext& context)
   _notice.add_css_class("item-caption");
   content().append(_searching);
   content().append(_notice);
+  _more.set_label(LocalizedString("Window_ShowMore"));
+  _more.set_halign(Gtk::Align::START);
+  _more.signal_clicked().connect([this] { askForLines(_shown); });
+  _more.hide();
+  content().append(_more);
   readFavorites();
   lookForGone();
   search();
@@ -132,29 +137,33 @@ void FavoritesPage::showFavorites() {
 
 void FavoritesPage::search() {
   showFavorites();
-  _searching.start();
-  _search = _context.process->ask(
-      protocol::kFindLines, {.query = _query.get_text().raw(), .limit = kLineLimit}, [this](const auto& found) {
-        _found = found ? *found : protocol::FoundLines{.failures = {failureOf(*found.error())}};
-        showFound();
-      });
+  askForLines(0);
 }
 
-void FavoritesPage::showFound() {
-  _searching.stop();
-  clear(_linesList);
-  for (const protocol::FeedLine& found : _found.lines) {
-    const TransitLineRef line = lineOf(found);
+void FavoritesPage::askForLines(std::size_t offset) {
+  _searching.start();
+  const protocol::FindLinesParams params{.query = _query.get_text().raw(), .offset = offset, .limit = kLineLimit};
+  _search = _context.process->ask(protocol::kFindLines, params, [this, offset](const auto& found) {
+    _searching.stop();
+    if (offset == 0) clear(_linesList);
+    showFound(found ? *found : protocol::FoundLines{.failures = {failureOf(*found.error())}}, offset);
+  });
+}
+
+void FavoritesPage::showFound(const protocol::FoundLines& found, std::size_t offset) {
+  for (const protocol::FeedLine& described : found.lines) {
+    const TransitLineRef line = lineOf(described);
     _linesList.append(*Gtk::make_managed<LineRow>(_context, line, isFavorite(*line), [this, line] { toggle(line); }));
   }
-  _linesList.set_visible(!_found.lines.empty());
+  _shown = offset + found.lines.size();
+  _more.set_visible(found.total > _shown && !found.lines.empty());
+  _linesList.set_visible(_shown > 0);
   std::string notice;
   const auto addNotice = [&notice](const std::string& text) { notice += (notice.empty() ? "" : "\n") + text; };
-  if (_found.total > _found.lines.size())
-    addNotice(
-        LocalizedFormat(LocalizedString("Window_Favorites_More"), {std::uint64_t{_found.total - _found.lines.size()}}));
-  if (_found.lines.empty() && _found.failures.empty()) addNotice(LocalizedString("Window_Favorites_NothingFound"));
-  for (const protocol::FetchError& failure : _found.failures) addNotice(textOfError(*errorOf(failure)));
+  if (found.total > _shown)
+    addNotice(LocalizedFormat(LocalizedString("Window_Favorites_More"), {std::uint64_t{found.total - _shown}}));
+  if (_shown == 0 && found.failures.empty()) addNotice(LocalizedString("Window_Favorites_NothingFound"));
+  for (const protocol::FetchError& failure : found.failures) addNotice(textOfError(*errorOf(failure)));
   _notice.set_text(notice);
   _notice.set_visible(!notice.empty());
 }

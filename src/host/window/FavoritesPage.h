@@ -1,5 +1,6 @@
 #pragma once
 
+#include <gtkmm/button.h>
 #include <gtkmm/label.h>
 #include <gtkmm/listbox.h>
 #include <gtkmm/searchentry.h>
@@ -25,7 +26,9 @@ class FavoritesPage final : public Page {
   /// Looks up which favourites' feeds are gone, or do not know them any more.
   void lookForGone();
   void search();
-  void showFound();
+  /// Looks for the lines from this one on.
+  void askForLines(std::size_t offset);
+  void showFound(const protocol::FoundLines& found, std::size_t offset);
   void toggle(TransitLineRef line);
   void move(TransitLineRef line, std::size_t position);
   /// Shows the state after a change, or why there was none.
@@ -35,11 +38,12 @@ class FavoritesPage final : public Page {
   const PageContext& _context;
   std::vector<TransitLineRef> _favorites;
   std::map<std::uint64_t, const char*> _gone;  // why, as a text's key, by the favourites' numbers
-  protocol::FoundLines _found;
+  std::size_t _shown = 0;                      // lines that were found
   Gtk::SearchEntry _query;
   Gtk::Label _favoritesTitle, _noFavorites, _linesTitle, _notice;
   Gtk::ListBox _favoritesList, _linesList;
   Gtk::Spinner _searching;
+  Gtk::Button _more;
   std::shared_ptr<WidgetHostProcess::Question> _search, _goneLookup;
 };
 

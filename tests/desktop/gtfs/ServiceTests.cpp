@@ -261,5 +261,48 @@ TEST_F(LineServiceTest, CatalogFindsLines) {
   EXPECT_EQ(catalog.find({.feed = "north", .limit = 1})->total, 2u);
 }
 
+TEST_F(LineServiceTest, CatalogPutsTheNearestLinesFirst) {
+  folder.write("city/agency.txt", "agency_id,agency_name\nM,Alameda Metro\nB,Autobusi Sofia\n");
+  folder.write("city/routes.txt",
+               "route_id,agency_id,route_short_name,route_long_name,route_type\n"
+               "r1,M,10,Harbour Line,1\nr2,M,1,Grand Harbour,1\nr3,M,A,Castle,1\nr4,B,BA,Ring – Витоша,3\n"
+               "r5,B,,Züri Älpli,3\nr6,B,X1,Ångström,3\n");
+  ASSERT_FALSE(
+      FeedConfiguration(paths.config)
+          .add({"city", *FeedAddress::parse((folder.path() / "city").native()), *FeedAddress::parse("/none")}));
+  const FeedLibrary library(paths);
+  FeedCatalog catalog(library);
+  const struct {
+    const char *text, *found;
+  } cases[] = {
+      {"", "r1 r2 r3 r4 r5 r6"},
+      {"A", "r3 r6 r5 r1 r2 r4"},  // itself, a name's beginning, a word's, within names
+      {"1", "r2 r1 r6"},
+      {"витоша", "r4"},
+      {" line  HARBOUR ", "r1"},
+      {"harbour", "r1 r2"},
+      {"zuri", "r5"},
+      {"alameda 1", "r2 r1"},
+      {"sofia ring", "r4"},
+      {"CITY:r2", "r2"},
+      {"city:r", "r1 r2 r3 r4 r5 r6"},
+      {"r6", "r6"},
+      {"town:r2", ""},
+      {"harbour castle", ""},
+  };
+  for (const auto& c : cases) {
+    std::string found;
+    const auto hits = catalog.find({.text = c.text, .limit = 100});
+    for (const auto& [line, longName] : hits->lines)
+      found += (found.empty() ? "" : " ") + line->identifier()->locator()->routeID;
+    EXPECT_EQ(found, c.found) << c.text;
+  }
+  const auto rest = catalog.find({.text = "A", .offset = 4, .limit = 1});
+  EXPECT_EQ(rest->total, 6u);
+  EXPECT_EQ(rest->lines.at(0).line->identifier()->locator()->routeID, "r2");
+  folder.write("city/routes.txt", "route_id,route_short_name,route_type\nr7,A,1\n");
+  EXPECT_EQ(catalog.find({.text = "a", .limit = 9})->total, 1u) << "not what was kept of the feed before";
+}
+
 }  // namespace
 }  // namespace nimbo

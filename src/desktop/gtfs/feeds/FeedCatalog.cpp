@@ -4,22 +4,17 @@
 
 #include "desktop/gtfs/feeds/FeedLookup.h"
 #include "desktop/gtfs/static/LineItems.h"
-#include "desktop/gtfs/text/Utf8.h"
 
 namespace nimbo {
 
 namespace {
 
-bool holds(std::string_view text, const std::string& part) {
-  return asciiLowerCase(text).find(part) != std::string::npos;
-}
-
-bool isHit(const StaticFeed& feed, const StaticLine& line, const std::string& part) {
-  const StaticAgency agency = feed.agency(line.agency);
-  if (line.routeID.size() + line.shortName.size() + agency.id.size() > FeedCatalog::kLongestIdentifiers) return false;
-  return holds(line.shortName, part) || holds(line.longName, part) || holds(line.routeID, part) ||
-         holds(agency.name, part);
-}
+/// A line that was found, in the feed of this place among those that were searched.
+struct Hit {
+  unsigned distance;
+  std::size_t feed;
+  std::size_t line;
+};
 
 FeedCatalog::Line lineOf(LineItems& items, const StaticFeed& feed, std::size_t index, std::uint64_t muid) {
   return {items.item(index, muid), std::string(feed.line(index).longName)};
@@ -36,25 +31,48 @@ Outcome<FeedCatalog::Hits> FeedCatalog::find(const Query& query, const std::stop
     if (!source) return source.error();
     *sources = {*source};
   }
-  const std::string part = asciiLowerCase(query.text);
-  Hits hits;
+  const LineSearch search(query.text);
+  Hits result;
+  std::vector<std::pair<StaticFeed, LineItems>> feeds;
+  std::vector<Hit> hits;
   for (std::size_t done = 0; done < sources->size() && !stop.stop_requested(); ++done) {
     const FeedSource& source = *(*sources)[done];
     if (progress) progress(source.name(), done, sources->size());
     const auto loaded = source.staticFeed(stop);
     if (!loaded) {
-      hits.errors.push_back(loaded.error()->ofFeed(source.name()));
+      result.errors.push_back(loaded.error()->ofFeed(source.name()));
       continue;
     }
     const StaticFeed& feed = loaded->feed;
-    LineItems items(source.name(), feed);
-    for (std::size_t i = 0; i < feed.lineCount(); ++i) {
-      const StaticLine line = feed.line(i);
-      if (!isHit(feed, line, part) || hits.total++ < query.offset || hits.lines.size() == query.limit) continue;
-      hits.lines.push_back(lineOf(items, feed, i, line.muid));
-    }
+    const auto index = indexOf(source.name(), feed);
+    for (std::size_t line = 0; line < feed.lineCount(); ++line)
+      if (const auto distance = index->distance(search, line)) hits.push_back({*distance, feeds.size(), line});
+    feeds.emplace_back(feed, LineItems(source.name(), feed));
   }
-  return hits;
+  std::stable_sort(hits.begin(), hits.end(), [](const Hit& a, const Hit& b) { return a.distance < b.distance; });
+  result.total = hits.size();
+  for (std::size_t i = query.offset; i < hits.size() && result.lines.size() < query.limit; ++i) {
+    auto& [feed, items] = feeds[hits[i].feed];
+    result.lines.push_back(lineOf(items, feed, hits[i].line, feed.line(hits[i].line).muid));
+  }
+  return result;
+}
+
+std::shared_ptr<const LineIndex> FeedCatalog::indexOf(const std::string& name, const StaticFeed& feed) const {
+  {
+    const std::lock_guard guard(_lock);
+    const auto kept = _indices.find(name);
+    if (kept != _indices.end() && kept->second.checksum == feed.checksum()) return kept->second.index;
+  }
+  auto index = std::make_shared<const LineIndex>(feed, name);
+  const std::lock_guard guard(_lock);
+  _indices.insert_or_assign(name, KeptIndex{feed.checksum(), index});
+  return index;
+}
+
+void FeedCatalog::forget() {
+  const std::lock_guard guard(_lock);
+  _indices.clear();
 }
 
 Outcome<FeedCatalog::Descriptions> FeedCatalog::describe(const std::vector<MapItemIdentifierRef>& identifiers,

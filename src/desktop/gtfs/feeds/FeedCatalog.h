@@ -1,17 +1,22 @@
 #pragma once
 
 #include <functional>
+#include <map>
+#include <memory>
+#include <mutex>
 #include <optional>
 #include <stop_token>
 #include <string>
 #include <vector>
 
 #include "desktop/gtfs/feeds/FeedLibrary.h"
+#include "desktop/gtfs/feeds/LineIndex.h"
 #include "platform/transit/TransitLine.h"
 
 namespace nimbo {
 
-/// The lines that there are to choose from. Blocks its thread.
+/// The lines that there are to choose from. What searches compare is kept from one to the next. Blocks its thread; any
+/// thread.
 class FeedCatalog {
  public:
   /// The library outlives this.
@@ -34,12 +39,10 @@ class FeedCatalog {
   };
   struct Hits {
     std::size_t total = 0;
-    std::vector<Line> lines;       ///< by feed, then as their agencies list them, from the offset on
+    std::vector<Line> lines;       ///< the nearest first, then by feed and as agencies list them; from the offset on
     std::vector<ErrorRef> errors;  ///< of feeds that could not be read, each with its feed
   };
-  /// The lines in whose names, route identifier or agency the text occurs, whatever the case of its ASCII letters. An
-  /// error when the configuration cannot be read, or has no such feed. A line whose identifiers are longer than
-  /// `kLongestIdentifiers` bytes is no hit.
+  /// The lines that the text finds (LineIndex). An error when the configuration cannot be read, or has no such feed.
   Outcome<Hits> find(const Query& query, const std::stop_token& stop = {}, const Progress& progress = {}) const;
 
   struct Description {
@@ -55,10 +58,19 @@ class FeedCatalog {
   Outcome<Descriptions> describe(const std::vector<MapItemIdentifierRef>& identifiers, const std::stop_token& stop = {},
                                  const Progress& progress = {}) const;
 
-  static constexpr std::size_t kLongestIdentifiers = 64 << 10;
+  /// Lets go of what is kept for the next search.
+  void forget();
 
  private:
+  struct KeptIndex {
+    std::uint64_t checksum;  // of the feed that it is of
+    std::shared_ptr<const LineIndex> index;
+  };
+  std::shared_ptr<const LineIndex> indexOf(const std::string& name, const StaticFeed& feed) const;
+
   const FeedLibrary& _library;
+  mutable std::mutex _lock;
+  mutable std::map<std::string, KeptIndex> _indices;  // by the names of their feeds
 };
 
 }  // namespace nimbo

@@ -134,6 +134,8 @@ std::string_view StaticFeed::fingerprint() const {
   return textOf(*_bytes, header, header.fingerprint);
 }
 
+std::uint64_t StaticFeed::checksum() const { return headerOf(*_bytes).checksum; }
+
 Date StaticFeed::checkedAt() const { return Date(std::chrono::microseconds(headerOf(*_bytes).checkedAt)); }
 
 StaticFeed StaticFeed::checkedAgainAt(Date date) const {

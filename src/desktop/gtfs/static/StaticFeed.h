@@ -135,6 +135,8 @@ class StaticFeed {
   std::string_view language() const;
   /// What the source was when the feed was read from it.
   std::string_view fingerprint() const;
+  /// Tells it from other feeds, and from other states of itself.
+  std::uint64_t checksum() const;
   /// When it was last known that the source has not changed.
   Date checkedAt() const;
   /// The same feed with another `checkedAt`.
