@@ -115,7 +115,7 @@ class Panel {
   }
   void drawWithHeadline() {
     const FontDescriptor headline{17, true};
-    const auto layout = _text.layOut("Delays on the N line", headline, 300, 1, TextAlignment::natural, false);
+    const auto layout = _text.layOut("Delays on the N line", headline, 300, 1, false);
     const double top = _y + 15 - layout->firstBaseline() + _text.metrics(headline).capHeight / 2;
     _painter.drawText(*layout, {12, top}, 300, colorOf(SystemColor::label, _appearance));
     _x = 24 + layout->size().width;

@@ -255,13 +255,20 @@ TEST_F(Layout, LabelTakesTheLinesItsWidthNeeds) {
   for (const Case& c : cases) {
     const auto view = std::make_shared<View>();
     view->setFrame({0, 0, c.width, 500});
-    const auto text = label(c.text, c.lines);
+    const auto text = label("something else", 7);
+    text->setFont(std::make_shared<const Font>(FontDescriptor{50, false}, 1));
     text->setUsesAutomaticConstraints(false);
     view->addSubview(text);
     activate({text->leadingAnchor().constraintEqualToAnchor(view->leadingAnchor()),
               text->topAnchor().constraintEqualToAnchor(view->topAnchor()),
               text->trailingAnchor().constraintEqualToAnchor(view->trailingAnchor())});
     if (c.height > 0) text->heightAnchor().constraintLessThanOrEqualToConstant(c.height)->setActive(true);
+    view->layoutIfNeeded();
+    text->setFont(nullptr);
+    view->layoutIfNeeded();
+    text->setNumberOfLines(c.lines);
+    view->layoutIfNeeded();
+    text->setText(c.text);
     view->layoutIfNeeded();
     SCOPED_TRACE(std::string(c.text).substr(0, 20) + " in " + std::to_string(c.height));
     EXPECT_EQ(text->frame(), (Rect{0, 0, c.width, c.expectedHeight}));

@@ -9,6 +9,22 @@
 namespace nimbo {
 namespace {
 
+TEST(SystemColors, AreThoseOfThePalette) {
+  using enum SystemColor;
+  for (const auto& [color, light, dark] : {std::tuple{background, "f6f6f8", "1e1e20"},
+                                           {label, "000000", "ffffff"},
+                                           {systemGrey, "606066", "a6a6ac"},
+                                           {rowHighlight, "e2e2e6", "343438"}}) {
+    EXPECT_EQ(colorOf(color, Appearance::light), colorFromHexText(light));
+    EXPECT_EQ(colorOf(color, Appearance::dark), colorFromHexText(dark));
+  }
+  for (const auto& [style, light, dark] :
+       {std::tuple{101, "141414", "fafafa"}, {102, "565656", "b4b4b4"}, {103, "c8c8c8", "4a4a4a"}}) {
+    EXPECT_EQ(VisualEffect(style).color(Appearance::light), colorFromHexText(light));
+    EXPECT_EQ(VisualEffect(style).color(Appearance::dark), colorFromHexText(dark));
+  }
+}
+
 TEST(Font, HasTheSizeOfItsStyleAtEachTextSize) {
   const TestPlatform platform;
   constexpr double kBody[] = {14, 15, 16, 17, 19, 21, 23, 28, 33, 40, 47, 53};
