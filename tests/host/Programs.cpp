@@ -44,7 +44,7 @@ ProgramRun Programs::run(std::vector<std::string> arguments, const std::string& 
   arguments.insert(arguments.begin(), {"--config", folder.path() / "config", "--state", folder.path() / "state", "<",
                                        folder.path() / "stdin", "2>", folder.path() / "stderr", ">",
                                        output.empty() ? (folder.path() / "stdout").string() : output});
-  std::string command = "exec " NIMBO_TRANSIT;
+  std::string command = "exec '" NIMBO_TRANSIT "'";
   for (const std::string& argument : arguments) {
     const bool isRedirection = argument == "<" || argument == ">" || argument == "2>";
     command += isRedirection ? " " + argument : " '" + std::regex_replace(argument, std::regex("'"), "'\\''") + "'";

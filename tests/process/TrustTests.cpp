@@ -301,7 +301,7 @@ TEST(Trust, ProgramsEndWithAMessageWhereTheyCannotReadOrWrite) {
 TEST(Trust, OfTheWidgetProcessIsGivenUpBeforeItSpeaks) {
   const TemporaryFolder folder;
   const auto script =
-      folder.write("script", "coproc " NIMBO_TRANSIT_WIDGET "\nset -e\necho '" + request("dance").dump() +
+      folder.write("script", "coproc '" NIMBO_TRANSIT_WIDGET "'\nset -e\necho '" + request("dance").dump() +
                                  "' >&${COPROC[1]}\nread -r answer <&${COPROC[0]}\n"
                                  "test \"$answer\"\nstatus=/proc/$COPROC_PID/status\n"
                                  "grep -q $'^NoNewPrivs:\\t1$' $status\n"
