@@ -109,22 +109,6 @@ TEST_F(Archive, WhatMayNotStandInAnArchiveFailsWithItsPlace) {
   }
 }
 
-TEST_F(Archive, StatesComeBackWithTheirResult) {
-  const ErrorRef error = Error::errorWithDomain_code_userInfo("Feed", 7, {{"Reason", box("offline")}});
-  for (const bool expanded : {false, true})
-    for (const ResultRef& result : {Result::resultWithValue(array({})), Result::resultWithError(error)}) {
-      ErrorRef failure;
-      const auto state =
-          State::unarchiveFromData_error(archived(State::initWithLineItemsResult_expanded(result, expanded)), &failure);
-      ASSERT_TRUE(state);
-      EXPECT_FALSE(failure);
-      EXPECT_TRUE(state->lineItemsResult()->isEqual(result.get()));
-      EXPECT_EQ(state->expanded(), expanded);
-    }
-  json content = json::from_cbor(archived(State::initWithLineItemsResult_expanded(nullptr, false)));
-  EXPECT_EQ(content["root"], json({{"$class", "NBTransitIncidentViewControllerState"}, {"expanded", false}}));
-}
-
 /// What rows, the updater and the map application ask an incident.
 auto answersOf(const TransitIncident& i) {
   std::vector<std::pair<std::uint64_t, bool>> entities;

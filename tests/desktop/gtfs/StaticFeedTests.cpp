@@ -202,19 +202,6 @@ TEST_F(StaticFeedStoreTest, ReadsAgainOnlyWhatChanged) {
   EXPECT_FALSE(readOwnFile(cacheFile, 1 << 20));
 }
 
-TEST_F(StaticFeedStoreTest, KeepsTripsBesideTheLines) {
-  folder.write("feed/routes.txt", "route_id,route_short_name\n1,A\n2,B\n");
-  folder.write("feed/trips.txt", "trip_id,route_id\nx,2\n");
-  const Feed feed = feedAt(folder.path() / "feed");
-  for (const bool isDamaged : {false, false, true}) {
-    if (isDamaged) std::ofstream(FeedCache(folder.path() / "cache").trips("city")) << "damaged";
-    const auto loaded = store.load(feed, {});
-    ASSERT_TRUE(loaded);
-    EXPECT_EQ(*loaded->trips("x"), 1u);
-    EXPECT_EQ(*loaded->trips("y"), std::nullopt);
-  }
-}
-
 TEST_F(StaticFeedStoreTest, ReadsZipFiles) {
   const auto makeZip = [&](const std::string& name, const std::string& entry, std::size_t emptyLines = 0) {
     const auto path = folder.path() / name;
