@@ -25,6 +25,11 @@ TEST(SystemColors, AreThoseOfThePalette) {
   }
 }
 
+TEST(Color, IsReadOfSixHexDigitsAlone) {
+  for (const char* text : {"", "12345", "12345g", "g12345", "##12345", "1234567"})
+    EXPECT_EQ(colorFromHexText(text), std::nullopt) << text;
+}
+
 TEST(Font, HasTheSizeOfItsStyleAtEachTextSize) {
   const TestPlatform platform;
   constexpr double kBody[] = {14, 15, 16, 17, 19, 21, 23, 28, 33, 40, 47, 53};

@@ -154,6 +154,9 @@ TEST(Wire, RecordsAndArtworksAreEqualWhereEveryFieldIs) {
     EXPECT_EQ(artworksAreEquivalent(other, one), sameArtwork) << field.full_name();
   });
   EXPECT_GT(changes, 200);
+  EXPECT_TRUE(ours.hasDisplayOptions() && ours.hasDirectionsPlan() && ours.hasDroppedPin() &&
+              ours.hasPresentedMapItem() && ours.hasSearchCategoryStorage() && ours.hasLineItem() &&
+              ours.directionsPlan()->hasRouteRequestStorage() && ours.directionsPlan()->hasTransitPreferences());
   EXPECT_TRUE(artworksAreEquivalent(nullptr, nullptr));
   EXPECT_FALSE(ours.isEqual(nullptr));
   EXPECT_FALSE(DroppedPin().isEqual(std::make_shared<StoredMapItem>().get()));
