@@ -6,6 +6,7 @@
 
 #include "desktop/raii/FileDescriptor.h"
 #include "host/Programs.h"
+#include "host/TerminalRows.h"
 #include "host/TerminalText.h"
 
 namespace nimbo {
@@ -171,6 +172,14 @@ TEST(TerminalText, HoldsNothingThatSteersATerminal) {
   const std::string escaped = printableJSON(json{"é\xC2\x9B\u202e\u2068\u061c\x7f"}.dump());
   EXPECT_EQ(escaped, R"(["é\u009b\u202e\u2068\u061c\u007f"])");
   EXPECT_EQ(counted(1, "alert") + counted(0, "agency", "agencies"), "1 alert0 agencies");
+}
+
+TEST(TerminalRows, TellsLinesOfOneShortNameApart) {
+  protocol::SummaryItem summary{.primaryText = "2 Advisories"};
+  for (const char* name : {"1, Harbour Line", "1, Airport Bus", "2, Castle Line"})
+    summary.artworks.push_back({.text = std::string(name, 1), .accessibilityText = name});
+  const protocol::Snapshot snapshot{.rows = {{.item = summary}}};
+  EXPECT_EQ(rowsAsText(snapshot, {}), "2 Advisories\n  [1, Harbour Line] [1, Airport Bus] [2]\n");
 }
 
 TEST(CommandLine, PrintsNothingThatSteersATerminal) {

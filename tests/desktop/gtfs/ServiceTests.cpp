@@ -180,32 +180,61 @@ TEST_F(LineServiceTest, AnswersWithinAMinuteAndTheNextLookupJoinsTheDownload) {
   EXPECT_EQ(server.requests().size(), 1u);
 }
 
+TEST(DueAnswer, IsClaimedOnce) {
+  const TestPlatform platform;
+  int late = 0;
+  const auto answered = DueAnswer::start([&] { ++late; }), forgotten = DueAnswer::start([&] { ++late; });
+  EXPECT_TRUE(answered->claim());
+  EXPECT_FALSE(answered->claim());
+  platform.time.advance(1);  // the turn with which the time begins
+  platform.time.advance(DueAnswer::kPatience);
+  EXPECT_EQ(late, 1);
+  EXPECT_FALSE(forgotten->claim());
+}
+
 TEST_F(LineServiceTest, DoesNotWaitForAStaticServerOnceThereIsACache) {
-  HeldBack end;
-  const LoopbackServer server([&, bytes = zipOfRoutes("route_id,route_short_name,route_type\nr1,1,3\n"),
-                               isFirst = std::make_shared<std::atomic<bool>>(true)](const std::string&) {
-    platform.loop.wake();
-    if (isFirst->exchange(false)) return LoopbackServer::Answer{LoopbackServer::answer("200 OK\r\nETag: \"a\"", bytes)};
-    end.mayGoOn.wait();
-    return LoopbackServer::Answer{};
-  });
+  HeldBack first, second;
+  std::atomic<HeldBack*> silence = nullptr;
+  const LoopbackServer server(
+      [&, bytes = zipOfRoutes("route_id,route_short_name,route_type\nr1,1,3\n")](const std::string&) {
+        platform.loop.wake();
+        HeldBack* const held = silence;
+        if (!held) return LoopbackServer::Answer{LoopbackServer::answer("200 OK\r\nETag: \"a\"", bytes)};
+        held->mayGoOn.wait();
+        return LoopbackServer::Answer{};
+      });
   addServedFeed(server.address());
   EXPECT_EQ(lookup({line("city", "r1")}), "1 (T); ");
-  struct Step {
-    TimeInterval later;
-    std::size_t requests;  // after the lookup
+  std::size_t requests = 1;
+  const auto isAskedAfter = [&](TimeInterval later) {
+    service = std::make_unique<GTFSTransitLineService>(paths);  // what the old one learned is kept
+    platform.time.advance(later);
+    EXPECT_EQ(lookup({line("city", "r1")}), "1 (T); ");
+    const bool isAsked = !service->library().downloads().underWay().empty();
+    requests += isAsked ? 1 : 0;
+    platform.loop.waitAndDrain([&] { return server.requests().size() >= requests; });
+    EXPECT_NE(server.requests().back().find("If-None-Match: \"a\""), std::string::npos);
+    EXPECT_EQ(service->library().downloads().firstUnderWay(), nullptr) << "nobody waits for it";
+    return isAsked;
   };
   // The server is silent from now on. It is asked after a day, then after 15 minutes, 30, an hour.
-  for (const Step& step :
-       {Step{86400, 2}, Step{899, 2}, Step{1, 3}, Step{1799, 3}, Step{1, 4}, Step{3599, 4}, Step{1, 5}}) {
-    platform.time.advance(step.later);
-    EXPECT_EQ(lookup({line("city", "r1")}), "1 (T); ");
-    platform.loop.waitAndDrain([&] { return server.requests().size() >= step.requests; });
-    EXPECT_EQ(server.requests().size(), step.requests) << step.later;
-    EXPECT_NE(server.requests().back().find("If-None-Match: \"a\""), std::string::npos);
-    service = std::make_unique<GTFSTransitLineService>(paths);  // what the old one learned is kept
-  }
-  end.promise.set_value();
+  silence = &first;
+  for (const auto& [later, isAsked] :
+       {std::pair{86400, true}, {899, false}, {1, true}, {1799, false}, {1, true}, {3599, false}, {1, true}})
+    EXPECT_EQ(isAskedAfter(later), isAsked) << later;
+  // One that answers again is asked as at first.
+  first.promise.set_value();
+  silence = nullptr;
+  service = std::make_unique<GTFSTransitLineService>(paths);
+  platform.time.advance(7200);
+  EXPECT_EQ(lookup({line("city", "r1")}), "1 (T); ");
+  while (!service->library().downloads().underWay().empty()) std::this_thread::yield();
+  requests = server.requests().size();
+  silence = &second;
+  EXPECT_FALSE(isAskedAfter(86399));
+  EXPECT_TRUE(isAskedAfter(1));
+  EXPECT_TRUE(isAskedAfter(900));
+  second.promise.set_value();
 }
 
 TEST_F(LineServiceTest, NeverCallsBackOnceItIsGone) {

@@ -214,6 +214,8 @@ TEST_F(FavoritesTest, CanBeChangedByWhatIsLeftOfThem) {
   EXPECT_EQ(makeEditor().remove({3}), nullptr);
   EXPECT_THAT(names(), ElementsAre("B"));
   EXPECT_EQ(notices.size(), 2u);
+  connect().execute("UPDATE favorites_seal SET wereSet = 0");
+  EXPECT_FALSE(makeEditor().list()) << "rows that are whole each, and as many, under a seal that is not";
 }
 
 TEST_F(FavoritesTest, LoseNothingWhenHostsChangeThemAtOnce) {
