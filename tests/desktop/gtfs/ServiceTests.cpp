@@ -181,7 +181,7 @@ TEST_F(LineServiceTest, AnswersWithinAMinuteAndTheNextLookupJoinsTheDownload) {
 }
 
 TEST(DueAnswer, IsClaimedOnce) {
-  const TestPlatform platform;
+  TestPlatform platform;
   int late = 0;
   const auto answered = DueAnswer::start([&] { ++late; }), forgotten = DueAnswer::start([&] { ++late; });
   EXPECT_TRUE(answered->claim());
