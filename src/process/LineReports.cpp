@@ -6,6 +6,7 @@
 #include "desktop/gtfs/alerts/IncidentReader.h"
 #include "desktop/gtfs/feeds/TransitLineServiceError.h"
 #include "desktop/gtfs/static/LineItems.h"
+#include "desktop/gtfs/text/Utf8.h"
 #include "platform/SystemServices.h"
 #include "process/Snapshot.h"
 
@@ -27,6 +28,12 @@ constexpr const char* kCauses[] = {
     "unknown_cause", "unknown_cause",   "other_cause",       "technical_problem", "strike",
     "demonstration", "accident",        "holiday",           "weather",           "maintenance",
     "construction",  "police_activity", "medical_emergency", "special_event"};
+
+/// A name in 500 characters, as hand-offs have them.
+std::string shortened(const std::string& name) {
+  constexpr std::size_t kLongestName = 500;
+  return std::string(firstCharacters(name, kLongestName));
+}
 
 template <std::size_t Count>
 std::string wordOf(const char* const (&words)[Count], std::int32_t number) {
@@ -119,8 +126,12 @@ protocol::Lines lineReports(const FavoritesEditor& editor, const GTFSTransitLine
     report.muid = line.muid();
     report.name = shown.artwork() ? shown.artwork()->accessibilityText().value_or("") : "";
     if (report.name.empty()) report.name = shown.name().value_or(report.id);
-    if (shown.system()) report.agency = shown.system()->name();
-    if (shown.artwork()) report.shield = shieldOf(*shown.artwork());
+    report.name = shortened(report.name);
+    if (shown.system() && shown.system()->name()) report.agency = shortened(*shown.system()->name());
+    if (shown.artwork()) {
+      report.shield = shieldOf(*shown.artwork());
+      report.shield->accessibilityText = report.name;
+    }
     reports.addVerdict(report, verdict);
   }
   return result;

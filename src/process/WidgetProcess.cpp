@@ -215,7 +215,13 @@ protocol::Kept WidgetProcess::viewWillDisappear(const Nothing&) {
   _controller->viewWillDisappear(false);
   SQLiteSharedSettings& settings = _platform->sharedSettings();
   if (const ErrorRef failure = settings.lastFailure()) return {failure->reason()};
-  if (const auto updated = updatedAt())
+  // Rows that show an error are of no date.
+  bool hasFailed = false;
+  if (const ResultRef& result = _controller->transitLineItemResult())
+    result->withValue_orError([](const ObjectRef&) {}, [&](const ErrorRef&) { hasFailed = true; });
+  if (hasFailed)
+    settings.groupStore()->removeValueForKey(kSavedRowsDateKey);
+  else if (const auto updated = updatedAt())
     settings.groupStore()->setValue_forKey(isoTextOfDate(*updated), kSavedRowsDateKey);
   return {};
 }

@@ -132,7 +132,7 @@ void WidgetHostProcess::setUpConnection() {
   client.connection().setHandler(protocol::kFrame.name,
                                  [this](const auto&, const JSONRPCResponder&) { askForContent(); });
   client.connection().setHandler(protocol::kUpdated.name, [this](const auto&, const JSONRPCResponder&) {
-    _widget->ask(protocol::kLines, {}, [this](const protocol::Lines& lines) { _delegate.widgetLinesDidChange(lines); });
+    askForLines([this](const protocol::Lines& lines) { _delegate.widgetLinesDidChange(lines); });
   });
   client.setNoticeHandler([this](const std::string& message) { _delegate.widgetTells(message); });
   client.setOpenHandler([this](const WidgetClient::Opening& opening) { return _delegate.widgetOpens(opening); });
@@ -212,12 +212,20 @@ void WidgetHostProcess::askForContent() {
     *content = WidgetContent::ofSnapshot(snapshot);
     content->picture = picture;
   });
-  _widget->ask(protocol::kLines, {}, [this, content](const protocol::Lines& lines) {
+  askForLines([this, content](const protocol::Lines& lines) {
     _awaitsContent = false;
     content->lines = lines;
-    if (!content->picture->pixels.empty()) show(content);
+    if (content->picture && !content->picture->pixels.empty()) show(content);
     if (_contentIsStale) askForContent();
   });
+}
+
+void WidgetHostProcess::askForLines(std::function<void(const protocol::Lines&)> completion) {
+  _widget->call(protocol::kLines, protocol::Nothing(),
+                [completion = std::move(completion)](const std::optional<protocol::Lines>& lines, const auto& error) {
+                  // More favorites than an answer has room for are no fault of the process.
+                  if (error.code != JSONRPCError::kConnectionClosed) completion(lines.value_or(protocol::Lines()));
+                });
 }
 
 void WidgetHostProcess::show(const std::shared_ptr<WidgetContent>& content) {

@@ -106,6 +106,8 @@ class WidgetHostProcess {
   void askOfRow(const protocol::Method<Params, Result>& method, const Params& params);
   /// Tells the process what it does not know of the presentation.
   void tellPresentation();
+  /// Gives what is known of the favorites, and nothing where they are too many to tell.
+  void askForLines(std::function<void(const protocol::Lines&)> completion);
   void show(const std::shared_ptr<WidgetContent>& content);
   void setExpandedMode(bool expanded);
   void setUpdating(bool updating);
