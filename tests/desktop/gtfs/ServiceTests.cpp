@@ -180,18 +180,6 @@ TEST_F(LineServiceTest, AnswersWithinAMinuteAndTheNextLookupJoinsTheDownload) {
   EXPECT_EQ(server.requests().size(), 1u);
 }
 
-TEST(DueAnswer, IsClaimedOnce) {
-  TestPlatform platform;
-  int late = 0;
-  const auto answered = DueAnswer::start([&] { ++late; }), forgotten = DueAnswer::start([&] { ++late; });
-  EXPECT_TRUE(answered->claim());
-  EXPECT_FALSE(answered->claim());
-  platform.time.advance(1);  // the turn with which the time begins
-  platform.time.advance(DueAnswer::kPatience);
-  EXPECT_EQ(late, 1);
-  EXPECT_FALSE(forgotten->claim());
-}
-
 TEST_F(LineServiceTest, DoesNotWaitForAStaticServerOnceThereIsACache) {
   HeldBack first, second;
   std::atomic<HeldBack*> silence = nullptr;
