@@ -18,4 +18,9 @@ struct CurlHeadersDeleter {
 /// Header lines of a request.
 using CurlHeaders = std::unique_ptr<curl_slist, CurlHeadersDeleter>;
 
+struct CurlAddressDeleter {
+  void operator()(CURLU* address) const { curl_url_cleanup(address); }
+};
+using CurlAddress = std::unique_ptr<CURLU, CurlAddressDeleter>;
+
 }  // namespace nimbo

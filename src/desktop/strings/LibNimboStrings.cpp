@@ -191,6 +191,10 @@ class ICUStrings final : public StringsPart {
     check(status);
     return utf8(key);
   }
+  std::string countryName(const std::string& code, const std::string& locale) override {
+    icu::UnicodeString name;
+    return utf8(icu::Locale("", code.c_str()).getDisplayCountry(icu::Locale::createCanonical(locale.c_str()), name));
+  }
 };
 
 }  // namespace

@@ -22,4 +22,6 @@ Paths Paths::resolve(const std::optional<std::filesystem::path>& config,
           state ? *state / "cache" : xdgFolder("XDG_CACHE_HOME", ".cache")};
 }
 
+std::filesystem::path Paths::data() { return xdgFolder("XDG_DATA_HOME", ".local/share"); }
+
 }  // namespace nimbo

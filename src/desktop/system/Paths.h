@@ -15,6 +15,9 @@ struct Paths {
   /// Makes nothing; a relative XDG variable counts as unset.
   static Paths resolve(const std::optional<std::filesystem::path>& config,
                        const std::optional<std::filesystem::path>& state);
+
+  /// The folder of what the user has in place of data that came with the program, below $XDG_DATA_HOME.
+  static std::filesystem::path data();
 };
 
 }  // namespace nimbo

@@ -130,6 +130,18 @@ const char* keyOfCode(TransitLineServiceError code) {
       return "Window_Error_CutOff";
     case tripsMissing:
       return "Window_Error_TripsMissing";
+    case badCatalog:
+      return "Window_Error_Catalog";
+    case wantedKey:
+      return "Window_Error_WantedKey";
+    case badKey:
+      return "Window_Error_BadKey";
+    case staticForAlerts:
+    case alertsForStatic:
+      return "Window_Error_Swapped";
+    case webPage:
+      return "Window_Error_WebPage";
+    case unknownCatalogFeed:
     case unknownLine:
       return "Window_Error_LineGone";
     case notAsked:

@@ -239,7 +239,7 @@ TEST_F(AlertsStoreTest, LetsTheLastAnswerStandInForAQuarterOfAnHour) {
       {{LoopbackServer::answer("500 Oops", "")}, Code::serverFailure},
       {{LoopbackServer::answer("302 Found\r\nLocation: file://" + folder.write("f", feedBytes("")).native(), "")},
        Code::badAddress},
-      {{LoopbackServer::answer("200 OK", "<html>maintenance</html>")}, Code::badAlerts},
+      {{LoopbackServer::answer("200 OK", "<html>maintenance</html>")}, Code::webPage},
       {{LoopbackServer::answer("200 OK", "")}, Code::badAlerts},
       {{one.substr(0, one.size() - 1)}, Code::cutOff},
       {{"HTTP/1.1 200 OK\r\nContent-Length: 20\r\n\r\n" + feedBytes(alert("1", "T", ""))}, Code::badAlerts},

@@ -9,6 +9,7 @@
 #include <locale>
 #include <sstream>
 
+#include "desktop/gtfs/feeds/OtherContent.h"
 #include "desktop/gtfs/feeds/TransitLineServiceError.h"
 #include "desktop/gtfs/net/FileReading.h"
 #include "desktop/gtfs/static/StaticFeed.h"
@@ -49,7 +50,7 @@ std::optional<KeptAlerts> KeptAlerts::read(const std::filesystem::path& path, co
   const auto fetchedAt = numberIn<std::int64_t>(lines[4]);
   const auto changedAt = numberIn<std::int64_t>(lines[5]);
   const auto checksum = numberIn<std::uint64_t>(lines[6]);
-  if (lines[0] != kFirstLine || lines[1] != address.text() || !fetchedAt || !changedAt || !checksum ||
+  if (lines[0] != kFirstLine || lines[1] != address.identity() || !fetchedAt || !changedAt || !checksum ||
       !rest.starts_with('\n'))
     return std::nullopt;
   rest.remove_prefix(1);
@@ -109,6 +110,7 @@ std::optional<Date> dateOfHTTPText(const std::string& text) {
 
 /// The alerts in a body; `undated` is when they were made where they do not say.
 Outcome<FetchedAlerts> readBody(const Feed& feed, std::string body, std::optional<Date> undated) {
+  if (ErrorRef error = otherThanAlerts(body, feed.alerts.publicText())) return error;
   auto alerts = AlertsFeed::read(std::move(body), feed.alerts.publicText(), feed.isCombined);
   if (!alerts) return alerts.error();
   const Date date = alerts->timestamp().value_or(undated.value_or(Date()));
@@ -161,7 +163,7 @@ Outcome<FetchedAlerts> AlertsStore::readLocal(const Feed& feed) const {
 Outcome<FetchedAlerts> AlertsStore::fetch(const Feed& feed, const std::stop_token& stop) const {
   if (!feed.alerts.isRemote()) return readLocal(feed);
   const std::string place = feed.alerts.publicText();
-  const std::filesystem::path path = _cache.alerts(feed.name);
+  const std::filesystem::path path = _cache.alerts(feed.nameOfAlerts());
   auto kept = KeptAlerts::read(path, feed.alerts);
   std::string body;
   const HTTPRequest request{feed.alerts, kept ? kept->validators : HTTPValidators(), kLargestAlerts, kFetchTimeLimit};
@@ -172,8 +174,8 @@ Outcome<FetchedAlerts> AlertsStore::fetch(const Feed& feed, const std::stop_toke
   if (!answer) return answer.error();
   if (answer->isUnchanged) body = kept->body;
   const bool isSame = kept && body == kept->body;
-  KeptAlerts present{feed.alerts.text(), answer->validators, currentDate(), isSame ? kept->changedAt : currentDate(),
-                     std::move(body)};
+  KeptAlerts present{feed.alerts.identity(), answer->validators, currentDate(),
+                     isSame ? kept->changedAt : currentDate(), std::move(body)};
   auto alerts = readBody(feed, present.body, undatedOf(present));
   if (!alerts) return alerts;
   if (kept && !isSame) {
@@ -192,7 +194,7 @@ Outcome<AlertsFeed> AlertsStore::load(const Feed& feed, const std::stop_token& s
   const ErrorRef error = fetched ? staleness(feed, *fetched) : fetched.error();
   if (!error) return std::move(fetched->feed);
   if (feed.alerts.isRemote() && !fetched) {
-    if (auto kept = KeptAlerts::read(_cache.alerts(feed.name), feed.alerts)) {
+    if (auto kept = KeptAlerts::read(_cache.alerts(feed.nameOfAlerts()), feed.alerts)) {
       auto held = readBody(feed, std::move(kept->body), undatedOf(*kept));
       if (held && canStandIn(feed, *kept, *held)) {
         writeLog(kFeedLogFacility, LogLevel::error, "The last alerts of %{private}@ stand in: %{private}@",

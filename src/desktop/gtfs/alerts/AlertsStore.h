@@ -17,7 +17,7 @@ namespace nimbo {
 /// The last good answer of an alerts feed's server, kept in the cache: for conditional requests, and to stand in for a
 /// while when the server fails.
 struct KeptAlerts {
-  std::string address;
+  std::string address;  ///< its identity
   HTTPValidators validators;
   Date fetchedAt;  ///< when the server last said that this is the present state
   Date changedAt;  ///< when the body was first seen

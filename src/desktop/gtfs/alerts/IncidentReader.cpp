@@ -95,6 +95,8 @@ class IncidentBuilder {
 
   IncidentReading build() {
     for (const AlertEntity& alert : _alerts.alerts()) take(alert);
+    if (_query.isRouteOfOther && !_belongs && _foreignRoutes.size() >= kFewestForeignRoutes)
+      _belongs = std::any_of(_foreignRoutes.begin(), _foreignRoutes.end(), _query.isRouteOfOther);
     if (!_belongs && _foreignRoutes.size() >= kFewestForeignRoutes)
       lacks(transitLineServiceError(
           TransitLineServiceError::foreignAlerts,
@@ -245,7 +247,7 @@ class IncidentBuilder {
       const Identifier route(routeOf(selector));
       if (_belongs || route.text().empty()) return;
       _belongs = _knownRoutes.contains(route.text());
-      if (_foreignRoutes.size() < kFewestForeignRoutes) _foreignRoutes.emplace(route.text());
+      if (_foreignRoutes.size() < kFewestForeignRoutes || _query.isRouteOfOther) _foreignRoutes.emplace(route.text());
     });
   }
 
@@ -330,7 +332,7 @@ class IncidentBuilder {
   bool _hasTrips = false;                // the alert at hand has selectors by trip alone that were not matched
   bool _hasRoutes = false;               // the alert at hand names routes
   bool _belongs = false;                 // an alert in force names a route of the static feed
-  std::set<std::string> _foreignRoutes;  // named by alerts in force; the first few
+  std::set<std::string> _foreignRoutes;  // named by alerts in force; as many as are asked for
   std::unordered_set<std::string_view> _knownRoutes;
   std::optional<bool> _isOnlyAgencyMeant;  // absent until asked
   std::map<std::size_t, bool> _lines;  // of the alert at hand: place in the query, whether it is about the whole line

@@ -1,6 +1,7 @@
 #pragma once
 
 #include <cstdint>
+#include <functional>
 #include <string>
 #include <vector>
 
@@ -57,6 +58,8 @@ struct IncidentQuery {
   bool minorAlerts = false;  ///< whether alerts that change nothing for most riders count
   Date now;
   SelectorMatcher::TripLookup trips;
+  /// Whether another static feed that is read by the same alerts has a route; none where there is no such feed.
+  std::function<bool(std::string_view routeID)> isRouteOfOther = {};
   bool countsUnfit = false;  ///< whether selectors that fit none of the lines are reported; for all lines of a feed
 };
 

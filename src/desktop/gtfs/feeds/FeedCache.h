@@ -18,7 +18,7 @@ class FeedCache {
   std::filesystem::path trips(std::string_view feed) const { return file("trips", feed); }
   std::filesystem::path alerts(std::string_view feed) const { return file("alerts", feed); }
 
-  /// Drops all that is kept of a feed.
+  /// Drops all that is kept under a feed's name.
   void remove(std::string_view feed) const;
 
  private:

@@ -1,5 +1,6 @@
 #include "desktop/gtfs/feeds/FeedCheck.h"
 
+#include <algorithm>
 #include <set>
 
 #include "desktop/gtfs/alerts/AlertsStore.h"
@@ -12,8 +13,8 @@ namespace nimbo {
 
 namespace {
 
-void checkAgainst(const FreshStaticFeed& fresh, const AlertsFeed& alerts, const Feed& feed,
-                  FeedCheckReport::Alerts& report) {
+void checkAgainst(const FreshStaticFeed& fresh, const AlertsFeed& alerts, const Feed& feed, const FeedCache& cache,
+                  const std::stop_token& stop, FeedCheckReport::Alerts& report) {
   IncidentQuery query;
   query.feed = feed.name;
   query.language = {"", fresh.feed.language()};
@@ -21,6 +22,13 @@ void checkAgainst(const FreshStaticFeed& fresh, const AlertsFeed& alerts, const 
   query.now = currentDate();
   query.trips = StaticFeedStore::lookupIn(feed, fresh.trips);
   query.countsUnfit = true;
+  if (!feed.siblings.empty())
+    query.isRouteOfOther = [&](std::string_view routeID) {
+      return std::any_of(feed.siblings.begin(), feed.siblings.end(), [&](const Feed& sibling) {
+        const auto held = StaticFeedStore(cache).load(sibling, stop);
+        return held && held->feed.hasRoute(routeID);
+      });
+    };
   for (std::size_t i = 0; i < fresh.feed.lineCount(); ++i)
     query.lines.push_back({static_cast<std::uint32_t>(i), fresh.feed.line(i).muid});
   const IncidentReading reading = readIncidents(alerts, fresh.feed, query);
@@ -71,7 +79,7 @@ FeedCheckReport checkFeed(const Feed& feed, const FeedCache& cache, const std::s
   report.alerts->alerts = alerts->feed.alerts().size();
   report.alerts->skipped = alerts->feed.skipped();
   report.alerts->hasOthers = alerts->feed.hasOthers();
-  if (fresh) checkAgainst(*fresh, alerts->feed, feed, *report.alerts);
+  if (fresh) checkAgainst(*fresh, alerts->feed, feed, cache, stop, *report.alerts);
   return report;
 }
 

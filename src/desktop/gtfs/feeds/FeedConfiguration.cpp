@@ -55,10 +55,11 @@ Outcome<std::optional<std::filesystem::path>> findDocument(const std::filesystem
   return std::optional(std::move(target));
 }
 
-Outcome<JSON> readDocument(const std::filesystem::path& file) {
+/// The file's content, an object with `part` in it, which is as in `none` where there is no file.
+Outcome<JSON> readDocument(const std::filesystem::path& file, const char* part, const JSON& none) {
   const auto found = findDocument(file);
   if (!found) return found.error();
-  if (!*found) return JSON{{"feeds", JSON::array()}};
+  if (!*found) return JSON{{part, none}};
   const auto bytes = readOwnFile(**found, kLargestConfiguration);
   if (!bytes) return bytes.error();
   const Fault fault{file};
@@ -73,8 +74,9 @@ Outcome<JSON> readDocument(const std::filesystem::path& file) {
   } catch (const JSON::parse_error& error) {
     return notJSON(error.byte);
   }
-  if (!document.is_object() || !document.contains("feeds") || !document["feeds"].is_array())
-    return fault("it is not an object with a list \"feeds\". Correct it, or move it away to begin anew.");
+  if (!document.is_object() || !document.contains(part) || document[part].type() != none.type())
+    return fault(std::string("it is not an object with ") + (none.is_array() ? "a list" : "an object") + " \"" + part +
+                 "\". Correct it, or move it away to begin anew.");
   return document;
 }
 
@@ -95,6 +97,13 @@ Outcome<Feed> readFeed(const JSON& entry, std::size_t index, const std::filesyst
   for (const auto* address : {&staticFeed, &alerts})
     if (!*address) return fault(place + ": " + address->error()->reason());
   Feed feed{*name, *staticFeed, *alerts};
+  if (entry.contains("staticMirror")) {
+    const auto mirrorText = text("staticMirror");
+    const auto mirror = mirrorText ? FeedAddress::parse(*mirrorText) : mirrorText.error();
+    if (!mirror) return fault(place + ": " + mirror.error()->reason());
+    if (!mirror->isRemote()) return fault(place + " has a \"staticMirror\" that is no http or https address.");
+    feed.staticMirror = *mirror;
+  }
   for (const auto& [key, flag] : {std::pair("minorAlerts", &feed.minorAlerts), {"combined", &feed.isCombined}}) {
     const auto value = entry.find(key);
     if (value == entry.end()) continue;
@@ -111,16 +120,53 @@ Outcome<Feed> readFeed(const JSON& entry, std::size_t index, const std::filesyst
   return feed;
 }
 
-Outcome<std::vector<Feed>> readFeeds(const JSON& document, const std::filesystem::path& file) {
-  std::vector<Feed> feeds;
-  for (std::size_t i = 0; i < document["feeds"].size(); ++i) {
-    auto feed = readFeed(document["feeds"][i], i, file);
-    if (!feed) return feed.error();
-    if (std::any_of(feeds.begin(), feeds.end(), [&](const Feed& other) { return other.name == feed->name; }))
-      return Fault{file}("two feeds in it are named \"" + feed->name + "\".");
-    feeds.push_back(std::move(*feed));
+/// The key of one half of a feed, by what `keys.json` has of the feed.
+Outcome<FeedKey> readKey(const JSON& ofFeed, const char* part, const std::filesystem::path& file) {
+  FeedKey key;
+  if (!ofFeed.is_object() || !ofFeed.contains(part)) return key;
+  try {
+    const JSON& entry = ofFeed[part];
+    key.query = entry.value("query", std::string());
+    if (entry.contains("headers")) key.headers = entry["headers"].get<std::vector<std::string>>();
+  } catch (const JSON::exception&) {
+    return Fault{file}(std::string("a key for \"") + part + "\" in it is none.");
   }
-  return feeds;
+  for (const std::string& header : key.headers)
+    if (const ErrorRef error = FeedKey::checkHeader(header)) return Fault{file}(error->reason());
+  if (std::any_of(key.query.begin(), key.query.end(), [](unsigned char c) { return c <= 0x20 || c == 0x7F; }))
+    return Fault{file}("a query in it holds spaces or control characters.");
+  return key;
+}
+
+/// The form that `readKey` reads; null for no key.
+JSON entryOfKey(const FeedKey& key) {
+  JSON entry;
+  if (!key.headers.empty()) entry["headers"] = key.headers;
+  if (!key.query.empty()) entry["query"] = key.query;
+  return entry;
+}
+
+void writeKeys(JSON& keys, const Feed& feed) {
+  JSON ofFeed;
+  for (const auto& [part, address] : {std::pair("static", &feed.staticFeed), {"alerts", &feed.alerts}})
+    if (JSON entry = entryOfKey(address->key()); !entry.is_null()) ofFeed[part] = std::move(entry);
+  keys.erase(feed.name);
+  if (!ofFeed.is_null()) keys[feed.name] = std::move(ofFeed);
+}
+
+/// What is not known here stays in the entry.
+void writeEntry(JSON& entry, const Feed& feed) {
+  const auto write = [&entry](const char* key, bool isThere, const JSON& value) {
+    isThere ? void(entry[key] = value) : void(entry.erase(key));
+  };
+  write("name", true, feed.name);
+  write("static", true, feed.staticFeed.text());
+  write("alerts", true, feed.alerts.text());
+  write("staticMirror", feed.staticMirror.has_value(), feed.staticMirror ? feed.staticMirror->text() : "");
+  write("minorAlerts", feed.minorAlerts, true);
+  write("combined", feed.isCombined, true);
+  write("maximumAlertsAgeMinutes", feed.maximumAlertsAge.has_value(),
+        feed.maximumAlertsAge.value_or(std::chrono::minutes(0)).count());
 }
 
 ErrorRef unknownFeed(std::string_view name, const std::vector<Feed>& present) {
@@ -128,6 +174,12 @@ ErrorRef unknownFeed(std::string_view name, const std::vector<Feed>& present) {
   for (const Feed& feed : present) names += " " + feed.name;
   return transitLineServiceError(TransitLineServiceError::unknownFeed,
                                  "No feed is named \"" + std::string(name) + "\". " + names + ".", std::string(name));
+}
+
+std::optional<std::size_t> indexOf(std::string_view name, const std::vector<Feed>& feeds) {
+  const auto found = std::find_if(feeds.begin(), feeds.end(), [&](const Feed& feed) { return feed.name == name; });
+  if (found == feeds.end()) return std::nullopt;
+  return static_cast<std::size_t>(found - feeds.begin());
 }
 
 ErrorRef takenName(std::string_view name, const std::vector<Feed>& present) {
@@ -146,7 +198,60 @@ ErrorRef writeDocument(const std::filesystem::path& file, const JSON& document) 
                              document.dump(2, ' ', false, JSON::error_handler_t::replace) + "\n");
 }
 
+void findSiblings(std::vector<Feed>& feeds) {
+  const std::vector<Feed> alone = feeds;
+  for (Feed& feed : feeds)
+    for (const Feed& other : alone)
+      if (other.name != feed.name && other.alerts.isRemote() && other.alerts == feed.alerts &&
+          other.isCombined == feed.isCombined && other.maximumAlertsAge == feed.maximumAlertsAge)
+        feed.siblings.push_back(other);
+}
+
 }  // namespace
+
+/// Both files, and the feeds in them.
+struct FeedConfiguration::Documents {
+  JSON feeds, keys;
+  std::vector<Feed> read;
+};
+
+Outcome<FeedConfiguration::Documents> FeedConfiguration::read() const {
+  auto feeds = readDocument(_file, "feeds", JSON::array());
+  if (!feeds) return feeds.error();
+  auto keys = readDocument(_keysFile, "keys", JSON::object());
+  if (!keys) return keys.error();
+  Documents documents{std::move(*feeds), std::move(*keys), {}};
+  const JSON& entries = documents.feeds["feeds"];
+  for (std::size_t i = 0; i < entries.size(); ++i) {
+    auto feed = readFeed(entries[i], i, _file);
+    if (!feed) return feed.error();
+    if (std::any_of(documents.read.begin(), documents.read.end(),
+                    [&](const Feed& other) { return other.name == feed->name; }))
+      return Fault{_file}("two feeds in it are named \"" + feed->name + "\".");
+    const JSON ofFeed = documents.keys["keys"].value(feed->name, JSON());
+    for (const auto& [part, address] : {std::pair("static", &feed->staticFeed), {"alerts", &feed->alerts}}) {
+      auto key = readKey(ofFeed, part, _keysFile);
+      if (!key) return key.error();
+      *address = address->withKey(std::move(*key));
+    }
+    documents.read.push_back(std::move(*feed));
+  }
+  findSiblings(documents.read);
+  return documents;
+}
+
+ErrorRef FeedConfiguration::change(const std::function<ErrorRef(Documents& documents)>& what) {
+  if (ErrorRef error = makeFolders(_folder)) return error;
+  const FolderLock lock(_folder);
+  auto documents = read();
+  if (!documents) return documents.error();
+  const JSON keysBefore = documents->keys;
+  if (ErrorRef error = what(*documents)) return error;
+  // Keys without a feed do no harm, other than a feed without its keys.
+  if (documents->keys != keysBefore)
+    if (ErrorRef error = writeDocument(_keysFile, documents->keys)) return error;
+  return writeDocument(_file, documents->feeds);
+}
 
 ErrorRef FeedConfiguration::checkName(std::string_view name) {
   constexpr std::size_t kLongestName = 64;
@@ -166,9 +271,9 @@ ErrorRef FeedConfiguration::checkName(std::string_view name) {
 }
 
 Outcome<std::vector<Feed>> FeedConfiguration::feeds() const {
-  const auto document = readDocument(_file);
-  if (!document) return document.error();
-  return readFeeds(*document, _file);
+  auto documents = read();
+  if (!documents) return documents.error();
+  return std::move(documents->read);
 }
 
 Outcome<Feed> FeedConfiguration::feedNamed(std::string_view name) const {
@@ -187,32 +292,34 @@ ErrorRef FeedConfiguration::checkNewName(std::string_view name) const {
 
 ErrorRef FeedConfiguration::add(const Feed& feed) {
   if (ErrorRef error = checkName(feed.name)) return error;
-  if (ErrorRef error = makeFolders(_folder)) return error;
-  const FolderLock lock(_folder);
-  auto document = readDocument(_file);
-  if (!document) return document.error();
-  const auto present = readFeeds(*document, _file);
-  if (!present) return present.error();
-  if (ErrorRef error = takenName(feed.name, *present)) return error;
-  JSON entry{{"name", feed.name}, {"static", feed.staticFeed.text()}, {"alerts", feed.alerts.text()}};
-  if (feed.minorAlerts) entry["minorAlerts"] = true;
-  if (feed.isCombined) entry["combined"] = true;
-  if (feed.maximumAlertsAge) entry["maximumAlertsAgeMinutes"] = feed.maximumAlertsAge->count();
-  (*document)["feeds"].push_back(std::move(entry));
-  return writeDocument(_file, *document);
+  return change([&](Documents& documents) -> ErrorRef {
+    if (ErrorRef error = takenName(feed.name, documents.read)) return error;
+    JSON entry;
+    writeEntry(entry, feed);
+    documents.feeds["feeds"].push_back(std::move(entry));
+    writeKeys(documents.keys["keys"], feed);
+    return nullptr;
+  });
+}
+
+ErrorRef FeedConfiguration::replace(const Feed& feed) {
+  return change([&](Documents& documents) -> ErrorRef {
+    const auto index = indexOf(feed.name, documents.read);
+    if (!index) return unknownFeed(feed.name, documents.read);
+    writeEntry(documents.feeds["feeds"][*index], feed);
+    writeKeys(documents.keys["keys"], feed);
+    return nullptr;
+  });
 }
 
 ErrorRef FeedConfiguration::remove(std::string_view name) {
-  const FolderLock lock(_folder);
-  auto document = readDocument(_file);
-  if (!document) return document.error();
-  const auto present = readFeeds(*document, _file);
-  if (!present) return present.error();
-  const auto found =
-      std::find_if(present->begin(), present->end(), [&](const Feed& feed) { return feed.name == name; });
-  if (found == present->end()) return unknownFeed(name, *present);
-  (*document)["feeds"].erase(static_cast<std::size_t>(found - present->begin()));
-  return writeDocument(_file, *document);
+  return change([&](Documents& documents) -> ErrorRef {
+    const auto index = indexOf(name, documents.read);
+    if (!index) return unknownFeed(name, documents.read);
+    documents.feeds["feeds"].erase(*index);
+    documents.keys["keys"].erase(std::string(name));
+    return nullptr;
+  });
 }
 
 }  // namespace nimbo

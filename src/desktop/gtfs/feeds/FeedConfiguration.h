@@ -1,6 +1,7 @@
 #pragma once
 
 #include <filesystem>
+#include <functional>
 #include <string>
 #include <string_view>
 #include <vector>
@@ -16,14 +17,19 @@ inline constexpr std::string_view kSampleFeedName = "sample";
 /// The feeds that the user set up, in `feeds.json`:
 ///
 ///     {"feeds": [{"name": "metro", "static": "/data/metro.zip", "alerts": "https://example.org/alerts.pb",
-///                 "minorAlerts": false, "maximumAlertsAgeMinutes": 15, "combined": false}]}
+///                 "staticMirror": "https://example.net/metro.zip", "minorAlerts": false,
+///                 "maximumAlertsAgeMinutes": 15, "combined": false}]}
 ///
-/// The last three may be left out. Keys that are not known here are kept. Nothing is held in memory: each call reads
-/// the file, and changes of several processes at once come one after the other. Any thread.
+/// The last four may be left out. The keys of servers stand apart, in `keys.json`, which is for the user's eyes alone:
+///
+///     {"keys": {"metro": {"alerts": {"headers": ["apikey: …"], "query": "token=…"}, "static": {"headers": […]}}}}
+///
+/// What is not known here is kept. Nothing is held in memory: each call reads the files, and changes of several
+/// processes at once come one after the other. Any thread.
 class FeedConfiguration {
  public:
   explicit FeedConfiguration(const std::filesystem::path& configFolder)
-      : _folder(configFolder), _file(configFolder / "feeds.json") {}
+      : _folder(configFolder), _file(configFolder / "feeds.json"), _keysFile(configFolder / "keys.json") {}
 
   const std::filesystem::path& file() const { return _file; }
 
@@ -36,6 +42,8 @@ class FeedConfiguration {
   ErrorRef checkNewName(std::string_view name) const;
   /// Adds a feed at the end. Null on success; nothing is written otherwise.
   ErrorRef add(const Feed& feed);
+  /// Puts a feed in the place of the one of its name. Null on success; nothing is written otherwise.
+  ErrorRef replace(const Feed& feed);
   /// Takes a feed out. Null on success; nothing is written otherwise.
   ErrorRef remove(std::string_view name);
 
@@ -44,8 +52,14 @@ class FeedConfiguration {
   static ErrorRef checkName(std::string_view name);
 
  private:
+  struct Documents;
+  Outcome<Documents> read() const;
+  /// Null on success; nothing is written otherwise.
+  ErrorRef change(const std::function<ErrorRef(Documents& documents)>& what);
+
   std::filesystem::path _folder;
   std::filesystem::path _file;
+  std::filesystem::path _keysFile;
 };
 
 }  // namespace nimbo

@@ -1,5 +1,7 @@
 #include "desktop/gtfs/feeds/FeedLibrary.h"
 
+#include <map>
+
 #include "desktop/gtfs/feeds/FeedSource.h"
 #include "desktop/gtfs/feeds/SampleCity.h"
 #include "desktop/gtfs/feeds/TransitLineServiceError.h"
@@ -17,8 +19,12 @@ Outcome<std::vector<FeedSourceRef>> FeedLibrary::sources() const {
   const auto feeds = _configuration.feeds();
   if (!feeds) return feeds.error();
   std::vector<FeedSourceRef> sources;
-  for (const Feed& feed : *feeds)
-    sources.push_back(std::make_shared<const ConfiguredFeedSource>(feed, _cache, _downloads));
+  std::map<std::string, std::shared_ptr<SharedAlerts>> alerts;
+  for (const Feed& feed : *feeds) {
+    auto& shared = alerts[feed.nameOfAlerts()];
+    if (!shared) shared = std::make_shared<SharedAlerts>();
+    sources.push_back(std::make_shared<const ConfiguredFeedSource>(feed, _cache, _downloads, shared));
+  }
   if (sources.empty()) sources.push_back(sampleCity());
   return sources;
 }

@@ -27,12 +27,6 @@ std::optional<std::uint32_t> lineLike(const StaticFeed& feed, const TransitLineL
   return found;
 }
 
-bool hasRoute(const StaticFeed& feed, std::string_view routeID) {
-  for (std::size_t i = 0; i < feed.lineCount(); ++i)
-    if (feed.line(i).routeID == routeID) return true;
-  return false;
-}
-
 }  // namespace
 
 std::vector<std::optional<FoundLine>> findLines(const StaticFeed& feed, const std::string& feedName,
@@ -49,7 +43,7 @@ std::vector<std::optional<FoundLine>> findLines(const StaticFeed& feed, const st
     if (const auto line = lineOfMuid[identifier->muid()])
       found = {*line, {}};
     else if (const auto like = locator && locator->feed == feedName ? lineLike(feed, *locator) : std::nullopt)
-      found = {*like, hasRoute(feed, locator->routeID) ? std::string() : locator->routeID};
+      found = {*like, feed.hasRoute(locator->routeID) ? std::string() : locator->routeID};
   }
   return lines;
 }
@@ -72,6 +66,7 @@ Outcome<FeedAnswer> lookUpInFeed(const FeedSource& source, std::span<const MapIt
   query.minorAlerts = source.minorAlerts();
   query.now = currentDate();
   query.trips = loaded->trips;
+  query.isRouteOfOther = source.isRouteOfOther(stop);
   std::unordered_map<std::uint32_t, std::size_t> placeOfLine;  // two identifiers may have become one line
   for (std::size_t i = 0; i < lines.size(); ++i) {
     if (!lines[i]) continue;

@@ -1,5 +1,9 @@
 #pragma once
 
+#include <algorithm>
+#include <functional>
+#include <mutex>
+#include <optional>
 #include <stop_token>
 #include <string>
 
@@ -21,25 +25,56 @@ class FeedSource {
   virtual Outcome<LoadedStaticFeed> staticFeed(const std::stop_token& stop) const = 0;
   /// The present alerts, fresh enough to say "good service" by.
   virtual Outcome<AlertsFeed> alerts(const std::stop_token& stop) const = 0;
+  /// Whether another feed that is read by the same alerts has a route.
+  virtual std::function<bool(std::string_view routeID)> isRouteOfOther(const std::stop_token&) const { return {}; }
+};
+
+/// Alerts that several feeds are read by, fetched once for them all. Any thread.
+class SharedAlerts {
+ public:
+  template <class Load>
+  Outcome<AlertsFeed> get(const Load& load) {
+    const std::lock_guard guard(_lock);
+    if (!_alerts) _alerts = load();
+    return *_alerts;
+  }
+
+ private:
+  std::mutex _lock;
+  std::optional<Outcome<AlertsFeed>> _alerts;
 };
 
 /// A feed that the user set up.
 class ConfiguredFeedSource final : public FeedSource {
  public:
-  ConfiguredFeedSource(Feed feed, const FeedCache& cache, std::shared_ptr<StaticFeedDownloads> downloads)
-      : _feed(std::move(feed)), _staticFeeds(std::move(downloads)), _alerts(cache) {}
+  /// `shared` is one for all feeds that are read by these alerts.
+  ConfiguredFeedSource(Feed feed, const FeedCache& cache, std::shared_ptr<StaticFeedDownloads> downloads,
+                       std::shared_ptr<SharedAlerts> shared)
+      : _feed(std::move(feed)), _staticFeeds(std::move(downloads)), _alerts(cache), _shared(std::move(shared)) {}
 
   const std::string& name() const override { return _feed.name; }
   bool minorAlerts() const override { return _feed.minorAlerts; }
   Outcome<LoadedStaticFeed> staticFeed(const std::stop_token& stop) const override {
     return _staticFeeds->load(_feed, stop);
   }
-  Outcome<AlertsFeed> alerts(const std::stop_token& stop) const override { return _alerts.load(_feed, stop); }
+  Outcome<AlertsFeed> alerts(const std::stop_token& stop) const override {
+    return _shared->get([&] { return _alerts.load(_feed, stop); });
+  }
+  std::function<bool(std::string_view routeID)> isRouteOfOther(const std::stop_token& stop) const override {
+    if (_feed.siblings.empty()) return {};
+    return [this, stop](std::string_view routeID) {
+      return std::any_of(_feed.siblings.begin(), _feed.siblings.end(), [&](const Feed& sibling) {
+        const auto loaded = _staticFeeds->load(sibling, stop);
+        return loaded && loaded->feed.hasRoute(routeID);
+      });
+    };
+  }
 
  private:
   Feed _feed;
   std::shared_ptr<StaticFeedDownloads> _staticFeeds;
   AlertsStore _alerts;
+  std::shared_ptr<SharedAlerts> _shared;
 };
 
 }  // namespace nimbo

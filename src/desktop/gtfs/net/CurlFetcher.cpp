@@ -1,5 +1,7 @@
 #include "desktop/gtfs/net/CurlFetcher.h"
 
+#include <algorithm>
+#include <chrono>
 #include <memory>
 #include <new>
 
@@ -8,13 +10,14 @@
 #include "desktop/gtfs/text/Utf8.h"
 #include "desktop/raii/CurlHandle.h"
 #include "platform/foundation/Version.h"
+
 namespace nimbo {
 
 namespace {
 
 using Code = TransitLineServiceError;
 
-constexpr long kMostRedirects = 5;
+constexpr int kMostRedirects = 5;
 constexpr long kConnectSeconds = 15;
 constexpr long kStalledSeconds = 30;  // a server that sends less than this for so long will not do better
 constexpr long kStalledBytesASecond = 100;
@@ -101,7 +104,8 @@ CurlHandle makeHandle() {
   return handle;
 }
 
-CurlHeaders headersFor(const HTTPValidators& validators) {
+/// Those of the key, if any, and what the request is.
+CurlHeaders headersFor(const std::vector<std::string>& key, const HTTPValidators& validators) {
   CurlHeaders headers;
   const auto add = [&](const std::string& line) {
     curl_slist* longer = curl_slist_append(headers.get(), line.c_str());
@@ -110,6 +114,7 @@ CurlHeaders headersFor(const HTTPValidators& validators) {
     headers.reset(longer);
   };
   add("Accept-Encoding: gzip");
+  for (const std::string& line : key) add(line);
   if (!validators.etag.empty()) add("If-None-Match: " + validators.etag);
   if (!validators.lastModified.empty()) add("If-Modified-Since: " + validators.lastModified);
   return headers;
@@ -117,24 +122,41 @@ CurlHeaders headersFor(const HTTPValidators& validators) {
 
 bool isEncrypted(const HTTPRequest& request) { return asciiLowerCase(request.address.text()).starts_with("https:"); }
 
-void setOptions(CURL* handle, Transfer& transfer, const CurlHeaders& headers) {
+/// A part of an address; empty where it has none.
+std::string partOf(CURLU* address, CURLUPart part, unsigned flags = 0) {
+  char* text = nullptr;
+  if (curl_url_get(address, part, &text, flags) != CURLUE_OK) return {};
+  const std::unique_ptr<char, void (*)(void*)> owned(text, curl_free);
+  return text;
+}
+
+/// The address that a redirect leads to, with the user name and the password of the one before where it stays with that
+/// server; `isSameServer` hears whether it does: scheme, host and port are the same.
+std::string redirected(const std::string& from, const std::string& to, bool& isSameServer) {
+  const CurlAddress before(curl_url()), after(curl_url());
+  isSameServer = curl_url_set(before.get(), CURLUPART_URL, from.c_str(), 0) == CURLUE_OK &&
+                 curl_url_set(after.get(), CURLUPART_URL, to.c_str(), 0) == CURLUE_OK;
+  for (const CURLUPart part : {CURLUPART_SCHEME, CURLUPART_HOST, CURLUPART_PORT})
+    isSameServer = isSameServer && asciiLowerCase(partOf(before.get(), part, CURLU_DEFAULT_PORT)) ==
+                                       asciiLowerCase(partOf(after.get(), part, CURLU_DEFAULT_PORT));
+  if (!isSameServer) return to;
+  for (const CURLUPart part : {CURLUPART_USER, CURLUPART_PASSWORD})
+    if (const std::string text = partOf(before.get(), part); !text.empty())
+      curl_url_set(after.get(), part, text.c_str(), 0);
+  return partOf(after.get(), CURLUPART_URL);
+}
+
+void setOptions(CURL* handle, Transfer& transfer) {
   const auto set = [&](CURLoption option, auto value) { curl_easy_setopt(handle, option, value); };
-  set(CURLOPT_URL, transfer.request.address.text().c_str());
-  set(CURLOPT_PROTOCOLS_STR, "http,https");
-  // Whoever chose https is not led off it; a key in the address stays with the server that it is for.
-  set(CURLOPT_REDIR_PROTOCOLS_STR, isEncrypted(transfer.request) ? "https" : "http,https");
-  set(CURLOPT_UNRESTRICTED_AUTH, 0L);
-  set(CURLOPT_FOLLOWLOCATION, 1L);
-  set(CURLOPT_MAXREDIRS, kMostRedirects);
+  // Whoever chose https is not led off it.
+  set(CURLOPT_PROTOCOLS_STR, isEncrypted(transfer.request) ? "https" : "http,https");
   set(CURLOPT_USERAGENT, (std::string("nimbo-transit/") + kVersion).c_str());
   set(CURLOPT_CONNECTTIMEOUT, kConnectSeconds);
-  set(CURLOPT_TIMEOUT, static_cast<long>(transfer.request.timeLimit.count()));
   set(CURLOPT_MAXFILESIZE_LARGE, static_cast<curl_off_t>(transfer.request.limit));
   set(CURLOPT_LOW_SPEED_TIME, kStalledSeconds);
   set(CURLOPT_LOW_SPEED_LIMIT, kStalledBytesASecond);
   set(CURLOPT_NOSIGNAL, 1L);
   set(CURLOPT_QUICK_EXIT, 1L);  // a name being looked up must not hold up the end
-  set(CURLOPT_HTTPHEADER, headers.get());
   set(CURLOPT_WRITEFUNCTION, &Transfer::onPiece);
   set(CURLOPT_WRITEDATA, static_cast<void*>(&transfer));
   set(CURLOPT_HEADERFUNCTION, &Transfer::onHeader);
@@ -172,8 +194,6 @@ Failure failureOf(CURLcode result, const Transfer& transfer) {
       return {Code::untrustedServer,
               "its server's certificate cannot be trusted. Check the address and the date of "
               "this machine."};
-    case CURLE_TOO_MANY_REDIRECTS:
-      return {Code::serverFailure, "its server redirects without end. Ask the publisher for the right address."};
     case CURLE_UNSUPPORTED_PROTOCOL:
     case CURLE_URL_MALFORMAT:
       if (isEncrypted(transfer.request))
@@ -210,18 +230,37 @@ Failure failureOfStatus(long status) {
 Outcome<HTTPAnswer> fetchWithCurl(const HTTPRequest& request, const std::stop_token& stop,
                                   const HTTPFetcher::Sink& sink) {
   const CurlHandle handle = makeHandle();
-  const CurlHeaders headers = headersFor(request.validators);
   const bool isConditional = request.validators != HTTPValidators();
   Transfer transfer{request, stop, sink, handle.get(), {}, {}, {}};
-  setOptions(handle.get(), transfer, headers);
+  setOptions(handle.get(), transfer);
   const auto failed = [&](const Failure& failure) {
     return transitLineServiceError(failure.code, "Cannot fetch " + request.address.publicText() + ": " + failure.what,
                                    request.address.publicText());
   };
-  if (const CURLcode result = curl_easy_perform(handle.get()); result != CURLE_OK)
-    return failed(failureOf(result, transfer));
+  const auto isDue = std::chrono::steady_clock::now() + request.timeLimit;
+  std::string address = request.address.textWithKey();
+  CurlHeaders headers = headersFor(request.address.key().headers, request.validators);
   long status = 0;
-  curl_easy_getinfo(handle.get(), CURLINFO_RESPONSE_CODE, &status);
+  // By hand, since libcurl would take headers of keys along to any server.
+  for (int redirects = 0;; ++redirects) {
+    const auto left = std::chrono::ceil<std::chrono::milliseconds>(isDue - std::chrono::steady_clock::now());
+    curl_easy_setopt(handle.get(), CURLOPT_TIMEOUT_MS, std::max<long>(left.count(), 1));
+    curl_easy_setopt(handle.get(), CURLOPT_URL, address.c_str());
+    curl_easy_setopt(handle.get(), CURLOPT_HTTPHEADER, headers.get());
+    if (const CURLcode result = curl_easy_perform(handle.get()); result != CURLE_OK)
+      return failed(failureOf(result, transfer));
+    curl_easy_getinfo(handle.get(), CURLINFO_RESPONSE_CODE, &status);
+    const char* next = nullptr;
+    curl_easy_getinfo(handle.get(), CURLINFO_REDIRECT_URL, &next);
+    if (!next) break;
+    if (redirects == kMostRedirects)
+      return failed(
+          {Code::serverFailure, "its server redirects without end. Ask the publisher for the right address."});
+    bool isSameServer = false;
+    address = redirected(address, next, isSameServer);
+    // Gone for good: another server may lead back to the first with an address of its own choice.
+    if (!isSameServer) headers = headersFor({}, request.validators);
+  }
   if (status == 304 && isConditional) {
     // The server may leave out what has not changed.
     const auto orHeld = [](std::string& value, const std::string& held) {

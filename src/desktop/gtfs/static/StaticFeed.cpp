@@ -103,6 +103,12 @@ std::optional<StaticFeed> StaticFeed::fromBytes(std::string bytes) {
 std::size_t StaticFeed::agencyCount() const { return headerOf(*_bytes).agencyCount; }
 std::size_t StaticFeed::lineCount() const { return headerOf(*_bytes).lineCount; }
 
+bool StaticFeed::hasRoute(std::string_view routeID) const {
+  for (std::size_t i = 0; i < lineCount(); ++i)
+    if (line(i).routeID == routeID) return true;
+  return false;
+}
+
 StaticAgency StaticFeed::agency(std::size_t index) const {
   const FlatHeader header = headerOf(*_bytes);
   if (index >= header.agencyCount) return {};

@@ -128,6 +128,7 @@ class StaticFeed {
   /// One without texts for an index that is not below the count.
   StaticAgency agency(std::size_t index) const;
   std::size_t lineCount() const;
+  bool hasRoute(std::string_view routeID) const;
   /// In the order of routes.txt; `index` is below the count.
   StaticLine line(std::size_t index) const;
 

@@ -2,8 +2,10 @@
 
 #include <fcntl.h>
 
+#include <algorithm>
 #include <cstdlib>
 
+#include "desktop/gtfs/feeds/OtherContent.h"
 #include "desktop/gtfs/feeds/TransitLineServiceError.h"
 #include "desktop/gtfs/net/FeedsPart.h"
 #include "desktop/gtfs/net/FileReading.h"
@@ -37,11 +39,11 @@ std::string localFingerprint(const std::filesystem::path& path) {
 
 // A remote source's fingerprint is its address and what the server says of its state.
 std::string remoteFingerprint(const FeedAddress& address, const HTTPValidators& validators) {
-  return address.text() + "\n" + validators.etag + "\n" + validators.lastModified;
+  return address.identity() + "\n" + validators.etag + "\n" + validators.lastModified;
 }
 
 std::optional<HTTPValidators> validatorsIn(std::string_view fingerprint, const FeedAddress& address) {
-  const std::string begin = address.text() + "\n";
+  const std::string begin = address.identity() + "\n";
   const std::size_t end = fingerprint.find('\n', begin.size());
   if (!fingerprint.starts_with(begin) || end == std::string_view::npos) return std::nullopt;
   return HTTPValidators{std::string(fingerprint.substr(begin.size(), end - begin.size())),
@@ -61,6 +63,11 @@ Outcome<std::unique_ptr<StaticFeedFiles>> openLocal(const std::filesystem::path&
   FileDescriptor file(::open(path.c_str(), O_RDONLY | O_CLOEXEC | O_NONBLOCK));
   if (!file) return unreadable(std::generic_category().message(errno));
   if (!std::filesystem::is_regular_file(path, ignored)) return unreadable("it is neither a file nor a folder");
+  char beginning[kTellingBytes];
+  const ssize_t count = ::pread(file.get(), beginning, sizeof beginning, 0);
+  if (ErrorRef error =
+          otherThanStatic({beginning, static_cast<std::size_t>(std::max<ssize_t>(count, 0))}, path.native()))
+    return error;
   return openZippedFeed(file, path.native());
 }
 
@@ -161,19 +168,38 @@ Outcome<FreshStaticFeed> StaticFeedStore::parse(StaticFeedFiles& files, const Fe
 Outcome<std::optional<FreshStaticFeed>> StaticFeedStore::fetch(const Feed& feed, const HTTPValidators& validators,
                                                                const std::stop_token& stop,
                                                                const Progress& progress) const {
+  auto fetched = fetchFrom(feed, feed.staticFeed, validators, stop, progress);
+  if (fetched || !feed.staticMirror || stop.stop_requested()) return fetched;
+  auto copy = fetchFrom(feed, *feed.staticMirror, {}, stop, progress);
+  if (!copy) return fetched;
+  writeLog(kFeedLogFacility, LogLevel::info, "The copy of the static feed of %{private}@ stands in: %{private}@",
+           {feed.name, fetched.error()->reason()});
+  return copy;
+}
+
+Outcome<std::optional<FreshStaticFeed>> StaticFeedStore::fetchFrom(const Feed& feed, const FeedAddress& address,
+                                                                   const HTTPValidators& validators,
+                                                                   const std::stop_token& stop,
+                                                                   const Progress& progress) const {
   if (ErrorRef error = makeFolders(_cache.folder())) return error;
   const FileDescriptor file = temporaryFile(_cache.folder());
   if (!file) return fileError("write in", _cache.folder(), errno);
-  const HTTPRequest request{feed.staticFeed, validators, kLargestDownload, kDownloadTimeLimit};
+  std::string beginning;
+  const HTTPRequest request{address, validators, kLargestDownload, kDownloadTimeLimit};
   const auto answer = HTTPFetcher::fetch(request, stop, [&](std::string_view piece) {
     if (progress) progress(piece.size());
+    if (beginning.size() < kTellingBytes) beginning += piece.substr(0, kTellingBytes);
     return writeAll(file, piece);
   });
   if (!answer) return answer.error();
   if (answer->isUnchanged) return std::optional<FreshStaticFeed>();
-  auto files = openZippedFeed(file, feed.staticFeed.publicText());
+  if (ErrorRef error = otherThanStatic(beginning, address.publicText())) return error;
+  auto files = openZippedFeed(file, address.publicText());
   if (!files) return files.error();
-  auto fresh = parse(**files, feed, remoteFingerprint(feed.staticFeed, answer->validators));
+  // What a copy's server says of its state tells nothing of the source's.
+  const bool isSource = address == feed.staticFeed;
+  auto fresh =
+      parse(**files, feed, remoteFingerprint(feed.staticFeed, isSource ? answer->validators : HTTPValidators()));
   if (!fresh) return fresh.error();
   return std::optional(std::move(*fresh));
 }

@@ -56,6 +56,9 @@ class StaticFeedStore {
                                        const std::stop_token& stop, const Progress& progress) const;
   Outcome<std::optional<FreshStaticFeed>> fetch(const Feed& feed, const HTTPValidators& validators,
                                                 const std::stop_token& stop, const Progress& progress) const;
+  Outcome<std::optional<FreshStaticFeed>> fetchFrom(const Feed& feed, const FeedAddress& address,
+                                                    const HTTPValidators& validators, const std::stop_token& stop,
+                                                    const Progress& progress) const;
   Outcome<FreshStaticFeed> parse(StaticFeedFiles& files, const Feed& feed, const std::string& fingerprint) const;
   Outcome<TripRoutes> readTrips(const Feed& feed, const StaticFeed& staticFeed, const std::stop_token& stop) const;
   LoadedStaticFeed withTrips(const Feed& feed, StaticFeed staticFeed, std::optional<TripRoutes> trips,
