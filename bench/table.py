@@ -131,7 +131,7 @@ class Bench:
         self.large = ["--config", self.folder / "large", "--state", self.folder / "large"]
         program = self.build / "src/host/nimbo-transit"
         run(program, *self.large, "feed", "add", "metro", "--static", self.folder / "feed", "--alerts",
-            self.folder / "feed/alerts.pb")
+            self.folder / "feed/alerts.pb", "--force")
         for number in range(FAVORITES):
             run(program, *self.large, "favorite", "add", f"metro:R{number * 200}")
 

@@ -19,7 +19,8 @@ _nimbo_transit() {
   local command="" i
   for ((i = 1; i < cword; i++)); do
     case ${words[i]} in
-      --config | --state | --static | --alerts | --format | --now | --virtual-time | --size | --scale | --text-size | --locale) ((i++)) ;;
+      --config | --state | --static | --alerts | --mirror | --from | --key | --key-file | --header | --static-header | \
+        --alerts-header | --maximum-age | --format | --now | --virtual-time | --size | --scale | --text-size | --locale) ((i++)) ;;
       -*) ;;
       *)
         case $command in
@@ -32,7 +33,7 @@ _nimbo_transit() {
 
   case $prev in
     --config | --state) _filedir -d; return ;;
-    --static | --alerts) _filedir; return ;;
+    --static | --alerts | --key-file) _filedir; return ;;
     --text-size)
       COMPREPLY=($(compgen -W "extraSmall small medium large extraLarge extraExtraLarge extraExtraExtraLarge
         accessibilityMedium accessibilityLarge accessibilityExtraLarge accessibilityExtraExtraLarge
@@ -40,7 +41,8 @@ _nimbo_transit() {
       return
       ;;
     --format) COMPREPLY=($(compgen -W "text json" -- "$cur")); return ;;
-    --now | --virtual-time | --size | --scale | --locale) return ;;
+    --mirror | --from | --key | --header | --static-header | --alerts-header | --maximum-age | \
+      --now | --virtual-time | --size | --scale | --locale) return ;;
   esac
 
   local options="--help --config --state" names=""
@@ -50,9 +52,15 @@ _nimbo_transit() {
     render) options+=" --expanded --size --scale --text-size --dark --locale --now" ;;
     script) options+=" --virtual-time" ;;
     analytics | lines | "feed list" | "favorite list") options+=" --json" ;;
-    feed) names="add remove list check" ;;
-    "feed add") options+=" --static --alerts --combined" ;;
-    "feed remove" | "feed check") names=$(_nimbo_transit_names feed list | sed -n 's/^\([^ ]*\)$/\1/p') ;;
+    feed) names="find add edit remove list check" ;;
+    "feed find") options+=" --json" ;;
+    "feed add" | "feed edit")
+      options+=" --static --alerts --mirror --key --key-file --header --static-header --alerts-header --combined
+        --no-combined --minor-alerts --no-minor-alerts --maximum-age --force"
+      ;;&
+    "feed add") options+=" --from" ;;
+    "feed edit") options+=" --no-keys" ;;&
+    "feed edit" | "feed remove" | "feed check") names=$(_nimbo_transit_names feed list | sed -n 's/^\([^ ]*\)$/\1/p') ;;
     favorite) names="add remove move list" ;;
     "favorite add") names=$(_nimbo_transit_names lines | cut -d ' ' -f 1) ;;
     "favorite remove" | "favorite move") names=$(_nimbo_transit_names favorite list | sed -n 's/^\([^ ]*:[^ ]*\).*/\1/p') ;;

@@ -94,10 +94,28 @@ for command in lines 'feed list' 'favorite list'
     complete -c nimbo-transit -n "__nimbo_transit_at $command" -l json -d 'As JSON'
 end
 
-complete -c nimbo-transit -n '__nimbo_transit_at feed' -a 'add remove list check'
-complete -c nimbo-transit -n '__nimbo_transit_at feed add' -l static -r -F -d 'GTFS: folder, zip file or address'
-complete -c nimbo-transit -n '__nimbo_transit_at feed add' -l alerts -r -F -d 'Alerts: file or address'
-complete -c nimbo-transit -n '__nimbo_transit_at feed add' -l combined -d 'Alerts come beside other data'
+complete -c nimbo-transit -n '__nimbo_transit_at feed' -a 'find add edit remove list check'
+complete -c nimbo-transit -n '__nimbo_transit_at feed find' -l json -d 'As JSON'
+complete -c nimbo-transit -n '__nimbo_transit_at feed add' -l from -x -d 'A feed of the catalog, by its ID'
+complete -c nimbo-transit -n '__nimbo_transit_at feed edit' -l no-keys -d 'Forget its keys'
+complete -c nimbo-transit -n '__nimbo_transit_at feed edit' -a '(__nimbo_transit_feeds)'
+for command in add edit
+    set -l at "__nimbo_transit_at feed $command"
+    complete -c nimbo-transit -n $at -l static -r -F -d 'GTFS: folder, zip file or address'
+    complete -c nimbo-transit -n $at -l alerts -r -F -d 'Alerts: file or address'
+    complete -c nimbo-transit -n $at -l mirror -x -d 'Copy of the static feed'
+    complete -c nimbo-transit -n $at -l key -x -d 'Key of the agency'
+    complete -c nimbo-transit -n $at -l key-file -r -F -d 'File with the key'
+    complete -c nimbo-transit -n $at -l header -x -d 'NAME: VALUE, sent to both servers'
+    complete -c nimbo-transit -n $at -l static-header -x -d 'Sent for the lines'
+    complete -c nimbo-transit -n $at -l alerts-header -x -d 'Sent for the alerts'
+    complete -c nimbo-transit -n $at -l combined -d 'Alerts come beside other data'
+    complete -c nimbo-transit -n $at -l no-combined -d 'Alerts come alone'
+    complete -c nimbo-transit -n $at -l minor-alerts -d 'All alerts count'
+    complete -c nimbo-transit -n $at -l no-minor-alerts -d 'Not all count'
+    complete -c nimbo-transit -n $at -l maximum-age -x -d 'Minutes for which alerts count'
+    complete -c nimbo-transit -n $at -l force -d 'Keep what cannot be used now'
+end
 complete -c nimbo-transit -n '__nimbo_transit_at feed remove' -a '(__nimbo_transit_feeds)'
 complete -c nimbo-transit -n '__nimbo_transit_at feed check' -a '(__nimbo_transit_feeds)'
 

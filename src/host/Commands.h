@@ -9,9 +9,13 @@
 #include "desktop/system/GLibRunLoop.h"
 #include "desktop/system/Paths.h"
 #include "host/TerminalText.h"
-#include "platform/foundation/Error.h"
 #include "platform/foundation/Geometry.h"
+#include "platform/foundation/Outcome.h"
 #include "platform/transit/TransitLine.h"
+
+namespace nimbo::protocol {
+struct FeedReport;
+}
 
 namespace nimbo {
 
@@ -35,6 +39,11 @@ struct CommandFailure : std::runtime_error {
 inline void require(const ErrorRef& error) {
   if (error) throw CommandFailure(error->reason());
 }
+template <class T>
+T require(Outcome<T> outcome) {
+  require(outcome.error());
+  return std::move(*outcome);
+}
 
 /// Exit statuses of the programs.
 inline constexpr int kExitSuccess = 0;
@@ -49,16 +58,29 @@ int runFavoriteRemove(const CommandContext& context, const std::vector<std::stri
 int runFavoriteMove(const CommandContext& context, const std::string& line, int position);
 int runFavoriteList(const CommandContext& context, bool json);
 
+/// Prints the feeds of the catalog whose agency, name, identifier or place `text` has the words of. Fails when there
+/// are none, after it has told what there is in which country; as JSON that is an empty array.
+int runFeedFind(const CommandContext& context, const std::string& text, bool json);
+
+/// What a feed is to be like; for one that is there, what of it is to change.
 struct FeedOptions {
-  std::string name;
-  std::string staticFeed;   ///< folder, zip file or http(s) address
-  std::string alerts;       ///< file or http(s) address
-  bool isCombined = false;  ///< other entities may come without alerts
+  std::string name;                                       ///< may be empty with `from`
+  std::string from;                                       ///< identifier of the catalog; empty: by the addresses
+  std::optional<std::string> staticFeed, alerts, mirror;  ///< folder, file or http(s) address
+  std::optional<std::string> key;                         ///< goes where the catalog says
+  std::string keyFile;                                    ///< holds the key; "-" is the standard input
+  std::vector<std::string> headers, staticHeaders, alertsHeaders;  ///< "NAME: VALUE"
+  bool withoutKeys = false;                                        ///< those that are kept are dropped
+  std::optional<bool> isCombined;                                  ///< whether other entities may come without alerts
+  std::optional<bool> minorAlerts;  ///< whether alerts count that change nothing for most riders
+  std::optional<int> maximumAlertsAgeMinutes;
+  bool force = false;  ///< keeps what cannot be used
 };
 
-/// Reads the feed, and sets it up even when it cannot be used now, which it says; but for alerts that are another
-/// feed's.
+/// Reads what is to be set up, says what is in it, and keeps it when it can be used.
 int runFeedAdd(const CommandContext& context, const FeedOptions& options);
+/// The same for a feed that is there.
+int runFeedEdit(const CommandContext& context, const FeedOptions& options);
 int runFeedRemove(const CommandContext& context, const std::string& name);
 int runFeedList(const CommandContext& context, bool json);
 /// Reads a feed, or with an empty name every one, and prints what it holds. Fails when one cannot be read.
@@ -66,6 +88,9 @@ int runFeedCheck(const CommandContext& context, const std::string& name);
 
 /// Prints the lines of all feeds that contain `text`, one a line, as FEED:ROUTE_ID, names and agency.
 int runLines(const CommandContext& context, const std::string& text, bool json);
+
+/// Prints what a check found. Answers whether both halves can be used.
+bool printCheck(const protocol::FeedReport& report);
 
 /// Prints a line each, or an array as docs/formats.md has it.
 void printLines(const std::vector<TransitLineRef>& lines, bool json);

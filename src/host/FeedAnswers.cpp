@@ -1,5 +1,8 @@
 #include "host/FeedAnswers.h"
 
+#include <algorithm>
+
+#include "desktop/gtfs/feeds/TransitLineServiceError.h"
 #include "desktop/gtfs/static/LineItems.h"
 #include "platform/transit/BasicTransitLineItem.h"
 
@@ -50,12 +53,35 @@ protocol::LineKey keyOf(const MapItemIdentifier& identifier) {
           .mode = static_cast<std::int64_t>(locator.mode)};
 }
 
+namespace {
+
+/// Whether a fault tells only that no alert is about this one of several feeds that go with the same alerts.
+bool isOfForeignAlerts(const std::optional<protocol::FetchError>& fault) {
+  return fault && fault->domain == kTransitLineServiceErrorDomain &&
+         fault->code == static_cast<std::int64_t>(TransitLineServiceError::foreignAlerts);
+}
+
+}  // namespace
+
+void forgiveForeignAlerts(std::vector<protocol::FeedReport>& reports) {
+  const bool belongs = std::any_of(reports.begin(), reports.end(), [](const protocol::FeedReport& report) {
+    return report.alerts && report.staticFeed && !isOfForeignAlerts(report.alerts->gap);
+  });
+  for (protocol::FeedReport& report : reports)
+    if (belongs && report.alerts && isOfForeignAlerts(report.alerts->gap)) report.alerts->gap.reset();
+}
+
 protocol::FeedDefinition definitionOf(const Feed& feed) {
   protocol::FeedDefinition definition{.name = feed.name,
                                       .staticFeed = feed.staticFeed.text(),
                                       .alerts = feed.alerts.text(),
                                       .minorAlerts = feed.minorAlerts,
                                       .isCombined = feed.isCombined};
+  if (feed.staticMirror) definition.staticMirror = feed.staticMirror->text();
+  for (const auto& [address, key] :
+       {std::pair(&feed.staticFeed, &definition.staticKey), {&feed.alerts, &definition.alertsKey}})
+    if (!address->key().isEmpty()) *key = {address->key().headers, address->key().query};
+  definition.sharesAlerts = feed.sharesAlerts;
   if (feed.maximumAlertsAge) definition.maximumAlertsAgeMinutes = feed.maximumAlertsAge->count();
   return definition;
 }

@@ -18,6 +18,10 @@ ErrorRef errorOf(const protocol::FetchError& error);
 /// Asks for a line that was found before; `identifier` has a locator.
 protocol::LineKey keyOf(const MapItemIdentifier& identifier);
 
+/// Takes away, of feeds that go with the same alerts, the fault that no alert is about one of them, where some are
+/// about another.
+void forgiveForeignAlerts(std::vector<protocol::FeedReport>& reports);
+
 /// Asks for a feed that need not be set up.
 protocol::FeedDefinition definitionOf(const Feed& feed);
 

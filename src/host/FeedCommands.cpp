@@ -16,12 +16,6 @@ namespace nimbo {
 
 namespace {
 
-template <class T>
-T require(Outcome<T> outcome) {
-  if (!outcome) throw CommandFailure(outcome.error()->reason());
-  return std::move(*outcome);
-}
-
 void printLine(const std::string& text) { std::cout << "  " << printableText(text) << "\n"; }
 
 void printReport(const char* what, const std::vector<protocol::Skipped>& report) {
@@ -31,7 +25,8 @@ void printReport(const char* what, const std::vector<protocol::Skipped>& report)
   }
 }
 
-/// Prints what a check found. Answers whether both halves can be used.
+}  // namespace
+
 bool printCheck(const protocol::FeedReport& report) {
   std::cout << printableText(report.name) << "\n";
   if (const auto& feed = report.staticFeed) {
@@ -57,6 +52,8 @@ bool printCheck(const protocol::FeedReport& report) {
   for (const protocol::FetchError& fault : faults) printLine("error: " + fault.reason);
   return faults.empty();
 }
+
+namespace {
 
 /// The parts of a line: how it is written, its shield's text, its name, its agency.
 std::vector<std::string> partsOfLine(const TransitLine& line) {
@@ -90,45 +87,17 @@ void printLines(const std::vector<TransitLineRef>& lines, bool asJSON) {
   }
 
   std::vector<std::vector<std::string>> table;
-  std::vector<int> widths(4);
-  for (const TransitLineRef& line : lines) {
-    table.push_back(columnsOfLine(*line));
-    for (std::size_t i = 0; i < widths.size(); ++i) widths[i] = std::max(widths[i], terminalWidth(table.back()[i]));
-  }
-  for (const auto& row : table) {
-    std::string text;
-    for (std::size_t i = 0; i < row.size(); ++i)
-      if (widths[i] > 0)
-        text += row[i] + std::string(static_cast<std::size_t>(widths[i] - terminalWidth(row[i]) + 2), ' ');
-    std::cout << text.substr(0, text.find_last_not_of(' ') + 1) << "\n";
-  }
-}
-
-int runFeedAdd(const CommandContext& context, const FeedOptions& options) {
-  const HostPlatform platform(context);
-  Feed feed{.name = options.name,
-            .staticFeed = require(FeedAddress::parse(options.staticFeed)),
-            .alerts = require(FeedAddress::parse(options.alerts))};
-  feed.isCombined = options.isCombined;
-  FeedConfiguration configuration(context.paths.config);
-  if (const ErrorRef error = configuration.checkNewName(feed.name)) throw CommandFailure(error->reason());
-  const FeedCache cache(context.paths.cache);
-  const protocol::FeedReport report =
-      WidgetWithProgress(context).call(protocol::kCheckFeed, {.definition = definitionOf(feed)});
-  if (report.isOtherFeed && report.alertsError) {
-    cache.remove(feed.name);
-    throw CommandFailure(report.alertsError->reason + " \"--combined\" does so.");
-  }
-  if (report.alerts && report.alerts->hasOthers) feed.isCombined = true;
-  if (const ErrorRef error = configuration.add(feed)) throw CommandFailure(error->reason());
-  for (const protocol::FetchError& fault : report.faults()) printMessage(fault.reason);
-  return kExitSuccess;
+  table.reserve(lines.size());
+  for (const TransitLineRef& line : lines) table.push_back(columnsOfLine(*line));
+  printTable(table);
 }
 
 int runFeedRemove(const CommandContext& context, const std::string& name) {
   const HostPlatform platform(context);
-  require(FeedConfiguration(context.paths.config).remove(name));
-  FeedCache(context.paths.cache).remove(name);
+  FeedConfiguration configuration(context.paths.config);
+  const Feed feed = require(configuration.feedNamed(name));
+  require(configuration.remove(name));
+  FeedCache(context.paths.cache).remove(feed);
   return kExitSuccess;
 }
 

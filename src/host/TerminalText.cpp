@@ -116,6 +116,21 @@ int terminalWidth(std::string_view text) {
   return width;
 }
 
+void printTable(const std::vector<std::vector<std::string>>& rows) {
+  std::vector<int> widths;
+  for (const auto& row : rows) {
+    widths.resize(row.size());
+    for (std::size_t i = 0; i < row.size(); ++i) widths[i] = std::max(widths[i], terminalWidth(row[i]));
+  }
+  for (const auto& row : rows) {
+    std::string text;
+    for (std::size_t i = 0; i < row.size(); ++i)
+      if (widths[i] > 0)
+        text += row[i] + std::string(static_cast<std::size_t>(widths[i] - terminalWidth(row[i]) + 2), ' ');
+    std::cout << text.substr(0, text.find_last_not_of(' ') + 1) << "\n";
+  }
+}
+
 std::vector<std::string> foldedText(std::string_view text, int columns) {
   columns = std::max(columns, 2);
   std::vector<std::string> lines;

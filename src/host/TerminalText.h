@@ -41,6 +41,9 @@ void printMessage(const std::string& message);
 /// Columns that a text takes in a terminal: wide characters two, combining marks and escape sequences none.
 int terminalWidth(std::string_view text);
 
+/// Prints rows of texts that are printable, each with as many, in columns. An empty column takes no room.
+void printTable(const std::vector<std::vector<std::string>>& rows);
+
 /// The text's lines, folded at blanks to `columns`; a word that is wider is cut. An empty text has no line.
 std::vector<std::string> foldedText(std::string_view text, int columns);
 

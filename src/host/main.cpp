@@ -10,6 +10,7 @@
 #include <iostream>
 #include <set>
 
+#include "desktop/gtfs/feeds/Feed.h"
 #include "host/Arguments.h"
 #include "host/Commands.h"
 #include "host/StandardDescriptors.h"
@@ -33,6 +34,8 @@ class CommandLine {
   /// The exit status for what was printed, which may not have been written: says so then.
   int outputStatus();
   void addWidgetCommands();
+  /// What `feed add` and `feed edit` have in common; answers the options of the two addresses.
+  std::pair<CLI::Option*, CLI::Option*> addFeedOptions(CLI::App& command);
   void addFeedCommands();
   void addFavoriteCommands();
   void addStateCommands();
@@ -129,18 +132,59 @@ void CommandLine::addWidgetCommands() {
       ->check(checkDate);
 }
 
+std::pair<CLI::Option*, CLI::Option*> CommandLine::addFeedOptions(CLI::App& command) {
+  const auto addAddress = [&](const char* option, std::optional<std::string>& address, const char* description) {
+    return command.add_option(option, address, description)->check(checkFeedAddress);
+  };
+  const auto addHeaders = [&](const char* option, std::vector<std::string>& headers, const char* description) {
+    command.add_option(option, headers, description)->type_name("'NAME: VALUE'")->expected(1)->take_all();
+  };
+  CLI::Option* staticFeed =
+      addAddress("--static", _feed.staticFeed, "GTFS: a folder, a zip file, or an http(s) address");
+  CLI::Option* alerts =
+      addAddress("--alerts", _feed.alerts, "GTFS-Realtime Service Alerts: a file or an http(s) address");
+  addAddress("--mirror", _feed.mirror, "Address of a copy, read where the static feed cannot be fetched");
+  CLI::Option* key = command.add_option("--key", _feed.key, "The key that the agency gave you");
+  command.add_option("--key-file", _feed.keyFile, "File that holds the key; - for the standard input")->excludes(key);
+  addHeaders("--header", _feed.headers, "Sent to both servers; may be given again");
+  addHeaders("--static-header", _feed.staticHeaders, "Sent to the server of the static feed");
+  addHeaders("--alerts-header", _feed.alertsHeaders, "Sent to the server of the alerts");
+  command.add_flag("--combined,!--no-combined", _feed.isCombined,
+                   "The alerts come beside positions of vehicles or times of trips");
+  command.add_flag("--minor-alerts,!--no-minor-alerts", _feed.minorAlerts,
+                   "Alerts count too that change nothing for most riders");
+  command.add_option("--maximum-age", _feed.maximumAlertsAgeMinutes, "Minutes for which alerts count")
+      ->check(CLI::Range(0, kLongestAlertsAgeMinutes));
+  command.add_flag("--force", _feed.force, "Keep what cannot be used now");
+  return {staticFeed, alerts};
+}
+
 void CommandLine::addFeedCommands() {
   CLI::App* feed = _app.add_subcommand("feed", "The feeds of the agencies")->require_subcommand(1);
+  CLI::App* find = add(*feed, "find", "Find an agency's feed by agency or place",
+                       [this](const CommandContext& context) { return runFeedFind(context, _text, _json); });
+  find->add_option("TEXT", _text, "Words of the agency, the place or the country, in any order")->required();
+  find->add_flag("--json", _json, "As JSON");
   CLI::App* addFeed =
       add(*feed, "add", "Set up a feed", [this](const CommandContext& context) { return runFeedAdd(context, _feed); });
-  addFeed->add_option("NAME", _feed.name, "Name of your choice")->required()->check(checkFeedName);
-  addFeed->add_option("--static", _feed.staticFeed, "GTFS: a folder, a zip file, or an http(s) address")
-      ->required()
-      ->check(checkFeedAddress);
-  addFeed->add_option("--alerts", _feed.alerts, "GTFS-Realtime Service Alerts: a file or an http(s) address")
-      ->required()
-      ->check(checkFeedAddress);
-  addFeed->add_flag("--combined", _feed.isCombined, "The alerts come beside positions of vehicles or times of trips");
+  CLI::Option* name = addFeed->add_option("NAME", _feed.name, "Name of your choice; a fitting one is made with --from");
+  name->check(checkFeedName);
+  CLI::Option* from = addFeed->add_option("--from", _feed.from, "A feed that \"feed find\" tells, by its ID");
+  const auto [staticFeed, alerts] = addFeedOptions(*addFeed);
+  // Either from the catalog, or by name and addresses.
+  addFeed->callback([this, name, from, staticFeed, alerts] {
+    for (const CLI::Option* option : {name, staticFeed, alerts})
+      if (from->count() == 0 && option->count() == 0) throw CLI::RequiredError(option->get_name() + " or --from");
+    _chosen = [this](const CommandContext& context) { return runFeedAdd(context, _feed); };
+  });
+  from->excludes(staticFeed)->excludes(alerts);
+  for (const char* option : {"--mirror", "--header", "--static-header", "--alerts-header"})
+    from->excludes(addFeed->get_option(option));
+  CLI::App* edit = add(*feed, "edit", "Change a feed: what is given, and its name stays",
+                       [this](const CommandContext& context) { return runFeedEdit(context, _feed); });
+  edit->add_option("NAME", _feed.name, "Name of the feed")->required();
+  addFeedOptions(*edit);
+  edit->add_flag("--no-keys", _feed.withoutKeys, "Forget the keys that are kept for it");
   CLI::App* remove = add(*feed, "remove", "Forget a feed",
                          [this](const CommandContext& context) { return runFeedRemove(context, _feed.name); });
   remove->add_option("NAME", _feed.name, "Name of the feed")->required();

@@ -76,16 +76,37 @@ protocol::FeedReport writtenReport(const FeedCheckReport& report) {
   return written;
 }
 
+namespace {
+
+Outcome<FeedAddress> addressOf(const std::string& text, const std::optional<protocol::FeedKey>& key) {
+  const auto address = FeedAddress::parse(text);
+  if (!address || !key) return address;
+  for (const std::string& header : key->headers)
+    if (ErrorRef error = FeedKey::checkHeader(header)) return error;
+  return address->withKey({key->headers, key->query});
+}
+
+}  // namespace
+
 Outcome<Feed> feedOf(const protocol::FeedDefinition& definition) {
   if (ErrorRef error = FeedConfiguration::checkName(definition.name)) return error;
-  const auto staticFeed = FeedAddress::parse(definition.staticFeed), alerts = FeedAddress::parse(definition.alerts);
+  const auto staticFeed = addressOf(definition.staticFeed, definition.staticKey),
+             alerts = addressOf(definition.alerts, definition.alertsKey);
   for (const auto* address : {&staticFeed, &alerts})
     if (!*address) return address->error();
+  std::optional<FeedAddress> mirror;
+  if (definition.staticMirror) {
+    const auto address = FeedAddress::parse(*definition.staticMirror);
+    if (!address) return address.error();
+    mirror = *address;
+  }
   Feed feed{.name = definition.name,
             .staticFeed = *staticFeed,
             .alerts = *alerts,
+            .staticMirror = mirror,
             .minorAlerts = definition.minorAlerts,
-            .isCombined = definition.isCombined};
+            .isCombined = definition.isCombined,
+            .sharesAlerts = definition.sharesAlerts};
   if (definition.maximumAlertsAgeMinutes)
     feed.maximumAlertsAge = std::chrono::minutes(*definition.maximumAlertsAgeMinutes);
   return feed;

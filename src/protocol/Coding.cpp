@@ -292,13 +292,20 @@ template <>
 constexpr std::tuple kFields<DescribedLines>{Field{"lines", &DescribedLines::lines},
                                              Field{"failures", &DescribedLines::failures}};
 template <>
+constexpr std::tuple kFields<FeedKey>{Field{"headers", &FeedKey::headers, kMayBeLeftOut},
+                                      Field{"query", &FeedKey::query, kMayBeLeftOut}};
+template <>
 constexpr std::tuple kFields<FeedDefinition>{
     Field{"name", &FeedDefinition::name},
     Field{"static", &FeedDefinition::staticFeed},
     Field{"alerts", &FeedDefinition::alerts},
     Field{"minorAlerts", &FeedDefinition::minorAlerts, kMayBeLeftOut},
     Field{"combined", &FeedDefinition::isCombined, kMayBeLeftOut},
-    Field{"maximumAlertsAgeMinutes", &FeedDefinition::maximumAlertsAgeMinutes, kMayBeLeftOut}};
+    Field{"maximumAlertsAgeMinutes", &FeedDefinition::maximumAlertsAgeMinutes, kMayBeLeftOut},
+    Field{"staticMirror", &FeedDefinition::staticMirror, kMayBeLeftOut},
+    Field{"staticKey", &FeedDefinition::staticKey, kMayBeLeftOut},
+    Field{"alertsKey", &FeedDefinition::alertsKey, kMayBeLeftOut},
+    Field{"sharesAlerts", &FeedDefinition::sharesAlerts, kMayBeLeftOut}};
 template <>
 constexpr std::tuple kFields<CheckFeedParams>{Field{"feed", &CheckFeedParams::feed, kMayBeLeftOut},
                                               Field{"definition", &CheckFeedParams::definition, kMayBeLeftOut}};

@@ -76,6 +76,12 @@ struct DescribedLines {
   std::vector<FetchError> failures;  ///< of feeds that could not be read or are not set up, once each
 };
 
+/// What a server lets its clients in by.
+struct FeedKey {
+  std::vector<std::string> headers;  ///< "NAME: VALUE"
+  std::string query;                 ///< goes to the end of the address's query; may be empty
+};
+
 /// A feed as its user sets it up.
 struct FeedDefinition {
   std::string name;
@@ -84,6 +90,9 @@ struct FeedDefinition {
   bool minorAlerts = false;
   bool isCombined = false;
   std::optional<std::int64_t> maximumAlertsAgeMinutes;
+  std::optional<std::string> staticMirror;  ///< address
+  std::optional<FeedKey> staticKey, alertsKey;
+  bool sharesAlerts = false;  ///< other feeds go with the same alerts
 };
 
 /// One of the two.

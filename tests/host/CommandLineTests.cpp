@@ -4,6 +4,9 @@
 #include <gmock/gmock.h>
 #include <unistd.h>
 
+#include "desktop/archive/Bzip2.h"
+#include "desktop/gtfs/LoopbackServer.h"
+#include "desktop/gtfs/ZipOfRoutes.h"
 #include "desktop/raii/FileDescriptor.h"
 #include "host/Programs.h"
 #include "host/TerminalRows.h"
@@ -75,12 +78,113 @@ TEST(CommandLine, AsksWhetherAFeedOfOtherThingsHoldsAlertsToo) {
   EXPECT_EQ(refused.status, 1);
   EXPECT_THAT(refused.errors, AllOf(HasSubstr("positions of vehicles"), HasSubstr("--combined")));
   EXPECT_EQ(programs.folder.read("config/feeds.json"), "");
-  EXPECT_EQ(add("b", {"--combined"}).status, 0);
+  EXPECT_EQ(add("b", {"--combined", "--force"}).status, 0);
   EXPECT_TRUE(isCombined());
   programs.run({"feed", "remove", "b"});
   programs.publishBytes(AlertsBuilder::feed(Programs::now(), {{"a", {"m2"}, "Works", "Slow."}}) + vehicle);
-  EXPECT_EQ(add("c", {}).status, 0);
+  EXPECT_EQ(add("c", {"--force"}).status, 0);
   EXPECT_TRUE(isCombined());
+}
+
+/// A catalog of the test's own, in a folder of the user's data.
+class OwnCatalog {
+ public:
+  explicit OwnCatalog(const json& feeds) {
+    const std::string text = json{{"version", 1}, {"feeds", feeds}}.dump();
+    const auto packed =
+        Bzip2Compressor().Bzip2Compress({reinterpret_cast<const std::uint8_t*>(text.data()), text.size()});
+    _folder.write("nimbo-transit/feed-catalog.json.bz2",
+                  {reinterpret_cast<const char*>(packed->data()), packed->size()});
+    ::setenv("XDG_DATA_HOME", _folder.path().c_str(), 1);
+  }
+  ~OwnCatalog() { ::unsetenv("XDG_DATA_HOME"); }
+
+ private:
+  TemporaryFolder _folder;
+};
+
+TEST(CommandLine, LeadsFromNothingToTheStateOfALine) {
+  const Programs programs;
+  std::string alerts = AlertsBuilder::feed(std::chrono::floor<Date::duration>(std::chrono::system_clock::now()),
+                                           {{"a", {"7"}, "Works", "Slow."}});
+  const LoopbackServer server([&](const std::string& request) -> LoopbackServer::Answer {
+    if (request.find("\r\nX-Key: apikey s3cret\r\n") == std::string::npos)
+      return {LoopbackServer::answer("401 Unauthorized", "")};
+    const bool isStatic = request.starts_with("GET /static?part=1 ");
+    return {LoopbackServer::answer("200 OK", isStatic ? zipOfRoutes("route_id,route_short_name\n7,Seven\n") : alerts)};
+  });
+  const json key{{"in", "header"}, {"name", "X-Key"}, {"page", "https://keys.example/get"}};
+  const json files{{{"url", server.address("/static?part=1")}, {"key", key}}};
+  const OwnCatalog catalog({{{"id", "r-7"},
+                             {"provider", "Verkehrsbetriebe Zürich (VBZ)"},
+                             {"country", "CH"},
+                             {"municipality", "Zürich"},
+                             {"alerts", {{"url", server.address("/alerts")}, {"key", key}}},
+                             {"static", files}},
+                            {{"id", "r-8"},
+                             {"provider", "Free Rides"},
+                             {"country", "AT"},
+                             {"alerts", {{"url", server.address("/alerts")}}},
+                             {"static", {{{"url", server.address()}}}}}});
+
+  EXPECT_THAT(programs.run({"feed", "find", "ZURICH vbz"}).output, AllOf(HasSubstr("r-7"), Not(HasSubstr("r-8"))));
+  const json found = json::parse(programs.run({"feed", "find", "switzerland", "--json"}).output);
+  EXPECT_EQ(found, (json{{{"id", "r-7"},
+                          {"provider", "Verkehrsbetriebe Zürich (VBZ)"},
+                          {"country", "CH"},
+                          {"subdivision", nullptr},
+                          {"municipality", "Zürich"},
+                          {"key", {{"alerts", key}, {"static", key}}}}}));
+  const ProgramRun nothing = programs.run({"feed", "find", "atlantis"});
+  EXPECT_EQ(nothing.status, 1);
+  EXPECT_THAT(nothing.output, AllOf(HasSubstr("Austria"), HasSubstr("Switzerland")));
+  EXPECT_THAT(nothing.errors, AllOf(HasSubstr("atlantis"), HasSubstr("--static")));
+  EXPECT_EQ(programs.run({"feed", "find", "atlantis", "--json"}).output, "[]\n");
+
+  const struct {
+    std::vector<std::string> more;
+    std::string input, says;
+  } refusals[] = {{{}, "", "https://keys.example/get"},
+                  {{"--key", "wrong"}, "", "https://keys.example/get"},
+                  {{"--key-file", "-"}, "", "no key"},
+                  {{"--key", "a\nb"}, "", "line end"},
+                  {{"--key-file", "/none"}, "", "/none"}};
+  const auto add = [&](const std::string& from, std::vector<std::string> more, const std::string& input = {}) {
+    more.insert(more.begin(), {"feed", "add", "--from", from});
+    return programs.run(more, input);
+  };
+  for (const auto& refusal : refusals) {
+    const ProgramRun run = add("r-7", refusal.more, refusal.input);
+    EXPECT_EQ(run.status, 1) << run.output;
+    EXPECT_THAT(run.errors, HasSubstr(refusal.says));
+  }
+  EXPECT_THAT(add("r-9", {}).errors, HasSubstr("r-9"));
+  EXPECT_THAT(add("r-8", {"--key", "x"}).errors, HasSubstr("wants no key"));
+  EXPECT_EQ(programs.folder.read("config/feeds.json"), "");
+
+  const ProgramRun added = add("r-7", {"--key-file", "-"}, "apikey s3cret\n");
+  EXPECT_EQ(added.status, 0) << added.errors;
+  EXPECT_THAT(added.output,
+              AllOf(HasSubstr("vbz: 1 line"), HasSubstr("1 line affected"), HasSubstr("favorite add vbz:")));
+  EXPECT_EQ(programs.run({"favorite", "add", "vbz:7"}).status, 0);
+  EXPECT_THAT(programs.run({"status"}).output, HasSubstr("Works"));
+
+  // The agency gives out another key, and the old one is of no use any more.
+  EXPECT_THAT(programs.run({"feed", "edit", "vbz", "--key", "old"}).errors, HasSubstr("does not take the key"));
+  EXPECT_EQ(programs.run({"feed", "check"}).status, 0) << "what cannot be used changes nothing";
+  EXPECT_EQ(programs.run({"feed", "edit", "vbz", "--no-keys", "--force"}).status, 0);
+  EXPECT_EQ(programs.run({"feed", "check"}).status, 1);
+  const std::vector<std::string> edit{"feed", "edit", "vbz", "--minor-alerts", "--maximum-age", "60"};
+  EXPECT_EQ(programs.run(edit).status, 1);
+  std::vector<std::string> whole = edit;
+  whole.insert(whole.end(), {"--header", "X-Key: apikey s3cret"});
+  EXPECT_EQ(programs.run(whole).status, 0);
+  EXPECT_THAT(programs.folder.read("config/feeds.json"),
+              AllOf(HasSubstr("minorAlerts"), HasSubstr("60"), Not(HasSubstr("s3cret"))));
+  const ProgramRun swapped = programs.run(
+      {"feed", "edit", "vbz", "--static", server.address("/alerts"), "--alerts", server.address("/static?part=1")});
+  EXPECT_EQ(swapped.status, 1);
+  EXPECT_THAT(swapped.errors, HasSubstr("swapped"));
 }
 
 TEST(CommandLine, RefusesWhatItCannotDoAndSaysWhy) {
@@ -121,7 +225,7 @@ TEST(CommandLine, SaysWhatIsWrongWithArguments) {
       {{"stauts"}, R"(there is no command "stauts". Did you mean "status"?)"},
       {{"favorite", "lst"}, R"(there is no command "favorite lst". Did you mean "favorite list"?)"},
       {{"quit"}, R"(no command "quit". The commands are status, update,)"},
-      {{"feed"}, "a command is missing. The commands are add, remove, list, check."},
+      {{"feed"}, "a command is missing. The commands are find, add, edit, remove, list, check."},
       {{"status", "--expandd"}, R"(no option "--expandd". Did you mean "--expanded"?)"},
       {{"status", "now"}, R"("now" is more than "status" takes.)"},
       {{"render"}, "OUT is required"},
@@ -130,6 +234,8 @@ TEST(CommandLine, SaysWhatIsWrongWithArguments) {
       {{"favorite", "move", "city:m1", "18446744073709551617"}, "is no position"},
       {{"favorite", "add", "nocolon"}, R"("nocolon" is no line)"},
       {{"feed", "add", "a:b", "--static", "/x", "--alerts", "/x"}, R"(cannot be named "a:b")"},
+      {{"feed", "add"}, "NAME or --from is required"},
+      {{"feed", "add", "new", "--alerts", "/x"}, "--static or --from is required"},
       {{"feed", "add", "new", "--static", "ftp://example.org/x.zip", "--alerts", "/x"}, "ftp:"},
       {{"render", "--scale", "0", "x.png"}, R"(--scale: "0" is no number from 0.25 to 8)"},
       {{"render", "--size", "100", "x.png"}, R"(--size: "100" is no size such as 359x110)"},
@@ -188,7 +294,7 @@ TEST(CommandLine, PrintsNothingThatSteersATerminal) {
   programs.folder.write("feed/routes.txt", "route_id,agency_id,route_short_name,route_type\nr" + hostile + ",M," +
                                                hostile + "1,1\nm2,M,2,1\n");
   const std::string feed = programs.folder.path() / "feed", setting = "\x1b[2J" + hostile;
-  programs.run({"feed", "add", "c" + hostile, "--static", feed, "--alerts", "/none" + hostile});
+  programs.run({"feed", "add", "c" + hostile, "--static", feed, "--alerts", "/none" + hostile, "--force"});
   programs.run({"favorite", "add", "c" + hostile + ":r" + hostile, "c" + hostile + ":m2"});
   programs.run({"settings", "set", "a", setting});
   for (const std::string& command :

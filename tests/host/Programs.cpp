@@ -27,7 +27,7 @@ void Programs::publish(const std::vector<AlertsBuilder::Alert>& alerts) const {
 void Programs::setUpCity(const std::vector<std::string>& favorites,
                          const std::vector<AlertsBuilder::Alert>& alerts) const {
   publish(alerts);
-  run({"feed", "add", "city", "--static", folder.path() / "feed", "--alerts", alertsFile()});
+  run({"feed", "add", "city", "--static", folder.path() / "feed", "--alerts", alertsFile(), "--force"});
   // Its alerts are of the virtual date, whatever the date of a program is.
   auto feeds = nlohmann::json::parse(folder.read("config/feeds.json"));
   for (auto& feed : feeds["feeds"]) feed["maximumAlertsAgeMinutes"] = 0;

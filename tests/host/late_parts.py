@@ -47,7 +47,7 @@ def main(cmake, build):
     feed.mkdir()
     (feed / "agency.txt").write_text("agency_id,agency_name\n1,City\n")
     (feed / "routes.txt").write_text("route_id,agency_id,route_short_name,route_type\nR,1,Red,1\n")
-    run("feed", "add", "city", "--static", feed, "--alerts", "http://127.0.0.1:1/alerts.pb")
+    run("feed", "add", "city", "--static", feed, "--alerts", "http://127.0.0.1:1/alerts.pb", "--force")
     run("favorite", "add", "city:R")
     for arguments in ["feed", "check"], ["lines", "red"], ["favorite", "remove", "city:R"], ["favorite", "add", "city:R"]:
         assert not loaded(*arguments), f"{arguments} loads {loaded(*arguments)}"

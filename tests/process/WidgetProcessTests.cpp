@@ -237,7 +237,7 @@ std::vector<json> results(const std::vector<json>& lines, const std::vector<json
 TEST(WidgetProcess, TellsOfLinesBeforeAnythingElse) {
   Programs programs;
   programs.setUpCity({}, {});
-  programs.run({"feed", "add", "bad", "--static", "/none", "--alerts", "/none"});
+  programs.run({"feed", "add", "bad", "--static", "/none", "--alerts", "/none", "--force"});
   const std::vector<json> asked = {
       request("findLines", {{"query", "castle"}}),
       request("findLines", {{"query", ""}, {"feed", "city"}, {"offset", 1}, {"limit", 2}}),

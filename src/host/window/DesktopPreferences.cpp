@@ -6,6 +6,7 @@
 #include <algorithm>
 #include <charconv>
 #include <cmath>
+#include <cstdio>
 
 #include "desktop/resources/Resources.h"
 #include "platform/Platform.h"
@@ -46,6 +47,7 @@ constexpr const char* kSystem = "system";
 constexpr std::string_view kAppearanceKey = "Nimbo.Window.appearance";
 constexpr std::string_view kLanguageKey = "Nimbo.Window.language";
 constexpr std::string_view kTextSizeKey = "Nimbo.Window.textSizeSteps";
+constexpr std::string_view kWindowSizeKey = "Nimbo.Window.size";
 
 constexpr int kLargestCategory = static_cast<int>(ContentSizeCategory::accessibilityExtraExtraExtraLarge);
 
@@ -91,6 +93,18 @@ DesktopPreferences::DesktopPreferences()
 DesktopPreferences::~DesktopPreferences() {
   for (sigc::connection& connection : _connections) connection.disconnect();
   Gtk::StyleContext::remove_provider_for_display(Gdk::Display::get_default(), _style);
+}
+
+std::pair<int, int> DesktopPreferences::windowSize() {
+  constexpr int kWidth = 420, kHeight = 680, kLeast = 200, kMost = 10'000;
+  int width = 0, height = 0;
+  const std::string text = storedText(kWindowSizeKey, "");
+  if (std::sscanf(text.c_str(), "%dx%d", &width, &height) != 2) return {kWidth, kHeight};
+  return {std::clamp(width, kLeast, kMost), std::clamp(height, kLeast, kMost)};
+}
+
+void DesktopPreferences::keepWindowSize(int width, int height) {
+  keep(std::to_string(width) + "x" + std::to_string(height), kWindowSizeKey);
 }
 
 void DesktopPreferences::chooseAppearance(const std::string& choice) {

@@ -5,6 +5,7 @@
 
 #include <optional>
 #include <string>
+#include <utility>
 #include <vector>
 
 #include "host/window/ColorSchemePortal.h"
@@ -30,6 +31,10 @@ class DesktopPreferences {
   void chooseLanguage(const std::string& choice);
   /// Makes texts larger (1) or smaller (-1) than they are, or as large as on the desktop (0).
   void stepTextSize(int step);
+
+  /// Width and height of the window when it was closed the last time.
+  static std::pair<int, int> windowSize();
+  static void keepWindowSize(int width, int height);
 
   Appearance appearance() const;
   ContentSizeCategory textSize() const;

@@ -4,6 +4,8 @@
 #include <gtkmm/expander.h>
 #include <gtkmm/label.h>
 
+#include <set>
+
 #include "host/FeedAnswers.h"
 #include "host/window/Texts.h"
 #include "host/window/WidgetTexts.h"
@@ -75,6 +77,14 @@ void FeedCheckView::check(const protocol::CheckFeedParams& feed, Done done) {
 }
 
 void FeedCheckView::show(const protocol::FeedReport& report) {
+  showBesideFaults(report);
+  std::set<std::string> faults;  // a key that both halves want is told of once
+  for (const protocol::FetchError& fault : report.faults())
+    if (const auto [text, isNew] = faults.insert(textOfError(*errorOf(fault))); isNew) addText(*text, "failed");
+  addSkipped(report);
+}
+
+void FeedCheckView::showBesideFaults(const protocol::FeedReport& report) {
   clear();
   set_visible();
   if (const auto& feed = report.staticFeed)
@@ -90,8 +100,6 @@ void FeedCheckView::show(const protocol::FeedReport& report) {
                               {DateText(_context.preferences.locale()).textOf(*alerts->timestamp)}),
               "item-caption");
   }
-  for (const protocol::FetchError& fault : report.faults()) addText(textOfError(*errorOf(fault)), "failed");
-  addSkipped(report);
 }
 
 void FeedCheckView::addSkipped(const protocol::FeedReport& report) {

@@ -19,6 +19,8 @@ class FeedCheckView final : public Gtk::Box {
   /// Has the feed read anew.
   void check(const protocol::CheckFeedParams& feed, Done done);
   void show(const protocol::FeedReport& report);
+  /// The same without the faults, which are shown elsewhere.
+  void showBesideFaults(const protocol::FeedReport& report);
   /// Drops what runs and what is shown.
   void cancel();
 

@@ -2,6 +2,9 @@
 
 #include <gtkmm/dialog.h>
 
+#include <algorithm>
+
+#include "desktop/gtfs/feeds/FeedSetup.h"
 #include "host/FeedAnswers.h"
 #include "host/window/Texts.h"
 #include "host/window/WidgetTexts.h"
@@ -9,58 +12,79 @@
 
 namespace nimbo {
 
-FeedForm::FeedForm(const PageContext& context, Added added)
-    : Gtk::Box(Gtk::Orientation::VERTICAL, 8), _context(context), _added(std::move(added)), _check(context) {
-  add_css_class("card");
-  add_css_class("notice");
-  auto* title = Gtk::make_managed<Gtk::Label>(LocalizedString("Window_Feed_AddTitle"));
-  title->add_css_class("item-heading");
-  title->set_xalign(0);
-  append(*title);
-  addEntry(_name, "Window_Feed_Name", "Window_Feed_NamePrompt");
-  addEntry(_static, "Window_Feed_Static", "Window_Feed_StaticPrompt");
-  addEntry(_alerts, "Window_Feed_Alerts", "Window_Feed_AlertsPrompt");
-  // Asked only where the answer does not tell.
+FeedForm::FeedForm(const PageContext& context, std::optional<Feed> edited, Kept kept)
+    : Gtk::Box(Gtk::Orientation::VERTICAL, 8),
+      _context(context),
+      _edited(std::move(edited)),
+      _kept(std::move(kept)),
+      _check(context) {
+  const bool hasKey = _edited && !(_edited->staticFeed.key().isEmpty() && _edited->alerts.key().isEmpty());
+  if (_edited) {
+    auto* title =
+        Gtk::make_managed<Gtk::Label>(LocalizedFormat(LocalizedString("Window_Feed_EditTitle"), {_edited->name}));
+    title->add_css_class("item-heading");
+    title->set_xalign(0);
+    append(*title);
+    _name.entry.set_text(_edited->name);
+    _static.entry.set_text(_edited->staticFeed.text());
+    _alerts.entry.set_text(_edited->alerts.text());
+    _minorAlerts.set_active(_edited->minorAlerts);
+    _combined.set_active(_edited->isCombined);
+  } else {
+    addField(_name, "Window_Feed_Name", "Window_Feed_NamePrompt");
+  }
+  addField(_static, "Window_Feed_Static", "Window_Feed_StaticPrompt");
+  addField(_alerts, "Window_Feed_Alerts", "Window_Feed_AlertsPrompt");
+  addField(_key, "Window_Feed_Key", hasKey ? "Window_Feed_KeyKept" : "Window_Feed_KeyPrompt");
+  _key.entry.set_visibility(false);
+  _minorAlerts.set_label(LocalizedString("Window_Feed_MinorAlerts"));
+  append(_minorAlerts);
+  // Of a new feed asked only where the answer does not tell.
   _combined.set_label(LocalizedString("Window_Feed_Combined"));
-  _combined.hide();
+  _combined.set_visible(_edited.has_value());
   append(_combined);
-  _problem.add_css_class("failed");
-  _problem.set_xalign(0);
-  _problem.hide();
-  append(_problem);
   append(_check);
   auto* buttons = Gtk::make_managed<Gtk::Box>(Gtk::Orientation::HORIZONTAL, 8);
-  _add.set_label(LocalizedString("Window_Feed_Add"));
-  _add.add_css_class("suggested-action");
-  _add.signal_clicked().connect([this] { check(); });
-  _addAnyway.set_label(LocalizedString("Window_Feed_AddAnyway"));
-  _addAnyway.signal_clicked().connect([this] {
+  _keep.set_label(LocalizedString(_edited ? "Window_Feed_Save" : "Window_Feed_Add"));
+  _keep.add_css_class("suggested-action");
+  _keep.signal_clicked().connect([this] { check(); });
+  _keepAnyway.set_label(LocalizedString(_edited ? "Window_Feed_SaveAnyway" : "Window_Feed_AddAnyway"));
+  _keepAnyway.signal_clicked().connect([this] {
     if (const auto entered = feed()) keep(*entered, nullptr);
   });
-  _addAnyway.hide();
-  buttons->append(_add);
-  buttons->append(_addAnyway);
+  _keepAnyway.hide();
+  buttons->append(_keep);
+  buttons->append(_keepAnyway);
   append(*buttons);
+  wrapTexts(*this);
 }
 
-void FeedForm::addEntry(Gtk::Entry& entry, const char* labelKey, const char* promptKey) {
+void FeedForm::addField(Field& field, const char* labelKey, const char* promptKey) {
   auto* label = Gtk::make_managed<Gtk::Label>(LocalizedString(labelKey));
   label->set_xalign(0);
   label->add_css_class("item-caption");
   append(*label);
   auto* row = Gtk::make_managed<Gtk::Box>(Gtk::Orientation::HORIZONTAL);
   row->add_css_class("linked");
+  Gtk::Entry& entry = field.entry;
   entry.set_hexpand();
   entry.set_placeholder_text(LocalizedString(promptKey));
   entry.signal_activate().connect([this] { check(); });
-  entry.signal_changed().connect([this] { _addAnyway.hide(); });
+  entry.signal_changed().connect([this, &field] {
+    _keepAnyway.hide();
+    clear(field);
+  });
   setAccessibleLabel(entry, label->get_text());
   row->append(entry);
-  if (&entry == &_static)
+  if (&field == &_static)
     addChooser(*row, entry, Gtk::FileChooser::Action::SELECT_FOLDER, "folder-symbolic", "Window_Feed_ChooseFolder");
-  if (&entry != &_name)
+  if (&field == &_static || &field == &_alerts)
     addChooser(*row, entry, Gtk::FileChooser::Action::OPEN, "document-open-symbolic", "Window_Feed_ChooseFile");
   append(*row);
+  field.problem.add_css_class("failed");
+  field.problem.set_xalign(0);
+  field.problem.hide();
+  append(field.problem);
 }
 
 void FeedForm::addChooser(Gtk::Box& row, Gtk::Entry& entry, Gtk::FileChooser::Action action, const char* icon,
@@ -88,65 +112,120 @@ void FeedForm::choose(Gtk::Entry& entry, Gtk::FileChooser::Action action) {
   _chooser->show();
 }
 
-std::optional<Feed> FeedForm::feed() {
-  _problem.hide();
-  const std::string name = _name.get_text();
-  if (const ErrorRef problem = FeedConfiguration::checkName(name)) {
-    showProblem(textOfError(*problem));
-    _name.grab_focus();
+std::optional<FeedAddress> FeedForm::addressIn(Field& field, const std::optional<FeedAddress>& before) {
+  const std::string text = field.entry.get_text().raw();
+  if (before && text == before->text()) return before;
+  const auto address = FeedAddress::parse(text);
+  if (!address) {
+    showProblem(field, address.error());
     return std::nullopt;
   }
-  std::optional<FeedAddress> addresses[2];
-  Gtk::Entry* entries[] = {&_static, &_alerts};
-  for (std::size_t i = 0; i < std::size(entries); ++i) {
-    const auto address = FeedAddress::parse(entries[i]->get_text().raw());
-    if (!address) {
-      showProblem(textOfError(*address.error()));
-      entries[i]->grab_focus();
-      return std::nullopt;
-    }
-    addresses[i] = *address;
-  }
-  return Feed{.name = name, .staticFeed = *addresses[0], .alerts = *addresses[1], .isCombined = _combined.get_active()};
+  return address->withQueryAsKey();
 }
 
-void FeedForm::showProblem(const std::string& text) {
-  _problem.set_text(text);
-  _problem.show();
+std::optional<Feed> FeedForm::feed() {
+  for (Field* field : fields()) clear(*field);
+  const std::string name = _name.entry.get_text();
+  const ErrorRef problem = _edited ? nullptr : _context.feeds().checkNewName(name);
+  if (problem) showProblem(_name, problem);
+  const auto staticFeed = addressIn(_static, _edited ? std::optional(_edited->staticFeed) : std::nullopt);
+  const auto alerts = addressIn(_alerts, _edited ? std::optional(_edited->alerts) : std::nullopt);
+  if (problem || !staticFeed || !alerts) return std::nullopt;
+  Feed feed = _edited.value_or(Feed{.name = name, .staticFeed = *staticFeed, .alerts = *alerts});
+  if (feed.staticFeed != *staticFeed) feed.staticMirror.reset();
+  feed.staticFeed = *staticFeed;
+  feed.alerts = *alerts;
+  feed.minorAlerts = _minorAlerts.get_active();
+  feed.isCombined = _combined.get_active();
+  if (!takeKey(feed)) return std::nullopt;
+  return feed;
+}
+
+bool FeedForm::takeKey(Feed& feed) {
+  const std::string key = _key.entry.get_text();
+  if (key.empty()) return true;
+  const auto known = KnownFeeds::read();
+  bool isWanted = false;
+  for (FeedAddress* address : {&feed.staticFeed, &feed.alerts})
+    if (const auto wanted = known ? known->keyFor(*address) : std::nullopt) {
+      *address = withKey(*address, *wanted, key);
+      isWanted = true;
+    }
+  if (isWanted) return true;
+  if (const ErrorRef problem = FeedKey::checkHeader(key)) {
+    showProblem(_key, problem);
+    return false;
+  }
+  for (FeedAddress* address : {&feed.staticFeed, &feed.alerts})
+    if (address->isRemote()) *address = address->withKey({{key}, address->key().query});
+  return true;
+}
+
+void FeedForm::showProblem(Field& field, const ErrorRef& problem) {
+  const auto all = fields();
+  const bool isFirst =
+      std::none_of(all.begin(), all.end(), [](const Field* other) { return other->problem.get_visible(); });
+  field.problem.set_text(textOfError(*problem));
+  field.problem.show();
+  field.entry.add_css_class("error");
+  setAccessibleDescription(field.entry, field.problem.get_text());
+  if (isFirst) field.entry.grab_focus();
+}
+
+void FeedForm::clear(Field& field) {
+  field.problem.hide();
+  field.entry.remove_css_class("error");
+  setAccessibleDescription(field.entry, "");
 }
 
 void FeedForm::setBusy(bool busy) {
-  for (Gtk::Widget* widget :
-       {static_cast<Gtk::Widget*>(&_name), static_cast<Gtk::Widget*>(&_static), static_cast<Gtk::Widget*>(&_alerts),
-        static_cast<Gtk::Widget*>(&_combined), static_cast<Gtk::Widget*>(&_add)})
+  for (Field* field : fields()) field->entry.set_sensitive(!busy);
+  for (Gtk::Widget* widget : std::initializer_list<Gtk::Widget*>{&_minorAlerts, &_combined, &_keep})
     widget->set_sensitive(!busy);
 }
 
 void FeedForm::check() {
   const auto entered = feed();
   if (!entered) return;
-  _addAnyway.hide();
+  _keepAnyway.hide();
   _check.check({.definition = definitionOf(*entered)}, [this, entered = *entered](const protocol::FeedReport* report) {
     setBusy(false);
-    _add.grab_focus();
+    _keep.grab_focus();
     if (!report) return;
     if (report->faults().empty()) return keep(entered, report);
+    showFaults(*report);
     if (report->isOtherFeed) return _combined.show();
-    _addAnyway.show();
+    _keepAnyway.show();
   });
   // The keyboard is with the check by now.
   setBusy(true);
 }
 
+void FeedForm::showFaults(const protocol::FeedReport& report) {
+  _check.showBesideFaults(report);
+  if (report.staticError) showProblem(_static, errorOf(*report.staticError));
+  if (report.alertsError) showProblem(_alerts, errorOf(*report.alertsError));
+  if (!report.alerts) return;
+  for (const auto& fault : {report.alerts->staleness, report.alerts->gap})
+    if (fault) showProblem(_alerts, errorOf(*fault));
+}
+
 void FeedForm::keep(Feed feed, const protocol::FeedReport* report) {
   if (report && report->alerts && report->alerts->hasOthers) feed.isCombined = true;
-  if (const ErrorRef failure = _context.feeds().add(feed)) return showProblem(textOfError(*failure));
-  for (Gtk::Entry* entry : {&_name, &_static, &_alerts}) entry->set_text("");
+  FeedConfiguration configuration = _context.feeds();
+  if (const ErrorRef failure = _edited ? configuration.replace(feed) : configuration.add(feed))
+    return showProblem(_edited ? _static : _name, failure);
+  if (!_edited) {
+    for (Field* field : fields()) field->entry.set_text("");
+    _combined.hide();
+    _combined.set_active(false);
+    _minorAlerts.set_active(false);
+  }
   _check.cancel();
-  _addAnyway.hide();
-  _combined.hide();
-  _combined.set_active(false);
-  _added(report);
+  _keepAnyway.hide();
+  const Kept kept = _kept;  // the form may go with it
+  const std::optional<protocol::FeedReport> found = report ? std::optional(*report) : std::nullopt;
+  kept(feed, found ? &*found : nullptr);
 }
 
 }  // namespace nimbo

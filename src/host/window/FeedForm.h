@@ -6,37 +6,52 @@
 #include <gtkmm/filechoosernative.h>
 #include <gtkmm/label.h>
 
+#include <array>
+
 #include "host/window/FeedCheckView.h"
 
 namespace nimbo {
 
-/// Sets up a feed: name and addresses, then the feed is read, and kept when it can be used or the user insists.
+/// Sets up a feed by its addresses, or changes one: the feed is read, and kept when it can be used or the user insists.
 class FeedForm final : public Gtk::Box {
  public:
   /// Hears of a feed that was kept, and what was found when it was read; null when it was not.
-  using Added = std::function<void(const protocol::FeedReport* report)>;
+  using Kept = std::function<void(const Feed& feed, const protocol::FeedReport* report)>;
 
-  FeedForm(const PageContext& context, Added added);
+  /// `edited` is the feed to change; absent for a new one.
+  FeedForm(const PageContext& context, std::optional<Feed> edited, Kept kept);
 
  private:
-  void addEntry(Gtk::Entry& entry, const char* labelKey, const char* promptKey);
+  /// A text to enter, with what is wrong with it below.
+  struct Field {
+    Gtk::Entry entry;
+    Gtk::Label problem;
+  };
+  std::array<Field*, 4> fields() { return {&_name, &_static, &_alerts, &_key}; }
+  void addField(Field& field, const char* labelKey, const char* promptKey);
   void addChooser(Gtk::Box& row, Gtk::Entry& entry, Gtk::FileChooser::Action action, const char* icon,
                   const char* nameKey);
   void choose(Gtk::Entry& entry, Gtk::FileChooser::Action action);
-  /// What the entries say; absent, and the user is told, when that is no feed.
+  /// What the fields say; absent, and the user is told, when that is no feed.
   std::optional<Feed> feed();
+  /// The address in a field: with the key that there was where the field says the same.
+  std::optional<FeedAddress> addressIn(Field& field, const std::optional<FeedAddress>& before);
+  /// Puts the key where the servers are known to want it, else into the header that was written.
+  bool takeKey(Feed& feed);
   void check();
+  void showFaults(const protocol::FeedReport& report);
   void keep(Feed feed, const protocol::FeedReport* report);
-  void showProblem(const std::string& text);
+  void showProblem(Field& field, const ErrorRef& problem);
+  static void clear(Field& field);
   void setBusy(bool busy);
 
   const PageContext& _context;
-  Added _added;
-  Gtk::Entry _name, _static, _alerts;
-  Gtk::CheckButton _combined;
-  Gtk::Label _problem;
+  std::optional<Feed> _edited;
+  Kept _kept;
+  Field _name, _static, _alerts, _key;
+  Gtk::CheckButton _minorAlerts, _combined;
   FeedCheckView _check;
-  Gtk::Button _add, _addAnyway;
+  Gtk::Button _keep, _keepAnyway;
   Glib::RefPtr<Gtk::FileChooserNative> _chooser;
 };
 

@@ -12,6 +12,7 @@
 #include "host/FeedAnswers.h"
 #include "host/window/FavoritesPage.h"
 #include "host/window/FeedsPage.h"
+#include "host/window/HelpPages.h"
 #include "host/window/IncidentPages.h"
 #include "host/window/LineStates.h"
 #include "host/window/WidgetTexts.h"
@@ -47,6 +48,8 @@ Glib::RefPtr<Gio::MenuModel> makeMainMenu() {
   look->append_submenu(LocalizedString("Window_Language"), language);
 
   const auto last = Gio::Menu::create();
+  last->append(LocalizedString("Window_Shortcuts"), "win.shortcuts");
+  last->append(LocalizedString("Window_About"), "win.about");
   last->append(LocalizedString("Window_Quit"), "app.quit");
 
   const auto menu = Gio::Menu::create();
@@ -61,8 +64,8 @@ MainWindow::MainWindow(const CommandContext& command, HostPlatform& platform, De
       _widgetPage(new WidgetPage(_context)),
       _pages(std::unique_ptr<Page>(_widgetPage)) {
   _context.process = &_widgetPage->process();
-  constexpr int kWidth = 420, kHeight = 680;
-  set_default_size(kWidth, kHeight);
+  const auto [width, height] = preferences.windowSize();
+  set_default_size(width, height);
   set_icon_name("org.nimbo.Transit");
   buildHeader();
   buildMessageBar();
@@ -104,6 +107,10 @@ void MainWindow::buildMessageBar() {
   _message.set_xalign(0);
   _message.set_hexpand();
   _messageBar.add_child(_message);
+  _undoButton.set_label(LocalizedString("Window_Undo"));
+  _undoButton.set_action_name("win.undo");
+  _undoButton.set_visible(false);
+  _messageBar.add_action_widget(_undoButton, Gtk::ResponseType::NONE);
   _messageBar.set_message_type(Gtk::MessageType::WARNING);
   _messageBar.set_show_close_button();
   _messageBar.set_visible(false);
@@ -112,6 +119,13 @@ void MainWindow::buildMessageBar() {
 
 void MainWindow::addActions() {
   add_action("back", [this] { _pages.pop(); });
+  add_action("shortcuts", [this] { push(std::make_unique<ShortcutsPage>()); });
+  add_action("about", [this] { push(std::make_unique<AboutPage>()); });
+  add_action("close-window", [this] { close(); });
+  add_action("undo", [this] {
+    _messageBar.set_visible(false);
+    if (const auto undo = std::exchange(_undo, nullptr)) undo();
+  });
   add_action("update", [this] { _widgetPage->update(); });
   DesktopPreferences& preferences = _context.preferences;
   add_action("text-larger", [&preferences] { preferences.stepTextSize(1); });
@@ -150,6 +164,7 @@ void MainWindow::showFront() {
   const bool isFirst = _pages.depth() == 1;
   _back.set_visible(!isFirst);
   _update.set_visible(isFirst);
+  _undo = nullptr;  // of the page that was left
   _messageBar.set_visible(false);
 }
 
@@ -223,7 +238,11 @@ void MainWindow::openIncident(const ShowIncident& show, const protocol::Lines& l
     tell(LocalizedString(isUnknown ? "Window_Incident_Unknown" : "Window_Incident_Over"));
 }
 
-void MainWindow::tell(const std::string& message) {
+void MainWindow::tell(const std::string& message) { tell(message, nullptr); }
+
+void MainWindow::tell(const std::string& message, std::function<void()> undo) {
+  _undo = std::move(undo);
+  _undoButton.set_visible(_undo != nullptr);
   _message.set_text(message);
   _messageBar.set_visible(true);
 }

@@ -25,6 +25,7 @@ class MainWindow final : public Gtk::ApplicationWindow, public Navigator {
 
   void open(const OpenRequest& request) override;
   void tell(const std::string& message) override;
+  void tell(const std::string& message, std::function<void()> undo) override;
 
  private:
   void buildHeader();
@@ -46,7 +47,9 @@ class MainWindow final : public Gtk::ApplicationWindow, public Navigator {
   Gtk::Box _body{Gtk::Orientation::VERTICAL};
   Gtk::InfoBar _messageBar;
   Gtk::Label _message;
-  WidgetPage* _widgetPage;  // the first page of the stack
+  Gtk::Button _undoButton;
+  std::function<void()> _undo;  // of what is told; null without
+  WidgetPage* _widgetPage;      // the first page of the stack
   PageStack _pages;
   std::shared_ptr<WidgetHostProcess::Question> _decoding;  // what was handed over last
 };

@@ -1,5 +1,6 @@
 #pragma once
 
+#include <functional>
 #include <map>
 #include <string>
 
@@ -22,6 +23,8 @@ class Navigator {
   virtual void open(const OpenRequest& request) = 0;
   /// Tells the user of something that went wrong, in words that he can act on.
   virtual void tell(const std::string& message) = 0;
+  /// Tells the user of something that he did, and takes it back when he wishes so.
+  virtual void tell(const std::string& message, std::function<void()> undo) = 0;
 };
 
 /// What every page has at hand; all of it outlives the pages.

@@ -141,11 +141,11 @@ const char* keyOfCode(TransitLineServiceError code) {
       return "Window_Error_Swapped";
     case webPage:
       return "Window_Error_WebPage";
-    case unknownCatalogFeed:
     case unknownLine:
       return "Window_Error_LineGone";
     case notAsked:
       return "Window_Error_NotAsked";
+    case unknownCatalogFeed:
     case internal:
       break;
   }

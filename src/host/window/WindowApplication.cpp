@@ -38,6 +38,8 @@ void WindowApplication::on_startup() {
   add_action("quit", [this] { quit(); });
   set_accel_for_action("app.quit", "<Primary>q");
   set_accel_for_action("win.update", "F5");
+  set_accel_for_action("win.close-window", "<Primary>w");
+  set_accels_for_action("win.shortcuts", {"<Primary>question", "<Primary><Shift>slash", "F1"});
   set_accel_for_action("win.back", "<Alt>Left");
   set_accels_for_action("win.text-larger", {"<Primary>plus", "<Primary>equal", "<Primary>KP_Add"});
   set_accels_for_action("win.text-smaller", {"<Primary>minus", "<Primary>KP_Subtract"});
@@ -48,7 +50,19 @@ void WindowApplication::makeWindow() {
   Gtk::Widget::set_default_direction(Platform::current().strings().isRightToLeft() ? Gtk::TextDirection::RTL
                                                                                    : Gtk::TextDirection::LTR);
   _window = std::make_unique<MainWindow>(_context, *_platform, *_preferences);
+  _window->signal_close_request().connect(
+      [this] {
+        keepSize();
+        return false;
+      },
+      false);
   add_window(*_window);
+}
+
+void WindowApplication::keepSize() {
+  int width = 0, height = 0;
+  _window->get_default_size(width, height);
+  _preferences->keepWindowSize(width, height);
 }
 
 void WindowApplication::changeLocale() {
@@ -88,6 +102,7 @@ void WindowApplication::on_open(const type_vec_files& files, const Glib::ustring
 }
 
 void WindowApplication::on_shutdown() {
+  if (_window) keepSize();
   _window.reset();
   _preferences.reset();
   _platform.reset();

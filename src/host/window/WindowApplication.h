@@ -30,6 +30,7 @@ class WindowApplication final : public Gtk::Application {
 
  private:
   void makeWindow();
+  void keepSize();
   std::unique_ptr<HostPlatform> makePlatform(const std::string& locale);
   /// The texts are another language's: everything that shows them is made anew.
   void changeLocale();

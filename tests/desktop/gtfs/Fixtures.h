@@ -2,13 +2,13 @@
 
 #include <google/protobuf/text_format.h>
 #include <gtest/gtest.h>
-#include <zip.h>
 
 #include <filesystem>
 #include <fstream>
 #include <map>
 #include <string>
 
+#include "desktop/gtfs/ZipOfRoutes.h"
 #include "desktop/gtfs/alerts/IncidentReader.h"
 #include "desktop/gtfs/net/FileReading.h"
 #include "desktop/gtfs/static/StaticFeedBuilder.h"
@@ -48,15 +48,5 @@ inline std::string alert(const std::string& id, const std::string& title, const 
 }
 
 inline std::string route(const std::string& id) { return "informed_entity { route_id: '" + id + "' } "; }
-
-/// A zip archive of a routes.txt.
-inline std::string zipOfRoutes(const std::string& routes) {
-  const TemporaryFolder folder;
-  const auto path = folder.path() / "made.zip";
-  zip_t* archive = zip_open(path.c_str(), ZIP_CREATE, nullptr);
-  zip_file_add(archive, "routes.txt", zip_source_buffer(archive, routes.data(), routes.size(), 0), 0);
-  zip_close(archive);
-  return *readFile(path, 1 << 20);
-}
 
 }  // namespace nimbo

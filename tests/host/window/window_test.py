@@ -1,5 +1,7 @@
 #!/usr/bin/python3
-"""The window as its user has it. usage: window_test.py tour|faults NIMBO_TRANSIT_DESKTOP NIMBO_TRANSIT WIDGET"""
+"""The window as its user has it. usage: window_test.py tour|faults|catalog NIMBO_TRANSIT_DESKTOP NIMBO_TRANSIT WIDGET"""
+import bz2
+import http.server
 import json
 import os
 import pathlib
@@ -11,8 +13,10 @@ import stat
 import subprocess
 import sys
 import tempfile
+import threading
 import time
 import urllib.parse
+import zipfile
 
 from window_session import PATIENCE, Session, Window, press, wait
 
@@ -76,10 +80,13 @@ def tour(session, folder):
 
     window.click("Set Up a Feed")
     window.see_page("Feeds")
+    window.click("By Address")
     for entry, text in ("Name", "town"), ("Lines", city), ("Incidents", city + "/alerts.pb"):
         window.click(entry, "text")
         press("type", text)
     press("key", "Return")
+    window.see_page("Favorites")  # what comes after the first feed
+    press("key", "alt+Left")
     window.see("3 lines, 1 agency")
     window.see("4 incidents")
     press("key", "Escape")
@@ -182,7 +189,13 @@ def tour(session, folder):
         window.see("Remove with 2 Favorites")
         press("key", "Tab", "Tab", "Return")
         window.see("No feed is set up")
+        window.click("Undo")
+        window.click("^Remove$")
+        window.see("Remove with 2 Favorites")
+        press("key", "Tab", "Tab", "Return")
+        window.see("No feed is set up")
         assert "town" not in subprocess.run([command_line, "favorite", "list"], capture_output=True, text=True).stdout
+        window.click("By Address")
         window.click("Name", "text")
         address = f"http://127.0.0.1:{silent.getsockname()[1]}/feed"
         press("type", "slow")
@@ -194,6 +207,71 @@ def tour(session, folder):
         press("key", "Escape")
         window.see_page("Nimbo Transit")
         window.quit()
+
+
+def catalog(session, folder):
+    """From nothing to the state of an agency's line, with its name and a key alone."""
+    city, asked = os.path.join(folder, "city"), []
+    publish(city, ["Signals fail"])
+    with zipfile.ZipFile(city + "/city.zip", "w") as archive:
+        for name in "agency.txt", "routes.txt":
+            archive.write(os.path.join(city, name), name)
+
+    class Agency(http.server.BaseHTTPRequestHandler):
+        def do_GET(self):
+            asked.append((self.path, self.headers.get("X-Key")))
+            isLetIn = self.headers.get("X-Key") == "s3cret"
+            self.send_response(200 if isLetIn else 401)
+            self.end_headers()
+            if isLetIn:
+                self.wfile.write(pathlib.Path(city + self.path).read_bytes())
+
+        def log_message(self, *arguments):
+            pass
+
+    with http.server.ThreadingHTTPServer(("127.0.0.1", 0), Agency) as server:
+        threading.Thread(target=server.serve_forever, daemon=True).start()
+        address, key = f"http://127.0.0.1:{server.server_port}", {"in": "header", "name": "X-Key", "page": "https://keys.example/"}
+        feeds = [{"id": "1", "provider": "Metro", "country": "CH", "municipality": "Zürich",
+                  "alerts": {"url": address + "/alerts.pb", "key": key}, "static": [{"url": address + "/city.zip", "key": key}]}]
+        data = pathlib.Path(folder, "data/nimbo-transit")
+        data.mkdir(parents=True)
+        (data / "feed-catalog.json.bz2").write_bytes(bz2.compress(json.dumps({"version": 1, "feeds": feeds}).encode()))
+        window = Window(session, desktop, XDG_DATA_HOME=folder + "/data")
+        window.comes_to_front()
+        window.click("Set Up a Feed")
+        window.click("Search agencies", "entry")
+        press("type", "atlantis")
+        window.see("No agency or place was found")
+        window.click("Switzerland, 1 feed")
+        window.click("Metro, Zürich, Switzerland", "list item")
+        window.see("https://keys.example/")
+        press("type", "wrong")
+        press("key", "Return")
+        window.see("The server wants a valid key. Get one here: https://keys.example/")
+        window.click("^Key", "text")
+        press("key", "ctrl+a", "type", "s3cret")
+        press("key", "Return")
+        window.see_page("Favorites")
+        window.click("Add 1, Harbour Line to favorites")
+        window.see("Remove 1, Harbour Line from favorites")
+        press("key", "alt+Left")
+        window.click("^Edit$")
+        window.see("Edit “metro”")
+        window.click("Lines", "text")
+        press("key", "ctrl+a", "type", city + "/alerts.pb")
+        press("key", "Return")
+        window.see("is the other half of a feed")
+        press("key", "alt+Left")
+        window.see("Signals fail", "push button")
+        press("key", "ctrl+question")
+        window.see_page("Keyboard Shortcuts")
+        window.see("Ctrl.W")
+        press("key", "alt+Left")
+        press("key", "ctrl+w")
+        assert window.process.wait(PATIENCE) == 0
+        server.shutdown()
+    assert ("/alerts.pb", "s3cret") in asked and ("/city.zip", "wrong") in asked, asked
 
 
 FAULTS = {  # what the widget program does, and what the window says
@@ -226,6 +304,7 @@ def faults(session, folder):
     window = Window(session, desktop, "--state", folder + "/german", LANG="en_US.UTF-8", LANGUAGE="pl:de")
     window.comes_to_front()
     window.click("Feed einrichten")
+    window.click("Mit Adresse")
     window.click("Hinzufügen")
     window.see("Gib einen Namen")
     for entry, text, problem in (("Name", "town", "Diese Adresse"), ("Linien", "/none", "Diese Adresse"),
@@ -285,4 +364,4 @@ def faults(session, folder):
 
 
 with tempfile.TemporaryDirectory() as home, Session(home) as running:
-    {"tour": tour, "faults": faults}[sys.argv[1]](running, home)
+    {"tour": tour, "faults": faults, "catalog": catalog}[sys.argv[1]](running, home)

@@ -61,6 +61,7 @@ class FeedAddress {
 
 /// How old what a publisher says, or how far ahead its date, may be before it is no more taken for the present state:
 /// an answer of a server, and a file, which somebody has to put there.
+inline constexpr int kLongestAlertsAgeMinutes = 60 * 24 * 366;
 inline constexpr std::chrono::minutes kDefaultMaximumAlertsAge{15}, kDefaultMaximumFileAge{24 * 60};
 
 /// A feed as the user set it up.
@@ -76,11 +77,13 @@ struct Feed {
   std::optional<std::chrono::minutes> maximumAlertsAge = {};
   /// Whether the answer may have other entities alone: positions of vehicles and times of trips come beside the alerts.
   bool isCombined = false;
-  /// The other feeds that are set up with the same alerts, which are fetched and kept once; these name no more.
+  /// Whether other feeds go with the same alerts, which are fetched and kept once.
+  bool sharesAlerts = false;
+  /// Those that are set up.
   std::vector<Feed> siblings = {};
 
   /// By what name its alerts are kept.
-  std::string nameOfAlerts() const { return siblings.empty() ? name : alerts.identity(); }
+  std::string nameOfAlerts() const { return sharesAlerts ? alerts.identity() : name; }
   /// By its settings alone.
   bool operator==(const Feed& other) const {
     const auto settings = [](const Feed& feed) {

@@ -17,7 +17,12 @@ std::filesystem::path FeedCache::file(std::string_view kind, std::string_view fe
   return _folder / name;
 }
 
-void FeedCache::remove(std::string_view feed) const {
+void FeedCache::remove(const Feed& feed) const {
+  removeNamed(feed.name);
+  removeNamed(feed.alerts.identity());  // those that it shared
+}
+
+void FeedCache::removeNamed(std::string_view feed) const {
   // Of whatever kind, and what killed processes left of them half written.
   const std::string mark = file("", feed).filename().native();
   std::error_code ignored;

@@ -4,6 +4,8 @@
 #include <string>
 #include <string_view>
 
+#include "desktop/gtfs/feeds/Feed.h"
+
 namespace nimbo {
 
 /// Where the cache keeps what was made from a feed. Everything there can be made again.
@@ -18,10 +20,11 @@ class FeedCache {
   std::filesystem::path trips(std::string_view feed) const { return file("trips", feed); }
   std::filesystem::path alerts(std::string_view feed) const { return file("alerts", feed); }
 
-  /// Drops all that is kept under a feed's name.
-  void remove(std::string_view feed) const;
+  /// Drops all that is kept of a feed.
+  void remove(const Feed& feed) const;
 
  private:
+  void removeNamed(std::string_view name) const;
   std::filesystem::path file(std::string_view kind, std::string_view feed) const;
   std::filesystem::path _folder;
 };

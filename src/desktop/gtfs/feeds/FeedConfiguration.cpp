@@ -20,7 +20,6 @@ namespace {
 using JSON = nlohmann::ordered_json;
 
 constexpr std::uint64_t kLargestConfiguration = 4 << 20;
-constexpr int kLongestAlertsAgeMinutes = 60 * 24 * 366;
 
 /// What is wrong with the file, made into an error.
 struct Fault {
@@ -205,6 +204,7 @@ void findSiblings(std::vector<Feed>& feeds) {
       if (other.name != feed.name && other.alerts.isRemote() && other.alerts == feed.alerts &&
           other.isCombined == feed.isCombined && other.maximumAlertsAge == feed.maximumAlertsAge)
         feed.siblings.push_back(other);
+  for (Feed& feed : feeds) feed.sharesAlerts = !feed.siblings.empty();
 }
 
 }  // namespace

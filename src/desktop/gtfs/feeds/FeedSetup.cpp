@@ -66,6 +66,7 @@ std::vector<Feed> feedsOf(const KnownFeed& known, const std::string& name, const
   for (const KnownFile& file : known.staticFeeds) {
     Feed feed{.name = nameOfPart(name, feeds.size()), .staticFeed = addressOf(file), .alerts = addressOf(known.alerts)};
     feed.staticMirror = file.mirror;
+    feed.sharesAlerts = known.staticFeeds.size() > 1;
     feeds.push_back(std::move(feed));
   }
   return feeds;
