@@ -208,9 +208,13 @@ void FeedFinder::showCountries(const KnownFeeds& known, const std::string& local
   std::map<std::string, std::uint64_t> countries;
   for (const KnownFeed& feed : known.all()) ++countries[stringsPart().countryName(feed.country, locale)];
   for (const auto& [name, count] : countries) {
-    auto* button = Gtk::make_managed<Gtk::Button>(
+    auto* label = Gtk::make_managed<Gtk::Label>(
         CommaDelimitedList({name, LocalizedFormat(LocalizedString("Window_Find_Count"), {count})}));
+    label->set_xalign(0);
+    auto* button = Gtk::make_managed<Gtk::Button>();
+    button->set_child(*label);
     button->add_css_class("flat");
+    wrapTexts(*button);
     button->signal_clicked().connect([this, country = name] {
       _query.set_text(country);
       _query.grab_focus();
