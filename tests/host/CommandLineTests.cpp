@@ -467,7 +467,7 @@ TEST(CommandLine, TellsTheStateOfEachLine) {
   EXPECT_THAT(print({"--expanded"}).output, AllOf(HasSubstr("Works"), HasSubstr("since "), HasSubstr("\nUpdated ")));
 
   // A feed that fails leaves the lines of the others what they are.
-  programs.run({"feed", "add", "town", "--static", feed, "--alerts", "/none"});
+  programs.run({"feed", "add", "town", "--static", feed, "--alerts", "/none", "--force"});
   programs.run({"favorite", "add", "town:m2"});
   EXPECT_EQ(look(), "4 unknown, city:m1 affected, city:b10 good, town:m2 unknown");
   EXPECT_THAT(print({"--lines"}).output, HasSubstr("? [2] Castle Line: not known: Cannot read /none"));

@@ -127,7 +127,8 @@ def check_cache(folder, _):
 
     with http.server.HTTPServer(("127.0.0.1", 0), Zip) as server:
         threading.Thread(target=server.serve_forever, daemon=True).start()
-        added = run("feed", "add", "city", "--static", f"http://127.0.0.1:{server.server_port}/", "--alerts", "/none")
+        added = run("feed", "add", "city", "--static", f"http://127.0.0.1:{server.server_port}/", "--alerts", "/none",
+                    "--force")
         assert added.returncode == 0 and "/none" in added.stderr, added
         server.shutdown()
     for arguments in ["lines", "1"], ["favorite", "add", "city:R"], ["favorite", "list"]:
