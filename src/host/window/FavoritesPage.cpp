@@ -124,6 +124,10 @@ void FavoritesPage::showFavorites() {
     row->addMoving(i > 0, i + 1 < _favorites.size(), [this, line, i](int step) {
       move(line, static_cast<std::size_t>(static_cast<std::ptrdiff_t>(i) + step));
     });
+    row->addDragging(static_cast<int>(i), [this](int from, int to) {
+      if (const auto index = static_cast<std::size_t>(from); index < _favorites.size())
+        move(_favorites[index], static_cast<std::size_t>(to));
+    });
     if (const auto gone = _gone.find(line->muid()); gone != _gone.end()) row->showGone(gone->second);
     _favoritesList.append(*row);
     if (static_cast<int>(i) == std::min(focusedIndex, static_cast<int>(_favorites.size()) - 1))
@@ -170,7 +174,19 @@ void FavoritesPage::showFound(const protocol::FoundLines& found, std::size_t off
 
 void FavoritesPage::toggle(TransitLineRef line) {
   FavoritesEditor& editor = _context.platform->favoritesEditor();
-  finish(isFavorite(*line) ? editor.remove({line->muid()}) : editor.add({line}));
+  const auto place = std::find_if(_favorites.begin(), _favorites.end(),
+                                  [&](const TransitLineRef& favorite) { return favorite->muid() == line->muid(); });
+  if (place == _favorites.end()) return finish(editor.add({line}));
+  const auto position = static_cast<std::size_t>(place - _favorites.begin());
+  const ErrorRef failure = editor.remove({line->muid()});
+  finish(failure);
+  if (failure) return;
+  _context.navigator.tell(LocalizedFormat(LocalizedString("Window_Removed"), {nameOfLine(*line)}),
+                          [this, line, position] {
+                            FavoritesEditor& favorites = _context.platform->favoritesEditor();
+                            const ErrorRef undoFailure = favorites.add({line});
+                            finish(undoFailure ? undoFailure : favorites.move(line->muid(), position));
+                          });
 }
 
 void FavoritesPage::move(TransitLineRef line, std::size_t position) {

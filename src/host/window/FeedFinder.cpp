@@ -214,6 +214,7 @@ void FeedFinder::showCountries(const KnownFeeds& known, const std::string& local
     auto* button = Gtk::make_managed<Gtk::Button>();
     button->set_child(*label);
     button->add_css_class("flat");
+    setAccessibleLabel(*button, label->get_text());
     wrapTexts(*button);
     button->signal_clicked().connect([this, country = name] {
       _query.set_text(country);

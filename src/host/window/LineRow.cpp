@@ -1,5 +1,9 @@
 #include "host/window/LineRow.h"
 
+#include <gdkmm/contentprovider.h>
+#include <glibmm/main.h>
+#include <gtkmm/dragsource.h>
+#include <gtkmm/droptarget.h>
 #include <gtkmm/eventcontrollerkey.h>
 #include <gtkmm/label.h>
 
@@ -102,6 +106,30 @@ void LineRow::addMoving(bool up, bool down, std::function<void(int)> move) {
       },
       false);
   add_controller(keys);
+}
+
+void LineRow::addDragging(int place, std::function<void(int from, int to)> move) {
+  const auto drag = Gtk::DragSource::create();
+  drag->set_actions(Gdk::DragAction::MOVE);
+  drag->signal_prepare().connect(
+      [place](double, double) {
+        Glib::Value<int> value;
+        value.init(Glib::Value<int>::value_type());
+        value.set(place);
+        return Gdk::ContentProvider::create(value);
+      },
+      false);
+  add_controller(drag);
+  const auto drop = Gtk::DropTarget::create(Glib::Value<int>::value_type(), Gdk::DragAction::MOVE);
+  drop->signal_drop().connect(
+      [place, move = std::move(move)](const Glib::ValueBase& value, double, double) {
+        const int from = g_value_get_int(value.gobj());
+        // The rows are made anew, which must not be while one of them is dropped on.
+        if (from != place) Glib::signal_idle().connect_once([move, from, place] { move(from, place); });
+        return from != place;
+      },
+      false);
+  add_controller(drop);
 }
 
 }  // namespace nimbo

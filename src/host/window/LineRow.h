@@ -27,6 +27,10 @@ class LineRow final : public Gtk::ListBoxRow {
   /// its list, where there is room that way.
   void addMoving(bool up, bool down, std::function<void(int)> move);
 
+  /// Lets the row, the one at `place` of its list, be dragged to the place of another; `move` hears from where to
+  /// where.
+  void addDragging(int place, std::function<void(int from, int to)> move);
+
   const TransitLineRef& line() const { return _line; }
   Gtk::Button& star() { return _star; }
 
