@@ -16,7 +16,6 @@ namespace {
 Gtk::Label* makeText(const std::string& text, const char* style) {
   auto* label = Gtk::make_managed<Gtk::Label>(text);
   label->set_xalign(0);
-  label->set_selectable();
   label->add_css_class(style);
   return label;
 }
