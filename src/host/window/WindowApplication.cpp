@@ -102,7 +102,7 @@ void WindowApplication::on_open(const type_vec_files& files, const Glib::ustring
 }
 
 void WindowApplication::on_shutdown() {
-  if (_window) keepSize();
+  if (_window && !get_windows().empty()) keepSize();  // a closed one has kept its size
   _window.reset();
   _preferences.reset();
   _platform.reset();
