@@ -19,19 +19,26 @@ import subprocess
 import sys
 import tempfile
 
+from day import Day, fresh_clone, seconds_of
+
 FAVORITES = 20
 PAIR_SECONDS = 0.15  # that a function runs for in one pair
 
 
 class Row:
-    """One row: `measure` and `measure_peer` answer a figure each; without a peer the figure counts itself."""
+    """One row: `measure` and `measure_peer` answer a figure each; without a peer the figure counts itself. `compare` is
+    what a pair makes of both, their ratio unless it says otherwise. What takes minutes is measured `once`."""
 
-    def __init__(self, name, aim, measure, measure_peer=None, unit="", peer="-", shown=("ms", 1e3)):
+    def __init__(self, name, aim, measure, measure_peer=None, unit="", peer="-", shown=("ms", 1e3),
+                 compare=lambda ours, theirs: ours / theirs, once=False):
         self.name, self.aim, self.unit, self.peer = name, aim, unit, peer
         self.measure, self.measure_peer, self.shown = measure, measure_peer, shown
+        self.compare, self.once = compare, once
 
     def figures(self, pairs):
         figures, ours, theirs = [], [], []
+        if self.once:
+            return [self.measure()], "once"
         for measure in filter(None, (self.measure, self.measure_peer)):
             measure()
         for number in range(pairs):
@@ -41,7 +48,7 @@ class Row:
             sides = [(self.measure, ours), (self.measure_peer, theirs)]
             for measure, values in sides if number % 2 == 0 else reversed(sides):
                 values.append(measure())
-            figures.append(ours[-1] / theirs[-1])
+            figures.append(self.compare(ours[-1], theirs[-1]))
         if not theirs:
             return figures, f"lowest {min(figures):.3g} {self.unit}"
         unit, scale = self.shown
@@ -50,7 +57,7 @@ class Row:
     def line(self, pairs):
         figures, note = self.figures(pairs)
         median = statistics.median(figures)
-        low, _, high = statistics.quantiles(figures, n=4)
+        low, _, high = statistics.quantiles(figures, n=4) if len(figures) > 1 else figures * 3
         verdict = "-" if self.aim is None else "met" if median <= self.aim else "missed"
         aim = "-" if self.aim is None else f"{self.aim:g} {self.unit}".strip()
         spread = f"{low:.3g} to {high:.3g}"
@@ -68,6 +75,7 @@ def run(*command, **options):
 class Bench:
     def __init__(self, build, folder):
         self.build, self.folder = build, folder
+        self.day = Day(build, folder)
         self.widget = build / "src/process/nimbo-transit-widget"
         self.environment = dict(os.environ, GSETTINGS_BACKEND="memory", NO_AT_BRIDGE="1", GTK_A11Y="none")
 
@@ -211,6 +219,37 @@ class Bench:
             Row("the window's resident memory", 40, self.process("residentKiB", *window, scale=mib), unit="MiB"),
             Row("the same beside the plain window", None, self.process("residentKiB", *window),
                 self.process("residentKiB", *bare_window), peer="plain gtkmm window", shown=memory),
+            *self.rows_of_the_day(loaded),
+        ]
+
+    def rows_of_the_day(self, loaded):
+        day = self.day
+        more = {"unit": "ms more", "compare": lambda ours, theirs: (ours - theirs) * 1e3}
+        seconds, written = 0, 1
+        hostile, usual = (lambda size=size: self.process("seconds", *loaded, *day.hostile(size))()
+                          for size in (20000, 200))
+        return [
+            Row("update answered 304, 4.3 MB of alerts, 20 favorites, 200 rows", 1, lambda: day.updates()[seconds],
+                day.unchanged_peer, peer="libcurl alone, new handle and connection", **more),
+            Row("update answered 304: bytes written", 100, lambda: day.updates()[written], unit="bytes"),
+            Row("update answered 200 with the same bytes", 2, lambda: day.updates(forgetful=True)[seconds],
+                day.same_peer, peer="libcurl receiving them, and a hash over them", **more),
+            Row("update answered 200 with the same bytes: bytes written", 100,
+                lambda: day.updates(forgetful=True)[written], unit="bytes"),
+            Row("update with one alert changed of 5000", 0.5, lambda: day.updates(changes=True)[seconds],
+                day.parse_peer, peer="libprotobuf lite, parse alone"),
+            Row("update with one alert changed of 5000: bytes written", None,
+                lambda: day.updates(changes=True)[written], unit="bytes"),
+            Row("day on screen: 1440 updates, 20 of them changed, 6 starts and ends", 5,
+                lambda: day.whole_day[seconds], unit="s", once=True),
+            Row("day on screen: written", 100, lambda: day.whole_day[written], unit="MB", once=True),
+            Row("memory (PSS) after 1000 updates, beside the tenth", 1.02, day.growth, once=True),
+            Row("status bar and its widget process after a fetch: PSS", 1.3, day.status_bar, day.bare_pair,
+                peer="two bare programs: GLib, SQLite; with libcurl, ICU", shown=("MiB", 1)),
+            Row("1049 alerts of 20 KB on the favorites, first rows", 1.5, hostile, usual,
+                peer="the same of 200 bytes"),
+            Row("fresh clone, packages installed, to the rows of ./run status, no compiler cache", 180,
+                lambda: fresh_clone(pathlib.Path(__file__).resolve().parent.parent, self.folder), unit="s", once=True),
         ]
 
 

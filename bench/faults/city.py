@@ -103,7 +103,12 @@ class Widget:
 
     def __init__(self, command):
         self.process = subprocess.Popen(command, stdin=subprocess.PIPE, stdout=subprocess.PIPE)
-        self.count = 0
+        self.count = self.heard = 0
+
+    def written(self):
+        """Bytes that it has written into files."""
+        with open(f"/proc/{self.process.pid}/io") as file:
+            return next(int(line.split()[1]) for line in file if line.startswith("wchar")) - self.heard
 
     def send(self, *requests):
         lines = []
@@ -118,6 +123,7 @@ class Widget:
         """The last request's result."""
         self.send(*requests)
         for line in self.process.stdout:
+            self.heard += len(line)
             message = json.loads(line)
             if message.get("id") == self.count and "method" not in message:
                 if "error" in message:
