@@ -1,15 +1,15 @@
 #include "handoff/NBUserActivityData.h"
 
 #include <algorithm>
-#include <functional>
-#include <map>
 
 #include "handoff/ApplicationRecord+NimboExtras.h"
 #include "handoff/Bytes+NimboExtra.h"
+#include "handoff/NBUserActivityPayload.h"
 #include "handoff/NimboActivity.h"
 #include "platform/Platform.h"
 #include "platform/UserSession.h"
 #include "platform/foundation/Hash.h"
+#include "platform/foundation/Log.h"
 #include "platform/wire/StoredTransitIncident.h"
 #include "util/NimboMap.h"
 
@@ -22,6 +22,28 @@ NBUserActivityDataRef NBUserActivityData::initWithActivityType_userInfo(
       new NBUserActivityData(std::move(activityType), UserSession::sharedSessionUserInfoForPunchoutUserInfo(userInfo)));
 }
 
+namespace {
+
+/// The user info with bytes in the place of payloads; absent, and logged, when they cannot be made.
+std::optional<std::shared_ptr<const BoxedDictionary>> readyUserInfo(
+    const std::shared_ptr<const BoxedDictionary>& userInfo) {
+  if (!userInfo) return userInfo;
+  BoxedDictionary::Entries entries = userInfo->entries();
+  for (auto& [key, value] : entries) {
+    const auto* payload = dynamic_cast<const NBUserActivityPayload*>(value.get());
+    if (!payload) continue;
+    auto bytes = payload->bytes();
+    if (!bytes) {
+      writeLog(NBTransitWidgetLogFacility, LogLevel::error, "The payload of a hand-off cannot be made: %@", {key});
+      return std::nullopt;
+    }
+    value = box(*std::move(bytes));
+  }
+  return std::make_shared<const BoxedDictionary>(std::move(entries));
+}
+
+}  // namespace
+
 void NBUserActivityData::openInContext_completionHandler(Object*, Completion completion) const {
   ActivityLauncher& launcher = Platform::current().activityLauncher();
   const std::shared_ptr<UserActivity> activity = _activityType ? launcher.createUserActivity(*_activityType) : nullptr;
@@ -32,7 +54,15 @@ void NBUserActivityData::openInContext_completionHandler(Object*, Completion com
                             {{std::string(kNBUserActivityErrorMissingActivityKey), shared_from_this()}}));
     return;
   }
-  activity->setUserInfo(_userInfo);
+  const auto userInfo = readyUserInfo(_userInfo);
+  if (!userInfo) {
+    if (completion)
+      completion(false, Error::errorWithDomain_code_reason(std::string(kNBUserActivityErrorDomain),
+                                                           kNBUserActivityErrorNoPayload,
+                                                           "What the row opens cannot be handed over."));
+    return;
+  }
+  activity->setUserInfo(*userInfo);
   ErrorRef error;
   const ApplicationRecordRef application = _nimbo_containingApplicationProxy(&error);
   if (error) {
@@ -57,38 +87,56 @@ std::uint64_t NBUserActivityData::hash() const {
 
 namespace {
 
-/// The payloads of objects that are alive. A line has a row for each of its incidents, and all rows are made anew
-/// whenever an incident starts or ends; compressing takes a hundred times what the rest of a row takes.
-class PayloadCache {
+Bytes recordOf(const TransitLineItemRef& line) {
+  NimboActivity activity;
+  activity.setLineItem(StoredTransitLineItem::initWithLineItem(line));
+  const auto displayOptions = std::make_shared<MapDisplayOptions>();
+  displayOptions->setMapType(kMapTypeTransit);
+  activity.setDisplayOptions(displayOptions);
+  return activity.data();
+}
+
+class LinePayload final : public NBUserActivityPayload {
  public:
-  /// What `make` answered for these very objects, or answers now; null when it answers no bytes.
-  ObjectRef payloadFor(const std::vector<ObjectRef>& objects, const std::function<std::optional<Bytes>()>& make) {
-    Key key(objects.begin(), objects.end());
-    if (const auto known = _payloads.find(key); known != _payloads.end()) return known->second;
-    std::optional<Bytes> bytes = make();
-    if (!bytes) return nullptr;
-    std::erase_if(_payloads, [](const auto& entry) {
-      return std::ranges::any_of(entry.first, [](const auto& object) { return object.expired(); });
-    });
-    return _payloads.emplace(std::move(key), box(*std::move(bytes))).first->second;
+  explicit LinePayload(TransitLineItemRef line) : _line(std::move(line)) {}
+
+  std::optional<Bytes> bytes() const override { return bzip2CompressedData(recordOf(_line)); }
+  bool isEqual(const Object* other) const override {
+    const auto* payload = instanceOf<LinePayload>(other);
+    return payload && (payload->_line == _line || recordOf(payload->_line) == recordOf(_line));
   }
+  std::uint64_t hash() const override { return _line->muid(); }
 
  private:
-  using Key = std::vector<std::weak_ptr<const Object>>;
-  struct IsBefore {
-    bool operator()(const Key& a, const Key& b) const {
-      return std::ranges::lexicographical_compare(a, b, std::owner_less<>());
-    }
-  };
-  std::map<Key, ObjectRef, IsBefore> _payloads;
+  TransitLineItemRef _line;
+};
+
+class IncidentsPayload final : public NBUserActivityPayload {
+ public:
+  explicit IncidentsPayload(TransitIncidents incidents) : _incidents(std::move(incidents)) {}
+
+  std::optional<Bytes> bytes() const override {
+    const auto stored = NimboMap(_incidents, [](const TransitIncidentRef& incident, std::size_t) {
+      return StoredTransitIncident::initWithIncident(incident);
+    });
+    auto archived = Platform::current().archive().archivedDataWithRootObject(BoxedArray::of(stored), true);
+    return archived ? std::optional(std::move(*archived)) : std::nullopt;
+  }
+  bool isEqual(const Object* other) const override {
+    const auto* payload = instanceOf<IncidentsPayload>(other);
+    return payload && std::ranges::equal(payload->_incidents, _incidents, [](const auto& a, const auto& b) {
+             return a == b || StoredTransitIncident::initWithIncident(a)->data() ==
+                                  StoredTransitIncident::initWithIncident(b)->data();
+           });
+  }
+  std::uint64_t hash() const override { return _incidents.size(); }
+
+ private:
+  TransitIncidents _incidents;
 };
 
 NBUserActivityDataRef activityData(const std::string& activityType, std::string_view key,
-                                   const std::vector<ObjectRef>& objects,
-                                   const std::function<std::optional<Bytes>()>& makePayload) {
-  const auto cache = Platform::current().singleton<PayloadCache>([] { return std::make_shared<PayloadCache>(); });
-  ObjectRef payload = cache->payloadFor(objects, makePayload);
-  if (!payload) return nullptr;
+                                   std::shared_ptr<const NBUserActivityPayload> payload) {
   BoxedDictionary::Entries userInfo;
   userInfo.emplace(key, std::move(payload));
   return NBUserActivityData::initWithActivityType_userInfo(
@@ -99,26 +147,13 @@ NBUserActivityDataRef activityData(const std::string& activityType, std::string_
 
 NBUserActivityDataRef activityDataForLineItem(const TransitLineItemRef& lineItem) {
   return activityData(kNimboTransitWidgetIncidentActivityType, kNimboTransitWidgetIncidentActivityUserInfoKey,
-                      {lineItem}, [&] {
-                        NimboActivity activity;
-                        activity.setLineItem(StoredTransitLineItem::initWithLineItem(lineItem));
-                        const auto displayOptions = std::make_shared<MapDisplayOptions>();
-                        displayOptions->setMapType(kMapTypeTransit);
-                        activity.setDisplayOptions(displayOptions);
-                        return bzip2CompressedData(activity.data());
-                      });
+                      std::make_shared<const LinePayload>(lineItem));
 }
 
 NBUserActivityDataRef activityDataForIncidents(const TransitIncidents& incidents) {
-  return activityData(
-      kNimboTransitWidgetIncidentSummaryActivityType, kNimboTransitWidgetIncidentSummaryActivityUserInfoKey,
-      std::vector<ObjectRef>(incidents.begin(), incidents.end()), [&] {
-        const auto stored = NimboMap(incidents, [](const TransitIncidentRef& incident, std::size_t) {
-          return StoredTransitIncident::initWithIncident(incident);
-        });
-        auto archived = Platform::current().archive().archivedDataWithRootObject(BoxedArray::of(stored), true);
-        return archived ? std::optional(std::move(*archived)) : std::nullopt;
-      });
+  return activityData(kNimboTransitWidgetIncidentSummaryActivityType,
+                      kNimboTransitWidgetIncidentSummaryActivityUserInfoKey,
+                      std::make_shared<const IncidentsPayload>(incidents));
 }
 
 }  // namespace nimbo

@@ -10,10 +10,11 @@
 
 namespace nimbo {
 
-/// Domain of an activity that the system does not create.
+/// Domain of an activity that the system does not create, with the code 0, and of one whose payload cannot be made.
 inline constexpr std::string_view kNBUserActivityErrorDomain = "NBUserActivityErrorDomain";
+inline constexpr std::int64_t kNBUserActivityErrorNoPayload = 1;
 
-/// Key, in such an error's user info, of the activity data that failed.
+/// Key, in the user info of an error of the code 0, of the activity data that failed.
 inline constexpr std::string_view kNBUserActivityErrorMissingActivityKey = "NBUserActivityErrorMissingActivityKey";
 
 /// A hand-off to the map application: an activity type and its details, tagged with the session that widget and
@@ -25,7 +26,7 @@ class NBUserActivityData final : public NBOpenable {
       std::optional<std::string> activityType, const std::shared_ptr<const BoxedDictionary>& userInfo);
 
   const std::optional<std::string>& activityType() const { return _activityType; }
-  /// As tagged, not as given; may be null.
+  /// As tagged, not as given; may be null. An `NBUserActivityPayload` in it becomes bytes when it is opened.
   const std::shared_ptr<const BoxedDictionary>& userInfo() const { return _userInfo; }
 
   /// Creates the activity anew and gives it to the launcher, for the application that contains this program. The
@@ -49,10 +50,10 @@ class NBUserActivityData final : public NBOpenable {
 
 using NBUserActivityDataRef = std::shared_ptr<const NBUserActivityData>;
 
-/// Opens the map application at this line, with its incidents. Null when the payload cannot be compressed.
+/// Opens the map application at this line, with its incidents; neither is null.
 NBUserActivityDataRef activityDataForLineItem(const TransitLineItemRef& lineItem);
 
-/// Opens the map application at the list of these incidents, in this order. Null when they cannot be archived.
+/// Opens the map application at the list of these incidents, in this order; none is null.
 NBUserActivityDataRef activityDataForIncidents(const TransitIncidents& incidents);
 
 }  // namespace nimbo

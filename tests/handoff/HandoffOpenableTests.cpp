@@ -42,22 +42,38 @@ TEST_F(Openable, ActivityDataIsTaggedWhenMadeAndComparedByWhatItStores) {
   }
 }
 
-TEST_F(Openable, PayloadsAreMadeAgainForEveryOtherListAndKeptForTheSame) {
-  auto a = incident(1);
-  const auto b = incident(2);
-  const auto payloadOf = [](const TransitIncidents& incidents) {
-    return activityDataForIncidents(incidents)->userInfo()->objectForKey("incidentListKey");
-  };
-  const std::weak_ptr<const Object> payload = payloadOf({a});
-  EXPECT_EQ(payloadOf({a}), payload.lock());
-  for (const TransitIncidents& other : {TransitIncidents{a, b}, {b, a}, {b}, {}})
-    EXPECT_FALSE(payloadOf(other)->isEqual(payload.lock().get()));
-  a.reset();
-  payloadOf({b, b});
-  EXPECT_TRUE(payload.expired()) << "that of an incident that is gone";
-  platform.archive.fails = platform.compressor.fails = true;
-  EXPECT_EQ(activityDataForIncidents({b, b, b}), nullptr);
-  EXPECT_EQ(activityDataForLineItem(lineItem(1, "A")), nullptr);
+TEST_F(Openable, PayloadsAreEqualWhereTheirRecordsAre) {
+  const auto a = incident(1), b = incident(2);
+  const auto list = activityDataForIncidents({a, b}), line = activityDataForLineItem(lineItem(1, "A", {a}));
+  const std::pair<NBUserActivityDataRef, const Object*> equal[] = {
+      {activityDataForIncidents({incident(1), b}), list.get()},
+      {activityDataForLineItem(lineItem(1, "A", {incident(1)})), line.get()}};
+  for (const auto& [made, other] : equal) {
+    EXPECT_TRUE(made->isEqual(other));
+    EXPECT_EQ(made->hash(), other->hash());
+  }
+  for (const TransitIncidents& other : {TransitIncidents{a}, {b, a}, {a, incident(3)}, {}})
+    EXPECT_FALSE(activityDataForIncidents(other)->isEqual(list.get()));
+  for (const TransitLineItemRef& other : {lineItem(1, "B", {a}), lineItem(1, "A", {b}), lineItem(1, "A")})
+    EXPECT_FALSE(activityDataForLineItem(other)->isEqual(line.get()));
+}
+
+TEST_F(Openable, PayloadsAreMadeWhenTheyAreOpened) {
+  platform.activityLauncher.bundleRecord = std::make_shared<const ApplicationRecord>("map");
+  platform.compressor.fails = platform.archive.fails = true;
+  const auto line = activityDataForLineItem(lineItem(1, "A")), list = activityDataForIncidents({incident(1)});
+  for (const auto& activity : {line, list}) activity->openInContext_completionHandler(nullptr, record());
+  ASSERT_EQ(answers.size(), 2u);
+  for (const auto& [opened, error] : answers) EXPECT_TRUE(!opened && error->code() == 1);
+  EXPECT_TRUE(platform.log.contains("cannot be made: bs") && platform.log.contains("cannot be made: incidentListKey"));
+  EXPECT_TRUE(platform.activityLauncher.opened.empty());
+  platform.compressor.fails = platform.archive.fails = false;
+  for (const auto& [activity, key] : {std::pair(line, "bs"), {list, "incidentListKey"}}) {
+    activity->openInContext_completionHandler(nullptr, record());
+    const auto opened = platform.activityLauncher.opened.back().activity->userInfo();
+    EXPECT_TRUE(std::dynamic_pointer_cast<const BoxedData>(opened->objectForKey(key))) << key;
+    EXPECT_TRUE(opened->objectForKey(kUserSessionTag)) << key;
+  }
 }
 
 TEST_F(Openable, AnActivityGoesToTheApplicationThatContainsTheProgram) {
@@ -78,7 +94,7 @@ TEST_F(Openable, AnActivityGoesToTheApplicationThatContainsTheProgram) {
     const auto& opened = platform.activityLauncher.opened.back();
     EXPECT_EQ(opened.application, test.expected);
     EXPECT_EQ(opened.activity->activityType(), "type");
-    EXPECT_EQ(opened.activity->userInfo(), activity->userInfo());
+    EXPECT_TRUE(opened.activity->userInfo()->isEqual(activity->userInfo().get()));
     EXPECT_TRUE(opened.requireUnlockPrompt);
   }
   EXPECT_EQ(answers.size(), std::size(cases));

@@ -266,14 +266,6 @@ TEST_F(ListBuilder, HandsEveryShownIncidentToTheSummaryAndTheRestToTheOverflowRo
   EXPECT_TRUE(list->expandedItems()->at(1)->openable()->isEqual(activityDataForIncidents({a[1], b[1]}).get()));
 }
 
-TEST_F(ListBuilder, ShowsRowsThatNothingCanOpen) {
-  platform.compressor.fails = true;
-  platform.archive.fails = true;
-  const std::string closed = " | -";
-  expectRows("A:1,2", 0, "TransitWidget_Summary_advisory_count(2) | A" + closed,
-             {"Incident 1 | Summary 1 | A" + closed, "Incident 2 | Summary 2 | A" + closed});
-}
-
 TEST_F(ListBuilder, TellsTheSessionEveryIncidentWithItsFirstLine) {
   session->startSessionIfNeeded();
   const auto list = build(Network("A:1,2 B:2,3"), 1);

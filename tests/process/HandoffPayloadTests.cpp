@@ -5,6 +5,7 @@
 #include "desktop/archive/Bzip2.h"
 #include "desktop/archive/CBORKeyedArchive.h"
 #include "handoff/NBUserActivityData.h"
+#include "handoff/NBUserActivityPayload.h"
 #include "handoff/NimboActivity.h"
 #include "process/HandoffDecoder.h"
 #include "support/TestPlatform.h"
@@ -18,7 +19,7 @@ using nlohmann::json;
 class HandoffPayload : public testing::Test {
  protected:
   static Bytes payload(const NBUserActivityDataRef& data, std::string_view key) {
-    return dynamic_cast<const BoxedData&>(*data->userInfo()->objectForKey(key)).value();
+    return dynamic_cast<const NBUserActivityPayload&>(*data->userInfo()->objectForKey(key)).bytes().value();
   }
 
   /// One whose texts all have so many characters.
@@ -122,15 +123,6 @@ TEST_F(HandoffPayload, IsShownWithinTheBoundsOfFeeds) {
   EXPECT_EQ(shown.title->size(), 500u);
   EXPECT_EQ(shown.summary->size(), 10'000u);
   EXPECT_EQ(shown.fullDescription->size(), 10'000u);
-}
-
-TEST_F(HandoffPayload, OfALineIsMadeOnceWhileTheLineLives) {
-  TransitLineItemRef line = lineItem(1, "A");
-  const auto payloadOf = [&] { return activityDataForLineItem(line)->userInfo()->objectForKey("bs"); };
-  const ObjectRef first = payloadOf();
-  EXPECT_EQ(payloadOf(), first);
-  line = lineItem(1, "B");
-  EXPECT_FALSE(payloadOf()->isEqual(first.get()));
 }
 
 }  // namespace
