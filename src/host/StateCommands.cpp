@@ -77,8 +77,10 @@ std::string textOfInteraction(const AnalyticsWidgetInteraction& interaction) {
   if (record.everExpanded) text += record.initiallyExpanded ? ", expanded from the start" : ", expanded";
   if (record.tappedItemIndex) text += ", row " + std::to_string(*record.tappedItemIndex);
   text += ", " + wordsOfMessageType(record.transitMessageType);
-  for (const auto& item : record.incidentItems)
+  for (const auto& item : record.incidentItems) {
     text += "\n  line " + item.transitLineMuid + ": " + printableText(item.transitIncidentTitle);
+    if (item.count > 1) text += " (shown in " + std::to_string(item.count) + " reports)";
+  }
   return text;
 }
 

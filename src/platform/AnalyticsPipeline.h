@@ -19,17 +19,20 @@ inline constexpr int kAnalyticsTargetTransitWidget = 706;
 struct TransitIncidentAnalyticsItem {
   std::string transitLineMuid;  ///< decimal identifier of the line it was shown for
   std::string transitIncidentTitle;
+  std::uint64_t count = 1;  ///< in how many reports
 };
 
 /// What one appearance of the widget showed.
 struct TransitWidgetAnalyticsRecord {
   bool initiallyExpanded = false;
   bool everExpanded = false;
-  int transitMessageType = 0;  ///< 0 until a build reported; then 1 to 4
-  std::vector<TransitIncidentAnalyticsItem> incidentItems;
-  std::optional<std::int64_t> tappedItemIndex;  ///< absent when no row was opened
+  int transitMessageType = 0;                               ///< 0 until a build reported; then 1 to 4
+  std::vector<TransitIncidentAnalyticsItem> incidentItems;  ///< each once, in the order of their first reports
+  std::optional<std::int64_t> tappedItemIndex;              ///< absent when no row was opened
+  std::size_t next = 0;  ///< the place behind the item added last: reports come in the same order again
 
-  void addTransitIncidentItem(TransitIncidentAnalyticsItem item) { incidentItems.push_back(std::move(item)); }
+  /// Counts one that is there already: a day on screen has a thousand reports, mostly of the same incidents.
+  void addTransitIncidentItem(TransitIncidentAnalyticsItem item);
 };
 
 /// Keeps usage records. Main thread only; a record that cannot be kept is logged and dropped.

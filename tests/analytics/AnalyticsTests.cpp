@@ -88,12 +88,13 @@ TEST_F(Analytics, GathersWhatTheBuildsOfASessionShow) {
 
   session->startSessionIfNeeded();
   report({line}, 1);
+  report({line}, 3);
   report({line}, 2);
   session->recordCloseSessionSwiping();
   std::vector<std::string> items;
   for (const auto& item : closed().record.incidentItems)
-    items.push_back(item.transitLineMuid + " " + item.transitIncidentTitle);
-  EXPECT_THAT(items, ElementsAre("18446744073709551615 Incident 1", "18446744073709551615 Incident 1", "0 Incident 2"));
+    items.push_back(std::to_string(item.count) + " " + item.transitLineMuid + " " + item.transitIncidentTitle);
+  EXPECT_THAT(items, ElementsAre("3 18446744073709551615 Incident 1", "2 0 Incident 2", "1 0 Incident 3"));
 }
 
 TEST_F(Analytics, EndsWithTheRowThatWasOpened) {

@@ -36,8 +36,9 @@ ordered_json jsonOf(const AnalyticsWidgetInteraction& interaction) {
   const TransitWidgetAnalyticsRecord& record = interaction.record;
   ordered_json incidents = ordered_json::array();
   for (const TransitIncidentAnalyticsItem& item : record.incidentItems)
-    incidents.push_back(
-        {{"transitLineMuid", item.transitLineMuid}, {"transitIncidentTitle", item.transitIncidentTitle}});
+    incidents.push_back({{"transitLineMuid", item.transitLineMuid},
+                         {"transitIncidentTitle", item.transitIncidentTitle},
+                         {"count", item.count}});
   return {{"widgetType", interaction.widgetType},
           {"endState", interaction.endState},
           {"wasLocked", interaction.wasLocked},
@@ -62,7 +63,8 @@ AnalyticsWidgetInteraction interactionOf(const ordered_json& object) {
   interaction.record.transitMessageType = object.at("transitMessageType");
   interaction.record.tappedItemIndex = valueOf<std::int64_t>(object, "tappedItemIndex");
   for (const ordered_json& item : object.at("incidentItems"))
-    interaction.record.addTransitIncidentItem({item.at("transitLineMuid"), item.at("transitIncidentTitle")});
+    interaction.record.addTransitIncidentItem(
+        {item.at("transitLineMuid"), item.at("transitIncidentTitle"), item.value("count", std::uint64_t{1})});
   return interaction;
 }
 

@@ -259,7 +259,7 @@ TEST_F(StateDatabaseTest, KeepsTheNewestAnalyticsUnlessTurnedOff) {
             R"({"date":"2026-01-05T12:00:00Z","widgetType":2,"endState":1,"wasLocked":true,)"
             R"("startDate":"2026-01-05T11:59:30.500000Z","duration":29.5,"initiallyExpanded":true,)"
             R"("everExpanded":true,"transitMessageType":3,"tappedItemIndex":2,"incidentItems":[{"transitLineMuid":)"
-            "\"18446744073709551615\",\"transitIncidentTitle\":\"Title \uFFFD\"}]}");
+            "\"18446744073709551615\",\"transitIncidentTitle\":\"Title \uFFFD\",\"count\":1}]}");
 }
 
 }  // namespace nimbo
