@@ -2,6 +2,7 @@
 #include <sched.h>
 #include <sys/mount.h>
 #include <sys/wait.h>
+#include <unistd.h>
 #include <zip.h>
 
 #include "desktop/gtfs/Fixtures.h"
@@ -188,10 +189,10 @@ class AlertsStoreTest : public testing::Test {
 
   /// Titles and time of the alerts, or the error's code.
   std::string load() {
-    const auto alerts = store.load(feed, {});
+    const auto alerts = store.load(feed, state, true, {});
     if (!alerts) return "error " + std::to_string(alerts.error()->code());
-    return std::to_string(alerts->alerts().size()) + " alerts of " +
-           std::to_string(static_cast<long>(intervalBetween(dateFromUnixTime(kNow), *alerts->timestamp())));
+    return std::to_string((*alerts)->alerts().size()) + " alerts of " +
+           std::to_string(static_cast<long>(intervalBetween(dateFromUnixTime(kNow), *(*alerts)->timestamp())));
   }
   static std::string error(Code code) { return "error " + std::to_string(static_cast<int>(code)); }
   static Answer good(int alerts, long made, const std::string& head = "200 OK") {
@@ -208,6 +209,7 @@ class AlertsStoreTest : public testing::Test {
   LoopbackServer server{[this](const std::string&) { return answer; }};
   Feed feed{"city", *FeedAddress::parse("/none"), *FeedAddress::parse(server.address())};
   AlertsStore store{FeedCache(folder.path() / "cache")};
+  AlertsState state;
 };
 
 TEST_F(AlertsStoreTest, AsksConditionallyAndTakesPackedAnswers) {
@@ -253,7 +255,8 @@ TEST_F(AlertsStoreTest, LetsTheLastAnswerStandInForAQuarterOfAnHour) {
   for (const auto& failure : failures) {
     answer = failure.answer;
     EXPECT_EQ(load(), "2 alerts of -60") << answer.bytes.substr(0, 80);
-    const auto alone = other.load(feed, {});
+    AlertsState none;
+    const auto alone = other.load(feed, none, true, {});
     ASSERT_FALSE(alone) << answer.bytes.substr(0, 80);
     EXPECT_EQ("error " + std::to_string(alone.error()->code()), error(failure.alone)) << alone.error()->reason();
   }
@@ -285,15 +288,71 @@ TEST_F(AlertsStoreTest, JudgesAgeByThePublishersOwnTime) {
   EXPECT_EQ(load(), error(Code::staleAlerts));
 }
 
+TEST_F(AlertsStoreTest, GivesNothingThatIsHeldAndWritesWhatChangedEveryTenMinutes) {
+  feed.maximumAlertsAge = std::chrono::minutes(60);
+  const auto file = FeedCache(folder.path() / "cache").alerts("city");
+  std::size_t hash = 0;  // of the file's bytes
+  const auto outcome = [&](bool needsFeed) {
+    const auto alerts = store.load(feed, state, needsFeed, {});
+    if (!alerts) return "error " + std::to_string(alerts.error()->code());
+    const std::size_t before = std::exchange(hash, std::hash<std::string>()(*readFile(file, 1 << 20)));
+    return std::string(*alerts ? "feed" : "same") + (hash == before ? "" : ", written") +
+           (fileChangeDate(file) == platform.time.now() ? ", confirmed" : "");
+  };
+  const std::string notModified = LoopbackServer::answer("304 Not Modified", "");
+  const Answer first = good(1, 0, "200 OK\r\nETag: \"a\""), second = good(2, 0, "200 OK\r\nETag: \"b\"");
+  const struct {
+    int seconds;  // since the step before
+    Answer answer;
+    bool needsFeed;
+    std::string outcome;
+  } steps[] = {
+      {0, first, false, "feed, written, confirmed"},
+      {60, {notModified}, false, "same, confirmed"},
+      {60, first, false, "same, confirmed"},
+      {60, second, false, "feed"},
+      {60, {notModified}, false, "same"},
+      {60, second, true, "feed"},  // the body is wanted, and not in the cache
+      {240, good(1, 0), false, "feed"},
+      {60, second, false, "feed, written, confirmed"},
+      {60, {notModified}, true, "feed, confirmed"},
+      {60, {LoopbackServer::answer("500 Oops", "")}, false, "same"},
+      {0, {LoopbackServer::answer("500 Oops", "")}, true, "feed"},
+      {60, good(1, -60), false, "same"},  // the publisher went back: the last answer stands in
+  };
+  for (const auto& step : steps) {
+    SCOPED_TRACE(&step - steps);
+    platform.time.advance(step.seconds);
+    answer = step.answer;
+    EXPECT_EQ(outcome(step.needsFeed), step.outcome);
+  }
+  std::ofstream(file, std::ios::app) << " ";  // another process has something else to keep
+  const auto date = fileChangeDate(file);
+  answer.bytes = notModified;
+  EXPECT_EQ(outcome(false), "same, written");
+  EXPECT_EQ(fileChangeDate(file), date);
+  feed.alerts = *FeedAddress::parse(server.address("/other"));
+  EXPECT_EQ(outcome(false), error(Code::serverFailure)) << "what is held is of another address";
+}
+
 TEST_F(AlertsStoreTest, DoesWithoutADamagedCache) {
   answer = good(2, 0, "200 OK\r\nETag: \"a\"");
   EXPECT_EQ(load(), "2 alerts of 0");
   const auto file = FeedCache(folder.path() / "cache").alerts("city");
   const std::string bytes = *readFile(file, 1 << 20);
-  for (const std::string& damaged : {bytes.substr(0, bytes.size() - 1), std::string("?"), bytes + "x"}) {
+  std::string older = bytes;
+  older.replace(0, 14, "nimbo-alerts 2");
+  for (const std::string& damaged : {bytes.substr(0, bytes.size() - 1), std::string("?"), bytes + "x", older}) {
     std::ofstream(file, std::ios::binary) << damaged;
+    state = {};
     EXPECT_EQ(load(), "2 alerts of 0");
     EXPECT_EQ(server.requests().back().find("If-None-Match"), std::string::npos);
+  }
+  if (::geteuid() == 0) {
+    EXPECT_EQ(::chown(file.c_str(), 1, 1), 0);
+    state = {};
+    EXPECT_EQ(load(), "2 alerts of 0");
+    EXPECT_EQ(server.requests().back().find("If-None-Match"), std::string::npos) << "another user's";
   }
   feed.alerts = *FeedAddress::parse(folder.write("alerts.pb", feedBytes("", kNow - 3600)).native());
   EXPECT_EQ(load(), "0 alerts of -3600");

@@ -87,6 +87,48 @@ TEST_F(LineServiceTest, AnswersInTheOrderOfTheIdentifiers) {
   EXPECT_EQ(lookup({}), "");
 }
 
+TEST_F(LineServiceTest, KeepsTheObjectsOfWhatHasNotChanged) {
+  const auto publish = [&](const std::string& second, std::uint64_t time = kNow) {
+    return folder.write(
+        "north/alerts.pb",
+        feedBytes(alert("a", "A", route("r1")) + alert("b", "B", route("r2")) + alert("c", second, route("r2")), time));
+  };
+  addFeed("north", {"1", "2"}, publish("C"));
+  const auto items = [&](const std::vector<MapItemIdentifierRef>& identifiers) {
+    std::optional<TransitLineItems> answer;
+    service->lookup(identifiers, [&](const TransitLineItems& found, const ErrorRef&) { answer = found; });
+    platform.loop.waitAndDrain([&] { return answer.has_value(); });
+    return *answer;
+  };
+  const TransitLineItems first = items({line("north", "r1"), line("north", "r2")});
+  EXPECT_EQ(items({line("north", "r1"), line("north", "r2")}), first) << "the same bytes";
+  publish("C", kNow + 1);
+  EXPECT_EQ(items({line("north", "r1"), line("north", "r2")}), first) << "the same alerts";
+  publish("changed");
+  const TransitLineItems changed = items({line("north", "r1"), line("north", "r2")});
+  EXPECT_EQ(changed[0], first[0]);
+  EXPECT_NE(changed[1], first[1]);
+  EXPECT_EQ(changed[1]->incidents()[0], first[1]->incidents()[0]);
+  EXPECT_EQ(changed[1]->incidents()[1]->title(), "changed");
+  EXPECT_EQ(items({line("north", "r2")})[0]->incidents(), changed[1]->incidents()) << "another question";
+  service->setLanguage("de");
+  EXPECT_EQ(lookup({line("north", "r2")}), "2 (B) (changed); ");
+  folder.write("north/routes.txt", "route_id,route_short_name,route_type\nr2,two,3\n");
+  EXPECT_EQ(lookup({line("north", "r2")}), "two (B) (changed); ") << "another static feed";
+}
+
+TEST_F(LineServiceTest, ReadsTheSameBytesAgainWhenWhatTheyMeanChanges) {
+  const std::string start = "active_period { start: " + std::to_string(kNow + 3600) + " } ";
+  addFeed("north", {"1"},
+          folder.write("alerts.pb", feedBytes(alert("a", "A", route("r1")) +
+                                              alert("b", "B", start + "informed_entity { trip { trip_id: 'x' } }"))));
+  EXPECT_EQ(lookup({line("north", "r1")}), "1 (A); ");
+  platform.time.advance(3599);
+  EXPECT_EQ(lookup({line("north", "r1")}), "1 (A); ");
+  platform.time.advance(1);
+  EXPECT_EQ(lookup({line("north", "r1")}), error(Code::badStaticFeed)) << "an alert by trip comes in force";
+}
+
 TEST_F(LineServiceTest, FailsWhenAFeedDoes) {
   addFeed("north", {"1"});
   addFeed("south", {"1"}, folder.path() / "missing.pb");

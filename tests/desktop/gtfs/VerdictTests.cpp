@@ -33,7 +33,7 @@ const std::string kCutText = field(10, "").substr(0, 1) + "\x7F";
 const std::string kVehicle = entity(field(1, "v") + field(4, ""));
 const std::string kTripUpdate = entity(field(1, "u") + field(3, ""));
 
-/// A feed "city" with a line r1, looked up by the line service. The clock stands at kNow.
+/// A feed "city" with a line r1, looked up by a line service that is new each time. The clock stands at kNow.
 class VerdictTest : public testing::Test {
  protected:
   VerdictTest() {
@@ -51,6 +51,7 @@ class VerdictTest : public testing::Test {
     const auto line = std::make_shared<const MapItemIdentifier>(
         lineMuid("city", routeID), TransitLineLocator{"city", "A", routeID, shortName, TransitMode::tram});
     std::string text;
+    GTFSTransitLineService service(paths);
     service.lookup({line}, [&](const TransitLineItems& items, const ErrorRef& error) {
       text = error                              ? "unknown " + std::to_string(error->code())
              : items.at(0)->incidents().empty() ? "good"
@@ -77,7 +78,6 @@ class VerdictTest : public testing::Test {
   Paths paths = Paths::resolve(folder.path() / "config", folder.path() / "state");
   Feed feed{"city", *FeedAddress::parse((folder.path() / "feed").native()),
             *FeedAddress::parse((folder.path() / "alerts.pb").native())};
-  GTFSTransitLineService service{paths};
 };
 
 /// The same with the alerts on a server whose answer the test sets.

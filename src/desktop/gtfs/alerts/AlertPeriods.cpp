@@ -10,7 +10,7 @@ namespace {
 
 constexpr std::uint64_t kLeastMilliseconds = 100'000'000'000;  // 10^11 seconds is the year 5138
 constexpr std::uint64_t kEndOfYear9999 = 253'402'300'799;
-constexpr TimeInterval kDay = 86400;
+constexpr std::chrono::hours kForgotten{24};  // after the end
 constexpr std::size_t kMostOver = 16;
 constexpr std::size_t kMostComing = 16;
 
@@ -93,8 +93,21 @@ std::vector<AlertPeriod> joinedPeriods(std::vector<AlertPeriod> periods) {
   return result;
 }
 
+Date nextChangeOf(const std::vector<AlertPeriod>& periods, Date now) {
+  Date next = Date::max();
+  const auto take = [&](std::optional<Date> date, Date::duration later) {
+    if (date && *date <= Date::max() - later && *date + later > now) next = std::min(next, *date + later);
+  };
+  for (const AlertPeriod& period : periods) {
+    take(period.start, {});
+    take(period.end, Date::duration(1));  // the end itself is a part of the period
+    take(period.end, kForgotten + Date::duration(1));
+  }
+  return next;
+}
+
 std::vector<AlertPeriod> periodsThatMatter(std::vector<AlertPeriod> periods, Date now) {
-  const Date longAgo = dateByAdding(now, -kDay);
+  const Date longAgo = now - kForgotten;
   std::erase_if(periods, [&](const AlertPeriod& period) { return endOf(period) < longAgo; });
   const auto notOver =
       std::find_if(periods.begin(), periods.end(), [&](const AlertPeriod& period) { return endOf(period) >= now; });

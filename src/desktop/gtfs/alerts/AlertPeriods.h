@@ -39,4 +39,8 @@ std::vector<AlertPeriod> joinedPeriods(std::vector<AlertPeriod> periods);
 /// (the clock may be set back) the last 16, and of those to come the next 16.
 std::vector<AlertPeriod> periodsThatMatter(std::vector<AlertPeriod> periods, Date now);
 
+/// The next moment after `now` at which another of these periods matters, or is in force; Date::max() when none is to
+/// come.
+Date nextChangeOf(const std::vector<AlertPeriod>& periods, Date now);
+
 }  // namespace nimbo

@@ -21,8 +21,9 @@ namespace nimbo {
 namespace {
 
 // Lines, then an empty one, then the body: what the file is, the address, ETag, Last-Modified, microseconds since 1970
-// of the answer and of the first one with this body, the body's checksum.
-constexpr std::string_view kFirstLine = "nimbo-alerts 2";
+// of the first answer with this body and of the publisher's timestamp, which may be empty, the body's checksum. When
+// the last answer with it came is the file's own time.
+constexpr std::string_view kFirstLine = "nimbo-alerts 3";
 constexpr std::size_t kLines = 7;
 constexpr std::uint64_t kLargestFile = 65 << 20;
 
@@ -34,49 +35,11 @@ std::optional<T> numberIn(std::string_view text) {
   return number;
 }
 
-}  // namespace
-
-std::optional<KeptAlerts> KeptAlerts::read(const std::filesystem::path& path, const FeedAddress& address) {
-  const auto bytes = readOwnFile(path, kLargestFile);
-  if (!bytes) return std::nullopt;
-  std::string_view rest = *bytes;
-  std::array<std::string_view, kLines> lines;
-  for (std::string_view& line : lines) {
-    const std::size_t end = rest.find('\n');
-    if (end == std::string_view::npos) return std::nullopt;
-    line = rest.substr(0, end);
-    rest.remove_prefix(end + 1);
-  }
-  const auto fetchedAt = numberIn<std::int64_t>(lines[4]);
-  const auto changedAt = numberIn<std::int64_t>(lines[5]);
-  const auto checksum = numberIn<std::uint64_t>(lines[6]);
-  if (lines[0] != kFirstLine || lines[1] != address.identity() || !fetchedAt || !changedAt || !checksum ||
-      !rest.starts_with('\n'))
-    return std::nullopt;
-  rest.remove_prefix(1);
-  if (flatChecksum(rest) != *checksum) return std::nullopt;
-  return KeptAlerts{std::string(lines[1]),
-                    {std::string(lines[2]), std::string(lines[3])},
-                    Date(std::chrono::microseconds(*fetchedAt)),
-                    Date(std::chrono::microseconds(*changedAt)),
-                    std::string(rest)};
-}
-
-ErrorRef KeptAlerts::write(const std::filesystem::path& path) const {
-  std::string bytes(kFirstLine);
-  for (const std::string& line :
-       {address, validators.etag, validators.lastModified, std::to_string(fetchedAt.time_since_epoch().count()),
-        std::to_string(changedAt.time_since_epoch().count()), std::to_string(flatChecksum(body))})
-    bytes.append(1, '\n').append(line);
-  return writeFileAtomically(path, bytes.append("\n\n").append(body));
-}
-
-namespace {
-
 constexpr std::uint64_t kLargestAlerts = 64 << 20;
 constexpr std::chrono::seconds kFetchTimeLimit{30};
 constexpr TimeInterval kLongestStandIn = 15 * 60;
-constexpr TimeInterval kLongestUndated = 7 * 86400;  // of a server whose feed does not say when it was made
+constexpr TimeInterval kShortestBetweenWritings = 10 * 60;  // feeds of some publishers differ each time
+constexpr TimeInterval kLongestUndated = 7 * 86400;         // of a server whose feed does not say when it was made
 constexpr TimeInterval kClockTolerance = 60;  // a little into the future is a clock being set, a lot is a wrong clock
 
 TimeInterval ageOf(Date date) { return -intervalFromNow(date); }
@@ -90,12 +53,12 @@ std::string ageText(TimeInterval seconds) {
 }
 
 /// Absent for a file that counts for ever.
-std::optional<TimeInterval> longestAgeOf(const Feed& feed, const AlertsFeed& alerts) {
+std::optional<TimeInterval> longestAgeOf(const Feed& feed, const AlertsState& state) {
   const bool isRemote = feed.alerts.isRemote();
   const auto limit = feed.maximumAlertsAge.value_or(isRemote ? kDefaultMaximumAlertsAge : kDefaultMaximumFileAge);
   if (limit.count() == 0) return std::nullopt;
   const auto seconds = static_cast<TimeInterval>(std::chrono::seconds(limit).count());
-  return isRemote && !alerts.timestamp() ? std::max(seconds, kLongestUndated) : seconds;
+  return isRemote && !state.timestamp ? std::max(seconds, kLongestUndated) : seconds;
 }
 
 /// The date of a Last-Modified field; absent for one that is none. Source: RFC 9110, section 5.6.7.
@@ -108,40 +71,93 @@ std::optional<Date> dateOfHTTPText(const std::string& text) {
   return dateFromUnixTime(static_cast<TimeInterval>(::timegm(&parts)));
 }
 
-/// The alerts in a body; `undated` is when they were made where they do not say.
-Outcome<FetchedAlerts> readBody(const Feed& feed, std::string body, std::optional<Date> undated) {
+Outcome<AlertsFeed> readBody(const Feed& feed, std::string body) {
   if (ErrorRef error = otherThanAlerts(body, feed.alerts.publicText())) return error;
-  auto alerts = AlertsFeed::read(std::move(body), feed.alerts.publicText(), feed.isCombined);
-  if (!alerts) return alerts.error();
-  const Date date = alerts->timestamp().value_or(undated.value_or(Date()));
-  return FetchedAlerts{std::move(*alerts), date};
+  return AlertsFeed::read(std::move(body), feed.alerts.publicText(), feed.isCombined);
 }
 
-std::optional<Date> undatedOf(const KeptAlerts& kept) {
-  return dateOfHTTPText(kept.validators.lastModified).value_or(kept.changedAt);
-}
-
-/// Whether an answer that was good once may stand in for one that does not come.
-bool canStandIn(const Feed& feed, const KeptAlerts& kept, const FetchedAlerts& alerts) {
-  const TimeInterval age = ageOf(kept.fetchedAt);
-  return age > -kClockTolerance && age <= kLongestStandIn && !AlertsStore::staleness(feed, alerts);
+Date dateOf(const AlertsState& state) {
+  return state.timestamp.value_or(dateOfHTTPText(state.validators.lastModified).value_or(state.changedAt));
 }
 
 /// Whether the publisher went back. A held stamp that is ahead of the clock was a wrong one.
-bool isOlder(const AlertsFeed& alerts, const AlertsFeed& held) {
-  return alerts.timestamp() && held.timestamp() && *alerts.timestamp() < *held.timestamp() &&
-         *held.timestamp() <= currentDate();
+bool isOlder(const std::optional<Date>& timestamp, const std::optional<Date>& held) {
+  return timestamp && held && *timestamp < *held && *held <= currentDate();
 }
 
-void keep(const KeptAlerts& kept, const std::filesystem::path& path) {
-  if (const ErrorRef error = kept.write(path)) logCacheFailure(error->reason());
+std::size_t hashOf(const std::string& body) { return std::hash<std::string>()(body); }
+
+std::optional<Date> dateIn(std::string_view text) {
+  const auto number = numberIn<std::int64_t>(text);
+  return number ? std::optional(Date(std::chrono::microseconds(*number))) : std::nullopt;
+}
+std::string textOf(Date date) { return std::to_string(date.time_since_epoch().count()); }
+
+/// An answer in the cache.
+struct KeptAlerts {
+  AlertsState state;
+  std::string body;
+};
+
+/// Absent when there is none, or it is damaged, of another address, another version or another user.
+std::optional<KeptAlerts> readKept(const std::filesystem::path& path, const Feed& feed) {
+  // Before the bytes: a file that is written meanwhile is no younger than it seems.
+  std::string file = fileFingerprint(path);
+  const auto fetchedAt = fileChangeDate(path);
+  const auto bytes = readOwnFile(path, kLargestFile);
+  if (!bytes || !fetchedAt) return std::nullopt;
+  std::string_view rest = *bytes;
+  std::array<std::string_view, kLines> lines;
+  for (std::string_view& line : lines) {
+    const std::size_t end = rest.find('\n');
+    if (end == std::string_view::npos) return std::nullopt;
+    line = rest.substr(0, end);
+    rest.remove_prefix(end + 1);
+  }
+  const auto changedAt = dateIn(lines[4]), timestamp = dateIn(lines[5]);
+  const auto checksum = numberIn<std::uint64_t>(lines[6]);
+  if (lines[0] != kFirstLine || lines[1] != feed.alerts.identity() || !changedAt || !checksum || !rest.starts_with('\n'))
+    return std::nullopt;
+  rest.remove_prefix(1);
+  if (flatChecksum(rest) != *checksum) return std::nullopt;
+  KeptAlerts kept{{.feed = feed,
+                   .validators = {std::string(lines[2]), std::string(lines[3])},
+                   .timestamp = timestamp,
+                   .fetchedAt = *fetchedAt,
+                   .changedAt = *changedAt,
+                   .file = std::move(file)},
+                  std::string(rest)};
+  kept.state.hash = hashOf(kept.body);
+  kept.state.size = kept.body.size();
+  return kept;
+}
+
+/// Lets the file at `path` be as old as the answer in it, unless another process has replaced it.
+void confirm(const std::filesystem::path& path, AlertsState& state) {
+  if (fileFingerprint(path) != state.file) return state.file.clear();
+  if (const ErrorRef error = setFileChangeDate(path, state.fetchedAt)) logCacheFailure(error->reason());
+  state.file = fileFingerprint(path);
+}
+
+void write(const std::filesystem::path& path, AlertsState& state, const std::string& body) {
+  if (const TimeInterval age = ageOf(state.writtenAt); age >= 0 && age < kShortestBetweenWritings) return;
+  std::string bytes(kFirstLine);
+  for (const std::string& line :
+       {state.feed->alerts.identity(), state.validators.etag, state.validators.lastModified, textOf(state.changedAt),
+        state.timestamp ? textOf(*state.timestamp) : std::string(), std::to_string(flatChecksum(body))})
+    bytes.append(1, '\n').append(line);
+  state.writtenAt = state.fetchedAt;
+  if (const ErrorRef error = writeFileAtomically(path, bytes.append("\n\n").append(body)))
+    return logCacheFailure(error->reason());
+  state.file = fileFingerprint(path);
+  confirm(path, state);
 }
 
 }  // namespace
 
-ErrorRef AlertsStore::staleness(const Feed& feed, const FetchedAlerts& alerts) {
-  const auto longest = longestAgeOf(feed, alerts.feed);
-  const TimeInterval age = ageOf(alerts.madeAt);
+ErrorRef AlertsStore::staleness(const Feed& feed, const AlertsState& state) {
+  const auto longest = longestAgeOf(feed, state);
+  const TimeInterval age = ageOf(state.madeAt);
   if (!longest || std::abs(age) <= *longest) return nullptr;
   const std::string what = age > 0
                                ? " was last renewed " + ageText(age) + " ago. Try again later"
@@ -153,57 +169,107 @@ ErrorRef AlertsStore::staleness(const Feed& feed, const FetchedAlerts& alerts) {
                                  feed.alerts.publicText());
 }
 
-Outcome<FetchedAlerts> AlertsStore::readLocal(const Feed& feed) const {
+Outcome<std::optional<AlertsFeed>> AlertsStore::fetchLocal(const Feed& feed, AlertsState& state, bool needsFeed) const {
   // Before the bytes: a file that is written meanwhile is no younger than it seems.
   const auto changedAt = fileChangeDate(feed.alerts.path());
   auto bytes = readFile(feed.alerts.path(), kLargestAlerts);
-  return bytes ? readBody(feed, std::move(*bytes), changedAt) : bytes.error();
-}
-
-Outcome<FetchedAlerts> AlertsStore::fetch(const Feed& feed, const std::stop_token& stop) const {
-  if (!feed.alerts.isRemote()) return readLocal(feed);
-  const std::string place = feed.alerts.publicText();
-  const std::filesystem::path path = _cache.alerts(feed.nameOfAlerts());
-  auto kept = KeptAlerts::read(path, feed.alerts);
-  std::string body;
-  const HTTPRequest request{feed.alerts, kept ? kept->validators : HTTPValidators(), kLargestAlerts, kFetchTimeLimit};
-  const auto answer = HTTPFetcher::fetch(request, stop, [&](std::string_view piece) {
-    body += piece;
-    return true;
-  });
-  if (!answer) return answer.error();
-  if (answer->isUnchanged) body = kept->body;
-  const bool isSame = kept && body == kept->body;
-  KeptAlerts present{feed.alerts.identity(), answer->validators, currentDate(),
-                     isSame ? kept->changedAt : currentDate(), std::move(body)};
-  auto alerts = readBody(feed, present.body, undatedOf(present));
-  if (!alerts) return alerts;
-  if (kept && !isSame) {
-    const auto held = readBody(feed, std::move(kept->body), undatedOf(*kept));
-    if (held && isOlder(alerts->feed, held->feed))
-      return transitLineServiceError(TransitLineServiceError::staleAlerts,
-                                     "The alerts feed " + place + " went back to an older state. Try again later.",
-                                     place);
+  if (!bytes) return bytes.error();
+  const std::size_t hash = std::hash<std::string>()(*bytes);
+  std::optional<AlertsFeed> alerts;
+  if (needsFeed || hash != state.hash) {
+    auto read = readBody(feed, std::move(*bytes));
+    if (!read) return read.error();
+    alerts = std::move(*read);
+    state.feed = feed;
+    state.hash = hash;
+    state.timestamp = alerts->timestamp();
   }
-  keep(present, path);
+  state.madeAt = state.timestamp.value_or(changedAt.value_or(Date()));
   return alerts;
 }
 
-Outcome<AlertsFeed> AlertsStore::load(const Feed& feed, const std::stop_token& stop) const {
-  auto fetched = fetch(feed, stop);
-  const ErrorRef error = fetched ? staleness(feed, *fetched) : fetched.error();
-  if (!error) return std::move(fetched->feed);
-  if (feed.alerts.isRemote() && !fetched) {
-    if (auto kept = KeptAlerts::read(_cache.alerts(feed.nameOfAlerts()), feed.alerts)) {
-      auto held = readBody(feed, std::move(kept->body), undatedOf(*kept));
-      if (held && canStandIn(feed, *kept, *held)) {
-        writeLog(kFeedLogFacility, LogLevel::error, "The last alerts of %{private}@ stand in: %{private}@",
-                 {feed.name, error->reason()});
-        return std::move(held->feed);
-      }
-    }
+Outcome<std::optional<AlertsFeed>> AlertsStore::fetchRemote(const Feed& feed, AlertsState& state, bool needsFeed,
+                                                            const std::stop_token& stop) const {
+  const std::filesystem::path path = _cache.alerts(feed.nameOfAlerts());
+  std::optional<KeptAlerts> kept;
+  if (needsFeed) kept = readKept(path, feed);
+  if (kept && !state.feed) state = kept->state;
+  // A server may leave out what is held, or not needed.
+  const HTTPValidators known = !needsFeed ? state.validators : kept ? kept->state.validators : HTTPValidators();
+  std::string body;
+  const auto answer =
+      HTTPFetcher::fetch({feed.alerts, known, kLargestAlerts, kFetchTimeLimit}, stop, [&](std::string_view piece) {
+        // The next answer is mostly as large, and growing copies all of it.
+        if (body.empty()) body.reserve(state.size + state.size / 16);
+        body += piece;
+        return true;
+      });
+  if (!answer) return answer.error();
+  const bool isKept = kept && (answer->isUnchanged || body == kept->body);
+  if (isKept) body = std::move(kept->body);
+  const std::size_t hash = answer->isUnchanged && !needsFeed ? state.hash : hashOf(body);
+  const bool isSame = state.feed && hash == state.hash;
+  std::optional<AlertsFeed> alerts;
+  if (needsFeed || !isSame) {
+    auto read = readBody(feed, std::move(body));
+    if (!read) return read.error();
+    if (isOlder(read->timestamp(), state.timestamp))
+      return transitLineServiceError(
+          TransitLineServiceError::staleAlerts,
+          "The alerts feed " + feed.alerts.publicText() + " went back to an older state. Try again later.",
+          feed.alerts.publicText());
+    alerts = std::move(*read);
+    state.timestamp = alerts->timestamp();
+    state.size = alerts->bytes().size();
   }
-  return error;
+  state.feed = feed;
+  state.hash = hash;
+  state.validators = answer->validators;
+  state.fetchedAt = currentDate();
+  if (!isSame) state.changedAt = isKept ? kept->state.changedAt : state.fetchedAt;
+  state.madeAt = dateOf(state);
+  if (isKept)
+    state.file = kept->state.file;
+  else if (!isSame)
+    state.file.clear();
+  if (!state.file.empty())
+    confirm(path, state);
+  else if (alerts)
+    write(path, state, alerts->bytes());
+  return alerts;
+}
+
+Outcome<std::optional<AlertsFeed>> AlertsStore::fetch(const Feed& feed, AlertsState& state, bool needsFeed,
+                                                      const std::stop_token& stop) const {
+  if (state.feed && state.feed != feed) state = {};
+  needsFeed = needsFeed || !state.feed;
+  return feed.alerts.isRemote() ? fetchRemote(feed, state, needsFeed, stop) : fetchLocal(feed, state, needsFeed);
+}
+
+Outcome<std::optional<AlertsFeed>> AlertsStore::lastAnswer(const Feed& feed, AlertsState& state, bool needsFeed,
+                                                           const ErrorRef& failure) const {
+  const TimeInterval age = ageOf(state.fetchedAt);
+  state.madeAt = dateOf(state);
+  if (!state.feed || age <= -kClockTolerance || age > kLongestStandIn || staleness(feed, state)) return failure;
+  std::optional<AlertsFeed> alerts;
+  if (needsFeed) {
+    auto kept = readKept(_cache.alerts(feed.nameOfAlerts()), feed);
+    if (!kept || kept->state.hash != state.hash) return failure;
+    auto read = readBody(feed, std::move(kept->body));
+    if (!read) return failure;
+    alerts = std::move(*read);
+  }
+  writeLog(kFeedLogFacility, LogLevel::error, "The last alerts of %{private}@ stand in: %{private}@",
+           {feed.name, failure->reason()});
+  return alerts;
+}
+
+Outcome<std::optional<AlertsFeed>> AlertsStore::load(const Feed& feed, AlertsState& state, bool needsFeed,
+                                                     const std::stop_token& stop) const {
+  auto fetched = fetch(feed, state, needsFeed, stop);
+  if (!fetched) return feed.alerts.isRemote() ? lastAnswer(feed, state, needsFeed, fetched.error()) : fetched;
+  if (ErrorRef error = staleness(feed, state)) return error;
+  return fetched;
 }
 
 }  // namespace nimbo

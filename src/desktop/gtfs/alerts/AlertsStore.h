@@ -14,49 +14,52 @@
 
 namespace nimbo {
 
-/// The last good answer of an alerts feed's server, kept in the cache: for conditional requests, and to stand in for a
-/// while when the server fails.
-struct KeptAlerts {
-  std::string address;  ///< its identity
-  HTTPValidators validators;
-  Date fetchedAt;  ///< when the server last said that this is the present state
-  Date changedAt;  ///< when the body was first seen
-  std::string body;
-
-  /// Absent when there is none at `path`, it is damaged, or of another address.
-  static std::optional<KeptAlerts> read(const std::filesystem::path& path, const FeedAddress& address);
-  /// Replaces what is kept. Null on success.
-  ErrorRef write(const std::filesystem::path& path) const;
-};
-
-/// The alerts of a feed, and how old they are.
-struct FetchedAlerts {
-  AlertsFeed feed;
-  /// By the header; where that says nothing, by Last-Modified or the file's own time, else by when the bytes were first
-  /// seen.
-  Date madeAt;
+/// What is known of a feed's last answer, for who asks again: a feed that does not change costs next to nothing.
+struct AlertsState {
+  std::optional<Feed> feed = {};       ///< whose answer it was; absent before the first
+  std::size_t hash = 0;                ///< of the answer's bytes
+  std::size_t size = 0;                ///< how many they were
+  HTTPValidators validators = {};      ///< of a server's answer
+  std::optional<Date> timestamp = {};  ///< when the publisher made it; absent when he does not say
+  /// By the timestamp; without one, by Last-Modified or the file's own time, else by when the bytes were first seen.
+  Date madeAt = {};
+  Date fetchedAt = {};    ///< when the server last said that this is the present state
+  Date changedAt = {};    ///< when the bytes were first seen
+  Date writtenAt = {};    ///< when this process last wrote the cache for this feed
+  std::string file = {};  ///< the cache file as it was left with these bytes (fileFingerprint); empty without them
 };
 
 /// Gets the present alerts of a feed. They count for as long after they were made as the feed's setting says: by
 /// default a quarter of an hour for an answer of a server, and a day for a file, which somebody has to put there. An
 /// answer whose header does not say when it was made counts for seven days. None is older than the one held. Blocks its
 /// thread; any thread.
+///
+/// The last good answer of a server is kept in the cache, which is written when an answer differs from the one before,
+/// and at most every ten minutes; its file is as old as the server's last word that this is the present state.
 class AlertsStore {
  public:
   explicit AlertsStore(FeedCache cache) : _cache(std::move(cache)) {}
 
-  /// The present alerts. When the server fails, the last answer stands in for at most 15 minutes.
-  Outcome<AlertsFeed> load(const Feed& feed, const std::stop_token& stop) const;
+  /// The present alerts; absent when their bytes are those of `state` and the feed is not needed (`needsFeed`). When
+  /// the server fails, the last answer stands in for at most 15 minutes. `state` is that of the last call for this
+  /// feed, and becomes that of this one.
+  Outcome<std::optional<AlertsFeed>> load(const Feed& feed, AlertsState& state, bool needsFeed,
+                                          const std::stop_token& stop) const;
 
-  /// What the source says now, however old.
-  Outcome<FetchedAlerts> fetch(const Feed& feed, const std::stop_token& stop) const;
+  /// The same of what the source says now, however old.
+  Outcome<std::optional<AlertsFeed>> fetch(const Feed& feed, AlertsState& state, bool needsFeed,
+                                           const std::stop_token& stop) const;
 
-  /// Null when the alerts are near enough to now for the feed's setting. Ones that are as far ahead are no better than
-  /// old ones: by a clock that is wrong, an incident in force counts as one to come.
-  static ErrorRef staleness(const Feed& feed, const FetchedAlerts& alerts);
+  /// Null when the answer is near enough to now for the feed's setting. One that is as far ahead is no better than an
+  /// old one: by a clock that is wrong, an incident in force counts as one to come.
+  static ErrorRef staleness(const Feed& feed, const AlertsState& state);
 
  private:
-  Outcome<FetchedAlerts> readLocal(const Feed& feed) const;
+  Outcome<std::optional<AlertsFeed>> fetchLocal(const Feed& feed, AlertsState& state, bool needsFeed) const;
+  Outcome<std::optional<AlertsFeed>> fetchRemote(const Feed& feed, AlertsState& state, bool needsFeed,
+                                                 const std::stop_token& stop) const;
+  Outcome<std::optional<AlertsFeed>> lastAnswer(const Feed& feed, AlertsState& state, bool needsFeed,
+                                                const ErrorRef& failure) const;
 
   FeedCache _cache;
 };

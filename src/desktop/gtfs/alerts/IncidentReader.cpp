@@ -139,6 +139,7 @@ class IncidentBuilder {
     AlertPeriods periods = alertPeriodsIn(view.body);
     const std::size_t published = periods.published;
     const bool isNever = periods.periods.empty();
+    _reading.holdsUntil = std::min(_reading.holdsUntil, nextChangeOf(periods.periods, _query.now));
     // Before each line gets its copy: an alert may have millions.
     const auto mattering = periodsThatMatter(joinedPeriods(std::move(periods.periods)), _query.now);
     if (_hasRoutes && !_belongs && isInForce(mattering)) takeRoutes(view);
@@ -270,15 +271,19 @@ class IncidentBuilder {
   /// The incident that the alert is, or is one of; absent for one that says nothing. Texts are read once a content.
   std::optional<std::size_t> incidentOf(const AlertEntity& alert, const AlertView& view) {
     const AlertContent& content = view.content;
-    if (const auto known = _incidentOfContent.find(content); known != _incidentOfContent.end()) return known->second;
+    const auto [known, isNewContent] = _incidentOfContent.try_emplace(content);
+    if (!isNewContent) return known->second;
     const auto texts = textsOf(view);
-    if (!texts) return std::nullopt;
+    if (!texts) {
+      _incidentOfContent.erase(known);
+      return std::nullopt;
+    }
     // Texts of one language may agree where those of others differ.
     const auto [place, isNew] = _incidentOfTexts.try_emplace(
         {texts->title, texts->description.value_or(""), texts->linkURL.value_or(""), content.cause, content.effect},
         _incidents.size());
     if (isNew) _incidents.push_back({keyOf(alert), *texts, content.effect, content.cause, view.severity, {}});
-    _incidentOfContent.emplace(content, place->second);
+    known->second = place->second;
     _sizesOfContents.insert(content.sizeHash());
     return place->second;
   }

@@ -69,6 +69,8 @@ struct IncidentReading {
   /// break off before they say what they are about, need trips that cannot be had, belong to another static feed, or
   /// are more than any network has.
   std::vector<Verdict> verdicts;
+  /// Until then, from the query's `now` on, the same alerts make the same verdicts.
+  Date holdsUntil = Date::max();
   std::size_t periods = 0;    ///< published ones of the alerts that concern the lines
   std::size_t selectors = 0;  ///< of all alerts
   SkipReport skipped;         ///< alerts that make no incident, by reason

@@ -69,17 +69,19 @@ FeedCheckReport checkFeed(const Feed& feed, const FeedCache& cache, const std::s
     report.staticFeed = {fresh->feed.agencyCount(), fresh->feed.lineCount(), fresh->trips.count(),
                          std::string(fresh->feed.language()), fresh->skipped};
   if (progress.beginsAlerts) progress.beginsAlerts();
-  const auto alerts = AlertsStore(cache).fetch(feed, stop);
-  report.alertsError = alerts.error();
-  if (!alerts) return report;
+  AlertsState state;
+  const auto fetched = AlertsStore(cache).fetch(feed, state, true, stop);
+  report.alertsError = fetched.error();
+  if (!fetched) return report;
+  const AlertsFeed& alerts = **fetched;
   report.alerts.emplace();
-  report.alerts->version = alerts->feed.version();
-  report.alerts->timestamp = alerts->feed.timestamp();
-  report.alerts->staleness = AlertsStore::staleness(feed, *alerts);
-  report.alerts->alerts = alerts->feed.alerts().size();
-  report.alerts->skipped = alerts->feed.skipped();
-  report.alerts->hasOthers = alerts->feed.hasOthers();
-  if (fresh) checkAgainst(*fresh, alerts->feed, feed, cache, stop, *report.alerts);
+  report.alerts->version = alerts.version();
+  report.alerts->timestamp = alerts.timestamp();
+  report.alerts->staleness = AlertsStore::staleness(feed, state);
+  report.alerts->alerts = alerts.alerts().size();
+  report.alerts->skipped = alerts.skipped();
+  report.alerts->hasOthers = alerts.hasOthers();
+  if (fresh) checkAgainst(*fresh, alerts, feed, cache, stop, *report.alerts);
   return report;
 }
 

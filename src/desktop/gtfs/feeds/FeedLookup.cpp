@@ -1,12 +1,16 @@
 #include "desktop/gtfs/feeds/FeedLookup.h"
 
 #include <algorithm>
+#include <map>
+#include <tuple>
 #include <unordered_map>
 
 #include "desktop/gtfs/alerts/IncidentReader.h"
 #include "desktop/gtfs/feeds/TransitLineServiceError.h"
 #include "desktop/gtfs/static/LineItems.h"
+#include "platform/DueAnswer.h"
 #include "platform/SystemServices.h"
+#include "platform/wire/StoredTransitIncident.h"
 
 namespace nimbo {
 
@@ -25,6 +29,47 @@ std::optional<std::uint32_t> lineLike(const StaticFeed& feed, const TransitLineL
     found = static_cast<std::uint32_t>(i);
   }
   return found;
+}
+
+HeldAnswer::Question questionOf(const StaticFeed& feed, std::span<const MapItemIdentifierRef> identifiers,
+                                std::string_view language) {
+  HeldAnswer::Question question{std::string(feed.fingerprint()), {}, std::string(language)};
+  for (const MapItemIdentifierRef& identifier : identifiers)
+    question.lines.emplace_back(identifier->muid(), identifier->locator());
+  return question;
+}
+
+/// The objects of the last answer, for those of a new one that say the same.
+class HeldObjects {
+ public:
+  explicit HeldObjects(const TransitLineItems& items) {
+    for (const TransitLineItemRef& item : items)
+      if (item)
+        for (const TransitIncidentRef& incident : item->incidents()) _incidents.emplace(keyOf(*incident), incident);
+  }
+
+  TransitIncidents orHeld(TransitIncidents incidents) const {
+    for (TransitIncidentRef& incident : incidents)
+      if (const auto held = _incidents.find(keyOf(*incident));
+          held != _incidents.end() && recordOf(held->second) == recordOf(incident))
+        incident = held->second;
+    return incidents;
+  }
+
+ private:
+  using Key = std::tuple<std::uint64_t, std::optional<Date>, bool>;
+  static Key keyOf(const TransitIncident& incident) {
+    return {incident.muid(), incident.startDate(), incident.isBlockingIncident()};
+  }
+  static Bytes recordOf(const TransitIncidentRef& incident) {
+    return StoredTransitIncident::initWithIncident(incident)->data();
+  }
+  std::map<Key, TransitIncidentRef> _incidents;
+};
+
+/// Whether the answer holds from now until a lookup that begins now is over.
+bool holds(const HeldAnswer& held, Date now) {
+  return held.from <= now && now < held.until && intervalBetween(now, held.until) > DueAnswer::kPatience;
 }
 
 }  // namespace
@@ -49,16 +94,21 @@ std::vector<std::optional<FoundLine>> findLines(const StaticFeed& feed, const st
 }
 
 Outcome<FeedAnswer> lookUpInFeed(const FeedSource& source, std::span<const MapItemIdentifierRef> identifiers,
-                                 std::string_view language, const std::stop_token& stop) {
+                                 std::string_view language, HeldAnswer& held, const std::stop_token& stop) {
   const auto loaded = source.staticFeed(stop);
   if (!loaded) return loaded.error();
   const StaticFeed& feed = loaded->feed;
-  const auto lines = findLines(feed, source.name(), identifiers);
+  HeldAnswer::Question question = questionOf(feed, identifiers, language);
+  const bool isHeld = held.question == question && held.hash == held.alerts.hash && holds(held, currentDate());
   FeedAnswer answer{TransitLineItems(identifiers.size()), std::nullopt};
-  if (std::none_of(lines.begin(), lines.end(), [](const auto& line) { return line.has_value(); })) return answer;
-  const auto alerts = source.alerts(stop);
+  std::vector<std::optional<FoundLine>> lines;
+  if (!isHeld) lines = findLines(feed, source.name(), identifiers);
+  if (!isHeld && std::ranges::none_of(lines, [](const auto& line) { return line.has_value(); })) return answer;
+  const auto alerts = source.alerts(held.alerts, !isHeld, stop);
   if (!alerts) return alerts.error();
-  answer.asOf = alerts->timestamp();
+  if (!*alerts) return held.answer;
+  if (isHeld) lines = findLines(feed, source.name(), identifiers);
+  answer.asOf = (*alerts)->timestamp();
 
   IncidentQuery query;
   query.feed = source.name();
@@ -74,14 +124,24 @@ Outcome<FeedAnswer> lookUpInFeed(const FeedSource& source, std::span<const MapIt
     if (isNew) query.lines.push_back({lines[i]->index, identifiers[i]->muid()});
     if (!lines[i]->formerRouteID.empty()) query.lines[place->second].formerRouteIDs.push_back(lines[i]->formerRouteID);
   }
-  const IncidentReading reading = readIncidents(*alerts, feed, query);
+  const IncidentReading reading = readIncidents(**alerts, feed, query);
   LineItems makeItems(source.name(), feed);
+  const HeldObjects heldObjects(held.answer.items);
   for (std::size_t i = 0; i < lines.size(); ++i) {
     if (!lines[i]) continue;
     const Verdict& verdict = reading.verdicts[placeOfLine.at(lines[i]->index)];
     if (verdict.unknownReason()) return verdict.unknownReason();
-    answer.items[i] = makeItems.item(lines[i]->index, identifiers[i]->muid(), verdict.incidents());
+    TransitIncidents incidents = heldObjects.orHeld(verdict.incidents());
+    if (held.question == question && held.answer.items[i]->incidents() == incidents)
+      answer.items[i] = held.answer.items[i];
+    else
+      answer.items[i] = makeItems.item(lines[i]->index, identifiers[i]->muid(), std::move(incidents));
   }
+  held.question = question;
+  held.hash = held.alerts.hash;
+  held.from = query.now;
+  held.until = reading.holdsUntil;
+  held.answer = answer;
   return answer;
 }
 

@@ -28,10 +28,26 @@ struct FeedAnswer {
   std::optional<Date> asOf;  ///< when the publisher made the alerts; absent when he does not say, or none were needed
 };
 
+/// What is held of a feed from one lookup to the next: the same question to the same bytes has the same answer, object
+/// for object.
+struct HeldAnswer {
+  struct Question {
+    std::string staticFeed;  ///< its fingerprint
+    std::vector<std::pair<std::uint64_t, std::optional<TransitLineLocator>>> lines;
+    std::string language;
+    bool operator==(const Question&) const = default;
+  };
+  AlertsState alerts;
+  Question question;
+  std::size_t hash = 0;  ///< of the alerts that the answer was made of
+  Date from, until;      ///< when it holds; never while both are the same
+  FeedAnswer answer;
+};
+
 /// Looks lines up in one feed: an answer when there is a verdict on every line, else the reason why there is none:
-/// their static data and their incidents by the alerts as they are now, texts in `language` (a BCP 47 tag). Blocks its
-/// thread.
+/// their static data and their incidents by the alerts as they are now, texts in `language` (a BCP 47 tag). `held` is
+/// that of the last lookup in this feed. Blocks its thread.
 Outcome<FeedAnswer> lookUpInFeed(const FeedSource& source, std::span<const MapItemIdentifierRef> identifiers,
-                                 std::string_view language, const std::stop_token& stop);
+                                 std::string_view language, HeldAnswer& held, const std::stop_token& stop);
 
 }  // namespace nimbo

@@ -23,25 +23,33 @@ class FeedSource {
   /// Whether alerts that change nothing for most riders count too.
   virtual bool minorAlerts() const = 0;
   virtual Outcome<LoadedStaticFeed> staticFeed(const std::stop_token& stop) const = 0;
-  /// The present alerts, fresh enough to say "good service" by.
-  virtual Outcome<AlertsFeed> alerts(const std::stop_token& stop) const = 0;
+  /// The present alerts, fresh enough to say "good service" by: as `AlertsStore::load`.
+  virtual Outcome<std::optional<AlertsFeed>> alerts(AlertsState& state, bool needsFeed,
+                                                    const std::stop_token& stop) const = 0;
   /// Whether another feed that is read by the same alerts has a route.
   virtual std::function<bool(std::string_view routeID)> isRouteOfOther(const std::stop_token&) const { return {}; }
 };
 
-/// Alerts that several feeds are read by, fetched once for them all. Any thread.
+/// Alerts that several feeds are read by, fetched and read once for them all. Any thread.
 class SharedAlerts {
  public:
-  template <class Load>
-  Outcome<AlertsFeed> get(const Load& load) {
+  Outcome<std::optional<AlertsFeed>> load(const AlertsStore& store, const Feed& feed, AlertsState& state,
+                                          const std::stop_token& stop) {
     const std::lock_guard guard(_lock);
-    if (!_alerts) _alerts = load();
+    if (!_alerts) {
+      _alerts = store.load(feed, state, true, stop);
+      _state = state;
+    } else {
+      state = _state;
+      if (state.feed) state.feed = feed;
+    }
     return *_alerts;
   }
 
  private:
   std::mutex _lock;
-  std::optional<Outcome<AlertsFeed>> _alerts;
+  std::optional<Outcome<std::optional<AlertsFeed>>> _alerts;
+  AlertsState _state;
 };
 
 /// A feed that the user set up.
@@ -57,8 +65,10 @@ class ConfiguredFeedSource final : public FeedSource {
   Outcome<LoadedStaticFeed> staticFeed(const std::stop_token& stop) const override {
     return _staticFeeds->load(_feed, stop);
   }
-  Outcome<AlertsFeed> alerts(const std::stop_token& stop) const override {
-    return _shared->get([&] { return _alerts.load(_feed, stop); });
+  Outcome<std::optional<AlertsFeed>> alerts(AlertsState& state, bool needsFeed,
+                                            const std::stop_token& stop) const override {
+    return _feed.siblings.empty() ? _alerts.load(_feed, state, needsFeed, stop)
+                                  : _shared->load(_alerts, _feed, state, stop);
   }
   std::function<bool(std::string_view routeID)> isRouteOfOther(const std::stop_token& stop) const override {
     if (_feed.siblings.empty()) return {};

@@ -17,6 +17,7 @@ struct GTFSTransitLineService::Shared {
   explicit Shared(const Paths& paths) : library(paths) {}
 
   FeedLibrary library;
+  std::map<std::string, HeldAnswer> held;  // by the names of feeds; of the one lookup that runs
   std::mutex lock;
   std::string language = "en";
   std::vector<MapItemIdentifierRef> goneLines;
@@ -37,6 +38,7 @@ constexpr std::size_t kMostKnownIncidents = 20;
 /// The identifiers that may be of one feed, and their places in the lookup.
 struct FeedPart {
   FeedSourceRef source;
+  HeldAnswer* held;
   std::vector<MapItemIdentifierRef> identifiers;
   std::vector<std::size_t> places;
 };
@@ -51,11 +53,11 @@ ErrorRef ofFeed(const Error& error, const std::string& name) {
 /// Sorts identifiers by feed; one that is only a number may be of any. `reasons` gets an error for each that is of a
 /// feed which is not set up.
 Outcome<std::vector<FeedPart>> partsOf(const std::vector<MapItemIdentifierRef>& identifiers, const FeedLibrary& library,
-                                       std::vector<ErrorRef>& reasons) {
+                                       std::map<std::string, HeldAnswer>& held, std::vector<ErrorRef>& reasons) {
   const auto sources = library.sources();
   if (!sources) return sources.error();
   std::vector<FeedPart> parts;
-  for (const FeedSourceRef& source : *sources) parts.push_back({source, {}, {}});
+  for (const FeedSourceRef& source : *sources) parts.push_back({source, &held[source->name()], {}, {}});
   for (std::size_t i = 0; i < identifiers.size(); ++i) {
     const auto& locator = identifiers[i]->locator();
     bool found = !locator;
@@ -73,7 +75,7 @@ Outcome<std::vector<FeedPart>> partsOf(const std::vector<MapItemIdentifierRef>& 
 
 Outcome<FeedAnswer> lookUpPart(const FeedPart& part, const std::string& language, const std::stop_token& stop) {
   try {
-    return lookUpInFeed(*part.source, part.identifiers, language, stop);
+    return lookUpInFeed(*part.source, part.identifiers, language, *part.held, stop);
   } catch (const std::exception& exception) {
     return transitLineServiceError(
         TransitLineServiceError::internal,
@@ -105,9 +107,10 @@ std::vector<KnownIncident> incidentsInForce(const TransitLineItems& items) {
 }
 
 Outcome<Answer> lookUpAll(const std::vector<MapItemIdentifierRef>& identifiers, const FeedLibrary& library,
-                          const std::string& language, const std::stop_token& stop) {
+                          std::map<std::string, HeldAnswer>& held, const std::string& language,
+                          const std::stop_token& stop) {
   Answer all{TransitLineItems(identifiers.size()), std::vector<ErrorRef>(identifiers.size()), {}, nullptr, {}};
-  const auto parts = partsOf(identifiers, library, all.reasons);
+  const auto parts = partsOf(identifiers, library, held, all.reasons);
   if (!parts) return parts.error();
   std::vector<std::future<Outcome<FeedAnswer>>> others;
   // Deferred where no thread can start: then one feed waits for another.
@@ -252,7 +255,7 @@ void GTFSTransitLineService::lookup(const std::vector<MapItemIdentifierRef>& ide
     TransitLineItems items;
     ErrorRef error;
     try {
-      auto outcome = lookUpAll(identifiers, shared->library, language, stop);
+      auto outcome = lookUpAll(identifiers, shared->library, shared->held, language, stop);
       if (due->isClaimed()) return;
       error = outcome ? outcome->error : outcome.error();
       auto verdicts = verdictsOf(identifiers, outcome ? *outcome : Answer(), outcome ? nullptr : error);

@@ -115,8 +115,17 @@ Outcome<LoadedStaticFeed> SampleCity::staticFeed(const std::stop_token&) const {
   return LoadedStaticFeed{readSampleFeed(_anchor), [](auto) { return std::optional<std::uint32_t>(); }};
 }
 
-Outcome<AlertsFeed> SampleCity::alerts(const std::stop_token&) const {
-  return AlertsFeed::read(alertsFeedBytes(nlohmann::json::parse(sampleFile("alerts.json").value()), _anchor), _name);
+Outcome<std::optional<AlertsFeed>> SampleCity::alerts(AlertsState& state, bool needsFeed,
+                                                      const std::stop_token&) const {
+  // It stands still while it lives.
+  const auto hash = static_cast<std::size_t>(_anchor.time_since_epoch().count());
+  if (!needsFeed && state.hash == hash) return std::optional<AlertsFeed>();
+  auto alerts =
+      AlertsFeed::read(alertsFeedBytes(nlohmann::json::parse(sampleFile("alerts.json").value()), _anchor), _name);
+  if (!alerts) return alerts.error();
+  state.hash = hash;
+  state.timestamp = alerts->timestamp();
+  return std::optional(std::move(*alerts));
 }
 
 std::vector<TransitLineRef> SampleCity::favorites() {

@@ -24,7 +24,8 @@ class SampleCity final : public FeedSource {
   bool minorAlerts() const override { return false; }
   Outcome<LoadedStaticFeed> staticFeed(const std::stop_token& stop) const override;
   /// Read from real GTFS-Realtime bytes.
-  Outcome<AlertsFeed> alerts(const std::stop_token& stop) const override;
+  Outcome<std::optional<AlertsFeed>> alerts(AlertsState& state, bool needsFeed,
+                                            const std::stop_token& stop) const override;
 
   /// The favourites of a rider who has chosen none yet: some lines with incidents in force, two of them shared, and
   /// some without.

@@ -22,6 +22,7 @@ constexpr long kConnectSeconds = 15;
 constexpr long kStalledSeconds = 30;  // a server that sends less than this for so long will not do better
 constexpr long kStalledBytesASecond = 100;
 constexpr std::size_t kLongestValidator = 1024;
+constexpr long kBufferBytes = 64 * 1024;  // a quarter of the calls that the default takes
 
 /// One fetch in progress.
 struct Transfer {
@@ -155,6 +156,7 @@ void setOptions(CURL* handle, Transfer& transfer) {
   set(CURLOPT_MAXFILESIZE_LARGE, static_cast<curl_off_t>(transfer.request.limit));
   set(CURLOPT_LOW_SPEED_TIME, kStalledSeconds);
   set(CURLOPT_LOW_SPEED_LIMIT, kStalledBytesASecond);
+  set(CURLOPT_BUFFERSIZE, kBufferBytes);
   set(CURLOPT_NOSIGNAL, 1L);
   set(CURLOPT_QUICK_EXIT, 1L);  // a name being looked up must not hold up the end
   set(CURLOPT_WRITEFUNCTION, &Transfer::onPiece);

@@ -2,12 +2,14 @@
 
 #include <fcntl.h>
 #include <sys/stat.h>
+#include <unistd.h>
 
 #include <cerrno>
 #include <system_error>
 
 #include "desktop/gtfs/feeds/TransitLineServiceError.h"
 #include "desktop/raii/FileDescriptor.h"
+#include "desktop/system/AtomicFile.h"
 
 namespace nimbo {
 
@@ -38,6 +40,7 @@ Outcome<std::string> read(const std::filesystem::path& path, std::uint64_t limit
                                        " MiB that such a file may have. Check that it is the right one.",
                                    path.native());
   };
+  if ((flags & O_NOFOLLOW) && status.st_uid != ::geteuid()) return unreadable(path, "it is another user's.");
   if (static_cast<std::uint64_t>(status.st_size) > limit) return tooLarge();
   std::string bytes;
   bytes.resize(static_cast<std::size_t>(status.st_size) + 1);  // room to see the end without moving everything
@@ -77,6 +80,15 @@ std::optional<Date> fileChangeDate(const std::filesystem::path& path) {
   if (::stat(path.c_str(), &status) != 0) return std::nullopt;
   return Date(std::chrono::floor<Date::duration>(std::chrono::seconds(status.st_mtim.tv_sec) +
                                                  std::chrono::nanoseconds(status.st_mtim.tv_nsec)));
+}
+
+ErrorRef setFileChangeDate(const std::filesystem::path& path, Date date) {
+  const auto seconds = std::chrono::floor<std::chrono::seconds>(date);
+  const timespec time{static_cast<time_t>(seconds.time_since_epoch().count()),
+                      static_cast<long>(std::chrono::nanoseconds(date - seconds).count())};
+  const timespec times[] = {{0, UTIME_OMIT}, time};
+  return ::utimensat(AT_FDCWD, path.c_str(), times, AT_SYMLINK_NOFOLLOW) == 0 ? nullptr
+                                                                              : fileError("date", path, errno);
 }
 
 }  // namespace nimbo

@@ -14,7 +14,7 @@ namespace nimbo {
 /// and what to do.
 Outcome<std::string> readFile(const std::filesystem::path& path, std::uint64_t limit);
 
-/// The same of a file of the program's own, which is never reached through a link; its folders may be.
+/// The same of a file of the program's own: of its user, and never reached through a link; its folders may be.
 Outcome<std::string> readOwnFile(const std::filesystem::path& path, std::uint64_t limit);
 
 /// What tells one state of a file from another without reading it: its size and when it was last written. Empty when
@@ -23,5 +23,7 @@ std::string fileFingerprint(const std::filesystem::path& path);
 
 /// When the file was last written; absent when there is none.
 std::optional<Date> fileChangeDate(const std::filesystem::path& path);
+/// Lets it count as written then, a link itself. Null on success.
+ErrorRef setFileChangeDate(const std::filesystem::path& path, Date date);
 
 }  // namespace nimbo

@@ -25,6 +25,9 @@ bool isUnwanted(char32_t c) {
          (c & 0xFFFE) == 0xFFFE;
 }
 
+/// Whether an ASCII character means nothing but itself: no space, control or markup.
+bool isPlain(char c) { return c > 0x20 && c < 0x7F && c != '<' && c != '&'; }
+
 /// Takes characters and line ends; writes the folded text.
 class FoldingWriter {
  public:
@@ -41,6 +44,13 @@ class FoldingWriter {
     } else if (!isUnwanted(c)) {
       append(c);
     }
+  }
+  /// Characters that are plain; at least one.
+  void write(std::string_view plain) {
+    append(static_cast<unsigned char>(plain.front()));
+    _count += plain.size() - 1;
+    _text.append(plain.substr(1));
+    _previous = static_cast<unsigned char>(plain.back());
   }
   void lineEnd() { ++_lineEndsPending, _joinerPending = 0; }
   void block() { _lineEndsPending = std::max(_lineEndsPending, 1), _joinerPending = 0; }
@@ -115,6 +125,12 @@ std::string plainText(std::string_view text, std::size_t limit) {
   FoldingWriter writer(limit);
   for (std::size_t position = 0; position < text.size() && !writer.isFull();) {
     const std::string_view rest = text.substr(position);
+    if (isPlain(rest.front())) {  // most of any text
+      const auto end = std::find_if_not(rest.begin(), rest.end(), isPlain);
+      writer.write(rest.substr(0, static_cast<std::size_t>(end - rest.begin())));
+      position += static_cast<std::size_t>(end - rest.begin());
+      continue;
+    }
     if (rest.front() == '<') {
       if (const auto tag = tags.tagAt(position)) {
         position += tag->length;
