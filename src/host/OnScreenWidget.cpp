@@ -63,7 +63,7 @@ OnScreenWidget::OnScreenWidget(const CommandContext& context, const WidgetPresen
 std::optional<std::string> OnScreenWidget::update() { return failureOfUpdate(_client); }
 
 void OnScreenWidget::expand() {
-  if (_client.call(protocol::kSnapshot).largestAvailableDisplayMode == WidgetDisplayMode::Expanded)
+  if (_client.call(protocol::kSnapshot, {.rows = false}).largestAvailableDisplayMode == WidgetDisplayMode::Expanded)
     _client.call(protocol::kSetActiveDisplayMode, {.mode = WidgetDisplayMode::Expanded});
 }
 

@@ -52,7 +52,9 @@ class OnScreenWidget {
   /// Switches to the expanded mode where the widget offers it; else the compact row says it all.
   void expand();
   protocol::Lines lines() { return _client.call(protocol::kLines); }
-  protocol::Snapshot snapshot() { return _client.call(protocol::kSnapshot); }
+  protocol::Snapshot snapshot(const protocol::SnapshotParams& params = {}) {
+    return _client.call(protocol::kSnapshot, params);
+  }
   protocol::Rendered render() { return _client.call(protocol::kRender); }
   void close();
 

@@ -148,7 +148,7 @@ int runStatusBar(const CommandContext& context, const std::optional<std::string>
   try {
     OnScreenWidget widget(context, presentation);
     const std::optional<std::string> failure = widget.update();
-    std::cout << statusBarLine(widget.snapshot()).value_or("") << "\n";
+    std::cout << statusBarLine(widget.snapshot({.rows = false})).value_or("") << "\n";
     widget.close();
     if (failure) throw CommandFailure(*failure);
   } catch (const WidgetClientFailure& failure) {

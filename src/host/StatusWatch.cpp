@@ -47,7 +47,7 @@ void StatusWatch::update() {
 }
 
 void StatusWatch::look() {
-  _widget->ask(protocol::kSnapshot, {}, [this](const auto& snapshot) { showSnapshot(snapshot); });
+  _widget->ask(protocol::kSnapshot, {.rows = false}, [this](const auto& snapshot) { showSnapshot(snapshot); });
 }
 
 void StatusWatch::showSnapshot(const protocol::Snapshot& snapshot) {

@@ -120,8 +120,7 @@ std::map<std::string, std::string> writtenUserInfo(const BoxedDictionary* userIn
   return result;
 }
 
-protocol::Snapshot snapshotOf(NBTransitIncidentsViewController& controller) {
-  controller.view()->layoutIfNeeded();
+protocol::Snapshot snapshotOf(NBTransitIncidentsViewController& controller, bool withRows) {
   const NBTransitIncidentDataSource& dataSource = *controller.dataSource();
   const WidgetHost* host = controller.widgetHost();
   protocol::Snapshot snapshot{
@@ -129,15 +128,18 @@ protocol::Snapshot snapshotOf(NBTransitIncidentsViewController& controller) {
       .expanded = dataSource.isExpanded(),
       .visible = controller.isVisible(),
       .rowHeight = dataSource.rowHeight(),
-      .artworkColumnWidth = dataSource.artworkColumnWidth(),
       .largestAvailableDisplayMode = host ? host->largestAvailableDisplayMode() : WidgetDisplayMode::Compact,
       .listItem = {.summaryItem = itemOf(dataSource.listItem()->summaryItem().get())}};
   if (host) snapshot.preferredContentSize = controller.preferredContentSize();
   if (dataSource.maxNumberOfRows() != std::numeric_limits<std::uint64_t>::max())
     snapshot.maxNumberOfRows = dataSource.maxNumberOfRows();
   setResult(snapshot, controller.transitLineItemResult());
-  for (std::int64_t row = 0; row < controller.tableView()->numberOfRows(); ++row)
-    snapshot.rows.push_back(rowOf(controller, {0, row}));
+  if (withRows) {
+    controller.view()->layoutIfNeeded();
+    snapshot.artworkColumnWidth = dataSource.artworkColumnWidth();
+    for (std::int64_t row = 0; row < controller.tableView()->numberOfRows(); ++row)
+      snapshot.rows.push_back(rowOf(controller, {0, row}));
+  }
   for (const auto& item : dataSource.listItem()->expandedItemsOrEmpty())
     if (auto written = itemOf(item.get())) snapshot.listItem.expandedItems.push_back(*std::move(written));
   if (controller.updater()) {

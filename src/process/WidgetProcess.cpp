@@ -308,9 +308,9 @@ protocol::Highlighted WidgetProcess::highlightRow(const protocol::HighlightParam
   return {tableView.highlightedRow() == indexPath};
 }
 
-protocol::Snapshot WidgetProcess::snapshot(const Nothing&) {
+protocol::Snapshot WidgetProcess::snapshot(const protocol::SnapshotParams& params) {
   _frameAnnounced = false;
-  protocol::Snapshot snapshot = snapshotOf(*_controller);
+  protocol::Snapshot snapshot = snapshotOf(*_controller, params.rows);
   if (snapshot.error)
     for (auto& [line, title] : _platform->transitLines().knownIncidents())
       snapshot.knownIncidents.push_back({line, title});

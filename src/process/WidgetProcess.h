@@ -61,7 +61,7 @@ class WidgetProcess {
   Nothing setTextSize(const protocol::TextSizeParams& params);
   protocol::Selected selectRow(const protocol::RowParams& params);
   protocol::Highlighted highlightRow(const protocol::HighlightParams& params);
-  protocol::Snapshot snapshot(const Nothing&);
+  protocol::Snapshot snapshot(const protocol::SnapshotParams& params);
   protocol::Lines lines(const Nothing&);
   protocol::Downloads downloads(const Nothing&);
   protocol::Rendered render(const protocol::RenderParams& params);

@@ -105,7 +105,7 @@ int main(int argc, char** argv) {
     return 1;
   }
   try {
-    nimbo::drawingPart().lookForFonts();
+    if (pictures != -1) nimbo::drawingPart().lookForFonts();
     return nimbo::WidgetProcess(std::move(options), STDIN_FILENO, output).run();
   } catch (const std::exception& exception) {
     std::fprintf(stderr, "nimbo-transit-widget: %s\n", exception.what());

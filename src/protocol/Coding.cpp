@@ -113,6 +113,8 @@ constexpr std::tuple kFields<HighlightParams>{Field{"section", &HighlightParams:
 template <>
 constexpr std::tuple kFields<Highlighted>{Field{"highlighted", &Highlighted::highlighted}};
 template <>
+constexpr std::tuple kFields<SnapshotParams>{Field{"rows", &SnapshotParams::rows, kMayBeLeftOut}};
+template <>
 constexpr std::tuple kFields<RenderParams>{Field{"path", &RenderParams::path, kMayBeLeftOut},
                                            Field{"surface", &RenderParams::surface, kMayBeLeftOut}};
 template <>
@@ -611,6 +613,7 @@ NIMBO_MESSAGE(RowParams);
 NIMBO_MESSAGE(Selected);
 NIMBO_MESSAGE(HighlightParams);
 NIMBO_MESSAGE(Highlighted);
+NIMBO_MESSAGE(SnapshotParams);
 NIMBO_MESSAGE(Snapshot);
 NIMBO_MESSAGE(Lines);
 NIMBO_MESSAGE(LineReport);

@@ -103,6 +103,10 @@ struct Highlighted {
 };
 
 /// Neither of them is taken any more.
+struct SnapshotParams {
+  bool rows = true;  ///< whether the rows are wanted as laid out, with what depends on that
+};
+
 struct RenderParams {
   std::optional<std::string> path;
   std::optional<std::string> surface;

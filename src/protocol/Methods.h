@@ -37,7 +37,7 @@ inline constexpr Method<AppearanceParams> kSetAppearance{"setAppearance"};
 inline constexpr Method<ScaleParams> kSetScale{"setScale"};
 inline constexpr Method<RowParams, Selected> kSelectRow{"selectRow"};
 inline constexpr Method<HighlightParams, Highlighted> kHighlightRow{"highlightRow"};
-inline constexpr Method<Nothing, Snapshot> kSnapshot{"snapshot"};
+inline constexpr Method<SnapshotParams, Snapshot> kSnapshot{"snapshot"};
 inline constexpr Method<Nothing, Lines> kLines{"lines"};
 inline constexpr Method<Nothing, Downloads> kDownloads{"downloads"};
 inline constexpr Method<RenderParams, Rendered> kRender{"render"};

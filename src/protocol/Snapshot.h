@@ -97,12 +97,12 @@ struct Snapshot {
   bool visible = false;
   double rowHeight = 0;
   std::optional<std::uint64_t> maxNumberOfRows;
-  double artworkColumnWidth = 0;
+  std::optional<double> artworkColumnWidth;  ///< absent without rows
   std::optional<Size> preferredContentSize;  ///< absent without a host's sizes
   WidgetDisplayMode largestAvailableDisplayMode = WidgetDisplayMode::Compact;
   std::optional<FetchResult> result;
   std::optional<FetchError> error;  ///< absent without one
-  std::vector<Row> rows;
+  std::vector<Row> rows;            ///< empty where they were not asked for
   ListItem listItem;
   std::vector<Date> updateDates;
   std::vector<KnownIncident> knownIncidents;  ///< in force, with an error that left other feeds' known

@@ -36,7 +36,6 @@ NBTransitIncidentDataSource::initWithTransitLineItemsResult_expanded_artworkCach
       new NBTransitIncidentDataSource(std::move(result), std::move(artworkCache), maxNumberOfRows, availableWidth));
   dataSource->_listItem = dataSource->buildListItem(nullptr);
   dataSource->_expanded = _sanatizedExpandedValue_forListItem(expanded, *dataSource->_listItem);
-  dataSource->_updateAdjustedShieldItemsAndColumnWidth();
   return dataSource;
 }
 
@@ -81,7 +80,6 @@ void NBTransitIncidentDataSource::setListItem(std::shared_ptr<const NBTransitLis
   _listItem = std::move(listItem);
   _shieldAdjustedExpandedItems.reset();
   _shieldAjustedSummaryItem = nullptr;
-  _updateAdjustedShieldItemsAndColumnWidth();
   tellDelegate();
 }
 
@@ -114,6 +112,7 @@ bool NBTransitIncidentDataSource::_sanatizedExpandedValue_forListItem(bool expan
 
 void NBTransitIncidentDataSource::setAvailableWidth(double availableWidth) {
   if (availableWidth == _availableWidth) return;
+  _updateAdjustedShieldItemsAndColumnWidth();
   _availableWidth = availableWidth;
   const ObjectRef oldSummaryItem = std::exchange(_shieldAjustedSummaryItem, nullptr);
   const auto oldExpandedItems = std::exchange(_shieldAdjustedExpandedItems, std::nullopt);
@@ -126,7 +125,8 @@ void NBTransitIncidentDataSource::setAvailableWidth(double availableWidth) {
   tellDelegate();
 }
 
-const std::shared_ptr<NBTransitItemArtworkColumnCalculator>& NBTransitIncidentDataSource::artworkColumnCalculator() {
+const std::shared_ptr<NBTransitItemArtworkColumnCalculator>& NBTransitIncidentDataSource::artworkColumnCalculator()
+    const {
   if (!_artworkColumnCalculator) _artworkColumnCalculator = std::make_shared<NBTransitItemArtworkColumnCalculator>();
   return _artworkColumnCalculator;
 }
@@ -137,7 +137,7 @@ ArtworkWidthCalculatorSizeParameter NBTransitIncidentDataSource::_sizeParameters
           .artworkInsets = {}};
 }
 
-NBTransitItems NBTransitIncidentDataSource::itemsFittingColumn(const NBTransitItems& items) {
+NBTransitItems NBTransitIncidentDataSource::itemsFittingColumn(const NBTransitItems& items) const {
   return artworkColumnCalculator()->itemsFromItems_sizeParameter_outArtworkColumnWidth_downSizingBlock(
       items, _sizeParameters(), &_artworkColumnWidth,
       [](const std::shared_ptr<const NBTransitItem>& item, const std::shared_ptr<const SizedTransitArtwork>& artwork) {
@@ -146,7 +146,7 @@ NBTransitItems NBTransitIncidentDataSource::itemsFittingColumn(const NBTransitIt
       });
 }
 
-void NBTransitIncidentDataSource::_updateAdjustedShieldItemsAndColumnWidth() {
+void NBTransitIncidentDataSource::_updateAdjustedShieldItemsAndColumnWidth() const {
   if (!_shieldAdjustedExpandedItems)
     _shieldAdjustedExpandedItems = itemsFittingColumn(_listItem->expandedItemsOrEmpty());
   if (_shieldAjustedSummaryItem) return;
@@ -157,8 +157,8 @@ void NBTransitIncidentDataSource::_updateAdjustedShieldItemsAndColumnWidth() {
 }
 
 std::int64_t NBTransitIncidentDataSource::_numberOfRowInFirstSectionForExpandedState(bool expanded) const {
-  if (!expanded) return _shieldAjustedSummaryItem ? 1 : 0;
-  return _shieldAdjustedExpandedItems ? static_cast<std::int64_t>(_shieldAdjustedExpandedItems->size()) : 0;
+  if (!expanded) return _listItem->summaryItem() ? 1 : 0;
+  return static_cast<std::int64_t>(_listItem->expandedItemsOrEmpty().size());
 }
 
 Size NBTransitIncidentDataSource::preferredContentSizeForExpanded_maxSize(bool /*expanded*/, Size maxSize) const {
@@ -167,9 +167,9 @@ Size NBTransitIncidentDataSource::preferredContentSizeForExpanded_maxSize(bool /
 
 ObjectRef NBTransitIncidentDataSource::_itemAtIndexPath(IndexPath indexPath) const {
   if (indexPath.section != 0) return nullptr;
-  if (!_expanded) return _shieldAjustedSummaryItem;
+  if (!_expanded) return shieldAjustedSummaryItem();
   if (indexPath.row < 0 || indexPath.row >= _numberOfRowInFirstSectionForExpandedState(true)) return nullptr;
-  return (*_shieldAdjustedExpandedItems)[static_cast<std::size_t>(indexPath.row)];
+  return (*shieldAdjustedExpandedItems())[static_cast<std::size_t>(indexPath.row)];
 }
 
 std::shared_ptr<const NBOpenable> NBTransitIncidentDataSource::_openableItemAtIndexPath(IndexPath indexPath) const {
@@ -193,7 +193,7 @@ std::shared_ptr<StyledTableCell> NBTransitIncidentDataSource::tableView_cellForR
     const auto itemCell = std::static_pointer_cast<NBTransitItemFixedHeightCell>(
         tableView.dequeueReusableCellWithIdentifier_forIndexPath(kItemCellIdentifier, indexPath));
     itemCell->setTransitItem(std::move(transitItem));
-    itemCell->setTrailingArtworkColumnWidth(_artworkColumnWidth);
+    itemCell->setTrailingArtworkColumnWidth(artworkColumnWidth());
     itemCell->setRowHeight(_rowHeight);
     cell = itemCell;
   } else if (auto summaryItem = std::dynamic_pointer_cast<const NBTransitSummaryItem>(item)) {

@@ -71,13 +71,15 @@ class NBTransitIncidentDataSource final : public Object, public TableViewDataSou
   void setAvailableWidth(double availableWidth);
 
   /// Points.
-  double artworkColumnWidth() const { return _artworkColumnWidth; }
+  double artworkColumnWidth() const { return fitted()._artworkColumnWidth; }
   const std::shared_ptr<ArtworkCache>& artworkCache() const { return _artworkCache; }
-  const std::shared_ptr<NBTransitItemArtworkColumnCalculator>& artworkColumnCalculator();
+  const std::shared_ptr<NBTransitItemArtworkColumnCalculator>& artworkColumnCalculator() const;
 
   /// The rows as shown: the list item's, with shields that fit the column.
-  const std::optional<NBTransitItems>& shieldAdjustedExpandedItems() const { return _shieldAdjustedExpandedItems; }
-  const ObjectRef& shieldAjustedSummaryItem() const { return _shieldAjustedSummaryItem; }
+  const std::optional<NBTransitItems>& shieldAdjustedExpandedItems() const {
+    return fitted()._shieldAdjustedExpandedItems;
+  }
+  const ObjectRef& shieldAjustedSummaryItem() const { return fitted()._shieldAjustedSummaryItem; }
 
   std::shared_ptr<NBTransitIncidentDataSourceDelegate> delegate() const { return _delegate.lock(); }
   void setDelegate(std::weak_ptr<NBTransitIncidentDataSourceDelegate> delegate) { _delegate = std::move(delegate); }
@@ -107,23 +109,29 @@ class NBTransitIncidentDataSource final : public Object, public TableViewDataSou
   std::shared_ptr<const NBTransitListItem> buildListItem(
       const std::shared_ptr<NBTransitIncidentsAnalyticsDelegate>& analytics) const;
   ArtworkWidthCalculatorSizeParameter _sizeParameters() const;
-  void _updateAdjustedShieldItemsAndColumnWidth();
-  NBTransitItems itemsFittingColumn(const NBTransitItems& items);
+  void _updateAdjustedShieldItemsAndColumnWidth() const;
+  /// This, with the shields fitted.
+  const NBTransitIncidentDataSource& fitted() const {
+    _updateAdjustedShieldItemsAndColumnWidth();
+    return *this;
+  }
+  NBTransitItems itemsFittingColumn(const NBTransitItems& items) const;
   std::int64_t _numberOfRowInFirstSectionForExpandedState(bool expanded) const;
   void tellDelegate();
 
   double _rowHeight = 110.0;
   std::uint64_t _maxNumberOfRows;
   bool _expanded = false;
-  std::optional<NBTransitItems> _shieldAdjustedExpandedItems;
-  ObjectRef _shieldAjustedSummaryItem;
+  // Fitted when first read: shields are drawn for it, which a host that wants texts alone never needs.
+  mutable std::optional<NBTransitItems> _shieldAdjustedExpandedItems;
+  mutable ObjectRef _shieldAjustedSummaryItem;
+  mutable double _artworkColumnWidth = 0;
+  mutable std::shared_ptr<NBTransitItemArtworkColumnCalculator> _artworkColumnCalculator;
   ResultRef _transitLineItemResult;
   double _availableWidth;
   std::shared_ptr<const NBTransitListItem> _listItem;
   std::shared_ptr<ArtworkCache> _artworkCache;
   std::weak_ptr<NBTransitIncidentDataSourceDelegate> _delegate;
-  double _artworkColumnWidth = 0;
-  std::shared_ptr<NBTransitItemArtworkColumnCalculator> _artworkColumnCalculator;
 };
 
 }  // namespace nimbo

@@ -39,6 +39,10 @@ def main(cmake, build):
 
     for arguments in ["favorite", "list"], ["lines", "red"], ["settings", "get", "x"], ["feed", "check"]:
         assert not loaded(*arguments), f"{arguments} loads {loaded(*arguments)}"
+    bar = run("status", "--waybar", LD_DEBUG="files")  # of both processes
+    assert "4 Advisories" in bar.stdout
+    drawing = [name for name in LIBRARIES.findall(bar.stderr) if name in ("libpango", "libcairo")]
+    assert not drawing, f"a status bar loads {drawing}"
     assert "4 Advisories" in run("status").stdout
     assert without("libnimbo-drawing.so", "status").returncode != 0
     without("libnimbo-strings.so", "status")
