@@ -8,15 +8,13 @@ import functools
 import json
 import os
 import pathlib
-import socketserver
 import subprocess
 import sys
 import tempfile
-import threading
 import time
 
 sys.path.insert(0, str(pathlib.Path(__file__).parent / "faults"))
-from city import Widget, entity, field, header, period, text  # noqa: E402
+from city import Server, Widget, entity, field, header, period, text  # noqa: E402
 
 FAVORITES = [f"R{n * 200}" for n in range(20)]
 ROUTES = 5000
@@ -67,43 +65,6 @@ class BusyFeed:
         entities = list(self.entities)
         entities[100] = alert(100, [2000], self.always, change=f" ({change})" if change else "")
         return header(self.now) + b"".join(entities)
-
-
-class Server:
-    """Answers what `body` is under the name `etag`; "not modified" to who has that, unless it is `forgetful`."""
-
-    def __init__(self):
-        server = self
-
-        class Handler(socketserver.BaseRequestHandler):
-            def handle(self):
-                request = b""
-                while b"\r\n\r\n" not in request:
-                    piece = self.request.recv(65536)
-                    if not piece:
-                        return
-                    request += piece
-                if not server.forgetful and f"If-None-Match: {server.etag}".encode() in request:
-                    self.request.sendall(b"HTTP/1.1 304 Not Modified\r\nConnection: close\r\n\r\n")
-                    return
-                name = "" if server.forgetful else f"ETag: {server.etag}\r\n"
-                self.request.sendall(f"HTTP/1.1 200 OK\r\n{name}Content-Length: {len(server.body)}\r\n"
-                                     "Connection: close\r\n\r\n".encode() + server.body)
-
-        class Threaded(socketserver.ThreadingTCPServer):
-            daemon_threads = True
-            request_queue_size = 64
-
-        self.forgetful = False
-        self.number = 0
-        self.serve(b"")
-        self.server = Threaded(("127.0.0.1", 0), Handler)
-        self.address = f"http://127.0.0.1:{self.server.server_address[1]}/"
-        threading.Thread(target=self.server.serve_forever, daemon=True).start()
-
-    def serve(self, body):
-        self.number += 1
-        self.body, self.etag = body, f'"{self.number}"'
 
 
 def processor_seconds(pid):

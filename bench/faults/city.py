@@ -1,5 +1,5 @@
 """A small city for the tools beside this file: its feed, folders of its own, and the built programs run on it."""
-import json, os, subprocess, tempfile, time
+import json, os, socketserver, subprocess, tempfile, threading, time
 
 LINES = [f"r{n}" for n in range(10)]
 AGENCY = "agency_id,agency_name\nA,Metro\n"
@@ -49,7 +49,7 @@ def titled(title):
 class City:
     """Its feed is the files of `feed`, or comes from the given addresses."""
 
-    def __init__(self, build, static=None, alerts=None):
+    def __init__(self, build, static=None, alerts=None, **settings):
         self.build = os.path.abspath(build)
         self.holder = tempfile.TemporaryDirectory(prefix="nimbo-city-")
         self.folder = self.holder.name
@@ -61,7 +61,7 @@ class City:
         self.publish(header())
         os.mkdir(self.folder + "/config")
         feed = {"name": "city", "static": static or self.folder + "/feed",
-                "alerts": alerts or self.folder + "/feed/alerts.pb"}
+                "alerts": alerts or self.folder + "/feed/alerts.pb", **settings}
         with open(self.folder + "/config/feeds.json", "w") as file:
             json.dump({"feeds": [feed]}, file)
 
@@ -96,6 +96,47 @@ class City:
 
     def widget(self, *arguments):
         return Widget([self.build + "/src/process/nimbo-transit-widget", *self.folders, *arguments])
+
+
+class Server:
+    """On loopback, answers the body that it serves; "not modified" to who has that, unless it is `forgetful`; with an
+    error while it is `broken`."""
+
+    def __init__(self):
+        server = self
+
+        class Handler(socketserver.BaseRequestHandler):
+            def handle(self):
+                request = b""
+                while b"\r\n\r\n" not in request:
+                    piece = self.request.recv(65536)
+                    if not piece:
+                        return
+                    request += piece
+                if server.broken:
+                    self.request.sendall(b"HTTP/1.1 503 Oops\r\nConnection: close\r\n\r\n")
+                    return
+                if not server.forgetful and f"If-None-Match: {server.etag}".encode() in request:
+                    self.request.sendall(b"HTTP/1.1 304 Not Modified\r\nConnection: close\r\n\r\n")
+                    return
+                name = "" if server.forgetful else f"ETag: {server.etag}\r\n"
+                self.request.sendall(f"HTTP/1.1 200 OK\r\n{name}Content-Length: {len(server.body)}\r\n"
+                                     "Connection: close\r\n\r\n".encode() + server.body)
+
+        class Threaded(socketserver.ThreadingTCPServer):
+            daemon_threads = True
+            request_queue_size = 64
+
+        self.forgetful = self.broken = False
+        self.number = 0
+        self.serve(b"")
+        self.server = Threaded(("127.0.0.1", 0), Handler)
+        self.address = f"http://127.0.0.1:{self.server.server_address[1]}/"
+        threading.Thread(target=self.server.serve_forever, daemon=True).start()
+
+    def serve(self, body):
+        self.number += 1
+        self.body, self.etag = body, f'"{self.number}"'
 
 
 class Widget:

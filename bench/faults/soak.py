@@ -1,13 +1,14 @@
 #!/usr/bin/env python3
-"""One widget process through a great many update cycles of half an hour each, by virtual time: incidents begin and end,
-appear and vanish, rows are opened up, the widget goes away and comes back. Prints its resident memory and its open
-descriptors on the way, and fails when either grows.
+"""One widget process through a great many update cycles of half an hour each, by virtual time, with a server that has
+other alerts in four of seven of them, and fails in one of eleven: incidents begin and end, appear and vanish, rows are
+opened up, the widget goes away and comes back. Prints its resident memory, its open descriptors and what it wrote into
+files on the way; fails when memory or descriptors grow.
 
 Usage: soak.py BUILD_FOLDER [CYCLES]     1,000,000 cycles
 """
 import datetime, os, sys, time
 
-from city import LINES, City, entity, field, header, period, text
+from city import LINES, City, Server, entity, field, header, period, text
 
 START = datetime.datetime(2026, 1, 5, 12, tzinfo=datetime.timezone.utc)
 GROWTH_ALLOWED = 2 << 20  # bytes, from a tenth of the run on: the allocator's own ups and downs
@@ -20,13 +21,15 @@ def lines_of(cycle, n):
     return [LINES[(cycle * 7 + n + k) % len(LINES)] for k in range(1 + cycle % 3)]
 
 
-def is_affected(cycle):
-    """Whether the first incident, the only one in force when the cycle's update ends, is of a favourite."""
-    return cycle % 5 > 0 and any(line in FAVORITES for line in lines_of(cycle, 0))
+def is_affected(published, cycle):
+    """Whether an incident of those published then is in force on a favorite when this cycle's update ends."""
+    passed = 1800 * (cycle - published)
+    return any(600 * n - 300 <= passed <= 600 * n + 900 and any(line in FAVORITES for line in lines_of(published, n))
+               for n in range(published % 5))
 
 
 def alerts(cycle, now):
-    """Up to four incidents, the first in force, the others to come within the half hour; some are of several lines."""
+    """Up to four incidents, the first in force, the others to come within the hour; some are of several lines."""
     parts = [header(now)]
     for n in range(cycle % 5):
         selectors = b"".join(field(5, field(2, line)) for line in lines_of(cycle, n))
@@ -46,26 +49,37 @@ def descriptors(pid):
 
 def main():
     build, cycles = sys.argv[1], int(sys.argv[2]) if len(sys.argv) > 2 else 1000000
-    city = City(build)
+    server = Server()
+    city = City(build, alerts=server.address, maximumAlertsAgeMinutes=24 * 60)
     city.run("favorite", "add", *(f"city:{line}" for line in FAVORITES))
+    server.serve(alerts(0, int(START.timestamp())))
     widget = city.widget("--virtual-time", START.strftime("%Y-%m-%dT%H:%M:%SZ"))
     widget.appear()
-    pid, begin, samples = widget.process.pid, time.monotonic(), []
+    widget.call("performUpdate")
+    pid, begin, samples, published = widget.process.pid, time.monotonic(), [], 0
     for cycle in range(1, cycles + 1):
-        city.publish(alerts(cycle, int(START.timestamp()) + 1800 * cycle))
-        if widget.call(("advanceTime", {"seconds": 1800}), "performUpdate")["updateResult"] != "newData":
-            sys.exit(f"cycle {cycle}: the update failed")
-        mode = "expanded" if is_affected(cycle) and cycle % 2 else "compact"
-        if cycle % 7 == 0 or mode == "compact":
+        if cycle % 7 < 4:
+            published = cycle
+            server.serve(alerts(cycle, int(START.timestamp()) + 1800 * cycle))
+        server.forgetful = cycle % 7 == 5  # the same bytes, sent again
+        server.broken = cycle % 11 == 0
+        widget.send(("advanceTime", {"seconds": 1800}))
+        result = widget.call("performUpdate")["updateResult"]
+        if result != ("failed" if server.broken else "newData"):
+            sys.exit(f"cycle {cycle}: {result}")
+        affected = not server.broken and is_affected(published, cycle)
+        mode = "expanded" if affected and cycle % 2 else "compact"
+        if cycle % 14 == 0 or mode == "compact":
             widget.send(("setActiveDisplayMode", {"mode": mode}))
         if cycle % 100 == 0:
-            widget.send("viewWillDisappear", "viewDidDisappear", "viewWillAppear", "viewDidAppear")
-        if cycle % 49 == 0 and is_affected(cycle) == (widget.titles() == ["Good Service"]):
+            # The fetch that this begins ends before time goes on.
+            widget.call("viewWillDisappear", "viewDidDisappear", "viewWillAppear", "viewDidAppear", "performUpdate")
+        if cycle % 47 == 0 and not server.broken and affected == (widget.titles() == ["Good Service"]):
             sys.exit(f"cycle {cycle}: {widget.titles()}")
         if cycle % (cycles // 10) == 0:
             samples.append((resident(pid), descriptors(pid)))
             print(f"{cycle:8} cycles {time.monotonic() - begin:7.0f} s {samples[-1][0] / (1 << 20):7.2f} MiB resident "
-                  f"{samples[-1][1]} descriptors", flush=True)
+                  f"{samples[-1][1]} descriptors {widget.written() / 1e6:9.1f} MB written", flush=True)
     if widget.close() != 0:
         sys.exit("the widget process failed at its end")
     if samples[-1][0] - samples[0][0] > GROWTH_ALLOWED or len({count for _, count in samples}) > 1:

@@ -22,8 +22,8 @@ int main(int argc, char** argv) {
   curl_global_init(CURL_GLOBAL_DEFAULT);
   CURL* handle = curl_easy_init();
   curl_easy_setopt(handle, CURLOPT_URL, argv[2]);
-  curl_easy_setopt(handle, CURLOPT_WRITEFUNCTION,
-                   +[](char*, std::size_t size, std::size_t count, void*) { return size * count; });
+  curl_easy_setopt(
+      handle, CURLOPT_WRITEFUNCTION, +[](char*, std::size_t size, std::size_t count, void*) { return size * count; });
   if (curl_easy_perform(handle) != CURLE_OK) return 1;
   curl_easy_cleanup(handle);
   UErrorCode status = U_ZERO_ERROR;
