@@ -51,7 +51,8 @@ class HeldObjects {
   TransitIncidents orHeld(TransitIncidents incidents) const {
     for (TransitIncidentRef& incident : incidents)
       if (const auto held = _incidents.find(keyOf(*incident));
-          held != _incidents.end() && recordOf(held->second) == recordOf(incident))
+          held != _incidents.end() && kindOf(held->second) == kindOf(incident) &&
+          recordOf(held->second) == recordOf(incident))
         incident = held->second;
     return incidents;
   }
@@ -60,6 +61,11 @@ class HeldObjects {
   using Key = std::tuple<std::uint64_t, std::optional<Date>, bool>;
   static Key keyOf(const TransitIncident& incident) {
     return {incident.muid(), incident.startDate(), incident.isBlockingIncident()};
+  }
+  /// What records leave out.
+  static std::tuple<AlertEffect, std::int32_t, std::int32_t> kindOf(const TransitIncidentRef& incident) {
+    const AlertIncident::Fields& fields = static_cast<const AlertIncident&>(*incident).fields();
+    return {fields.effect, fields.cause, fields.severity};
   }
   static Bytes recordOf(const TransitIncidentRef& incident) {
     return StoredTransitIncident::initWithIncident(incident)->data();
