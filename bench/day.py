@@ -243,7 +243,9 @@ class Day:
                 alert(n, [n % 20 * 200], self.feed.always, size // 2) for n in range(1049)))
         return self.folders(path)
 
+    @functools.cached_property
     def saved_status(self):
+        """The command that shows the rows of the last time."""
         arguments = self.folders(self.file)
         program = str(self.build / "src/host/nimbo-transit")
         subprocess.run([program, *arguments, "update"], check=True)

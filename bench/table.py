@@ -246,6 +246,8 @@ class Bench:
             Row("memory (PSS) after 1000 updates, beside the tenth", 1.02, day.growth, once=True),
             Row("status bar and its widget process after a fetch: PSS", 1.3, day.status_bar, day.bare_pair,
                 peer="two bare programs: GLib, SQLite; with libcurl, ICU", shown=("MiB", 1)),
+            Row("nimbo-transit status --saved, to its end", 1.2, lambda: seconds_of(day.saved_status),
+                lambda: seconds_of(["/usr/bin/python3", "-c", "pass"]), peer="python3 -c pass"),
             Row("1049 alerts of 20 KB on the favorites, first rows", 1.5, hostile, usual,
                 peer="the same of 200 bytes"),
             Row("fresh clone, packages installed, to the rows of ./run status, no compiler cache", 180,

@@ -50,9 +50,9 @@ class HeldObjects {
 
   TransitIncidents orHeld(TransitIncidents incidents) const {
     for (TransitIncidentRef& incident : incidents)
-      if (const auto held = _incidents.find(keyOf(*incident));
-          held != _incidents.end() && kindOf(held->second) == kindOf(incident) &&
-          recordOf(held->second) == recordOf(incident))
+      if (const auto held = _incidents.find(keyOf(*incident)); held != _incidents.end() &&
+                                                               kindOf(held->second) == kindOf(incident) &&
+                                                               recordOf(held->second) == recordOf(incident))
         incident = held->second;
     return incidents;
   }
