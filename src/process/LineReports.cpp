@@ -40,7 +40,7 @@ std::string wordOf(const char* const (&words)[Count], std::int32_t number) {
   return words[number > 0 && number < static_cast<std::int32_t>(Count) ? number : 0];
 }
 
-protocol::LineIncident incidentOf(const TransitIncident& incident) {
+protocol::LineIncident lineIncidentOf(const TransitIncident& incident) {
   protocol::LineIncident result{.id = std::to_string(incident.muid()),
                                 .title = incident.title().value_or(""),
                                 .text = incident.fullDescription() ? incident.fullDescription() : incident.summary(),
@@ -85,7 +85,7 @@ class Reports {
 
  private:
   void add(std::vector<protocol::LineIncident>& list, const TransitIncident& incident) {
-    protocol::LineIncident written = incidentOf(incident);
+    protocol::LineIncident written = lineIncidentOf(incident);
     constexpr std::size_t kFrame = 300;  // keys and dates
     const std::size_t size =
         kFrame + written.title.size() + written.text.value_or("").size() + written.url.value_or("").size();
