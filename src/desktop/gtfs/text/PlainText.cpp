@@ -126,9 +126,11 @@ std::string plainText(std::string_view text, std::size_t limit) {
   for (std::size_t position = 0; position < text.size() && !writer.isFull();) {
     const std::string_view rest = text.substr(position);
     if (isPlain(rest.front())) {  // most of any text
-      const auto end = std::find_if_not(rest.begin(), rest.end(), isPlain);
-      writer.write(rest.substr(0, static_cast<std::size_t>(end - rest.begin())));
-      position += static_cast<std::size_t>(end - rest.begin());
+      const std::string_view most = rest.substr(0, limit);
+      const auto end = std::find_if_not(most.begin(), most.end(), isPlain);
+      const std::string_view run = most.substr(0, static_cast<std::size_t>(end - most.begin()));
+      writer.write(run);
+      position += run.size();
       continue;
     }
     if (rest.front() == '<') {
