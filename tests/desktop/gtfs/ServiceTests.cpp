@@ -126,7 +126,7 @@ TEST_F(LineServiceTest, ReadsTheSameBytesAgainWhenWhatTheyMeanChanges) {
   platform.time.advance(3599);
   EXPECT_EQ(lookup({line("north", "r1")}), "1 (A); ");
   platform.time.advance(1);
-  EXPECT_EQ(lookup({line("north", "r1")}), error(Code::badStaticFeed)) << "an alert by trip comes in force";
+  EXPECT_EQ(lookup({line("north", "r1")}), error(Code::tripsMissing)) << "an alert by trip comes in force";
 }
 
 TEST_F(LineServiceTest, FailsWhenAFeedDoes) {
