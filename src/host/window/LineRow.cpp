@@ -14,23 +14,12 @@
 
 namespace nimbo {
 
-namespace {
-
-constexpr std::int64_t kRowShieldSize = 5;
-/// Shields stand in a column of this width, so that names begin below each other.
-constexpr int kShieldColumn = 60;
-
-}  // namespace
-
 LineRow::LineRow(const PageContext& context, TransitLineRef line, bool isFavorite, std::function<void()> toggle)
     : _line(std::move(line)) {
   set_activatable(false);
   set_child(_box);
   _box.add_css_class("item");
-  auto* shield = Gtk::make_managed<Gtk::Box>();
-  shield->set_size_request(kShieldColumn, -1);
-  shield->append(*Gtk::make_managed<ShieldImage>(context.preferences, artworkOfLine(*_line), kRowShieldSize));
-  _box.append(*shield);
+  _box.append(shieldOfRow(context.preferences, artworkOfLine(*_line)));
 
   _texts.set_hexpand();
   _texts.set_valign(Gtk::Align::CENTER);

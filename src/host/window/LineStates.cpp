@@ -17,9 +17,6 @@ namespace nimbo {
 
 namespace {
 
-constexpr std::int64_t kShieldSize = 5;
-constexpr int kShieldColumn = 60;
-
 std::uint64_t numberOf(const protocol::LineIncident& incident) {
   std::uint64_t number = 0;
   std::from_chars(incident.id.data(), incident.id.data() + incident.id.size(), number);
@@ -179,10 +176,7 @@ Gtk::Widget* LineStates::makeRow(const protocol::LineReport& line, const DateTex
   auto* row = Gtk::make_managed<Gtk::ListBoxRow>();
   auto* box = Gtk::make_managed<Gtk::Box>(Gtk::Orientation::HORIZONTAL, 8);
   box->add_css_class("item");
-  auto* shield = Gtk::make_managed<Gtk::Box>();
-  shield->set_size_request(kShieldColumn, -1);
-  shield->append(*Gtk::make_managed<ShieldImage>(_context.preferences, artworkOf(line.shield), kShieldSize));
-  box->append(*shield);
+  box->append(shieldOfRow(_context.preferences, artworkOf(line.shield)));
   auto* texts = Gtk::make_managed<Gtk::Box>(Gtk::Orientation::VERTICAL, 2);
   std::vector<std::string> said{line.name};
   const auto add = [&](const std::string& text, const char* style) {

@@ -1,5 +1,7 @@
 #include "host/window/ShieldImage.h"
 
+#include <gtkmm/box.h>
+
 #include <cmath>
 
 #include "desktop/drawing/CairoImage.h"
@@ -40,6 +42,15 @@ void ShieldImage::draw(const Cairo::RefPtr<Cairo::Context>& context, int, int) c
   context->scale(scale, scale);
   cairo_set_source_surface(context->cobj(), image->surface().get(), 0, 0);
   context->paint();
+}
+
+Gtk::Widget& shieldOfRow(DesktopPreferences& preferences, TransitArtworkRef artwork) {
+  constexpr std::int64_t kSize = 5;
+  constexpr int kColumn = 60;
+  auto* column = Gtk::make_managed<Gtk::Box>();
+  column->set_size_request(kColumn, -1);
+  column->append(*Gtk::make_managed<ShieldImage>(preferences, std::move(artwork), kSize));
+  return *column;
 }
 
 TransitArtworkRef artworkOfLine(const TransitLine& line) {

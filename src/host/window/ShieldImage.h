@@ -1,6 +1,7 @@
 #pragma once
 
 #include <gtkmm/drawingarea.h>
+#include <gtkmm/widget.h>
 
 #include "host/window/DesktopPreferences.h"
 #include "platform/artwork/ArtworkImageSource.h"
@@ -26,6 +27,9 @@ class ShieldImage final : public Gtk::DrawingArea {
   ImageRef _image;
   sigc::connection _connection;
 };
+
+/// A shield at the beginning of a row, in a column of one width, so that names begin below each other. The row's own.
+Gtk::Widget& shieldOfRow(DesktopPreferences& preferences, TransitArtworkRef artwork);
 
 /// The shield that shows a line, else its system's symbol; null where there is neither.
 TransitArtworkRef artworkOfLine(const class TransitLine& line);
