@@ -43,13 +43,6 @@ struct FeedPart {
   std::vector<std::size_t> places;
 };
 
-/// The error with the name of the feed that it happened to.
-ErrorRef ofFeed(const Error& error, const std::string& name) {
-  auto userInfo = error.userInfo()->entries();
-  userInfo.emplace(kErrorFeedKey, box(name));
-  return Error::errorWithDomain_code_userInfo(error.domain(), error.code(), std::move(userInfo));
-}
-
 /// Sorts identifiers by feed; one that is only a number may be of any. `reasons` gets an error for each that is of a
 /// feed which is not set up.
 Outcome<std::vector<FeedPart>> partsOf(const std::vector<MapItemIdentifierRef>& identifiers, const FeedLibrary& library,
@@ -67,7 +60,7 @@ Outcome<std::vector<FeedPart>> partsOf(const std::vector<MapItemIdentifierRef>& 
       part.places.push_back(i);
       found = true;
     }
-    if (!found) reasons[i] = ofFeed(*library.sourceNamed(locator->feed).error(), locator->feed);
+    if (!found) reasons[i] = library.sourceNamed(locator->feed).error()->ofFeed(locator->feed);
   }
   std::erase_if(parts, [](const FeedPart& part) { return part.identifiers.empty(); });
   return parts;
@@ -124,7 +117,7 @@ Outcome<Answer> lookUpAll(const std::vector<MapItemIdentifierRef>& identifiers, 
   for (std::size_t i = 0; i < answers.size(); ++i) {
     const FeedPart& part = (*parts)[i];
     if (!answers[i]) {
-      const ErrorRef error = ofFeed(*answers[i].error(), part.source->name());
+      const ErrorRef error = answers[i].error()->ofFeed(part.source->name());
       for (const std::size_t place : part.places) all.reasons[place] = error;
       continue;
     }
