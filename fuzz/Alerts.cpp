@@ -29,7 +29,11 @@ const StaticFeed& city() {
 }
 
 std::vector<Verdict> verdictsOf(const AlertsFeed& alerts, std::span<const std::uint32_t> lines) {
-  IncidentQuery query{"city", {}, {"de-AT", "en"}, true, Date(std::chrono::seconds(1'750'000'000)), {}, true};
+  IncidentQuery query;
+  query.feed = "city";
+  query.language = {"de-AT", "en"};
+  query.minorAlerts = query.countsUnfit = true;
+  query.now = Date(std::chrono::seconds(1'750'000'000));
   for (const std::uint32_t line : lines) query.lines.push_back({line, city().line(line).muid});
   query.trips = [](std::string_view trip) { return trip == "t" ? std::optional(1u) : std::nullopt; };
   return readIncidents(alerts, city(), query).verdicts;

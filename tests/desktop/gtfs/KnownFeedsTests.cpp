@@ -115,7 +115,8 @@ class KeyedFeedTest : public testing::Test {
   }
   Feed feed(const std::string& key) { return feedsOf(*KnownFeeds::read()->withID("1"), "city", key).front(); }
   std::string fetch(const Feed& feed) {
-    const auto alerts = AlertsStore(FeedCache(folder.path() / "cache")).fetch(feed, {});
+    AlertsState state;
+    const auto alerts = AlertsStore(FeedCache(folder.path() / "cache")).fetch(feed, state, true, {});
     const auto lines = StaticFeedStore(FeedCache(folder.path() / "cache")).readAnew(feed, {});
     return !alerts ? alerts.error()->reason() : !lines ? lines.error()->reason() : "";
   }
@@ -246,7 +247,9 @@ TEST(KnownFeeds, OfSeveralPartsFetchTheirAlertsOnce) {
   ASSERT_EQ(sources->size(), 2u);
   for (const FeedSourceRef& source : *sources) {
     EXPECT_TRUE(source->staticFeed({})) << "from the mirror where its server fails";
-    EXPECT_TRUE(source->alerts({}));
+    AlertsState state;
+    EXPECT_TRUE(source->alerts(state, false, {}));
+    EXPECT_EQ(state.feed->name, source->name());
     EXPECT_EQ(source->isRouteOfOther({})("x1"), source->name() == "city");
   }
   std::size_t fetches = 0;
@@ -270,7 +273,9 @@ TEST(Feed, TellsWhatIsNoneFromWhatIsTheOtherHalf) {
     const Feed feed{"a", lines, incidents};
     const FeedCache cache(folder.path() / "cache");
     const auto code = [](const auto& outcome) { return outcome ? 0 : static_cast<int>(outcome.error()->code()); };
-    return std::pair(code(StaticFeedStore(cache).readAnew(feed, {})), code(AlertsStore(cache).fetch(feed, {})));
+    AlertsState state;
+    return std::pair(code(StaticFeedStore(cache).readAnew(feed, {})),
+                     code(AlertsStore(cache).fetch(feed, state, true, {})));
   };
   const auto pair = [](Code a, Code b) { return std::pair(static_cast<int>(a), static_cast<int>(b)); };
   EXPECT_EQ(codes(zip, alerts), std::pair(0, 0));
