@@ -116,7 +116,8 @@ std::optional<KeptAlerts> readKept(const std::filesystem::path& path, const Feed
   }
   const auto changedAt = dateIn(lines[4]), timestamp = dateIn(lines[5]);
   const auto checksum = numberIn<std::uint64_t>(lines[6]);
-  if (lines[0] != kFirstLine || lines[1] != feed.alerts.identity() || !changedAt || !checksum || !rest.starts_with('\n'))
+  if (lines[0] != kFirstLine || lines[1] != feed.alerts.identity() || !changedAt || !checksum ||
+      !rest.starts_with('\n'))
     return std::nullopt;
   rest.remove_prefix(1);
   if (flatChecksum(rest) != *checksum) return std::nullopt;
