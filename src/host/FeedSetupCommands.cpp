@@ -56,6 +56,7 @@ void printCountries(const KnownFeeds& known) {
   std::map<std::string, std::size_t> countries;
   for (const KnownFeed& feed : known.all()) ++countries[stringsPart().countryName(feed.country, "en")];
   std::vector<std::vector<std::string>> table;
+  table.reserve(countries.size());
   for (const auto& [name, count] : countries) table.push_back({printableText(name), counted(count, "feed")});
   printTable(table);
 }
@@ -251,6 +252,7 @@ int runFeedFind(const CommandContext& context, const std::string& text, bool jso
                          "ADDRESS --alerts ADDRESS\" sets one up by its addresses");
   }
   std::vector<std::vector<std::string>> table;
+  table.reserve(found.size());
   for (const KnownFeed& feed : found)
     table.push_back({printableText(feed.id), printableText(feed.title()), printableText(placeOf(feed)),
                      feed.firstKey() ? "wants a key" : ""});

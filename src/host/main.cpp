@@ -170,14 +170,14 @@ void CommandLine::addFeedCommands() {
   CLI::Option* name = addFeed->add_option("NAME", _feed.name, "Name of your choice; a fitting one is made with --from");
   name->check(checkFeedName);
   CLI::Option* from = addFeed->add_option("--from", _feed.from, "A feed that \"feed find\" tells, by its ID");
-  const auto [staticFeed, alerts] = addFeedOptions(*addFeed);
+  const auto addresses = addFeedOptions(*addFeed);
   // Either from the catalog, or by name and addresses.
-  addFeed->callback([this, name, from, staticFeed, alerts] {
-    for (const CLI::Option* option : {name, staticFeed, alerts})
+  addFeed->callback([this, name, from, addresses] {
+    for (const CLI::Option* option : {name, addresses.first, addresses.second})
       if (from->count() == 0 && option->count() == 0) throw CLI::RequiredError(option->get_name() + " or --from");
     _chosen = [this](const CommandContext& context) { return runFeedAdd(context, _feed); };
   });
-  from->excludes(staticFeed)->excludes(alerts);
+  from->excludes(addresses.first)->excludes(addresses.second);
   for (const char* option : {"--mirror", "--header", "--static-header", "--alerts-header"})
     from->excludes(addFeed->get_option(option));
   CLI::App* edit = add(*feed, "edit", "Change a feed: what is given, and its name stays",

@@ -8,11 +8,6 @@ namespace nimbo {
 
 namespace {
 
-/// Characters of a name, as hand-offs have them.
-constexpr std::size_t kLongestName = 500;
-
-std::string shortened(const std::string& name) { return std::string(firstCharacters(name, kLongestName)); }
-
 std::optional<std::string> shortenedIn(const std::optional<std::string>& name) {
   return name ? std::optional(shortened(*name)) : std::nullopt;
 }
@@ -35,6 +30,11 @@ std::vector<protocol::Skipped> skippedIn(const SkipReport& report) {
 }
 
 }  // namespace
+
+std::string shortened(const std::string& name) {
+  constexpr std::size_t kLongestName = 500;
+  return std::string(firstCharacters(name, kLongestName));
+}
 
 protocol::FeedLine writtenLine(const FeedCatalog::Line& described) {
   const TransitLine& line = *described.line;

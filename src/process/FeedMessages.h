@@ -8,6 +8,9 @@
 // What is known of feeds, as the protocol has it.
 namespace nimbo {
 
+/// The first 500 characters of a name, as hand-offs have them.
+std::string shortened(const std::string& name);
+
 /// Of each name come 500 characters.
 protocol::FeedLine writtenLine(const FeedCatalog::Line& line);
 

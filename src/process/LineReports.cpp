@@ -6,8 +6,8 @@
 #include "desktop/gtfs/alerts/IncidentReader.h"
 #include "desktop/gtfs/feeds/TransitLineServiceError.h"
 #include "desktop/gtfs/static/LineItems.h"
-#include "desktop/gtfs/text/Utf8.h"
 #include "platform/SystemServices.h"
+#include "process/FeedMessages.h"
 #include "process/Snapshot.h"
 
 namespace nimbo {
@@ -28,12 +28,6 @@ constexpr const char* kCauses[] = {
     "unknown_cause", "unknown_cause",   "other_cause",       "technical_problem", "strike",
     "demonstration", "accident",        "holiday",           "weather",           "maintenance",
     "construction",  "police_activity", "medical_emergency", "special_event"};
-
-/// A name in 500 characters, as hand-offs have them.
-std::string shortened(const std::string& name) {
-  constexpr std::size_t kLongestName = 500;
-  return std::string(firstCharacters(name, kLongestName));
-}
 
 template <std::size_t Count>
 std::string wordOf(const char* const (&words)[Count], std::int32_t number) {

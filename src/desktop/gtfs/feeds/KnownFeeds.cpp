@@ -15,7 +15,7 @@ namespace nimbo {
 
 namespace {
 
-using JSON = nlohmann::json;
+using CatalogJSON = nlohmann::json;
 
 constexpr std::uint64_t kLargestFile = 4 << 20;
 constexpr std::size_t kLargestCatalog = 32 << 20;
@@ -28,16 +28,16 @@ ErrorRef unusable(const std::string& place, const std::string& what) {
                                  place);
 }
 
-/// A text of the catalog that may be missing. Throws JSON::exception for what is no text.
-std::string textIn(const JSON& entry, const char* key) { return entry.value(key, std::string()); }
+/// A text of the catalog that may be missing. Throws CatalogJSON::exception for what is no text.
+std::string textIn(const CatalogJSON& entry, const char* key) { return entry.value(key, std::string()); }
 
-FeedAddress addressIn(const JSON& entry, const char* key) {
+FeedAddress addressIn(const CatalogJSON& entry, const char* key) {
   auto address = FeedAddress::parse(entry.at(key).get<std::string>());
   if (!address || !address->isRemote()) throw std::invalid_argument(std::string("a \"") + key + "\" is no address");
   return std::move(*address);
 }
 
-KnownFile readFileEntry(const JSON& entry) {
+KnownFile readFileEntry(const CatalogJSON& entry) {
   KnownFile file{.address = addressIn(entry, "url"), .mirror = {}, .name = textIn(entry, "name"), .key = {}};
   if (entry.contains("mirror")) file.mirror = addressIn(entry, "mirror");
   if (const auto key = entry.find("key"); key != entry.end()) {
@@ -49,7 +49,7 @@ KnownFile readFileEntry(const JSON& entry) {
   return file;
 }
 
-KnownFeed readFeedEntry(const JSON& entry) {
+KnownFeed readFeedEntry(const CatalogJSON& entry) {
   KnownFeed feed{.id = entry.at("id").get<std::string>(),
                  .provider = entry.at("provider").get<std::string>(),
                  .name = textIn(entry, "name"),
@@ -58,7 +58,7 @@ KnownFeed readFeedEntry(const JSON& entry) {
                  .municipality = textIn(entry, "municipality"),
                  .alerts = readFileEntry(entry.at("alerts")),
                  .staticFeeds = {}};
-  for (const JSON& file : entry.at("static")) feed.staticFeeds.push_back(readFileEntry(file));
+  for (const CatalogJSON& file : entry.at("static")) feed.staticFeeds.push_back(readFileEntry(file));
   if (feed.staticFeeds.empty()) throw std::invalid_argument("feed \"" + feed.id + "\" has no static feed");
   return feed;
 }
@@ -129,9 +129,9 @@ Outcome<KnownFeeds> KnownFeeds::read() {
   if (!unpacked) return unusable(place, unpacked.error()->reason());
   std::vector<KnownFeed> feeds;
   try {
-    const JSON document = JSON::parse(unpacked->begin(), unpacked->end());
+    const CatalogJSON document = CatalogJSON::parse(unpacked->begin(), unpacked->end());
     if (document.at("version") != kVersion) return unusable(place, "it is of another version");
-    for (const JSON& entry : document.at("feeds")) feeds.push_back(readFeedEntry(entry));
+    for (const CatalogJSON& entry : document.at("feeds")) feeds.push_back(readFeedEntry(entry));
   } catch (const std::exception& failure) {
     return unusable(place, failure.what());
   }
