@@ -1,6 +1,7 @@
 #include "process/WidgetProcess.h"
 
 #include <algorithm>
+#include <limits>
 #include <utility>
 
 #include "desktop/drawing/DrawingPart.h"
@@ -351,7 +352,9 @@ protocol::Rendered WidgetProcess::render(const protocol::RenderParams& params) {
   const auto picture = drawingPart().render(draw, view.bounds().size(), environment.screenScale(),
                                             colorOf(SystemColor::background, environment.appearance()));
   ErrorRef error = picture.error();
-  if (!error) error = writePicture(**picture, _options.pictures);
+  if (!error)
+    error = writePicture(**picture, _options.pictures, params.offset.value_or(0),
+                         params.capacity.value_or(std::numeric_limits<std::uint64_t>::max()));
   if (error) throw JSONRPCFailure(JSONRPCError::kDrawingFailed, error->reason());
   const Picture& drawn = **picture;
   return {drawn.pixelWidth(), drawn.pixelHeight(), drawn.stride(), drawn.scale()};

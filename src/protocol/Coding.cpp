@@ -115,8 +115,9 @@ constexpr std::tuple kFields<Highlighted>{Field{"highlighted", &Highlighted::hig
 template <>
 constexpr std::tuple kFields<SnapshotParams>{Field{"rows", &SnapshotParams::rows, kMayBeLeftOut}};
 template <>
-constexpr std::tuple kFields<RenderParams>{Field{"path", &RenderParams::path, kMayBeLeftOut},
-                                           Field{"surface", &RenderParams::surface, kMayBeLeftOut}};
+constexpr std::tuple kFields<RenderParams>{
+    Field{"offset", &RenderParams::offset, kMayBeLeftOut}, Field{"capacity", &RenderParams::capacity, kMayBeLeftOut},
+    Field{"path", &RenderParams::path, kMayBeLeftOut}, Field{"surface", &RenderParams::surface, kMayBeLeftOut}};
 template <>
 constexpr std::tuple kFields<Rendered>{Field{"width", &Rendered::width}, Field{"height", &Rendered::height},
                                        Field{"stride", &Rendered::stride}, Field{"scale", &Rendered::scale}};

@@ -102,12 +102,14 @@ struct Highlighted {
   bool highlighted = false;
 };
 
-/// Neither of them is taken any more.
 struct SnapshotParams {
   bool rows = true;  ///< whether the rows are wanted as laid out, with what depends on that
 };
 
 struct RenderParams {
+  std::optional<std::uint64_t> offset;    ///< bytes from the memory's beginning to the picture; absent: 0
+  std::optional<std::uint64_t> capacity;  ///< bytes that it may take there; absent: all that follow
+  // Neither of these is taken any more.
   std::optional<std::string> path;
   std::optional<std::string> surface;
 };

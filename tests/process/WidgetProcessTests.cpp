@@ -320,6 +320,10 @@ TEST(WidgetProcess, OutlivesEveryMessage) {
       {request("describeLines", {{"lines", {{{"id", "no colon"}}}}}), -32602},
       {request("cancel", {{"request", 1.5}}), -32602},
       {request("render", {{"surface", "/proc/self/fd/0"}}), -32602},
+      {request("render", {{"offset", -1}}), -32602},
+      {request("render", {{"offset", 255'900'000}}), -32002},
+      {request("render", {{"offset", 256'000'001}, {"capacity", 1'000'000}}), -32002},
+      {request("render", {{"offset", 4096}, {"capacity", 157'959}}), -32002},
   };
   std::vector<json> events = appearing() + kUpdateAndLook;
   for (const auto& c : cases) events.push_back(c.line);
