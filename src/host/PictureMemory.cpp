@@ -24,13 +24,18 @@ PictureMemory::PictureMemory() : _memory(memfd_create("nimbo-widget", MFD_CLOEXE
     throw std::system_error(errno, std::generic_category(), "no memory for the widget's pictures");
 }
 
-std::optional<WidgetPicture> PictureMemory::take(const protocol::Rendered& drawn) const {
+std::size_t PictureMemory::bytesOf(const protocol::Rendered& drawn) {
   const auto isSide = [](std::int32_t pixels) { return pixels > 0 && pixels <= kLargestSide; };
   if (!isSide(drawn.width) || !isSide(drawn.height) || drawn.stride < drawn.width * 4 || drawn.stride % 4 != 0 ||
       !(drawn.scale > 0 && drawn.scale <= kLargestScale))
-    return std::nullopt;
+    return 0;
   const std::size_t size = static_cast<std::size_t>(drawn.stride) * static_cast<std::size_t>(drawn.height);
-  if (size > kSize) return std::nullopt;
+  return size <= kSize ? size : 0;
+}
+
+std::optional<WidgetPicture> PictureMemory::take(const protocol::Rendered& drawn) const {
+  const std::size_t size = bytesOf(drawn);
+  if (size == 0) return std::nullopt;
   WidgetPicture picture{drawn, std::vector<std::uint8_t>(size)};
   for (std::size_t taken = 0; taken < size;) {
     const ssize_t count = pread(_memory.get(), picture.pixels.data() + taken, size - taken, static_cast<off_t>(taken));

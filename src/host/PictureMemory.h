@@ -24,6 +24,8 @@ class PictureMemory {
   PictureMemory();
 
   int descriptor() const { return _memory.get(); }
+  /// The bytes that such a picture takes; 0 where it is none, or larger than the memory.
+  static std::size_t bytesOf(const protocol::Rendered& drawn);
   /// A copy of what the process says it drew; absent when it says what no picture is.
   std::optional<WidgetPicture> take(const protocol::Rendered& drawn) const;
 

@@ -1,6 +1,5 @@
 #include "host/StatusBar.h"
 
-#include <glib-unix.h>
 #include <unistd.h>
 
 #include <algorithm>
@@ -12,6 +11,7 @@
 
 #include "host/LineStatus.h"
 #include "host/OnScreenWidget.h"
+#include "host/QuitOnSignal.h"
 #include "host/StatusWatch.h"
 #include "host/TerminalText.h"
 
@@ -126,18 +126,6 @@ WidgetPresentation presentationForBar() {
   WidgetPresentation presentation;
   presentation.expandedHeight = kTooltipRows * WidgetPresentation::kDefaultRowHeight;
   return presentation;
-}
-
-/// Ends the loop when the signal comes, instead of the process, for as long as the handle lives.
-GSourceHandle quitOnSignal(GLibRunLoop& runLoop, int signal) {
-  GSourceHandle source(g_unix_signal_source_new(signal));
-  const auto quit = [](gpointer loop) -> gboolean {
-    static_cast<GLibRunLoop*>(loop)->quit();
-    return G_SOURCE_CONTINUE;
-  };
-  g_source_set_callback(source.get(), quit, &runLoop, nullptr);
-  g_source_attach(source.get(), nullptr);
-  return source;
 }
 
 }  // namespace

@@ -82,8 +82,7 @@ DesktopPreferences::DesktopPreferences()
   _desktopIsDark = settings->property_gtk_application_prefer_dark_theme();
   const auto changed = [this] { apply(); };
   _connections = {settings->property_gtk_theme_name().signal_changed().connect(changed),
-                  settings->property_gtk_xft_dpi().signal_changed().connect(changed),
-                  _portal.signalChanged().connect(changed)};
+                  settings->property_gtk_xft_dpi().signal_changed().connect(changed)};
   _style = Gtk::CssProvider::create();
   Gtk::StyleContext::add_provider_for_display(Gdk::Display::get_default(), _style,
                                               GTK_STYLE_PROVIDER_PRIORITY_APPLICATION);

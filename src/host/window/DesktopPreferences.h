@@ -8,7 +8,7 @@
 #include <utility>
 #include <vector>
 
-#include "host/window/ColorSchemePortal.h"
+#include "host/ColorSchemePortal.h"
 #include "platform/ui/Environment.h"
 
 namespace nimbo {
@@ -53,7 +53,7 @@ class DesktopPreferences {
   double desktopTextScale() const;
 
   bool _desktopIsDark;  // by the toolkit's own settings
-  ColorSchemePortal _portal;
+  ColorSchemePortal _portal{[this] { apply(); }};
   std::string _appearanceChoice;
   std::string _languageChoice;
   int _textSizeSteps = 0;

@@ -7,9 +7,9 @@
 #include "desktop/gtfs/feeds/FeedConfiguration.h"
 #include "host/Commands.h"
 #include "host/HostPlatform.h"
+#include "host/WidgetHostProcess.h"
 #include "host/window/DesktopPreferences.h"
 #include "host/window/OpenRequest.h"
-#include "host/window/WidgetHostProcess.h"
 #include "platform/foundation/Date.h"
 #include "protocol/Lines.h"
 

@@ -43,7 +43,6 @@ WidgetContent WidgetContent::ofSnapshot(const protocol::Snapshot& snapshot) {
   WidgetContent content;
   for (const protocol::Row& row : snapshot.rows) content.rows.push_back(rowOf(row));
   content.canExpand = snapshot.largestAvailableDisplayMode == WidgetDisplayMode::Expanded;
-  content.isExpanded = snapshot.expanded;
   content.goneLines = snapshot.goneLines;
   content.asOf = snapshot.asOf;
   content.updated = snapshot.updated;

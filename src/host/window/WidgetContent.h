@@ -25,7 +25,6 @@ struct WidgetContent {
   std::shared_ptr<const WidgetPicture> picture;
   std::vector<WidgetRow> rows;
   bool canExpand = false;
-  bool isExpanded = false;
   std::vector<std::string> goneLines;  ///< "FEED:ROUTE_ID", of favorites that their feeds do not know any more
   ErrorRef failure;                    ///< of the last fetch; null without one
   std::vector<std::string> known;      ///< incidents of other feeds, with a failure, each as one line of text

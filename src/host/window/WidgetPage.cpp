@@ -13,6 +13,7 @@
 #include "host/window/WidgetTexts.h"
 #include "platform/Localization.h"
 #include "platform/Platform.h"
+#include "platform/foundation/Log.h"
 
 namespace nimbo {
 
@@ -264,7 +265,17 @@ void WidgetPage::showExpandButton() {
   _expand.set_visible(_content && _content->canExpand);
 }
 
-void WidgetPage::widgetDidChange(const WidgetContentRef& content) {
+bool WidgetPage::widgetDrew(const protocol::Rendered& picture) {
+  auto taken = _pictures->take(picture);
+  if (!taken) return false;
+  _picture = std::make_shared<const WidgetPicture>(*std::move(taken));
+  return true;
+}
+
+void WidgetPage::widgetDidChange(const protocol::Snapshot& snapshot, const protocol::Lines& lines) {
+  auto content = std::make_shared<WidgetContent>(WidgetContent::ofSnapshot(snapshot));
+  content->lines = lines;
+  content->picture = _picture;
   _content = content;
   _context.asOf = content->asOf;
   _view.setContent(content);
@@ -292,7 +303,12 @@ void WidgetPage::tryAgain() {
   _process.restart();
 }
 
+void WidgetPage::widgetEnded(const std::string& reason) {
+  writeLog({kDefaultLogSubsystem, "WidgetPage"}, LogLevel::error, "The widget process is ended: %@", {reason});
+}
+
 void WidgetPage::widgetDidFail(WidgetHostProcess::Failure failure, const std::string& detail) {
+  writeLog({kDefaultLogSubsystem, "WidgetPage"}, LogLevel::error, "No widget process: %@", {detail});
   _processFailed = true;
   const std::string reason = failure == WidgetHostProcess::Failure::cannotStart
                                  ? LocalizedString("Window_Widget_CannotStart")

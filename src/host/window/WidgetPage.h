@@ -5,10 +5,10 @@
 #include <gtkmm/listbox.h>
 #include <gtkmm/spinner.h>
 
+#include "host/WidgetHostProcess.h"
 #include "host/window/LineStates.h"
 #include "host/window/Page.h"
 #include "host/window/PageContext.h"
-#include "host/window/WidgetHostProcess.h"
 #include "host/window/WidgetView.h"
 
 namespace nimbo {
@@ -43,14 +43,20 @@ class WidgetPage final : public Page, private WidgetHostProcess::Delegate {
   /// `detail` is for whoever is told of the failure.
   void showFailure(const std::string& text, const std::string& detail);
 
-  void widgetDidChange(const WidgetContentRef& content) override;
+  const PictureMemory& newPictureMemory() override { return _pictures.emplace(); }
+  bool widgetDrew(const protocol::Rendered& picture) override;
+  bool wantsLines() const override { return true; }
+  void widgetDidChange(const protocol::Snapshot& snapshot, const protocol::Lines& lines) override;
   void widgetLinesDidChange(const protocol::Lines& lines) override { showLines(lines, lines.updated); }
+  void widgetEnded(const std::string& reason) override;
   void widgetDidFail(WidgetHostProcess::Failure failure, const std::string& detail) override;
   void widgetTells(const std::string& message) override;
   void widgetIsUpdating(bool updating) override;
   bool widgetOpens(const WidgetClient::Opening& opening) override;
 
   const PageContext& _context;
+  std::optional<PictureMemory> _pictures;         // of the process that runs
+  std::shared_ptr<const WidgetPicture> _picture;  // drawn last
   WidgetHostProcess _process;
   WidgetContentRef _content;
   bool _wantsExpanded;

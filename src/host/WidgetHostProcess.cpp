@@ -1,11 +1,9 @@
-#include "host/window/WidgetHostProcess.h"
+#include "host/WidgetHostProcess.h"
 
-#include <giomm/networkmonitor.h>
+#include <gio/gio.h>
 
 #include <algorithm>
 #include <stdexcept>
-
-#include "platform/foundation/Log.h"
 
 namespace nimbo {
 
@@ -13,8 +11,6 @@ namespace {
 
 /// Domain of the errors of a process that is asked and does not answer as it should.
 constexpr std::string_view kProcessErrorDomain = "org.nimbo.WidgetHostProcess";
-
-constexpr LogFacility kLog{kDefaultLogSubsystem, "WidgetHostProcess"};
 
 }  // namespace
 
@@ -25,7 +21,7 @@ WidgetHostProcess::WidgetHostProcess(GLibRunLoop& runLoop, const Clock& clock, s
 WidgetHostProcess::~WidgetHostProcess() {
   if (_hiddenTimer) _hiddenTimer->invalidate();
   endRetries();
-  _networkReturned.disconnect();
+  if (_networkReturned != 0) g_signal_handler_disconnect(g_network_monitor_get_default(), _networkReturned);
   _questions.clear();  // those who asked go, too
   stop();
 }
@@ -104,10 +100,9 @@ void WidgetHostProcess::setExpandedMode(bool expanded) {
 
 void WidgetHostProcess::start() {
   try {
-    // What an earlier process still has a hand on is not drawn into again.
-    _pictures.emplace();
+    const PictureMemory& pictures = _delegate.newPictureMemory();
     _widget = std::make_unique<WatchedWidget>(
-        _runLoop, _arguments, kAnswerPatience, [this](const std::string& reason) { replace(reason); }, &*_pictures);
+        _runLoop, _arguments, kAnswerPatience, [this](const std::string& reason) { replace(reason); }, &pictures);
   } catch (const std::runtime_error& failure) {
     return giveUp(Failure::cannotStart, failure.what());
   }
@@ -132,7 +127,8 @@ void WidgetHostProcess::setUpConnection() {
   client.connection().setHandler(protocol::kFrame.name,
                                  [this](const auto&, const JSONRPCResponder&) { askForContent(); });
   client.connection().setHandler(protocol::kUpdated.name, [this](const auto&, const JSONRPCResponder&) {
-    askForLines([this](const protocol::Lines& lines) { _delegate.widgetLinesDidChange(lines); });
+    if (_delegate.wantsLines())
+      askForLines([this](const protocol::Lines& lines) { _delegate.widgetLinesDidChange(lines); });
   });
   client.setNoticeHandler([this](const std::string& message) { _delegate.widgetTells(message); });
   client.setOpenHandler([this](const WidgetClient::Opening& opening) { return _delegate.widgetOpens(opening); });
@@ -161,7 +157,7 @@ void WidgetHostProcess::stop() {
 }
 
 void WidgetHostProcess::replace(const std::string& reason) {
-  writeLog(kLog, LogLevel::error, "The widget process is ended: %@", {reason});
+  _delegate.widgetEnded(reason);
   _appeared = false;
   stop();
   setUpdating(false);
@@ -171,12 +167,11 @@ void WidgetHostProcess::replace(const std::string& reason) {
   if (_crashes.size() >= kCrashLimit)
     return giveUp(Failure::keepsFailing, "its process had to be started " + std::to_string(kCrashLimit) +
                                              " times within a minute, the last time since " + reason +
-                                             ". Start the window in a terminal with NIMBO_LOG=debug to see why.");
+                                             ". Start the program in a terminal with NIMBO_LOG=debug to see why.");
   if (_visible) start();
 }
 
 void WidgetHostProcess::giveUp(Failure failure, const std::string& detail) {
-  writeLog(kLog, LogLevel::error, "No widget process: %@", {detail});
   _gaveUp = true;
   _delegate.widgetDidFail(failure, detail);
 }
@@ -198,26 +193,32 @@ void WidgetHostProcess::askForContent() {
     _contentIsStale = true;
     return;
   }
+  const auto room = _delegate.roomForPicture();
+  if (!room) return;
   _awaitsContent = true;
   _contentIsStale = false;
-  const auto picture = std::make_shared<WidgetPicture>();
-  _widget->ask(protocol::kRender, {}, [this, picture](const protocol::Rendered& answer) {
-    if (auto taken = _pictures->take(answer))
-      *picture = *std::move(taken);
+  const auto content = std::make_shared<Content>();
+  _widget->ask(protocol::kRender, *room, [this, content](const protocol::Rendered& answer) {
+    if (_delegate.widgetDrew(answer))
+      content->picture = answer;
     else
       _widget->fail("it has not drawn what it says");
   });
-  const auto content = std::make_shared<WidgetContent>();
-  _widget->ask(protocol::kSnapshot, {}, [content, picture](const protocol::Snapshot& snapshot) {
-    *content = WidgetContent::ofSnapshot(snapshot);
-    content->picture = picture;
-  });
-  askForLines([this, content](const protocol::Lines& lines) {
+  const auto finish = [this, content] {
     _awaitsContent = false;
-    content->lines = lines;
-    if (content->picture && !content->picture->pixels.empty()) show(content);
+    if (content->picture) show(*content);
     if (_contentIsStale) askForContent();
+  };
+  const bool wantsLines = _delegate.wantsLines();
+  _widget->ask(protocol::kSnapshot, {}, [content, finish, wantsLines](const protocol::Snapshot& snapshot) {
+    content->snapshot = snapshot;
+    if (!wantsLines) finish();
   });
+  if (wantsLines)
+    askForLines([content, finish](const protocol::Lines& lines) {
+      content->lines = lines;
+      finish();
+    });
 }
 
 void WidgetHostProcess::askForLines(std::function<void(const protocol::Lines&)> completion) {
@@ -228,21 +229,21 @@ void WidgetHostProcess::askForLines(std::function<void(const protocol::Lines&)> 
                 });
 }
 
-void WidgetHostProcess::show(const std::shared_ptr<WidgetContent>& content) {
-  const protocol::Rendered& layout = content->picture->layout;
-  _contentHeight = layout.height / layout.scale;
+void WidgetHostProcess::show(const Content& content) {
+  const protocol::Snapshot& snapshot = content.snapshot;
+  _contentHeight = content.picture->height / content.picture->scale;
   tellPresentation();
   // The expanded mode ends with the rows that need it, and comes back with them; rows that could not take it are
   // compact without being told. What was asked for before the last mode was told decides nothing.
   if (!_contentIsStale) {
-    _isExpanded = content->isExpanded;
-    setExpandedMode(_wantsExpanded && content->canExpand);
+    _isExpanded = snapshot.expanded;
+    setExpandedMode(_wantsExpanded && snapshot.largestAvailableDisplayMode == WidgetDisplayMode::Expanded);
   }
-  if (content->failure)
+  if (snapshot.error)
     retryLater();
-  else if (content->isFetched)
+  else if (snapshot.result)
     endRetries();
-  _delegate.widgetDidChange(content);
+  _delegate.widgetDidChange(snapshot, content.lines);
 }
 
 void WidgetHostProcess::retryLater() {
@@ -251,14 +252,15 @@ void WidgetHostProcess::retryLater() {
     _retry = nullptr;
     update();
   });
-  if (_networkReturned.connected()) return;
-  // giomm's own get_default() gives away a reference that is GLib's.
-  const auto monitor = Glib::wrap(g_network_monitor_get_default(), true);
-  _networkReturned = monitor->signal_network_changed().connect([this](bool isAvailable) {
-    if (!isAvailable || !_retry) return;
-    endRetries();
-    update();
-  });
+  if (_networkReturned != 0) return;
+  const auto changed = +[](GNetworkMonitor*, gboolean isAvailable, gpointer self) {
+    auto& process = *static_cast<WidgetHostProcess*>(self);
+    if (!isAvailable || !process._retry) return;
+    process.endRetries();
+    process.update();
+  };
+  _networkReturned =
+      g_signal_connect(g_network_monitor_get_default(), "network-changed", reinterpret_cast<GCallback>(changed), this);
 }
 
 void WidgetHostProcess::endRetries() {

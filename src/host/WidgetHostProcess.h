@@ -1,7 +1,5 @@
 #pragma once
 
-#include <sigc++/connection.h>
-
 #include <deque>
 #include <memory>
 #include <optional>
@@ -10,16 +8,15 @@
 
 #include "host/OnScreenWidget.h"
 #include "host/WatchedWidget.h"
-#include "host/window/WidgetContent.h"
 #include "platform/SystemServices.h"
 #include "platform/foundation/Outcome.h"
 #include "protocol/Methods.h"
 
 namespace nimbo {
 
-/// Keeps a widget process for a window: started when the widget is first shown, told when it is hidden, ended when it
-/// stays hidden, started again after a crash. Nothing waits for the process: what it shows comes to the delegate.
-/// Main thread only.
+/// Keeps a widget process for a host on screen: started when the widget is first shown, told when it is hidden, ended
+/// when it stays hidden, started again after a crash. Nothing waits for the process: what it shows comes to the
+/// delegate. Main thread only.
 class WidgetHostProcess {
  public:
   /// Why there is no process.
@@ -29,10 +26,21 @@ class WidgetHostProcess {
   class Delegate {
    public:
     virtual ~Delegate() = default;
-    /// The widget shows something else; until the next call that is what to show, whatever becomes of the process.
-    virtual void widgetDidChange(const WidgetContentRef& content) = 0;
-    /// A fetch has ended, which may have left the widget as it was.
-    virtual void widgetLinesDidChange(const protocol::Lines& lines) = 0;
+    /// Memory for a process that starts, which no earlier one has a hand on; there until the next call.
+    virtual const PictureMemory& newPictureMemory() = 0;
+    /// Where in it the next picture goes. Absent: nowhere now; `askForContent` is called when there is room.
+    virtual std::optional<protocol::RenderParams> roomForPicture() { return protocol::RenderParams(); }
+    /// Takes what the process says it drew there; false when that is no picture.
+    virtual bool widgetDrew(const protocol::Rendered& picture) = 0;
+    /// Whether it hears of the favorites apart from the rows: those that it hears of are empty otherwise.
+    virtual bool wantsLines() const { return false; }
+    /// The widget shows the picture that was drawn last, whose rows are in the snapshot; until the next call that is
+    /// what to show, whatever becomes of the process.
+    virtual void widgetDidChange(const protocol::Snapshot& snapshot, const protocol::Lines& lines) = 0;
+    /// A fetch has ended, which may have left the widget as it was. For those who want lines.
+    virtual void widgetLinesDidChange(const protocol::Lines&) {}
+    /// A process is ended for what is wrong with it; another one follows, or `widgetDidFail`.
+    virtual void widgetEnded(const std::string& reason) = 0;
     /// The process is not started again by itself; `detail` says why, for developers. `restart` is the way out.
     virtual void widgetDidFail(Failure failure, const std::string& detail) = 0;
     /// Something that the user must be told.
@@ -85,6 +93,13 @@ class WidgetHostProcess {
   static constexpr TimeInterval kCrashWindow = 60;
 
  private:
+  /// What the process answers of a moment.
+  struct Content {
+    std::optional<protocol::Rendered> picture;  // absent: there is none
+    protocol::Snapshot snapshot;
+    protocol::Lines lines;
+  };
+
   void start();
   void appear();
   void disappear();
@@ -108,7 +123,7 @@ class WidgetHostProcess {
   void tellPresentation();
   /// Gives what is known of the favorites, and nothing where they are too many to tell.
   void askForLines(std::function<void(const protocol::Lines&)> completion);
-  void show(const std::shared_ptr<WidgetContent>& content);
+  void show(const Content& content);
   void setExpandedMode(bool expanded);
   void setUpdating(bool updating);
   /// Sees to the next attempt after a fetch that failed.
@@ -127,11 +142,10 @@ class WidgetHostProcess {
   std::deque<Date> _crashes;
   std::shared_ptr<Timer> _hiddenTimer;
   Backoff _retries{kFirstRetry, kLongestRetry};
-  std::shared_ptr<Timer> _retry;      // while the next attempt is waited for
-  sigc::connection _networkReturned;  // from the first failure on
+  std::shared_ptr<Timer> _retry;       // while the next attempt is waited for
+  unsigned long _networkReturned = 0;  // GLib's handler, from the first failure on; 0 before
 
   // Of the process that runs.
-  std::optional<PictureMemory> _pictures;
   std::unique_ptr<WatchedWidget> _widget;
   std::vector<std::weak_ptr<Question>> _questions;  // that were asked
   std::shared_ptr<bool> _processMark;               // while it runs
