@@ -9,15 +9,15 @@ packages=(
   g++ cmake ninja-build pkg-config ccache
   libglib2.0-dev libsqlite3-dev libcurl4-openssl-dev libprotozero-dev libzip-dev libcsv-dev zlib1g-dev libicu-dev
   nlohmann-json3-dev libcli11-dev libpango1.0-dev libcairo2-dev libfontconfig-dev libbz2-dev libsystemd-dev
-  libseccomp-dev libgtkmm-4.0-dev fonts-dejavu-core ca-certificates
+  libseccomp-dev libgtkmm-4.0-dev libwayland-dev wayland-protocols fonts-dejavu-core ca-certificates
 )
 case $purpose in
   run) ;;
   test | lint) packages+=(libgtest-dev libgmock-dev protobuf-compiler libprotobuf-dev python3 python3-kiwisolver zlib1g-dev libssl-dev
     desktop-file-utils appstream mandoc systemd zsh fish libxml2-utils
-    xvfb xdotool dbus at-spi2-core python3-gi gir1.2-atspi-2.0 procps) ;;
+    xvfb xdotool dbus at-spi2-core python3-gi gir1.2-atspi-2.0 procps sway grim) ;;
   bench) packages+=(libbenchmark-dev protobuf-compiler libprotobuf-dev python3 python3-dev python3-kiwisolver
-    libxdamage-dev xvfb) ;;
+    libxdamage-dev xvfb dbus procps sway mako-notifier dunst) ;;
   fuzz) packages+=(clang libclang-rt-dev llvm) ;;  # the compiler with libFuzzer, the sanitizers, names in their reports
   package) packages+=(dpkg-dev file) ;;
   *) echo "usage: tools/setup.sh run|test|lint|bench|fuzz" >&2; exit 2 ;;

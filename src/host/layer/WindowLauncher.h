@@ -1,0 +1,35 @@
+#pragma once
+
+#include <filesystem>
+#include <functional>
+#include <string>
+#include <vector>
+
+#include "host/WidgetClient.h"
+
+namespace nimbo {
+
+/// Opens in the window what the widget hands over. Main thread only.
+class WindowLauncher {
+ public:
+  /// `folders` are arguments that give the window the same folders; `tell` hears what the user must be told.
+  WindowLauncher(std::vector<std::string> folders, std::function<void(const std::string& message)> tell)
+      : _folders(std::move(folders)), _tell(std::move(tell)) {}
+
+  /// Answers whether the window was started for it.
+  bool open(const WidgetClient::Opening& opening) const;
+  /// The window's first page, which leads to all others.
+  bool openPages() const { return openURL("nimbo://"); }
+
+  /// Where the window's program is: beside the running one, or as built, or NIMBO_TRANSIT_DESKTOP; else a name to be
+  /// looked for in PATH.
+  static std::filesystem::path windowProgram();
+
+ private:
+  bool openURL(const std::string& url) const;
+
+  std::vector<std::string> _folders;
+  std::function<void(const std::string&)> _tell;
+};
+
+}  // namespace nimbo
