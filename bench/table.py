@@ -9,6 +9,7 @@ Functions are measured in processor time, which other programs disturb less; pro
 """
 
 import argparse
+import contextlib
 import json
 import os
 import pathlib
@@ -18,6 +19,7 @@ import statistics
 import subprocess
 import sys
 import tempfile
+import time
 
 from day import Day, fresh_clone, seconds_of
 
@@ -160,6 +162,24 @@ class Bench:
         child.wait()
         return messages
 
+    def desktop_rows(self, desktop):
+        layer = [self.build / "src/host/layer/nimbo-transit-layer", *self.arguments]
+        bare = [self.build / "bench/nimbo-bare-layer"]
+        memory = desktop.folder + "/picture"
+        pathlib.Path(memory).touch()
+        bare_widget = [self.build / "bench/nimbo-bare-widget", self.folder / "bare.sqlite", memory]
+        share, shown = desktop.share(layer), ("MiB", 1)
+        return [
+            Row("the desktop's first frame", 1.25, desktop.first_frame(*layer), desktop.first_frame(*bare),
+                peer="bare layer-shell client, one text through Pango"),
+            Row("the desktop's memory, host and widget process (PSS)", 1.3, share, desktop.share(bare, bare_widget),
+                peer="two bare programs", shown=shown),
+            Row("the same beside mako with a notification", None, share, desktop.share(["mako"], notify=True),
+                peer="mako", shown=shown),
+            Row("the same beside dunst with a notification", None, share, desktop.share(["dunst"], notify=True),
+                peer="dunst", shown=shown),
+        ]
+
     def rows(self):
         first, drawn = self.requests("first", ("loadView", {}), ("render", {}))
         # The descriptor of the memory that the measuring program hands on.
@@ -255,6 +275,86 @@ class Bench:
         ]
 
 
+NOTIFY = ["gdbus", "call", "--session", "--dest=org.freedesktop.Notifications",
+          "--object-path=/org/freedesktop/Notifications", "--method=org.freedesktop.Notifications.Notify", "bench", "0", "",
+          "Delays of up to 15 minutes", "After works between two stations.", "[]", "{}", "60000"]
+
+
+class Desktop(contextlib.ExitStack):
+    """What stands on a Wayland desktop: first frames on a compositor that does nothing else, memory on sway."""
+
+    SETTLED = 2  # seconds after which a program has said what it has to say
+    NOBODY = 65534  # sway refuses to be root
+
+    def __init__(self, build):
+        super().__init__()
+        self.folder = self.enter_context(tempfile.TemporaryDirectory())
+        somebody = {}
+        if os.getuid() == 0:
+            somebody = {"user": self.NOBODY, "group": self.NOBODY, "extra_groups": []}
+            os.chown(self.folder, self.NOBODY, self.NOBODY)
+        self.environment = dict(os.environ, XDG_RUNTIME_DIR=self.folder, HOME=self.folder, WLR_BACKENDS="headless",
+                                WLR_RENDERER="pixman", WLR_LIBINPUT_NO_DEVICES="1")
+        self.environment.pop("DISPLAY", None)
+        self.compositor = self.start(build / "bench/nimbo-bench-compositor", "wp_fractional_scale_manager_v1", text=True,
+                                     stdin=subprocess.PIPE, stdout=subprocess.PIPE)
+        self.own = self.compositor.stdout.readline().strip()
+        bus = self.start("dbus-daemon", "--session", "--nofork", "--print-address=1", stdout=subprocess.PIPE, text=True)
+        self.environment["DBUS_SESSION_BUS_ADDRESS"] = bus.stdout.readline().strip()
+        config = pathlib.Path(self.folder, "config")
+        config.write_text("xwayland disable\n")
+        self.start("sway", "-c", config, stderr=subprocess.DEVNULL, **somebody)
+        while not (names := set(os.listdir(self.folder)) & {"wayland-0", "wayland-1"} - {self.own}):
+            time.sleep(0.1)
+        self.sway = names.pop()
+
+    def start(self, *command, **options):
+        child = subprocess.Popen([str(word) for word in command], env=self.environment, **options)
+        self.callback(child.wait)
+        self.callback(child.kill)
+        return child
+
+    def first_frame(self, *command):
+        """Seconds from the start of a program to its first picture."""
+        words, environment = [str(word) for word in command], dict(self.environment, WAYLAND_DISPLAY=self.own)
+
+        def measure():
+            begin = time.perf_counter()
+            child = subprocess.Popen(words, env=environment)
+            while not self.compositor.stdout.readline().startswith("shown"):
+                pass
+            seconds = time.perf_counter() - begin
+            child.terminate()
+            child.wait()
+            while not self.compositor.stdout.readline().startswith("closed"):
+                pass
+            return seconds
+        return measure
+
+    def share(self, *commands, notify=False):
+        """MiB that programs and those that they started take, what they share with others divided among all."""
+        environment = dict(self.environment, WAYLAND_DISPLAY=self.sway)
+
+        def measure():
+            children = [subprocess.Popen([str(word) for word in command], env=environment, stdin=subprocess.PIPE,
+                                         stdout=subprocess.DEVNULL) for command in commands]
+            time.sleep(self.SETTLED)
+            if notify:
+                subprocess.run(NOTIFY, env=environment, check=True, stdout=subprocess.DEVNULL)
+                time.sleep(self.SETTLED)
+            started = subprocess.run(["pgrep", "-P", ",".join(str(child.pid) for child in children)],
+                                     capture_output=True, text=True).stdout.split()
+            total = 0
+            for pid in [*started, *(child.pid for child in children)]:
+                with open(f"/proc/{pid}/smaps_rollup") as rollup:
+                    total += sum(int(line.split()[1]) for line in rollup if line.startswith("Pss:"))
+            for child in children:
+                child.terminate()
+                child.wait()
+            return total / 1024
+        return measure
+
+
 class Display:
     """An X server of its own for the windows."""
 
@@ -281,11 +381,11 @@ def main():
     arguments = parser.parse_args()
     folder = pathlib.Path(tempfile.mkdtemp(prefix="nimbo-bench-"))
     try:
-        with Display():
+        with Display(), Desktop(arguments.build.resolve()) as desktop:
             bench = Bench(arguments.build.resolve(), folder)
             bench.prepare()
             print("| row | peer | median | spread | aim | | ours : the peer's |\n|---|---|---|---|---|---|---|")
-            for row in bench.rows():
+            for row in bench.rows() + bench.desktop_rows(desktop):
                 if arguments.rows in row.name:
                     print(row.line(arguments.pairs), flush=True)
     finally:
