@@ -7,8 +7,10 @@
 #include <wayland-client.h>
 #include <wlr-layer-shell-unstable-v1-client-protocol.h>
 
+#include <cstdint>
 #include <cstdio>
 #include <cstring>
+#include <type_traits>
 
 namespace {
 
