@@ -86,7 +86,7 @@ void sendFrames() {
 void commit(wl_client*, wl_resource* self) {
   if (self != surface) return;  // a cursor's
   if (layer && !isConfigured) {
-    wl_surface_send_enter(surface, output);
+    if (output) wl_surface_send_enter(surface, output);
     if (fraction) wp_fractional_scale_v1_send_preferred_scale(fraction, scale);
     configure();
   }
