@@ -45,6 +45,7 @@ MapItemIdentifierRef identifierOf(const protocol::LineKey& key) {
 
 std::vector<protocol::FetchError> writtenErrors(const std::vector<ErrorRef>& errors) {
   std::vector<protocol::FetchError> written;
+  written.reserve(errors.size());
   for (const ErrorRef& error : errors) written.push_back(fetchErrorOf(*error));
   return written;
 }

@@ -19,7 +19,7 @@ using CatalogJSON = nlohmann::json;
 
 constexpr std::uint64_t kLargestFile = 4 << 20;
 constexpr std::size_t kLargestCatalog = 32 << 20;
-constexpr int kVersion = 1;
+constexpr int kCatalogVersion = 1;
 
 ErrorRef unusable(const std::string& place, const std::string& what) {
   return transitLineServiceError(TransitLineServiceError::badCatalog,
@@ -130,7 +130,7 @@ Outcome<KnownFeeds> KnownFeeds::read() {
   std::vector<KnownFeed> feeds;
   try {
     const CatalogJSON document = CatalogJSON::parse(unpacked->begin(), unpacked->end());
-    if (document.at("version") != kVersion) return unusable(place, "it is of another version");
+    if (document.at("version") != kCatalogVersion) return unusable(place, "it is of another version");
     for (const CatalogJSON& entry : document.at("feeds")) feeds.push_back(readFeedEntry(entry));
   } catch (const std::exception& failure) {
     return unusable(place, failure.what());
@@ -158,6 +158,7 @@ std::vector<KnownFeed> KnownFeeds::matching(std::string_view text, const std::st
   }
   std::stable_sort(found.begin(), found.end(), [](const auto& a, const auto& b) { return a.first < b.first; });
   std::vector<KnownFeed> feeds;
+  feeds.reserve(found.size());
   for (const auto& [rank, feed] : found) feeds.push_back(*feed);
   return feeds;
 }
