@@ -4,13 +4,11 @@
 #include <algorithm>
 #include <fstream>
 #include <iostream>
-#include <map>
 #include <nlohmann/json.hpp>
 
 #include "desktop/gtfs/feeds/FeedCache.h"
 #include "desktop/gtfs/feeds/FeedConfiguration.h"
 #include "desktop/gtfs/feeds/FeedSetup.h"
-#include "desktop/strings/StringsPart.h"
 #include "host/Commands.h"
 #include "host/FeedAnswers.h"
 #include "host/HostPlatform.h"
@@ -53,8 +51,7 @@ JSON writtenFeed(const KnownFeed& feed) {
 
 /// How many feeds there are in which country.
 void printCountries(const KnownFeeds& known) {
-  std::map<std::string, std::size_t> countries;
-  for (const KnownFeed& feed : known.all()) ++countries[stringsPart().countryName(feed.country, "en")];
+  const auto countries = known.countries("en");
   std::vector<std::vector<std::string>> table;
   table.reserve(countries.size());
   for (const auto& [name, count] : countries) table.push_back({printableText(name), counted(count, "feed")});

@@ -1,6 +1,7 @@
 // libnimbo-strings.so: what StringsPart.h declares.
 
 #include <unicode/brkiter.h>
+#include <unicode/coll.h>
 #include <unicode/datefmt.h>
 #include <unicode/msgfmt.h>
 #include <unicode/normalizer2.h>
@@ -190,6 +191,17 @@ class ICUStrings final : public StringsPart {
     const icu::UnicodeString key = together->normalize(kept, status);
     check(status);
     return utf8(key);
+  }
+  std::string sortKey(std::string_view text, const std::string& locale) override {
+    UErrorCode status = U_ZERO_ERROR;
+    const std::unique_ptr<icu::Collator> order(
+        icu::Collator::createInstance(icu::Locale::createCanonical(locale.c_str()), status));
+    check(status);
+    const auto letters =
+        icu::UnicodeString::fromUTF8(icu::StringPiece(text.data(), static_cast<std::int32_t>(text.size())));
+    std::string key(static_cast<std::size_t>(order->getSortKey(letters, nullptr, 0)), '\0');
+    order->getSortKey(letters, reinterpret_cast<std::uint8_t*>(key.data()), static_cast<std::int32_t>(key.size()));
+    return key;
   }
   std::string countryName(const std::string& code, const std::string& locale) override {
     icu::UnicodeString name;

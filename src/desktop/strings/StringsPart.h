@@ -45,6 +45,9 @@ class StringsPart {
   /// A UTF-8 text as searches compare it: without case and accents, letters of any script in one form ("Zürich" and
   /// "ZURICH" alike). Bytes that are no UTF-8 become U+FFFD. Any thread. Throws std::runtime_error.
   virtual std::string searchKey(std::string_view text) = 0;
+  /// Bytes that stand in the order in which the language of a BCP 47 tag or POSIX name sorts such texts. Any thread.
+  /// Throws std::runtime_error.
+  virtual std::string sortKey(std::string_view text, const std::string& locale) = 0;
   /// The name of a country, by its ISO 3166-1 code, in the language of a BCP 47 tag or POSIX name; the code where ICU
   /// has none. Any thread.
   virtual std::string countryName(const std::string& code, const std::string& locale) = 0;

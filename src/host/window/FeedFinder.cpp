@@ -3,7 +3,6 @@
 #include <gtkmm/linkbutton.h>
 
 #include <algorithm>
-#include <map>
 
 #include "desktop/gtfs/feeds/FeedSetup.h"
 #include "host/FeedAnswers.h"
@@ -205,11 +204,9 @@ void FeedFinder::search() {
 void FeedFinder::showCountries(const KnownFeeds& known, const std::string& locale) {
   _notice.set_text(LocalizedString("Window_Find_None"));
   _notice.show();
-  std::map<std::string, std::uint64_t> countries;
-  for (const KnownFeed& feed : known.all()) ++countries[stringsPart().countryName(feed.country, locale)];
-  for (const auto& [name, count] : countries) {
+  for (const auto& [name, count] : known.countries(locale)) {
     auto* label = Gtk::make_managed<Gtk::Label>(
-        CommaDelimitedList({name, LocalizedFormat(LocalizedString("Window_Find_Count"), {count})}));
+        CommaDelimitedList({name, LocalizedFormat(LocalizedString("Window_Find_Count"), {std::uint64_t{count}})}));
     label->set_xalign(0);
     auto* button = Gtk::make_managed<Gtk::Button>();
     button->set_child(*label);

@@ -82,6 +82,12 @@ TEST(KnownFeeds, AreFoundByAgencyNameIdentifierAndPlace) {
   }
   EXPECT_TRUE(known->matching("trimet budapest", "en").empty());
   EXPECT_EQ(known->matching("", "en").size(), known->all().size());
+  std::vector<std::string> countries;
+  for (const auto& country : known->countries("fr")) countries.push_back(country.name);
+  const auto states = std::ranges::find(countries, "États-Unis");
+  ASSERT_NE(states, countries.end());
+  EXPECT_LT(*(states - 1), "F");
+  EXPECT_GE(*(states + 1), "F");
   EXPECT_EQ(nameForFeed(*known->withID("2655"), {}), "ptv");
   EXPECT_EQ(known->keyFor(*FeedAddress::parse("https://developer.trimet.org/ws/V1/FeedSpecAlerts/?a=b"))->name,
             "AppID");

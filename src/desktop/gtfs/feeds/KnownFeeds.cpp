@@ -163,6 +163,21 @@ std::vector<KnownFeed> KnownFeeds::matching(std::string_view text, const std::st
   return feeds;
 }
 
+std::vector<KnownFeeds::Country> KnownFeeds::countries(const std::string& locale) const {
+  std::map<std::string, std::size_t> feedsOfCountry;
+  for (const KnownFeed& feed : _feeds) ++feedsOfCountry[feed.country];
+  std::map<std::string, Country> sorted;
+  for (const auto& [code, feeds] : feedsOfCountry) {
+    std::string name = stringsPart().countryName(code, locale);
+    std::string key = stringsPart().sortKey(name, locale);
+    sorted.emplace(std::move(key), Country{std::move(name), feeds});
+  }
+  std::vector<Country> countries;
+  countries.reserve(sorted.size());
+  for (auto& [key, country] : sorted) countries.push_back(std::move(country));
+  return countries;
+}
+
 Outcome<KnownFeed> KnownFeeds::withID(std::string_view id) const {
   for (const KnownFeed& feed : _feeds)
     if (feed.id == id) return feed;

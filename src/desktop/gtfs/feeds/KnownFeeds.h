@@ -55,6 +55,13 @@ class KnownFeeds {
   /// and that in the language of `locale`.
   std::vector<KnownFeed> matching(std::string_view text, const std::string& locale) const;
 
+  /// The countries that there are feeds in, by their names in the language of `locale` and in its order.
+  struct Country {
+    std::string name;
+    std::size_t feeds = 0;
+  };
+  std::vector<Country> countries(const std::string& locale) const;
+
   /// The feed of this identifier, or an error that says what to do.
   Outcome<KnownFeed> withID(std::string_view id) const;
 
