@@ -285,6 +285,11 @@ TEST(Feed, TellsWhatIsNoneFromWhatIsTheOtherHalf) {
   };
   const auto pair = [](Code a, Code b) { return std::pair(static_cast<int>(a), static_cast<int>(b)); };
   EXPECT_EQ(codes(zip, alerts), std::pair(0, 0));
+  for (const char size : {'<', '[', '{'}) {  // "\n<" begins a header of 60 bytes, and a page
+    const std::size_t padding = static_cast<std::size_t>(size) - 7;
+    const std::string header = std::string("\x0A") + size + "\x0A\x03" + "2.0" + '\x22' + static_cast<char>(padding);
+    EXPECT_EQ(codes(zip, file("long", header + std::string(padding, 'v'))), std::pair(0, 0)) << size;
+  }
   EXPECT_EQ(codes(alerts, zip), pair(Code::alertsForStatic, Code::staticForAlerts));
   EXPECT_EQ(codes(page, page), pair(Code::webPage, Code::webPage));
   EXPECT_EQ(codes(json, json), pair(Code::webPage, Code::webPage));

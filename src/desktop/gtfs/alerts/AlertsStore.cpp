@@ -72,8 +72,12 @@ std::optional<Date> dateOfHTTPText(const std::string& text) {
 }
 
 Outcome<AlertsFeed> readBody(const Feed& feed, std::string body) {
-  if (ErrorRef error = otherThanAlerts(body, feed.alerts.publicText())) return error;
-  return AlertsFeed::read(std::move(body), feed.alerts.publicText(), feed.isCombined);
+  const std::string place = feed.alerts.publicText(), beginning = body.substr(0, kTellingBytes);
+  auto alerts = AlertsFeed::read(std::move(body), place, feed.isCombined);
+  // Only of what is no feed: the first bytes of one may look like a page's.
+  if (!alerts)
+    if (ErrorRef other = otherThanAlerts(beginning, place)) return other;
+  return alerts;
 }
 
 Date dateOf(const AlertsState& state) {

@@ -41,6 +41,7 @@ ErrorRef otherThanStatic(std::string_view beginning, const std::string& place) {
 }
 
 ErrorRef otherThanAlerts(std::string_view beginning, const std::string& place) {
+  if (isRealtime(beginning)) return nullptr;
   if (isZip(beginning))
     return transitLineServiceError(TransitLineServiceError::staticForAlerts,
                                    place +
