@@ -269,6 +269,22 @@ TEST_F(LineServiceTest, DoesNotWaitForAStaticServerOnceThereIsACache) {
   second.promise.set_value();
 }
 
+TEST_F(LineServiceTest, ReadsTheAlertsAgainForAStaticFeedWhoseServerDoesNotTellItsState) {
+  std::atomic<bool> isNew = false;
+  const LoopbackServer server([&](const std::string&) {
+    return LoopbackServer::Answer{
+        LoopbackServer::answer("200 OK", zipOfRoutes(isNew ? "route_id,route_short_name,route_type\nr1,one,3\n"
+                                                           : "route_id,route_short_name,route_type\nr1,1,3\n"))};
+  });
+  addServedFeed(server.address());
+  EXPECT_EQ(lookup({line("city", "r1")}), "1 (T); ");
+  isNew = true;
+  platform.time.advance(86400);
+  EXPECT_EQ(lookup({line("city", "r1")}), "1 (T); ");
+  while (!service->library().downloads().underWay().empty()) std::this_thread::yield();
+  EXPECT_EQ(lookup({line("city", "r1")}), "one (T); ");
+}
+
 TEST_F(LineServiceTest, NeverCallsBackOnceItIsGone) {
   std::mutex lock;
   lock.lock();

@@ -33,7 +33,7 @@ std::optional<std::uint32_t> lineLike(const StaticFeed& feed, const TransitLineL
 
 HeldAnswer::Question questionOf(const StaticFeed& feed, std::span<const MapItemIdentifierRef> identifiers,
                                 std::string_view language) {
-  HeldAnswer::Question question{std::string(feed.fingerprint()), {}, std::string(language)};
+  HeldAnswer::Question question{feed.checksum(), {}, std::string(language)};
   for (const MapItemIdentifierRef& identifier : identifiers)
     question.lines.emplace_back(identifier->muid(), identifier->locator());
   return question;

@@ -32,7 +32,7 @@ struct FeedAnswer {
 /// for object.
 struct HeldAnswer {
   struct Question {
-    std::string staticFeed;  ///< its fingerprint
+    std::uint64_t staticFeed = 0;  ///< its checksum: not every server tells a new state from an old one
     std::vector<std::pair<std::uint64_t, std::optional<TransitLineLocator>>> lines;
     std::string language;
     bool operator==(const Question&) const = default;
