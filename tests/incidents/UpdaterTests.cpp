@@ -63,6 +63,7 @@ TEST_F(Updater, WaitsForTheDatesThatChangeTheRows) {
 TEST_F(Updater, TellsEachDateOnceAndAsksForARefreshAtEachInterval) {
   const auto updater = start({lineWith({{10, 70}})});
   EXPECT_EQ(updater->refreshInterval(), 1800);
+  EXPECT_THAT(platform.loop.tolerances, ElementsAre(180));
   EXPECT_EQ(updater->lineItems().size(), 1u);
   platform.time.advance(600);
   EXPECT_THAT(updater->updateDates(), ElementsAre(at(70)));

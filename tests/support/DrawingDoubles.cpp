@@ -23,17 +23,17 @@ std::vector<std::size_t> wordLengths(const std::string& text) {
 }  // namespace
 
 ImageRef ShieldRendererDouble::render(const TransitArtwork& artwork, std::int64_t shieldSize, double screenScale,
-                                      bool) {
+                                      bool nightMode) {
   ++rendered;
   const std::int64_t size = std::max<std::int64_t>(shieldSize, 0);
   const double height = 14 + 2 * static_cast<double>(size);
   if (artwork.shieldDataSource()) {
     const std::string text = artwork.shieldDataSource()->shieldText.value_or("");
     const double wide = width ? width(size, text) : std::max(height, height / 2 * static_cast<double>(text.size()));
-    return std::make_shared<const ImageDouble>(Size{wide, height}, screenScale);
+    return std::make_shared<const ImageDouble>(Size{wide, height}, screenScale, nightMode);
   }
   if (!artwork.iconDataSource()) return nullptr;
-  return std::make_shared<const ImageDouble>(Size{height, height}, screenScale);
+  return std::make_shared<const ImageDouble>(Size{height, height}, screenScale, nightMode);
 }
 
 TextLayoutRef TextSystemDouble::layOut(const std::string& text, const FontDescriptor& font, double maxWidth,

@@ -9,13 +9,14 @@
 
 namespace nimbo {
 
-/// An image that is only its size.
+/// An image that is only its size, and whether it is for the night.
 class ImageDouble final : public Image {
  public:
-  ImageDouble(Size size, double scale) : _size(size), _scale(scale) {}
+  ImageDouble(Size size, double scale, bool forNight) : isForNight(forNight), _size(size), _scale(scale) {}
   Size size() const override { return _size; }
   double scale() const override { return _scale; }
   std::string_view className() const override { return "ImageDouble"; }
+  const bool isForNight;
 
  private:
   Size _size;
@@ -25,9 +26,10 @@ class ImageDouble final : public Image {
 /// Images of the sizes that a test sets, in points, 24 by 24 until set.
 class ImageResourcesDouble final : public ImageResources {
  public:
-  ImageRef image(std::string_view name, double screenScale, bool) override {
+  ImageRef image(std::string_view name, double screenScale, bool nightMode) override {
     const auto found = sizes.find(name);
-    return std::make_shared<const ImageDouble>(found == sizes.end() ? Size{24, 24} : found->second, screenScale);
+    return std::make_shared<const ImageDouble>(found == sizes.end() ? Size{24, 24} : found->second, screenScale,
+                                               nightMode);
   }
   std::map<std::string, Size, std::less<>> sizes;
 };

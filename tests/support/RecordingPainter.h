@@ -22,6 +22,7 @@ class RecordingPainter final : public Painter {
     Rect rect;
     double alpha;
     Color tint;
+    bool isForNight;
   };
   struct Fill {
     Rect rect;
@@ -34,8 +35,8 @@ class RecordingPainter final : public Painter {
     texts.push_back(
         {{_origin.x + origin.x, _origin.y + origin.y}, width, color, layout.lineCount(), known.text, known.font});
   }
-  void drawImage(const Image&, const Rect& rect, double alpha, const Color& tint) override {
-    pictures.push_back({moved(rect), alpha, tint});
+  void drawImage(const Image& image, const Rect& rect, double alpha, const Color& tint) override {
+    pictures.push_back({moved(rect), alpha, tint, dynamic_cast<const ImageDouble&>(image).isForNight});
   }
   void save(Point offset, const Rect& clip) override {
     clips.push_back(clip);

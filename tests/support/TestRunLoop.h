@@ -5,6 +5,7 @@
 #include <functional>
 #include <mutex>
 #include <thread>
+#include <vector>
 
 #include "platform/RunLoop.h"
 #include "platform/VirtualTime.h"
@@ -24,8 +25,11 @@ class TestRunLoop final : public RunLoop {
     _arrived.notify_all();
   }
   std::shared_ptr<Timer> scheduleTimer(TimeInterval interval, bool repeats, std::function<void(Timer&)> fire) override {
-    return _time.scheduleTimer(interval, repeats, std::move(fire));
+    return std::make_shared<TolerantTimer>(_time.scheduleTimer(interval, repeats, std::move(fire)), tolerances);
   }
+
+  /// Seconds that timers were given, in that order; virtual time makes no use of them.
+  std::vector<TimeInterval> tolerances;
 
   /// Runs the queued work, and what that queues, until none is left.
   void runUntilIdle() {
@@ -60,6 +64,16 @@ class TestRunLoop final : public RunLoop {
   }
 
  private:
+  struct TolerantTimer final : Timer {
+    bool isValid() const override { return _timer->isValid(); }
+    void invalidate() override { _timer->invalidate(); }
+    void setTolerance(TimeInterval tolerance) override { _told.push_back(tolerance); }
+    TolerantTimer(std::shared_ptr<Timer> timer, std::vector<TimeInterval>& told)
+        : _timer(std::move(timer)), _told(told) {}
+    const std::shared_ptr<Timer> _timer;
+    std::vector<TimeInterval>& _told;
+  };
+
   bool runOne() {
     std::unique_lock guard(_lock);
     if (_queue.empty()) return false;

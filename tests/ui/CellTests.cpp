@@ -166,7 +166,8 @@ class SummaryCell : public Cells {
  protected:
   NBTransitSummaryItemRef summary(int shields) {
     TransitArtworks artworks;
-    for (int i = 0; i < shields; ++i) artworks.push_back(shieldArtwork("L" + std::to_string(i % 10)));
+    for (int i = 0; i < shields; ++i)
+      artworks.push_back(i % 2 ? modeArtwork(TransitMode::bus) : shieldArtwork("L" + std::to_string(i % 10)));
     return NBTransitSummaryItem::initWithText_artworks_userActivityData("4 advisories", artworks, nullptr);
   }
   SummaryCell() {
@@ -215,6 +216,8 @@ TEST_F(SummaryCell, TextsHaveTheWeightsAndColoursOfTheirRoles) {
                 testing::ElementsAre(isText("Title", 17, true, primary), isText("Second", 15, false, secondary),
                                      isText("4 advisories", 17, false, primary),
                                      isText("+(26)", 17, false, colorOf(SystemColor::systemGrey, appearance))));
+    EXPECT_THAT(painter.pictures,
+                testing::Each(Field(&RecordingPainter::Picture::isForNight, appearance == Appearance::dark)));
   }
   EXPECT_THAT(cell->layoutDump(), testing::HasSubstr("primaryLabel.firstBaseline = contentGuide.top + 12 @750"));
 }

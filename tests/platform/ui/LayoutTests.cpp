@@ -136,6 +136,7 @@ TEST_F(Layout, RefusesNumbersThatMakeNoSense) {
   }
   for (const LayoutPriority bad : {0.99f, 1000.01f, std::nanf("")})
     EXPECT_THROW(width->setPriority(bad), std::invalid_argument);
+  for (const LayoutPriority good : {1.f, kLayoutPriorityRequired}) EXPECT_NO_THROW(width->setPriority(good));
   EXPECT_EQ(width->constant(), 30);
   EXPECT_EQ(root->frame(), (Rect{0, 0, 200, 100}));
   EXPECT_THAT(platform.log.texts("Layout", LogLevel::error), SizeIs(10));
@@ -229,6 +230,22 @@ TEST_F(Layout, AStackByItselfIsLaidOutAndKeepsDrawingsOnBaselinesApart) {
   expectTops(77, 12, 60);
 }
 
+TEST_F(Layout, AViewKeepsItsConstraintsWhereverItIs) {
+  const auto moved = std::make_shared<View>();
+  const auto inside = constrainedView(*moved, "inside");
+  inside->widthAnchor().constraintEqualToAnchor(moved->widthAnchor())->setActive(true);
+  const auto expectFollowed = [&](View& laidOut, double width) {
+    moved->setFrame({0, 0, width, 10});
+    laidOut.layoutIfNeeded();
+    EXPECT_EQ(inside->frame().width, width);
+  };
+  expectFollowed(*moved, 50);
+  root->addSubview(moved);
+  expectFollowed(*root, 60);
+  moved->removeFromSuperview();
+  expectFollowed(*moved, 70);
+}
+
 TEST_F(Layout, LabelTakesTheLinesItsWidthNeeds) {
   struct Case {
     const char* text;
@@ -263,6 +280,13 @@ TEST_F(Layout, LabelTakesTheLinesItsWidthNeeds) {
               text->topAnchor().constraintEqualToAnchor(view->topAnchor()),
               text->trailingAnchor().constraintEqualToAnchor(view->trailingAnchor())});
     if (c.height > 0) text->heightAnchor().constraintLessThanOrEqualToConstant(c.height)->setActive(true);
+    const auto marker = constrainedView(*view, "marker");
+    marker->topAnchor().constraintEqualToAnchor(text->lastBaselineAnchor())->setActive(true);
+    const auto stretch = text->heightAnchor().constraintEqualToConstant(400);
+    stretch->setPriority(kLayoutPriorityHugging - 1);
+    stretch->setActive(true);
+    view->layoutIfNeeded();
+    text->setText(std::nullopt);
     view->layoutIfNeeded();
     text->setFont(nullptr);
     view->layoutIfNeeded();
@@ -272,6 +296,8 @@ TEST_F(Layout, LabelTakesTheLinesItsWidthNeeds) {
     view->layoutIfNeeded();
     SCOPED_TRACE(std::string(c.text).substr(0, 20) + " in " + std::to_string(c.height));
     EXPECT_EQ(text->frame(), (Rect{0, 0, c.width, c.expectedHeight}));
+    const double descent = c.clipped ? c.height - marker->frame().y : 3.4;
+    EXPECT_EQ(marker->frame().y, std::round(c.expectedHeight - descent));
     RecordingPainter painter;
     view->draw(painter);
     EXPECT_EQ(painter.texts.empty() ? 0 : painter.texts[0].lines, c.drawnLines);
@@ -283,14 +309,14 @@ TEST_F(Layout, ShortOfRoomTheLastTextGivesWayButKeepsItsFirstLine) {
   const auto stack = std::make_shared<StackView>();
   stack->setUsesAutomaticConstraints(false);
   root->addSubview(stack);
-  const auto first = label("a b c", 0), second = label("a b c d e f", 0);
+  const auto first = label("a b", 0), second = label("a b c d e f", 0);
   stack->addArrangedSubview(first);
   stack->addArrangedSubview(second);
   pinToCorner(*stack);
   const auto height = stack->heightAnchor().constraintLessThanOrEqualToConstant(90);
   activate({height, stack->widthAnchor().constraintEqualToConstant(10)});
   for (const auto& [room, firstHeight, secondHeight] :
-       {std::array{200, 51, 102}, {90, 51, 34}, {70, 51, 17}, {40, 17, 17}, {25, 17, 8}, {90, 51, 34}}) {
+       {std::array{200, 34, 102}, {90, 34, 51}, {55, 34, 17}, {40, 17, 17}, {25, 17, 8}, {90, 34, 51}}) {
     height->setConstant(room);
     EXPECT_EQ(laidOut(*first).height, firstHeight) << room;
     EXPECT_EQ(second->frame(), (Rect{0, static_cast<double>(firstHeight), 10, static_cast<double>(secondHeight)}))
