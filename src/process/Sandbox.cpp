@@ -55,8 +55,9 @@ class Filter {
   void refuseWhereEqual(int call, unsigned argument, std::uint32_t value) {
     refuseWhereBitsAre(call, argument, ~0u, value);
   }
-  void refuseUnlessEqual(int call, unsigned argument, std::uint32_t value) {
-    for (std::uint32_t bit = 1; bit != 0; bit <<= 1) refuseWhereBitsAre(call, argument, bit, ~value & bit);
+  /// Looks at all 64 bits: one rule for 32. What calls these passes a register that holds nothing else.
+  void refuseUnlessEqual(int call, unsigned argument, std::uint64_t value) {
+    refuseWhere(call, {argument, SCMP_CMP_NE, value, 0});
   }
   /// Of the values below 32 only these pass.
   void refuseUnlessAmong(int call, unsigned argument, std::initializer_list<std::uint32_t> values) {
@@ -66,7 +67,9 @@ class Filter {
     for (std::uint32_t bit = kEnd; bit != 0; bit <<= 1) refuseWhereBitsAre(call, argument, bit, bit);
   }
   void refuseWhereBitsAre(int call, unsigned argument, std::uint32_t mask, std::uint32_t bits) {
-    const scmp_arg_cmp comparison{argument, SCMP_CMP_MASKED_EQ, mask, bits};
+    refuseWhere(call, {argument, SCMP_CMP_MASKED_EQ, mask, bits});
+  }
+  void refuseWhere(int call, const scmp_arg_cmp& comparison) {
     keepFailure(::seccomp_rule_add_array(_context.get(), SCMP_ACT_ERRNO(EPERM), call, 1, &comparison));
   }
 
@@ -153,7 +156,7 @@ int installFilter() {
   for (const int call : {SCMP_SYS(mprotect), SCMP_SYS(pkey_mprotect)})
     filter.refuseWhereBitsAre(call, 2, PROT_EXEC, PROT_EXEC);
   filter.refuseWhereBitsAre(SCMP_SYS(shmat), 2, SHM_EXEC, SHM_EXEC);
-  filter.refuseUnlessEqual(SCMP_SYS(tgkill), 0, static_cast<std::uint32_t>(::getpid()));
+  filter.refuseUnlessEqual(SCMP_SYS(tgkill), 0, static_cast<std::uint64_t>(::getpid()));
   filter.refuseUnlessAmong(SCMP_SYS(socket), 0, {AF_UNIX, AF_INET, AF_INET6, AF_NETLINK});
   for (const unsigned request : {TIOCSTI, TIOCLINUX, FIOSETOWN, SIOCSPGRP})
     filter.refuseWhereEqual(SCMP_SYS(ioctl), 1, request);
