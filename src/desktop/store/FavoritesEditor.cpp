@@ -240,8 +240,16 @@ Outcome<Favorites> FavoritesEditor::read(Loss loss) const {
   const auto readOnce = [&] {
     return _database->read([&](SQLiteConnection& connection) -> ErrorRef {
       requireFittingFavorites(connection);
+      const std::int64_t digest = connection.integer("SELECT digest FROM favorites_seal WHERE id = 1");
+      if (*_memory && (*_memory)->digest == digest) {
+        stored = (*_memory)->favorites;
+        return nullptr;
+      }
       if (wereSet(connection)) stored = storedFavorites(connection);
-      return loss == Loss::isError ? lossOf(connection, stored.value_or(Favorites())) : nullptr;
+      if (loss == Loss::isPassedOver) return nullptr;
+      if (ErrorRef lost = lossOf(connection, stored.value_or(Favorites()))) return lost;
+      if (stored) *_memory = {digest, *stored};
+      return nullptr;
     });
   };
   ErrorRef error = readOnce();

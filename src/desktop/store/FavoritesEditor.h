@@ -54,11 +54,17 @@ class FavoritesEditor final {
 
  private:
   enum class Loss { isError, isPassedOver };
+  /// What was read last: while the seal is the same, so are they, object for object. Used with the database locked.
+  struct Memory {
+    std::int64_t digest = 0;
+    Favorites favorites;
+  };
   Outcome<Favorites> read(Loss loss) const;
   ErrorRef change(const StateDatabase::Work& work);
 
   std::shared_ptr<StateDatabase> _database;
   FirstFavorites _firstFavorites;
+  std::shared_ptr<std::optional<Memory>> _memory = std::make_shared<std::optional<Memory>>();
 };
 
 }  // namespace nimbo
