@@ -40,9 +40,9 @@ protocol::InitializeParams initializationOf(const WidgetPresentation& presentati
                                      .kind = std::string(protocol::Bundle::kApplication), .identifier = application})}};
 }
 
-std::optional<std::string> failureOfUpdate(WidgetClient& client) {
+std::optional<std::string> failureOfUpdate(WidgetClient& client, bool shared) {
   while (true) {
-    const protocol::UpdateResult answer = client.call(protocol::kPerformUpdate);
+    const protocol::UpdateResult answer = client.call(protocol::kPerformUpdate, {shared});
     if (answer.updateResult != WidgetUpdateResult::Failed) return std::nullopt;
     const std::string reason = answer.reason.value_or("the update failed");
     // The download has a limit of its own.
@@ -60,7 +60,7 @@ OnScreenWidget::OnScreenWidget(const CommandContext& context, const WidgetPresen
     _client.call(step);
 }
 
-std::optional<std::string> OnScreenWidget::update() { return failureOfUpdate(_client); }
+std::optional<std::string> OnScreenWidget::update(bool shared) { return failureOfUpdate(_client, shared); }
 
 void OnScreenWidget::expand() {
   if (_client.call(protocol::kSnapshot, {.rows = false}).largestAvailableDisplayMode == WidgetDisplayMode::Expanded)

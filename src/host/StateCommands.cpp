@@ -8,6 +8,7 @@
 #include <iterator>
 
 #include "desktop/rpc/Base64.h"
+#include "desktop/store/RefreshSetting.h"
 #include "host/Commands.h"
 #include "host/HostPlatform.h"
 #include "host/TerminalText.h"
@@ -95,6 +96,9 @@ int runSettingsGet(const CommandContext& context, const std::string& key) {
 }
 
 int runSettingsSet(const CommandContext& context, const std::string& key, const std::string& value) {
+  if (key == kRefreshSecondsKey && !refreshSecondsIn(value))
+    throw CommandFailure("the setting refreshSeconds is a whole number of seconds from 30 to 3600, and not \"" + value +
+                         "\"");
   HostPlatform platform(context);
   require(Platform::current().sharedSettings().groupStore()->setValue_forKey(settingOfText(value), key));
   return kExitSuccess;

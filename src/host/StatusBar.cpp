@@ -135,7 +135,8 @@ int runStatusBar(const CommandContext& context, const std::optional<std::string>
   presentation.virtualTime = now;
   try {
     OnScreenWidget widget(context, presentation);
-    const std::optional<std::string> failure = widget.update();
+    // A bar may ask every few seconds.
+    const std::optional<std::string> failure = widget.update(true);
     std::cout << statusBarLine(widget.snapshot({.rows = false})).value_or("") << "\n";
     widget.close();
     if (failure) throw CommandFailure(*failure);

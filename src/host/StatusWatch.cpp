@@ -7,20 +7,20 @@ namespace nimbo {
 using nlohmann::json;
 
 StatusWatch::StatusWatch(const CommandContext& context, WidgetPresentation presentation, Show show)
-    : _context(context), _presentation(std::move(presentation)), _show(std::move(show)) {
+    : _context(context),
+      _presentation(std::move(presentation)),
+      _show(std::move(show)),
+      _refresh(
+          context.runLoop, _random, [this] { return _conditions.areScarce(); }, [this] { update(); }) {
   start();
 }
 
 StatusWatch::~StatusWatch() {
-  for (auto* timer : {&_restart, &_update}) cancel(*timer);
+  if (_restart) _restart->invalidate();
   if (!_widget) return;
   // The process does what it was asked before it finds its input closed.
   _widget->ask(protocol::kViewWillDisappear);
   _widget->ask(protocol::kViewDidDisappear);
-}
-
-void StatusWatch::cancel(std::shared_ptr<Timer>& timer) {
-  if (timer) std::exchange(timer, nullptr)->invalidate();
 }
 
 void StatusWatch::start() {
@@ -34,16 +34,21 @@ void StatusWatch::start() {
   WidgetClient& client = _widget->client();
   for (const char* heard : {protocol::kFrame.name, protocol::kUpdated.name})
     client.connection().setHandler(heard, [this](const json&, const JSONRPCResponder&) { look(); });
+  client.connection().setHandler(protocol::kChanged.name,
+                                 [this](const json&, const JSONRPCResponder&) { _refresh.askNow(); });
   client.setNoticeHandler(_context.tell);
   _widget->ask(protocol::kInitialize, initializationOf(_presentation));
   for (const auto& step : {protocol::kLoadView, protocol::kViewWillAppear, protocol::kViewDidAppear})
     _widget->ask(step);
-  update();
+  _refresh.setOnScreen(true);
   look();
 }
 
 void StatusWatch::update() {
-  _widget->ask(protocol::kPerformUpdate, {}, [this](const auto&) { look(); });
+  _widget->ask(protocol::kPerformUpdate, {.shared = true}, [this](const protocol::UpdateResult& result) {
+    _refresh.answered(result);
+    look();
+  });
 }
 
 void StatusWatch::look() {
@@ -52,18 +57,7 @@ void StatusWatch::look() {
 
 void StatusWatch::showSnapshot(const protocol::Snapshot& snapshot) {
   if (const auto line = statusBarLine(snapshot)) showLine(*line);
-  if (!snapshot.result) return;
-  _restarts.reset();
-  if (snapshot.result == protocol::FetchResult::success) {
-    _updates.reset();
-    cancel(_update);
-  } else if (!_update) {
-    // After a failed fetch the widget waits for its host.
-    _update = _context.runLoop.scheduleTimer(_updates.next(), false, [this](Timer&) {
-      _update = nullptr;
-      update();
-    });
-  }
+  if (snapshot.result) _restarts.reset();
 }
 
 void StatusWatch::showLine(const std::string& line) {
@@ -73,8 +67,8 @@ void StatusWatch::showLine(const std::string& line) {
 }
 
 void StatusWatch::restartAfter(const std::string& failure) {
+  _refresh.setOnScreen(false);
   _widget.reset();
-  cancel(_update);
   _restart = _context.runLoop.scheduleTimer(_restarts.next(), false, [this](Timer&) {
     _restart = nullptr;
     start();

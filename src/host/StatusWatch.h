@@ -4,14 +4,17 @@
 #include <memory>
 #include <string>
 
+#include "desktop/system/SystemClock.h"
+#include "host/MachineConditions.h"
 #include "host/OnScreenWidget.h"
+#include "host/RefreshRule.h"
 #include "host/WatchedWidget.h"
 
 namespace nimbo {
 
 /// Follows a widget on screen for a status bar: tells a line of `statusBarLine` whenever it is another one than the
-/// line before. The widget keeps its own schedule; what it leaves to its host is done here: a failed update is tried
-/// again, and a process that fails is replaced, both after waiting times that grow. Main thread only.
+/// line before. It asks again by the rule of `RefreshRule`; a process that fails is replaced, after waiting times that
+/// grow. Main thread only.
 class StatusWatch {
  public:
   using Show = std::function<void(const std::string& line)>;
@@ -23,9 +26,8 @@ class StatusWatch {
   StatusWatch(const StatusWatch&) = delete;
   StatusWatch& operator=(const StatusWatch&) = delete;
 
-  // Seconds before the first and the later attempts.
+  /// Seconds before the first and the later attempts to start a process.
   static constexpr TimeInterval kFirstRestart = 1, kLongestRestart = 300;
-  static constexpr TimeInterval kFirstUpdate = 60, kLongestUpdate = 1800;
 
  private:
   void start();
@@ -35,16 +37,16 @@ class StatusWatch {
   void showLine(const std::string& line);
   /// Another process follows later.
   void restartAfter(const std::string& failure);
-  void cancel(std::shared_ptr<Timer>& timer);
 
   const CommandContext& _context;
   WidgetPresentation _presentation;
   Show _show;
   std::string _lastLine;
   Backoff _restarts{kFirstRestart, kLongestRestart};
-  Backoff _updates{kFirstUpdate, kLongestUpdate};
   std::shared_ptr<Timer> _restart;
-  std::shared_ptr<Timer> _update;          // the next attempt after a failed one
+  SystemRandom _random;
+  MachineConditions _conditions{[this] { _refresh.networkReturned(); }};
+  RefreshRule _refresh;
   std::unique_ptr<WatchedWidget> _widget;  // null until it is started again
 };
 

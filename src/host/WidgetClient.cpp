@@ -90,7 +90,7 @@ WidgetClient::WidgetClient(GLibRunLoop& runLoop, const std::vector<std::string>&
   handleOpening(protocol::kOpenUserActivity);
   for (const char* heard :
        {protocol::kPreferredContentSizeDidChange.name, protocol::kLargestAvailableDisplayModeDidChange.name,
-        protocol::kUpdated.name, protocol::kLog.name})
+        protocol::kUpdated.name, protocol::kChanged.name, protocol::kLog.name})
     _connection->setHandler(heard, [](const json&, const JSONRPCResponder&) {});
   _connection->setHandler(protocol::kNotice.name, [this](const json& params, const JSONRPCResponder&) {
     const std::string message = protocol::read<protocol::NoticeParams>(params).message;

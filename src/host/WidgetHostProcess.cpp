@@ -1,7 +1,5 @@
 #include "host/WidgetHostProcess.h"
 
-#include <gio/gio.h>
-
 #include <algorithm>
 #include <stdexcept>
 
@@ -16,12 +14,15 @@ constexpr std::string_view kProcessErrorDomain = "org.nimbo.WidgetHostProcess";
 
 WidgetHostProcess::WidgetHostProcess(GLibRunLoop& runLoop, const Clock& clock, std::vector<std::string> arguments,
                                      Delegate& delegate)
-    : _runLoop(runLoop), _clock(clock), _arguments(std::move(arguments)), _delegate(delegate) {}
+    : _runLoop(runLoop),
+      _clock(clock),
+      _arguments(std::move(arguments)),
+      _delegate(delegate),
+      _refresh(
+          runLoop, _random, [this] { return _conditions.areScarce(); }, [this] { fetch(true); }) {}
 
 WidgetHostProcess::~WidgetHostProcess() {
   if (_hiddenTimer) _hiddenTimer->invalidate();
-  endRetries();
-  if (_networkReturned != 0) g_signal_handler_disconnect(g_network_monitor_get_default(), _networkReturned);
   _questions.clear();  // those who asked go, too
   stop();
 }
@@ -36,7 +37,6 @@ void WidgetHostProcess::setVisible(bool visible) {
     else if (!_gaveUp)
       start();
   } else if (_widget) {
-    endRetries();
     disappear();
     stopLater();
   }
@@ -130,6 +130,8 @@ void WidgetHostProcess::setUpConnection() {
     if (_delegate.wantsLines())
       askForLines([this](const protocol::Lines& lines) { _delegate.widgetLinesDidChange(lines); });
   });
+  client.connection().setHandler(protocol::kChanged.name,
+                                 [this](const auto&, const JSONRPCResponder&) { _refresh.askNow(); });
   client.setNoticeHandler([this](const std::string& message) { _delegate.widgetTells(message); });
   client.setOpenHandler([this](const WidgetClient::Opening& opening) { return _delegate.widgetOpens(opening); });
 }
@@ -138,11 +140,13 @@ void WidgetHostProcess::appear() {
   _appeared = true;
   _widget->ask(protocol::kViewWillAppear);
   _widget->ask(protocol::kViewDidAppear);
+  _refresh.setOnScreen(true);
   askForContent();
 }
 
 void WidgetHostProcess::disappear() {
   _appeared = false;
+  _refresh.setOnScreen(false);
   _widget->ask(protocol::kViewWillDisappear);
   _widget->ask(protocol::kViewDidDisappear);
 }
@@ -159,6 +163,7 @@ void WidgetHostProcess::stop() {
 void WidgetHostProcess::replace(const std::string& reason) {
   _delegate.widgetEnded(reason);
   _appeared = false;
+  _refresh.setOnScreen(false);
   stop();
   setUpdating(false);
   const Date now = _clock.now();
@@ -239,42 +244,23 @@ void WidgetHostProcess::show(const Content& content) {
     _isExpanded = snapshot.expanded;
     setExpandedMode(_wantsExpanded && snapshot.largestAvailableDisplayMode == WidgetDisplayMode::Expanded);
   }
-  if (snapshot.error)
-    retryLater();
-  else if (snapshot.result)
-    endRetries();
   _delegate.widgetDidChange(snapshot, content.lines);
 }
 
-void WidgetHostProcess::retryLater() {
-  if (_retry || _isUpdating || !_visible) return;
-  _retry = _runLoop.scheduleTimer(_retries.next(), false, [this](Timer&) {
-    _retry = nullptr;
-    update();
-  });
-  if (_networkReturned != 0) return;
-  const auto changed = +[](GNetworkMonitor*, gboolean isAvailable, gpointer self) {
-    auto& process = *static_cast<WidgetHostProcess*>(self);
-    if (!isAvailable || !process._retry) return;
-    process.endRetries();
-    process.update();
-  };
-  _networkReturned =
-      g_signal_connect(g_network_monitor_get_default(), "network-changed", reinterpret_cast<GCallback>(changed), this);
-}
-
-void WidgetHostProcess::endRetries() {
-  if (_retry) std::exchange(_retry, nullptr)->invalidate();
-  _retries.reset();
+void WidgetHostProcess::fetch(bool shared, std::function<void(const protocol::UpdateResult&)> completion) {
+  _widget->ask(protocol::kPerformUpdate, {shared},
+               [this, completion = std::move(completion)](const protocol::UpdateResult& result) {
+                 _refresh.answered(result);
+                 if (completion) completion(result);
+                 // Rows of an error stay the same where another one is the reason.
+                 if (completion || result.updateResult == WidgetUpdateResult::Failed) askForContent();
+               });
 }
 
 void WidgetHostProcess::update() {
   if (!_widget || _isUpdating) return;
   setUpdating(true);
-  _widget->ask(protocol::kPerformUpdate, {}, [this](const auto&) {
-    setUpdating(false);
-    askForContent();  // a failure that is the same again is no change, and is to be followed by another attempt
-  });
+  fetch(false, [this](const auto&) { setUpdating(false); });
 }
 
 void WidgetHostProcess::setUpdating(bool updating) {

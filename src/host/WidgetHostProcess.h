@@ -6,7 +6,10 @@
 #include <string>
 #include <vector>
 
+#include "desktop/system/SystemClock.h"
+#include "host/MachineConditions.h"
 #include "host/OnScreenWidget.h"
+#include "host/RefreshRule.h"
 #include "host/WatchedWidget.h"
 #include "platform/SystemServices.h"
 #include "platform/foundation/Outcome.h"
@@ -15,8 +18,8 @@
 namespace nimbo {
 
 /// Keeps a widget process for a host on screen: started when the widget is first shown, told when it is hidden, ended
-/// when it stays hidden, started again after a crash. Nothing waits for the process: what it shows comes to the
-/// delegate. Main thread only.
+/// when it stays hidden, started again after a crash. While the widget can be seen it fetches by the rule of
+/// `RefreshRule`. Nothing waits for the process: what it shows comes to the delegate. Main thread only.
 class WidgetHostProcess {
  public:
   /// Why there is no process.
@@ -62,8 +65,7 @@ class WidgetHostProcess {
   /// Whether the user wants a row for each incident; it is so while the widget offers it.
   void setExpanded(bool expanded);
 
-  /// Fetches now. While the widget can be seen, a fetch that failed is tried again by itself: after `kFirstRetry`, each
-  /// time after twice as long, and when the network returns.
+  /// Fetches now, for the user.
   void update();
   /// Has the delegate hear what the widget shows now, changed or not, while it appears.
   void askForContent();
@@ -86,8 +88,6 @@ class WidgetHostProcess {
   static constexpr TimeInterval kHiddenPatience = 60;
   /// Seconds in which the process answers anything but an update.
   static constexpr TimeInterval kAnswerPatience = 10;
-  /// Seconds from a fetch that failed to the next.
-  static constexpr TimeInterval kFirstRetry = 30, kLongestRetry = 1800;
   /// So many crashes within so many seconds are not the last ones.
   static constexpr std::size_t kCrashLimit = 3;
   static constexpr TimeInterval kCrashWindow = 60;
@@ -126,9 +126,8 @@ class WidgetHostProcess {
   void show(const Content& content);
   void setExpandedMode(bool expanded);
   void setUpdating(bool updating);
-  /// Sees to the next attempt after a fetch that failed.
-  void retryLater();
-  void endRetries();
+  /// Has the process fetch; `completion` hears when that has ended.
+  void fetch(bool shared, std::function<void(const protocol::UpdateResult&)> completion = nullptr);
 
   GLibRunLoop& _runLoop;
   const Clock& _clock;
@@ -141,9 +140,9 @@ class WidgetHostProcess {
   bool _gaveUp = false;
   std::deque<Date> _crashes;
   std::shared_ptr<Timer> _hiddenTimer;
-  Backoff _retries{kFirstRetry, kLongestRetry};
-  std::shared_ptr<Timer> _retry;       // while the next attempt is waited for
-  unsigned long _networkReturned = 0;  // GLib's handler, from the first failure on; 0 before
+  SystemRandom _random;
+  MachineConditions _conditions{[this] { _refresh.networkReturned(); }};
+  RefreshRule _refresh;
 
   // Of the process that runs.
   std::unique_ptr<WatchedWidget> _widget;

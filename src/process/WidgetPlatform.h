@@ -2,6 +2,7 @@
 
 #include "desktop/DesktopPlatform.h"
 #include "desktop/gtfs/feeds/GTFSTransitLineService.h"
+#include "desktop/store/RefreshSetting.h"
 
 namespace nimbo {
 
@@ -17,6 +18,7 @@ class WidgetPlatform final : public DesktopPlatform {
   WidgetPlatform(GTFSTransitLineService& lines, Options& options)
       : DesktopPlatform(std::move(options)), _transitLines(lines) {
     _transitLines.setLanguage(languageTag());
+    _transitLines.setSharedAge([settings = sharedSettings().groupStore()] { return refreshSecondsOf(*settings) / 2; });
   }
   static GTFSTransitLineService& addTransitLines(Options& options) {
     auto lines = std::make_unique<GTFSTransitLineService>(options.paths);

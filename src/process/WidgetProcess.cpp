@@ -8,6 +8,7 @@
 #include "desktop/gtfs/feeds/TransitLineServiceError.h"
 #include "desktop/gtfs/static/LineItems.h"
 #include "desktop/rpc/Base64.h"
+#include "desktop/store/RefreshSetting.h"
 #include "platform/foundation/Version.h"
 #include "platform/ui/Color.h"
 #include "process/HandoffDecoder.h"
@@ -88,8 +89,9 @@ WidgetProcess::WidgetProcess(Options options, int input, int output)
   addViewMethod(protocol::kSetAppearance, &WidgetProcess::setAppearance);
   addViewMethod(protocol::kSetScale, &WidgetProcess::setScale);
   if (_virtualTime) addMethod(protocol::kAdvanceTime, &WidgetProcess::advanceTime);
-  _connection.setHandler(protocol::kPerformUpdate.name,
-                         [this](const json&, const JSONRPCResponder& responder) { performUpdate(responder); });
+  _connection.setHandler(protocol::kPerformUpdate.name, [this](const json& params, const JSONRPCResponder& responder) {
+    performUpdate(paramsOf<protocol::UpdateParams>(params), responder);
+  });
   _connection.setClosedHandler([this] { _runLoop.quit(); });
   _host.setPreferredSizeObserver([this](Size size) { resizeView(size); });
   _host.setContentObserver([this] { announceFrame(); });
@@ -199,6 +201,9 @@ protocol::Nothing WidgetProcess::loadView(const Nothing&) {
 protocol::Nothing WidgetProcess::viewWillAppear(const Nothing&) {
   requireStage({Stage::hidden}, protocol::kViewWillAppear.name);
   _stage = Stage::appearing;
+  _sources = std::make_unique<SourceWatch>(_runLoop, _options.paths, _platform->favoritesEditor(),
+                                           _platform->sharedSettings().groupStore(),
+                                           [this] { notify(_connection, protocol::kChanged, {}); });
   _controller->viewWillAppear(false);
   return {};
 }
@@ -213,6 +218,7 @@ protocol::Nothing WidgetProcess::viewDidAppear(const Nothing&) {
 protocol::Kept WidgetProcess::viewWillDisappear(const Nothing&) {
   requireStage({Stage::appearing, Stage::visible}, protocol::kViewWillDisappear.name);
   _stage = Stage::disappearing;
+  _sources.reset();
   _controller->viewWillDisappear(false);
   SQLiteSharedSettings& settings = _platform->sharedSettings();
   if (const ErrorRef failure = settings.lastFailure()) return {failure->reason()};
@@ -246,17 +252,27 @@ protocol::Nothing WidgetProcess::didReceiveMemoryWarning(const Nothing&) {
   return {};
 }
 
-void WidgetProcess::performUpdate(const JSONRPCResponder& responder) {
+void WidgetProcess::performUpdate(const protocol::UpdateParams& params, const JSONRPCResponder& responder,
+                                  bool isSecond) {
   if (!_controller) throw JSONRPCFailure(JSONRPCError::kInvalidState, "performUpdate needs \"initialize\" first");
-  _controller->widgetPerformUpdateWithCompletionHandler([this, responder](WidgetUpdateResult result) {
-    protocol::UpdateResult answer{.updateResult = result};
-    _controller->transitLineItemResult()->withValue_orError([](const ObjectRef&) {},
-                                                            [&](const ErrorRef& error) {
-                                                              answer.reason = error->reason();
-                                                              if (isDownloading(*error)) answer.isDownloading = true;
-                                                            });
-    responder.answer(protocol::write(answer));
-  });
+  GTFSTransitLineService& lines = _platform->transitLines();
+  if (!params.shared) lines.askServersNext(true);
+  _controller->widgetPerformUpdateWithCompletionHandler(
+      [this, &lines, params, responder, isSecond](WidgetUpdateResult result) {
+        if (!params.shared) lines.askServersNext(false);
+        if (!params.shared && !isSecond && lines.tookShared())
+          return _runLoop.dispatchAsync([this, params, responder] { performUpdate(params, responder, true); });
+        protocol::UpdateResult answer{.updateResult = result,
+                                      .refreshSeconds = refreshSecondsOf(*_platform->sharedSettings().groupStore())};
+        if (const auto youngest = lines.youngestAnswer()) answer.age = std::max(-intervalFromNow(*youngest), 0.0);
+        _controller->transitLineItemResult()->withValue_orError([](const ObjectRef&) {},
+                                                                [&](const ErrorRef& error) {
+                                                                  answer.reason = error->reason();
+                                                                  if (isDownloading(*error))
+                                                                    answer.isDownloading = true;
+                                                                });
+        responder.answer(protocol::write(answer));
+      });
 }
 
 protocol::Nothing WidgetProcess::setActiveDisplayMode(const protocol::ActiveDisplayModeParams& params) {

@@ -8,6 +8,7 @@
 #include "platform/VirtualTime.h"
 #include "process/FeedRequests.h"
 #include "process/RemoteHost.h"
+#include "process/SourceWatch.h"
 #include "process/WidgetPlatform.h"
 #include "protocol/Methods.h"
 #include "widget/NBTransitIncidentsViewController.h"
@@ -71,7 +72,8 @@ class WidgetProcess {
   protocol::Handoff decode(const protocol::DecodeParams& params);
   Nothing cancel(const protocol::CancelParams& params);
   Nothing shutdown(const Nothing&);
-  void performUpdate(const JSONRPCResponder& responder);
+  /// A second attempt is of one that had joined a fetch for which no server was asked.
+  void performUpdate(const protocol::UpdateParams& params, const JSONRPCResponder& responder, bool isSecond = false);
 
   void makePlatform(const std::string& locale);
   /// When the fetch ended that the rows are of; absent where that is not known.
@@ -95,6 +97,7 @@ class WidgetProcess {
   std::unique_ptr<WidgetPlatform> _platform;    // null until initialized, or asked for feeds
   std::unique_ptr<FeedRequests> _feedRequests;  // with the platform, on which it works
   std::shared_ptr<NBTransitIncidentsViewController> _controller;
+  std::unique_ptr<SourceWatch> _sources;  // while it can be seen
   Stage _stage = Stage::created;
   bool _hostChoseMode = false;
   bool _frameAnnounced = false;

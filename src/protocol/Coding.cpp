@@ -34,6 +34,9 @@ constexpr Rules kLength{.least = 0, .most = 100000};
 /// Device pixels for each point.
 constexpr Rules kScale{.least = 0.25, .most = 8};
 
+/// As the setting has it.
+constexpr Rules kRefreshSeconds{.mayBeLeftOut = true, .least = 30, .most = 3600};
+
 constexpr Rules mayBeLeftOut(Rules rules) {
   rules.mayBeLeftOut = true;
   return rules;
@@ -84,9 +87,13 @@ template <>
 constexpr std::tuple kFields<Initialized>{Field{"name", &Initialized::name}, Field{"version", &Initialized::version},
                                           Field{"protocol", &Initialized::protocol}};
 template <>
+constexpr std::tuple kFields<UpdateParams>{Field{"shared", &UpdateParams::shared, kMayBeLeftOut}};
+template <>
 constexpr std::tuple kFields<UpdateResult>{Field{"updateResult", &UpdateResult::updateResult},
                                            Field{"reason", &UpdateResult::reason, kMayBeLeftOut},
-                                           Field{"downloading", &UpdateResult::isDownloading, kMayBeLeftOut}};
+                                           Field{"downloading", &UpdateResult::isDownloading, kMayBeLeftOut},
+                                           Field{"age", &UpdateResult::age, Rules{.mayBeLeftOut = true, .least = 0}},
+                                           Field{"refreshSeconds", &UpdateResult::refreshSeconds, kRefreshSeconds}};
 template <>
 constexpr std::tuple kFields<Kept>{Field{"failure", &Kept::failure, kMayBeLeftOut}};
 template <>
@@ -603,6 +610,7 @@ NIMBO_MESSAGE(Nothing);
 NIMBO_MESSAGE(DisplayModes);
 NIMBO_MESSAGE(InitializeParams);
 NIMBO_MESSAGE(Initialized);
+NIMBO_MESSAGE(UpdateParams);
 NIMBO_MESSAGE(UpdateResult);
 NIMBO_MESSAGE(Kept);
 NIMBO_MESSAGE(ActiveDisplayModeParams);

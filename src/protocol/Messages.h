@@ -50,10 +50,16 @@ struct Initialized {
   std::int64_t protocol = 0;
 };
 
+struct UpdateParams {
+  bool shared = false;  ///< an answer that any process got within the last half of the refresh time serves
+};
+
 struct UpdateResult {
   WidgetUpdateResult updateResult = WidgetUpdateResult::NewData;
   std::optional<std::string> reason;  ///< of a failure
   std::optional<bool> isDownloading;  ///< true where it is for want of a static feed that is still coming
+  std::optional<double> age;          ///< seconds since the youngest answer of a server came; absent without servers
+  double refreshSeconds = 60;         ///< as the user has it, whatever became of the update
 };
 
 /// What became of the rows that are kept for the next start.

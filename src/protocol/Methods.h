@@ -29,7 +29,7 @@ inline constexpr Method<Nothing> kViewDidAppear{"viewDidAppear"};
 inline constexpr Method<Nothing, Kept> kViewWillDisappear{"viewWillDisappear"};
 inline constexpr Method<Nothing> kViewDidDisappear{"viewDidDisappear"};
 inline constexpr Method<Nothing> kDidReceiveMemoryWarning{"didReceiveMemoryWarning"};
-inline constexpr Method<Nothing, UpdateResult> kPerformUpdate{"performUpdate", true};
+inline constexpr Method<UpdateParams, UpdateResult> kPerformUpdate{"performUpdate", true};
 inline constexpr Method<ActiveDisplayModeParams> kSetActiveDisplayMode{"setActiveDisplayMode"};
 inline constexpr Method<TransitionParams> kTransitionToSize{"transitionToSize"};
 inline constexpr Method<TextSizeParams> kSetTextSize{"setTextSize"};
@@ -59,6 +59,7 @@ inline constexpr Notification<LargestDisplayModeParams> kLargestAvailableDisplay
     "largestAvailableDisplayModeDidChange"};
 inline constexpr Notification<Nothing> kFrame{"frame"};
 inline constexpr Notification<Nothing> kUpdated{"updated"};
+inline constexpr Notification<Nothing> kChanged{"changed"};
 inline constexpr Notification<NoticeParams> kNotice{"notice"};
 inline constexpr Notification<ProgressParams> kProgress{"progress"};
 inline constexpr Notification<LogParams> kLog{"log"};

@@ -235,6 +235,15 @@ Outcome<Favorites> FavoritesEditor::list() const { return read(Loss::isError); }
 
 Outcome<Favorites> FavoritesEditor::left() const { return read(Loss::isPassedOver); }
 
+std::int64_t FavoritesEditor::mark() const {
+  std::int64_t mark = 0;
+  const ErrorRef unread = _database->read([&](SQLiteConnection& connection) -> ErrorRef {
+    if (wereSet(connection)) mark = connection.integer("SELECT digest FROM favorites_seal");
+    return nullptr;
+  });
+  return unread ? 0 : mark;
+}
+
 Outcome<Favorites> FavoritesEditor::read(Loss loss) const {
   std::optional<Favorites> stored;
   const auto readOnce = [&] {

@@ -42,6 +42,9 @@ class FavoritesEditor final {
   /// The same, but after such damage those that are left.
   Outcome<Favorites> left() const;
 
+  /// Tells one state of the favourites from another: 0 while none were ever set, or where they cannot be read.
+  std::int64_t mark() const;
+
   // The first change begins from the first favourites. Each answers null on success.
 
   /// Appends lines (none of them null). Refused when one is a favourite already.

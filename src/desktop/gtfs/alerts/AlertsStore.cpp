@@ -1,17 +1,16 @@
 #include "desktop/gtfs/alerts/AlertsStore.h"
 
+#include <fcntl.h>
+
 #include <algorithm>
 #include <array>
 #include <charconv>
 #include <cmath>
-#include <ctime>
-#include <iomanip>
-#include <locale>
-#include <sstream>
 
 #include "desktop/gtfs/feeds/OtherContent.h"
 #include "desktop/gtfs/feeds/TransitLineServiceError.h"
 #include "desktop/gtfs/net/FileReading.h"
+#include "desktop/gtfs/net/ServerWishes.h"
 #include "desktop/gtfs/static/StaticFeed.h"
 #include "desktop/system/AtomicFile.h"
 #include "platform/SystemServices.h"
@@ -59,16 +58,6 @@ std::optional<TimeInterval> longestAgeOf(const Feed& feed, const AlertsState& st
   if (limit.count() == 0) return std::nullopt;
   const auto seconds = static_cast<TimeInterval>(std::chrono::seconds(limit).count());
   return isRemote && !state.timestamp ? std::max(seconds, kLongestUndated) : seconds;
-}
-
-/// The date of a Last-Modified field; absent for one that is none. Source: RFC 9110, section 5.6.7.
-std::optional<Date> dateOfHTTPText(const std::string& text) {
-  std::tm parts{};
-  std::istringstream in(text);
-  in.imbue(std::locale::classic());
-  in >> std::get_time(&parts, "%a, %d %b %Y %H:%M:%S GMT");
-  if (in.fail()) return std::nullopt;
-  return dateFromUnixTime(static_cast<TimeInterval>(::timegm(&parts)));
 }
 
 Outcome<AlertsFeed> readBody(const Feed& feed, std::string body) {
@@ -137,15 +126,51 @@ std::optional<KeptAlerts> readKept(const std::filesystem::path& path, const Feed
   return kept;
 }
 
-/// Lets the file at `path` be as old as the answer in it, unless another process has replaced it.
+/// Lets the file at `path` be as old as the answer in it, unless another process has put another answer there.
 void confirm(const std::filesystem::path& path, AlertsState& state) {
-  if (fileFingerprint(path) != state.file) return state.file.clear();
+  if (fileFingerprint(path) != state.file)
+    if (const auto other = readKept(path, *state.feed); !other || other->state.hash != state.hash)
+      return state.file.clear();
   if (const ErrorRef error = setFileChangeDate(path, state.fetchedAt)) logCacheFailure(error->reason());
   state.file = fileFingerprint(path);
 }
 
-void write(const std::filesystem::path& path, AlertsState& state, const std::string& body) {
-  if (const TimeInterval age = ageOf(state.writtenAt); age >= 0 && age < kShortestBetweenWritings) return;
+/// Keeps a date as the time of an empty file; one that is over needs none.
+void keepDate(const std::filesystem::path& path, std::optional<Date> date) {
+  if (const auto kept = fileChangeDate(path); !date && (!kept || *kept <= currentDate())) return;
+  if (const ErrorRef error = makeFolders(path.parent_path())) return logCacheFailure(error->reason());
+  const FileDescriptor file(::open(path.c_str(), O_WRONLY | O_CREAT | O_CLOEXEC | O_NOFOLLOW | O_NONBLOCK, 0600));
+  if (const ErrorRef error = setFileChangeDate(path, date.value_or(currentDate()))) logCacheFailure(error->reason());
+}
+
+/// A date that was kept and is to come, in no more than `longest` seconds: a clock that was set back holds nothing up.
+std::optional<Date> keptDate(const std::filesystem::path& path, TimeInterval longest) {
+  const auto date = fileChangeDate(path);
+  const TimeInterval wait = date ? intervalFromNow(*date) : 0;
+  return wait > 0 && wait <= longest ? date : std::nullopt;
+}
+
+ErrorRef waitsForServer(const Feed& feed, Date until) {
+  return transitLineServiceError(TransitLineServiceError::serverFailure,
+                                 "Cannot fetch " + feed.alerts.publicText() +
+                                     ": its server does not want to be asked before " +
+                                     ageText(std::ceil(intervalFromNow(until) / 60) * 60) + " have passed.",
+                                 feed.alerts.publicText());
+}
+
+}  // namespace
+
+void AlertsStore::keepWishes(const Feed& feed, const HTTPWishes& wishes, bool hasFailed) const {
+  const std::string address = feed.alerts.identity();
+  if (hasFailed) return keepDate(_cache.retryAt(address), retryDateOf(wishes, currentDate()));
+  const TimeInterval freshness = freshnessOf(wishes);
+  keepDate(_cache.freshUntil(address),
+           freshness > 0 ? std::optional(dateByAdding(currentDate(), freshness)) : std::nullopt);
+}
+
+void AlertsStore::write(const std::filesystem::path& path, AlertsState& state, const std::string& body) const {
+  const TimeInterval age = ageOf(state.writtenAt);
+  if (age >= 0 && age < kShortestBetweenWritings && !(_users && _users->hasOthers())) return;
   std::string bytes(kFirstLine);
   for (const std::string& line :
        {state.feed->alerts.identity(), state.validators.etag, state.validators.lastModified, textOf(state.changedAt),
@@ -157,8 +182,6 @@ void write(const std::filesystem::path& path, AlertsState& state, const std::str
   state.file = fileFingerprint(path);
   confirm(path, state);
 }
-
-}  // namespace
 
 ErrorRef AlertsStore::staleness(const Feed& feed, const AlertsState& state) {
   const auto longest = longestAgeOf(feed, state);
@@ -201,14 +224,18 @@ Outcome<std::optional<AlertsFeed>> AlertsStore::fetchRemote(const Feed& feed, Al
   if (kept && !state.feed) state = kept->state;
   // A server may leave out what is held, or not needed.
   const HTTPValidators known = !needsFeed ? state.validators : kept ? kept->state.validators : HTTPValidators();
+  if (const auto retryAt = keptDate(_cache.retryAt(feed.alerts.identity()), kLongestRetryAfter))
+    return waitsForServer(feed, *retryAt);
   std::string body;
-  const auto answer =
-      HTTPFetcher::fetch({feed.alerts, known, kLargestAlerts, kFetchTimeLimit}, stop, [&](std::string_view piece) {
-        // The next answer is mostly as large, and growing copies all of it.
-        if (body.empty()) body.reserve(state.size + state.size / 16);
-        body += piece;
-        return true;
-      });
+  HTTPWishes wishes;
+  const auto answer = HTTPFetcher::fetch({feed.alerts, known, kLargestAlerts, kFetchTimeLimit, &wishes}, stop,
+                                         [&](std::string_view piece) {
+                                           // The next answer is mostly as large, and growing copies all of it.
+                                           if (body.empty()) body.reserve(state.size + state.size / 16);
+                                           body += piece;
+                                           return true;
+                                         });
+  keepWishes(feed, wishes, !answer);
   if (!answer) return answer.error();
   const bool isKept = kept && (answer->isUnchanged || body == kept->body);
   if (isKept) body = std::move(kept->body);
@@ -269,8 +296,49 @@ Outcome<std::optional<AlertsFeed>> AlertsStore::lastAnswer(const Feed& feed, Ale
   return alerts;
 }
 
+bool AlertsStore::takeShared(const Feed& feed, AlertsState& state, bool needsFeed, Date notBefore,
+                             std::optional<AlertsFeed>& alerts) const {
+  if (notBefore == kNow) return false;
+  const std::filesystem::path path = _cache.alerts(feed.nameOfAlerts());
+  const bool servesStill = keptDate(_cache.freshUntil(feed.alerts.identity()), kLongestFreshness).has_value();
+  const auto serves = [&](Date answered) {
+    return answered <= currentDate() &&
+           (answered >= notBefore || (servesStill && ageOf(answered) <= kLongestFreshness));
+  };
+  std::optional<KeptAlerts> kept;
+  const auto written = fileChangeDate(path);
+  // The answer in the file is another process's, or wanted whole.
+  if (written && serves(*written) && (needsFeed || !state.feed || fileFingerprint(path) != state.file))
+    kept = readKept(path, feed);
+  const bool isSame = kept && state.feed && kept->state.hash == state.hash;
+  if (kept && state.feed && !isSame &&
+      (kept->state.fetchedAt < state.fetchedAt || isOlder(kept->state.timestamp, state.timestamp)))
+    kept.reset();
+  if (kept) {
+    AlertsState& found = kept->state;
+    if (needsFeed || !isSame) {
+      auto read = readBody(feed, std::move(kept->body));
+      if (!read) return false;
+      alerts = std::move(*read);
+    }
+    found.writtenAt = state.writtenAt;
+    found.madeAt = dateOf(found);
+    if (staleness(feed, found)) return false;
+    state = std::move(found);
+    return true;
+  }
+  return !needsFeed && state.feed && serves(state.fetchedAt) && !staleness(feed, state);
+}
+
 Outcome<std::optional<AlertsFeed>> AlertsStore::load(const Feed& feed, AlertsState& state, bool needsFeed,
-                                                     const std::stop_token& stop) const {
+                                                     const std::stop_token& stop, Date notBefore) const {
+  if (state.feed && state.feed != feed) state = {};
+  if (feed.alerts.isRemote()) {
+    if (_users) _users->join();
+    std::optional<AlertsFeed> alerts;
+    state.isShared = takeShared(feed, state, needsFeed, notBefore, alerts);
+    if (state.isShared) return alerts;
+  }
   auto fetched = fetch(feed, state, needsFeed, stop);
   if (!fetched) return feed.alerts.isRemote() ? lastAnswer(feed, state, needsFeed, fetched.error()) : fetched;
   if (ErrorRef error = staleness(feed, state)) return error;

@@ -1,6 +1,7 @@
 #pragma once
 
 #include <filesystem>
+#include <memory>
 #include <optional>
 #include <stop_token>
 #include <string>
@@ -27,6 +28,7 @@ struct AlertsState {
   Date changedAt = {};    ///< when the bytes were first seen
   Date writtenAt = {};    ///< when this process last wrote the cache for this feed
   std::string file = {};  ///< the cache file as it was left with these bytes (fileFingerprint); empty without them
+  bool isShared = false;  ///< the last load took an answer that was there, of whichever process
 };
 
 /// Gets the present alerts of a feed. They count for as long after they were made as the feed's setting says: by
@@ -35,18 +37,26 @@ struct AlertsState {
 /// thread; any thread.
 ///
 /// The last good answer of a server is kept in the cache, which is written when an answer differs from the one before,
-/// and at most every ten minutes; its file is as old as the server's last word that this is the present state.
+/// and at most every ten minutes while no other process goes by it; its file is as old as the server's last word that
+/// this is the present state. So all processes with a cache share what one of them was answered, and what a server
+/// wishes: for how long an answer serves, and, once it has failed, when it is to be asked again (ServerWishes.h).
 class AlertsStore {
  public:
-  explicit AlertsStore(FeedCache cache) : _cache(std::move(cache)) {}
+  /// Without `users` no other process goes by the cache.
+  explicit AlertsStore(FeedCache cache, std::shared_ptr<CacheUsers> users = nullptr)
+      : _cache(std::move(cache)), _users(std::move(users)) {}
 
-  /// The present alerts; absent when their bytes are those of `state` and the feed is not needed (`needsFeed`). When
-  /// the server fails, the last answer stands in for at most 15 minutes. `state` is that of the last call for this
-  /// feed, and becomes that of this one.
+  /// Asks the server whatever was answered before.
+  static constexpr Date kNow = Date::max();
+
+  /// The present alerts; absent when their bytes are those of `state` and the feed is not needed (`needsFeed`). An
+  /// answer that is no older than `notBefore`, or that its server lets serve still, is taken without asking, unless it
+  /// is stale. When the server fails, or does not want to be asked yet, the last answer stands in for at most 15
+  /// minutes. `state` is that of the last call for this feed, and becomes that of this one.
   Outcome<std::optional<AlertsFeed>> load(const Feed& feed, AlertsState& state, bool needsFeed,
-                                          const std::stop_token& stop) const;
+                                          const std::stop_token& stop, Date notBefore = kNow) const;
 
-  /// The same of what the source says now, however old.
+  /// The same of what the source says now, however old, but from a server that does not want to be asked yet.
   Outcome<std::optional<AlertsFeed>> fetch(const Feed& feed, AlertsState& state, bool needsFeed,
                                            const std::stop_token& stop) const;
 
@@ -55,13 +65,21 @@ class AlertsStore {
   static ErrorRef staleness(const Feed& feed, const AlertsState& state);
 
  private:
+  /// Whether an answer was there that serves: then `alerts` is what `load` answers.
+  bool takeShared(const Feed& feed, AlertsState& state, bool needsFeed, Date notBefore,
+                  std::optional<AlertsFeed>& alerts) const;
   Outcome<std::optional<AlertsFeed>> fetchLocal(const Feed& feed, AlertsState& state, bool needsFeed) const;
   Outcome<std::optional<AlertsFeed>> fetchRemote(const Feed& feed, AlertsState& state, bool needsFeed,
                                                  const std::stop_token& stop) const;
   Outcome<std::optional<AlertsFeed>> lastAnswer(const Feed& feed, AlertsState& state, bool needsFeed,
                                                 const ErrorRef& failure) const;
 
+  /// Keeps what a server wishes for all processes; the date at which it is to be asked again is of a failure.
+  void keepWishes(const Feed& feed, const HTTPWishes& wishes, bool hasFailed) const;
+  void write(const std::filesystem::path& path, AlertsState& state, const std::string& body) const;
+
   FeedCache _cache;
+  std::shared_ptr<CacheUsers> _users;  // null: none
 };
 
 }  // namespace nimbo

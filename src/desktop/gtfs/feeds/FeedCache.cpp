@@ -1,10 +1,13 @@
 #include "desktop/gtfs/feeds/FeedCache.h"
 
+#include <fcntl.h>
+
 #include <cstdio>
 #include <system_error>
 #include <vector>
 
 #include "desktop/gtfs/feeds/TransitLineServiceError.h"
+#include "desktop/system/AtomicFile.h"
 #include "platform/foundation/Hash.h"
 
 namespace nimbo {
@@ -30,6 +33,22 @@ void FeedCache::removeNamed(std::string_view feed) const {
   for (const auto& entry : std::filesystem::directory_iterator(_folder, ignored))
     if (entry.path().filename().native().find(mark) != std::string::npos) paths.push_back(entry.path());
   for (const auto& path : paths) std::filesystem::remove(path, ignored);
+}
+
+void CacheUsers::join() {
+  const std::lock_guard guard(_lock);
+  if (_file || makeFolders(_folder)) return;
+  _file = FileDescriptor(::open((_folder / "users").c_str(), O_RDWR | O_CREAT | O_CLOEXEC | O_NOFOLLOW, 0600));
+  struct flock mine {};
+  mine.l_type = F_RDLCK;
+  if (_file) ::fcntl(_file.get(), F_OFD_SETLK, &mine);
+}
+
+bool CacheUsers::hasOthers() {
+  const std::lock_guard guard(_lock);
+  struct flock others {};
+  others.l_type = F_WRLCK;
+  return _file && ::fcntl(_file.get(), F_OFD_GETLK, &others) == 0 && others.l_type != F_UNLCK;
 }
 
 void logCacheFailure(const std::string& reason) {

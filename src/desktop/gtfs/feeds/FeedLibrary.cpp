@@ -23,7 +23,7 @@ Outcome<std::vector<FeedSourceRef>> FeedLibrary::sources() const {
   for (const Feed& feed : *feeds) {
     auto& shared = alerts[feed.nameOfAlerts()];
     if (!shared) shared = std::make_shared<SharedAlerts>();
-    sources.push_back(std::make_shared<const ConfiguredFeedSource>(feed, _cache, _downloads, shared));
+    sources.push_back(std::make_shared<const ConfiguredFeedSource>(feed, _cache, _users, _downloads, shared));
   }
   if (sources.empty()) sources.push_back(sampleCity());
   return sources;

@@ -19,6 +19,7 @@ class FeedLibrary {
   explicit FeedLibrary(const Paths& paths)
       : _configuration(paths.config),
         _cache(paths.cache),
+        _users(std::make_shared<CacheUsers>(paths.cache)),
         _downloads(std::make_shared<StaticFeedDownloads>(FeedCache(paths.cache))) {}
 
   /// In the user's order, by the configuration as it is now.
@@ -36,6 +37,7 @@ class FeedLibrary {
 
   FeedConfiguration _configuration;
   FeedCache _cache;
+  std::shared_ptr<CacheUsers> _users;
   std::shared_ptr<StaticFeedDownloads> _downloads;
   mutable std::mutex _lock;
   mutable FeedSourceRef _sampleCity;  // made when first needed; its dates begin then

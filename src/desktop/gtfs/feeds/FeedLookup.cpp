@@ -100,18 +100,22 @@ std::vector<std::optional<FoundLine>> findLines(const StaticFeed& feed, const st
 }
 
 Outcome<FeedAnswer> lookUpInFeed(const FeedSource& source, std::span<const MapItemIdentifierRef> identifiers,
-                                 std::string_view language, HeldAnswer& held, const std::stop_token& stop) {
+                                 std::string_view language, HeldAnswer& held, Date notBefore,
+                                 const std::stop_token& stop) {
   const auto loaded = source.staticFeed(stop);
   if (!loaded) return loaded.error();
   const StaticFeed& feed = loaded->feed;
   HeldAnswer::Question question = questionOf(feed, identifiers, language);
   const bool isHeld = held.question == question && held.hash == held.alerts.hash && holds(held, currentDate());
-  FeedAnswer answer{TransitLineItems(identifiers.size()), std::nullopt};
+  FeedAnswer answer{TransitLineItems(identifiers.size()), {}, {}};
   std::vector<std::optional<FoundLine>> lines;
   if (!isHeld) lines = findLines(feed, source.name(), identifiers);
   if (!isHeld && std::ranges::none_of(lines, [](const auto& line) { return line.has_value(); })) return answer;
-  const auto alerts = source.alerts(held.alerts, !isHeld, stop);
+  const auto alerts = source.alerts(held.alerts, !isHeld, notBefore, stop);
   if (!alerts) return alerts.error();
+  FeedAnswer& told = *alerts ? answer : held.answer;
+  if (held.alerts.fetchedAt != Date()) told.answeredAt = held.alerts.fetchedAt;
+  told.isShared = held.alerts.isShared;
   if (!*alerts) return held.answer;
   if (isHeld) lines = findLines(feed, source.name(), identifiers);
   answer.asOf = (*alerts)->timestamp();

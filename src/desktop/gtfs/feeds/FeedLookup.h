@@ -26,6 +26,8 @@ std::vector<std::optional<FoundLine>> findLines(const StaticFeed& feed, const st
 struct FeedAnswer {
   TransitLineItems items;    ///< one for each identifier, null for one whose line `findLines` does not find
   std::optional<Date> asOf;  ///< when the publisher made the alerts; absent when he does not say, or none were needed
+  std::optional<Date> answeredAt;  ///< when the alerts' server answered; absent without one
+  bool isShared = false;           ///< that answer was there: no server was asked
 };
 
 /// What is held of a feed from one lookup to the next: the same question to the same bytes has the same answer, object
@@ -46,8 +48,9 @@ struct HeldAnswer {
 
 /// Looks lines up in one feed: an answer when there is a verdict on every line, else the reason why there is none:
 /// their static data and their incidents by the alerts as they are now, texts in `language` (a BCP 47 tag). `held` is
-/// that of the last lookup in this feed. Blocks its thread.
+/// that of the last lookup in this feed; `notBefore` is as `AlertsStore::load` has it. Blocks its thread.
 Outcome<FeedAnswer> lookUpInFeed(const FeedSource& source, std::span<const MapItemIdentifierRef> identifiers,
-                                 std::string_view language, HeldAnswer& held, const std::stop_token& stop);
+                                 std::string_view language, HeldAnswer& held, Date notBefore,
+                                 const std::stop_token& stop);
 
 }  // namespace nimbo

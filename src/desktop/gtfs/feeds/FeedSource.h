@@ -24,7 +24,7 @@ class FeedSource {
   virtual bool minorAlerts() const = 0;
   virtual Outcome<LoadedStaticFeed> staticFeed(const std::stop_token& stop) const = 0;
   /// The present alerts, fresh enough to say "good service" by: as `AlertsStore::load`.
-  virtual Outcome<std::optional<AlertsFeed>> alerts(AlertsState& state, bool needsFeed,
+  virtual Outcome<std::optional<AlertsFeed>> alerts(AlertsState& state, bool needsFeed, Date notBefore,
                                                     const std::stop_token& stop) const = 0;
   /// Whether another feed that is read by the same alerts has a route.
   virtual std::function<bool(std::string_view routeID)> isRouteOfOther(const std::stop_token&) const { return {}; }
@@ -34,10 +34,10 @@ class FeedSource {
 class SharedAlerts {
  public:
   Outcome<std::optional<AlertsFeed>> load(const AlertsStore& store, const Feed& feed, AlertsState& state,
-                                          const std::stop_token& stop) {
+                                          Date notBefore, const std::stop_token& stop) {
     const std::lock_guard guard(_lock);
     if (!_alerts) {
-      _alerts = store.load(feed, state, true, stop);
+      _alerts = store.load(feed, state, true, stop, notBefore);
       _state = state;
     } else {
       state = _state;
@@ -56,19 +56,22 @@ class SharedAlerts {
 class ConfiguredFeedSource final : public FeedSource {
  public:
   /// `shared` is one for all feeds that are read by these alerts.
-  ConfiguredFeedSource(Feed feed, const FeedCache& cache, std::shared_ptr<StaticFeedDownloads> downloads,
-                       std::shared_ptr<SharedAlerts> shared)
-      : _feed(std::move(feed)), _staticFeeds(std::move(downloads)), _alerts(cache), _shared(std::move(shared)) {}
+  ConfiguredFeedSource(Feed feed, const FeedCache& cache, std::shared_ptr<CacheUsers> users,
+                       std::shared_ptr<StaticFeedDownloads> downloads, std::shared_ptr<SharedAlerts> shared)
+      : _feed(std::move(feed)),
+        _staticFeeds(std::move(downloads)),
+        _alerts(cache, std::move(users)),
+        _shared(std::move(shared)) {}
 
   const std::string& name() const override { return _feed.name; }
   bool minorAlerts() const override { return _feed.minorAlerts; }
   Outcome<LoadedStaticFeed> staticFeed(const std::stop_token& stop) const override {
     return _staticFeeds->load(_feed, stop);
   }
-  Outcome<std::optional<AlertsFeed>> alerts(AlertsState& state, bool needsFeed,
+  Outcome<std::optional<AlertsFeed>> alerts(AlertsState& state, bool needsFeed, Date notBefore,
                                             const std::stop_token& stop) const override {
-    return _feed.siblings.empty() ? _alerts.load(_feed, state, needsFeed, stop)
-                                  : _shared->load(_alerts, _feed, state, stop);
+    return _feed.siblings.empty() ? _alerts.load(_feed, state, needsFeed, stop, notBefore)
+                                  : _shared->load(_alerts, _feed, state, notBefore, stop);
   }
   std::function<bool(std::string_view routeID)> isRouteOfOther(const std::stop_token& stop) const override {
     if (_feed.siblings.empty()) return {};

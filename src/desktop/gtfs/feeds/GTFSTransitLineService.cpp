@@ -24,7 +24,8 @@ struct GTFSTransitLineService::Shared {
   std::map<std::string, Date> asOf;
   std::vector<KnownIncident> known;
   std::vector<LineVerdict> verdicts;
-  std::optional<Date> updatedAt;
+  std::optional<Date> updatedAt, youngestAnswer;
+  bool tookShared = false;
 };
 
 namespace {
@@ -66,9 +67,10 @@ Outcome<std::vector<FeedPart>> partsOf(const std::vector<MapItemIdentifierRef>& 
   return parts;
 }
 
-Outcome<FeedAnswer> lookUpPart(const FeedPart& part, const std::string& language, const std::stop_token& stop) {
+Outcome<FeedAnswer> lookUpPart(const FeedPart& part, const std::string& language, Date notBefore,
+                               const std::stop_token& stop) {
   try {
-    return lookUpInFeed(*part.source, part.identifiers, language, *part.held, stop);
+    return lookUpInFeed(*part.source, part.identifiers, language, *part.held, notBefore, stop);
   } catch (const std::exception& exception) {
     return transitLineServiceError(
         TransitLineServiceError::internal,
@@ -80,7 +82,9 @@ struct Answer {
   TransitLineItems items;         ///< one for each identifier, null for lines that are gone or unknown
   std::vector<ErrorRef> reasons;  ///< one for each, null but for lines of feeds that failed
   std::map<std::string, Date> asOf;
-  ErrorRef error;                    ///< of the first feed that failed; null without one
+  ErrorRef error;                        ///< of the first feed that failed; null without one
+  std::optional<Date> oldest, youngest;  ///< answers of servers
+  bool tookShared = false;
   std::vector<KnownIncident> known;  ///< of the other feeds, with an error
 };
 
@@ -100,18 +104,20 @@ std::vector<KnownIncident> incidentsInForce(const TransitLineItems& items) {
 }
 
 Outcome<Answer> lookUpAll(const std::vector<MapItemIdentifierRef>& identifiers, const FeedLibrary& library,
-                          std::map<std::string, HeldAnswer>& held, const std::string& language,
+                          std::map<std::string, HeldAnswer>& held, const std::string& language, Date notBefore,
                           const std::stop_token& stop) {
-  Answer all{TransitLineItems(identifiers.size()), std::vector<ErrorRef>(identifiers.size()), {}, nullptr, {}};
+  Answer all;
+  all.items.resize(identifiers.size());
+  all.reasons.resize(identifiers.size());
   const auto parts = partsOf(identifiers, library, held, all.reasons);
   if (!parts) return parts.error();
   std::vector<std::future<Outcome<FeedAnswer>>> others;
   // Deferred where no thread can start: then one feed waits for another.
   for (std::size_t i = 1; i < parts->size(); ++i)
     others.push_back(std::async(std::launch::async | std::launch::deferred,
-                                [&, i] { return lookUpPart((*parts)[i], language, stop); }));
+                                [&, i] { return lookUpPart((*parts)[i], language, notBefore, stop); }));
   std::vector<Outcome<FeedAnswer>> answers;
-  if (!parts->empty()) answers.push_back(lookUpPart(parts->front(), language, stop));
+  if (!parts->empty()) answers.push_back(lookUpPart(parts->front(), language, notBefore, stop));
   for (auto& other : others) answers.push_back(other.get());
 
   for (std::size_t i = 0; i < answers.size(); ++i) {
@@ -124,6 +130,11 @@ Outcome<Answer> lookUpAll(const std::vector<MapItemIdentifierRef>& identifiers, 
     for (std::size_t k = 0; k < answers[i]->items.size(); ++k)
       if (TransitLineItemRef& item = all.items[part.places[k]]; !item) item = answers[i]->items[k];
     if (answers[i]->asOf) all.asOf.emplace(part.source->name(), *answers[i]->asOf);
+    all.tookShared = all.tookShared || answers[i]->isShared;
+    if (const auto& answered = answers[i]->answeredAt) {
+      all.oldest = std::min(all.oldest.value_or(*answered), *answered);
+      all.youngest = std::max(all.youngest.value_or(*answered), *answered);
+    }
   }
   for (std::size_t i = 0; i < all.items.size(); ++i) {
     // A line that is only a number may be of another feed than the one that failed.
@@ -209,6 +220,16 @@ std::optional<Date> GTFSTransitLineService::updatedAt() const {
 
 const FeedLibrary& GTFSTransitLineService::library() const { return _shared->library; }
 
+bool GTFSTransitLineService::tookShared() const {
+  const std::lock_guard guard(_shared->lock);
+  return _shared->tookShared;
+}
+
+std::optional<Date> GTFSTransitLineService::youngestAnswer() const {
+  const std::lock_guard guard(_shared->lock);
+  return _shared->youngestAnswer;
+}
+
 std::map<std::string, Date> GTFSTransitLineService::asOf() const {
   const std::lock_guard guard(_shared->lock);
   return _shared->asOf;
@@ -224,6 +245,8 @@ void GTFSTransitLineService::lookup(const std::vector<MapItemIdentifierRef>& ide
     if (answered) answered();
     answer(items, error);
   };
+  const bool asks = _asksServers.exchange(false) || !_sharedAge;
+  const Date notBefore = asks ? AlertsStore::kNow : dateByAdding(currentDate(), -_sharedAge());
   std::stop_source giveUp;
   const auto due =
       DueAnswer::start([shared = _shared, serviceStop = _stop.get_token(), giveUp, identifiers, handler]() mutable {
@@ -236,7 +259,7 @@ void GTFSTransitLineService::lookup(const std::vector<MapItemIdentifierRef>& ide
         }
         if (!serviceStop.stop_requested()) handler({}, error);
       });
-  const auto work = [shared = _shared, due, giveUp, serviceStop = _stop.get_token(), identifiers, handler] {
+  const auto work = [shared = _shared, due, giveUp, serviceStop = _stop.get_token(), identifiers, notBefore, handler] {
     if (due->isClaimed()) return;
     const std::stop_callback endWithService(serviceStop, [giveUp = giveUp]() mutable { giveUp.request_stop(); });
     const std::stop_token stop = giveUp.get_token();
@@ -248,7 +271,7 @@ void GTFSTransitLineService::lookup(const std::vector<MapItemIdentifierRef>& ide
     TransitLineItems items;
     ErrorRef error;
     try {
-      auto outcome = lookUpAll(identifiers, shared->library, shared->held, language, stop);
+      auto outcome = lookUpAll(identifiers, shared->library, shared->held, language, notBefore, stop);
       if (due->isClaimed()) return;
       error = outcome ? outcome->error : outcome.error();
       auto verdicts = verdictsOf(identifiers, outcome ? *outcome : Answer(), outcome ? nullptr : error);
@@ -260,7 +283,9 @@ void GTFSTransitLineService::lookup(const std::vector<MapItemIdentifierRef>& ide
       }
       const std::lock_guard guard(shared->lock);
       shared->verdicts = std::move(verdicts);
-      if (!error) shared->updatedAt = currentDate();
+      shared->tookShared = outcome && outcome->tookShared;
+      shared->youngestAnswer = outcome ? outcome->youngest : std::nullopt;
+      if (!error) shared->updatedAt = std::min(outcome->oldest.value_or(currentDate()), currentDate());
       shared->known = outcome ? std::move(outcome->known) : std::vector<KnownIncident>();
       if (outcome && !outcome->error) {
         shared->goneLines = std::move(gone);

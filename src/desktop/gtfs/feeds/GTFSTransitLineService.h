@@ -1,5 +1,6 @@
 #pragma once
 
+#include <atomic>
 #include <functional>
 #include <map>
 #include <memory>
@@ -35,6 +36,17 @@ class GTFSTransitLineService final : public TransitLineService {
   /// Hears of each answer, before its handler does, on the main thread. For lookups from now on; main thread.
   void setAnswerObserver(std::function<void()> observer) { _answered = std::move(observer); }
 
+  /// How many seconds old an answer of a server may be that serves without asking again, whichever process got it;
+  /// asked at the beginning of each lookup from now on, on its thread. Until set, servers are asked each time. Main
+  /// thread.
+  void setSharedAge(std::function<TimeInterval()> age) { _sharedAge = std::move(age); }
+  /// Has the next lookup ask all servers, however young their answers are. Main thread.
+  void askServersNext(bool asks) { _asksServers = asks; }
+  /// Whether the last lookup took an answer that was there. Any thread.
+  bool tookShared() const;
+  /// When the youngest answer came that the last lookup went by; absent where no server was needed. Any thread.
+  std::optional<Date> youngestAnswer() const;
+
   /// Errors are of kTransitLineServiceErrorDomain and carry a reason for the user. A lookup of which no line is known
   /// any more is an error too.
   void lookup(const std::vector<MapItemIdentifierRef>& identifiers, Handler handler) override;
@@ -58,7 +70,8 @@ class GTFSTransitLineService final : public TransitLineService {
   };
   /// What the last lookup found out, also where it failed for other lines; empty before the first one. Any thread.
   std::vector<LineVerdict> verdicts() const;
-  /// When the last lookup that succeeded was answered; absent before that. Any thread.
+  /// Of when the answers are that the last lookup which succeeded went by, the oldest of them; absent before that. Any
+  /// thread.
   std::optional<Date> updatedAt() const;
 
   /// When the publishers made the alerts that the last lookup which succeeded went by, by the names of their feeds;
@@ -69,6 +82,8 @@ class GTFSTransitLineService final : public TransitLineService {
   struct Shared;
   std::shared_ptr<Shared> _shared;
   std::function<void()> _answered;
+  std::function<TimeInterval()> _sharedAge;
+  std::atomic<bool> _asksServers = false;
   std::stop_source _stop;
   SerialQueue _queue;
 };

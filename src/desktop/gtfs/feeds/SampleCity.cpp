@@ -115,7 +115,7 @@ Outcome<LoadedStaticFeed> SampleCity::staticFeed(const std::stop_token&) const {
   return LoadedStaticFeed{readSampleFeed(_anchor), [](auto) { return std::optional<std::uint32_t>(); }};
 }
 
-Outcome<std::optional<AlertsFeed>> SampleCity::alerts(AlertsState& state, bool needsFeed,
+Outcome<std::optional<AlertsFeed>> SampleCity::alerts(AlertsState& state, bool needsFeed, Date,
                                                       const std::stop_token&) const {
   // It stands still while it lives.
   const auto hash = static_cast<std::size_t>(_anchor.time_since_epoch().count());

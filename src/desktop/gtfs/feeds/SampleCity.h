@@ -24,7 +24,7 @@ class SampleCity final : public FeedSource {
   bool minorAlerts() const override { return false; }
   Outcome<LoadedStaticFeed> staticFeed(const std::stop_token& stop) const override;
   /// Read from real GTFS-Realtime bytes.
-  Outcome<std::optional<AlertsFeed>> alerts(AlertsState& state, bool needsFeed,
+  Outcome<std::optional<AlertsFeed>> alerts(AlertsState& state, bool needsFeed, Date notBefore,
                                             const std::stop_token& stop) const override;
 
   /// The favourites of a rider who has chosen none yet: some lines with incidents in force, two of them shared, and

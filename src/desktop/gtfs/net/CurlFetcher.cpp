@@ -31,6 +31,7 @@ struct Transfer {
   const HTTPFetcher::Sink& sink;
   CURL* handle;
   HTTPValidators validators;
+  HTTPWishes wishes;
   std::string encoding;  // as the answer's header says, in lower case; may be empty
   // libcurl takes a packed answer without its end for a whole one.
   std::unique_ptr<GzipReader> packed;
@@ -71,6 +72,7 @@ struct Transfer {
   void takeHeader(std::string_view line) {
     if (line.starts_with("HTTP/")) {  // those were of the answer before a redirect
       validators = {};
+      wishes = {};
       encoding.clear();
     }
     const std::size_t colon = line.find(':');
@@ -84,6 +86,12 @@ struct Transfer {
       validators.etag = value;
     else if (name == "last-modified")
       validators.lastModified = value;
+    else if (name == "cache-control")
+      wishes.cacheControl.append(wishes.cacheControl.empty() ? "" : ",").append(value);
+    else if (name == "age")
+      wishes.age = value;
+    else if (name == "retry-after")
+      wishes.retryAfter = value;
   }
 
   static std::size_t onPiece(char* bytes, std::size_t size, std::size_t count, void* transfer) {
@@ -233,7 +241,7 @@ Outcome<HTTPAnswer> fetchWithCurl(const HTTPRequest& request, const std::stop_to
                                   const HTTPFetcher::Sink& sink) {
   const CurlHandle handle = makeHandle();
   const bool isConditional = request.validators != HTTPValidators();
-  Transfer transfer{request, stop, sink, handle.get(), {}, {}, {}};
+  Transfer transfer{request, stop, sink, handle.get(), {}, {}, {}, {}};
   setOptions(handle.get(), transfer);
   const auto failed = [&](const Failure& failure) {
     return transitLineServiceError(failure.code, "Cannot fetch " + request.address.publicText() + ": " + failure.what,
@@ -263,6 +271,7 @@ Outcome<HTTPAnswer> fetchWithCurl(const HTTPRequest& request, const std::stop_to
     // Gone for good: another server may lead back to the first with an address of its own choice.
     if (!isSameServer) headers = headersFor({}, request.validators);
   }
+  if (request.wishes) *request.wishes = std::move(transfer.wishes);
   if (status == 304 && isConditional) {
     // The server may leave out what has not changed.
     const auto orHeld = [](std::string& value, const std::string& held) {

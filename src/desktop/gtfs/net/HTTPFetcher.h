@@ -19,12 +19,20 @@ struct HTTPValidators {
   bool operator==(const HTTPValidators&) const = default;
 };
 
+/// What a server says of the moment at which it wants to be asked again, as it says it; empty where it does not.
+struct HTTPWishes {
+  std::string cacheControl;
+  std::string age;
+  std::string retryAfter;
+};
+
 /// A document to fetch.
 struct HTTPRequest {
   FeedAddress address;             ///< a remote one
   HTTPValidators validators;       ///< of the state that is held already: ask only for another one
   std::uint64_t limit;             ///< bytes, unpacked
   std::chrono::seconds timeLimit;  ///< for everything, redirects too
+  HTTPWishes* wishes = nullptr;    ///< set by whatever answer came last, also one that is an error; null: not needed
 };
 
 /// What a server answered.
