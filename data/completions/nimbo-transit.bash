@@ -66,7 +66,7 @@ _nimbo_transit() {
     "favorite remove" | "favorite move") names=$(_nimbo_transit_names favorite list | sed -n 's/^\([^ ]*:[^ ]*\).*/\1/p') ;;
     settings) names="get set unset" ;;
     "settings "*)
-      names="Nimbo.TransitWidget.analytics.disabled Nimbo.TransitWidget.internal.injectFakeIncidents
+      names="refreshSeconds Nimbo.TransitWidget.analytics.disabled Nimbo.TransitWidget.internal.injectFakeIncidents
         Nimbo.TransitWidget.internal.randomNumberIncidents"
       ;;
   esac

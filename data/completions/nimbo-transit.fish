@@ -127,5 +127,5 @@ complete -c nimbo-transit -n '__nimbo_transit_at favorite move' -a '(__nimbo_tra
 complete -c nimbo-transit -n '__nimbo_transit_at settings' -a 'get set unset'
 for command in get set unset
     complete -c nimbo-transit -n "__nimbo_transit_at settings $command" \
-        -a 'Nimbo.TransitWidget.analytics.disabled Nimbo.TransitWidget.internal.injectFakeIncidents Nimbo.TransitWidget.internal.randomNumberIncidents'
+        -a 'refreshSeconds Nimbo.TransitWidget.analytics.disabled Nimbo.TransitWidget.internal.injectFakeIncidents Nimbo.TransitWidget.internal.randomNumberIncidents'
 end

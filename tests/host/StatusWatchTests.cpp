@@ -34,7 +34,7 @@ TEST(StatusWatch, TriesAgainWhatFails) {
     const StatusWatch watch(context, {}, show);
     waitFor("error");
     programs.publish({});
-    time.advance(StatusWatch::kFirstUpdate);
+    time.advance(2 * RefreshRule::kFirstRetry);
     waitFor("good");
   }
   const std::string talker =

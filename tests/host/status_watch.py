@@ -1,6 +1,6 @@
 #!/usr/bin/python3
-"""Follows the sample city with "status --waybar --watch" through a widget whose time this test moves.
-usage: status_watch.py NIMBO_TRANSIT WIDGET"""
+"""Follows the sample city with "status --waybar --watch" through a widget whose time this test moves; then what other
+programs change meanwhile. usage: status_watch.py NIMBO_TRANSIT WIDGET"""
 import json
 import os
 import signal
@@ -73,4 +73,42 @@ with tempfile.TemporaryDirectory() as folder:
         assert first["class"] == first["alt"] == "old" and first["text"].endswith("(old)"), first
         bar.stdout.close()
         assert bar.wait() == 0, "a bar without a reader ends by itself"
+
+# What other processes change shows at once: nothing else would make a bar look again before a minute has passed.
+with tempfile.TemporaryDirectory() as folder:
+    def path(name):
+        return os.path.join(folder, name)
+
+    def do(*arguments):
+        subprocess.run([program, "--config", path("config"), "--state", path("state"), *arguments], check=True,
+                       stdout=subprocess.DEVNULL)
+
+    def publish(entities):
+        with open(path("new.pb"), "wb") as file:
+            file.write(b"\x0a\x05\x0a\x03" + b"2.0" + entities)
+        os.rename(path("new.pb"), path("alerts.pb"))
+
+    def see(word):
+        seen = []
+        while not seen or seen[-1] != word:
+            seen.append(json.loads(bar.stdout.readline())["alt"])
+
+    os.mkdir(path("feed"))
+    with open(path("feed/routes.txt"), "w") as file:
+        file.write("route_id,route_short_name,route_type\nr1,1,3\n")
+    publish(b"")
+    bar = subprocess.Popen([program, "--config", path("config"), "--state", path("state"), "status", "--waybar", "--watch"],
+                           stdout=subprocess.PIPE, env=dict(os.environ, NIMBO_TRANSIT_WIDGET=widget, LC_ALL="C.UTF-8"))
+    see("advisories")
+    do("feed", "add", "city", "--static", path("feed"), "--alerts", path("alerts.pb"))
+    see("none")
+    do("favorite", "add", "city:r1")
+    see("good")
+    alert = b"\x2a\x04\x12\x02r1" + b"\x52\x07\x0a\x05\x0a\x03Ice"
+    publish(b"\x12" + bytes([len(alert) + 5]) + b"\x0a\x01a\x2a" + bytes([len(alert)]) + alert)
+    see("advisories")
+    do("favorite", "remove", "city:r1")
+    see("none")
+    bar.send_signal(signal.SIGTERM)
+    assert bar.wait() == 0
 print("watched")

@@ -9,6 +9,7 @@
 #include <cstdio>
 
 #include "desktop/resources/Resources.h"
+#include "desktop/store/RefreshSetting.h"
 #include "platform/Platform.h"
 #include "platform/ui/Color.h"
 #include "platform/ui/Font.h"
@@ -118,6 +119,12 @@ void DesktopPreferences::chooseLanguage(const std::string& choice) {
   keep(choice, kLanguageKey);
   _localeChanged.emit();
 }
+
+std::string DesktopPreferences::refreshChoice() {
+  return std::to_string(std::lround(refreshSecondsOf(*Platform::current().sharedSettings().groupStore())));
+}
+
+void DesktopPreferences::chooseRefresh(const std::string& choice) { keep(choice, kRefreshSecondsKey); }
 
 void DesktopPreferences::stepTextSize(int step) {
   const int base = categoryOfScale(desktopTextScale());

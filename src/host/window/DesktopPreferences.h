@@ -29,6 +29,9 @@ class DesktopPreferences {
   /// A language with a string table, or "system".
   const std::string& languageChoice() const { return _languageChoice; }
   void chooseLanguage(const std::string& choice);
+  /// After how many seconds what is shown is asked for again (RefreshSetting.h).
+  static std::string refreshChoice();
+  static void chooseRefresh(const std::string& choice);
   /// Makes texts larger (1) or smaller (-1) than they are, or as large as on the desktop (0).
   void stepTextSize(int step);
 

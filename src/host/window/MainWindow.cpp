@@ -26,6 +26,14 @@ namespace {
 constexpr std::pair<const char*, const char*> kLanguages[] = {{"ar", "العربية"}, {"de", "Deutsch"},  {"en", "English"},
                                                               {"es", "Español"}, {"fr", "Français"}, {"ja", "日本語"}};
 
+/// Seconds to choose from.
+constexpr std::uint64_t kRefreshChoices[] = {30, 60, 300, 1800};
+
+std::string refreshText(std::uint64_t seconds) {
+  return seconds < 60 ? LocalizedFormat(LocalizedString("Window_Refresh_Seconds"), {seconds})
+                      : LocalizedFormat(LocalizedString("Window_Refresh_Minutes"), {seconds / 60});
+}
+
 }  // namespace
 
 Glib::RefPtr<Gio::MenuModel> makeMainMenu() {
@@ -43,9 +51,14 @@ Glib::RefPtr<Gio::MenuModel> makeMainMenu() {
   language->append(LocalizedString("Window_Language_System"), "win.language::system");
   for (const auto& [tag, name] : kLanguages) language->append(name, std::string("win.language::") + tag);
 
+  const auto refresh = Gio::Menu::create();
+  for (const std::uint64_t seconds : kRefreshChoices)
+    refresh->append(refreshText(seconds), "win.refresh::" + std::to_string(seconds));
+
   const auto look = Gio::Menu::create();
   look->append_submenu(LocalizedString("Window_Appearance"), appearance);
   look->append_submenu(LocalizedString("Window_Language"), language);
+  look->append_submenu(LocalizedString("Window_Refresh"), refresh);
 
   const auto last = Gio::Menu::create();
   last->append(LocalizedString("Window_Shortcuts"), "win.shortcuts");
@@ -142,6 +155,8 @@ void MainWindow::addActions() {
             [&preferences](const std::string& choice) { preferences.chooseAppearance(choice); });
   addChoice("language", preferences.languageChoice(),
             [&preferences](const std::string& choice) { preferences.chooseLanguage(choice); });
+  addChoice("refresh", preferences.refreshChoice(),
+            [&preferences](const std::string& choice) { preferences.chooseRefresh(choice); });
 
   const auto keys = Gtk::EventControllerKey::create();
   keys->signal_key_pressed().connect(

@@ -12,6 +12,7 @@
 #include "desktop/gtfs/feeds/TransitLineServiceError.h"
 #include "desktop/gtfs/net/FileReading.h"
 #include "desktop/gtfs/net/HTTPFetcher.h"
+#include "desktop/gtfs/net/ServerWishes.h"
 #include "support/TestPlatform.h"
 
 namespace nimbo {
@@ -333,6 +334,97 @@ TEST_F(AlertsStoreTest, GivesNothingThatIsHeldAndWritesWhatChangedEveryTenMinute
   EXPECT_EQ(fileChangeDate(file), date);
   feed.alerts = *FeedAddress::parse(server.address("/other"));
   EXPECT_EQ(outcome(false), error(Code::serverFailure)) << "what is held is of another address";
+}
+
+TEST_F(AlertsStoreTest, SharesAnswersAndObeysServers) {
+  const auto cache = FeedCache(folder.path() / "cache");
+  const auto mine = std::make_shared<CacheUsers>(cache.folder()), others = std::make_shared<CacheUsers>(cache.folder());
+  const AlertsStore other(cache, others);
+  store = AlertsStore(cache, mine);
+  AlertsState otherState;
+  constexpr TimeInterval kAlways = -1;  // however young an answer is
+  const auto load = [&](const AlertsStore& by, AlertsState& known, TimeInterval age) {
+    const std::size_t before = server.requests().size();
+    const Date notBefore = age == kAlways ? AlertsStore::kNow : dateByAdding(platform.time.now(), -age);
+    const auto alerts = by.load(feed, known, false, {}, notBefore);
+    return (alerts ? *alerts ? std::to_string((*alerts)->alerts().size()) + " alerts" : std::string("same")
+                   : "error " + std::to_string(alerts.error()->code())) +
+           (server.requests().size() == before ? "" : ", asked");
+  };
+  const auto first = [&](TimeInterval age) { return load(store, state, age); };
+  const auto second = [&](TimeInterval age) { return load(other, otherState, age); };
+  answer = good(1, 0);
+  EXPECT_EQ(first(30), "1 alerts, asked");
+  platform.time.advance(30);
+  EXPECT_EQ(second(30), "1 alerts");
+  EXPECT_EQ(otherState.fetchedAt, state.fetchedAt);
+  EXPECT_EQ(first(30), "same");
+  EXPECT_EQ(second(kAlways), "same, asked") << "the user wants to know";
+  EXPECT_EQ(first(0), "same") << "what another process has just heard";
+  platform.time.advance(31);
+  answer = good(2, 0);
+  EXPECT_EQ(second(30), "2 alerts, asked") << "and written, ten minutes or not, since there is another";
+  EXPECT_EQ(first(30), "2 alerts");
+  platform.time.advance(31);
+  answer = good(3, 60);
+  EXPECT_EQ(first(30), "3 alerts, asked");
+  std::ofstream(cache.alerts("city"), std::ios::app) << "x";
+  EXPECT_EQ(second(30), "3 alerts, asked") << "the file is damaged";
+  platform.time.advance(31);
+  answer = good(3, 60, "200 OK\r\nCache-Control: max-age=100");
+  EXPECT_EQ(first(30), "same, asked");
+  platform.time.advance(99);
+  EXPECT_EQ(second(30), "same");
+  EXPECT_EQ(second(kAlways), "same, asked");
+  platform.time.advance(100);
+  answer = {LoopbackServer::answer("503 Busy\r\nRetry-After: 600", "")};
+  EXPECT_EQ(first(30), "same, asked") << "the last one stands in";
+  for (const TimeInterval age : {30.0, kAlways}) EXPECT_EQ(second(age), "same");
+  platform.time.advance(599);
+  EXPECT_EQ(second(kAlways), "same");
+  AlertsState none;
+  feed.alerts = *FeedAddress::parse(server.address("/other"));
+  answer = {LoopbackServer::answer("503 Busy\r\nRetry-After: 600", "")};
+  EXPECT_EQ(load(store, none, 30), error(Code::serverFailure) + ", asked");
+  EXPECT_EQ(load(store, none, 30), error(Code::serverFailure)) << "each server is another one";
+  feed.alerts = *FeedAddress::parse(server.address());
+  platform.time.advance(1);
+  answer = good(1, 700);
+  EXPECT_EQ(second(kAlways), "1 alerts, asked");
+  platform.time.setNow(dateByAdding(platform.time.now(), -3600));  // by a clock that was set back all this is to come
+  answer = good(2, -3000);
+  EXPECT_EQ(first(30), "2 alerts, asked");
+  feed.maximumAlertsAge = std::chrono::minutes(1);
+  answer = good(1, -3000);
+  state = otherState = {};
+  EXPECT_EQ(first(30), error(Code::staleAlerts) + ", asked");
+  EXPECT_EQ(second(30), error(Code::staleAlerts) + ", asked") << "what is too old is asked for again";
+}
+
+TEST(ServerWishes, AreBounded) {
+  for (const auto& [control, age, seconds] : std::initializer_list<std::tuple<const char*, const char*, int>>{
+           {"", "", 0},
+           {"max-age=60", "", 60},
+           {"public,MAX-AGE=\"60\" , s-maxage=9", "20", 40},
+           {"max-age=60", "61", 0},
+           {"max-age=60, no-cache", "", 0},
+           {"no-store", "", 0},
+           {"max-age=-1", "", 0},
+           {"max-age=99999999999999999999", "x", 300},
+           {"max-age=60x", "", 0}})
+    EXPECT_EQ(freshnessOf({control, age, {}}), seconds) << control;
+  const Date now = dateFromUnixTime(kNow);
+  for (const auto& [text, seconds] :
+       std::initializer_list<std::pair<const char*, int>>{{"", 0},
+                                                          {"120", 120},
+                                                          {"0", 0},
+                                                          {"-5", 0},
+                                                          {"soon", 0},
+                                                          {"999999999999999", 1800},
+                                                          {"Sun, 15 Jun 2025 15:16:40 GMT", 600},
+                                                          {"Sun, 15 Jun 2025 15:06:39 GMT", 0},
+                                                          {"Thu, 31 Dec 2099 00:00:00 GMT", 1800}})
+    EXPECT_EQ(intervalBetween(now, retryDateOf({{}, {}, text}, now).value_or(now)), seconds) << text;
 }
 
 TEST_F(AlertsStoreTest, DoesWithoutADamagedCache) {
