@@ -56,7 +56,7 @@ void SourceWatch::watch() {
       for (const FeedAddress* address : {&feed.staticFeed, &feed.alerts}) {
         if (address->isRemote()) continue;
         watchFile(address->path());
-        watchFolder(address->path(), {});
+        watchPlace({address->path(), {}});
       }
   _source = _runLoop.watchReadable(_events.get(), [this] { readEvents(); });
 }
@@ -66,15 +66,15 @@ void SourceWatch::watchFile(const std::filesystem::path& path, bool isState) {
   std::filesystem::path there = path;
   while (there.has_relative_path() && !std::filesystem::is_directory(there.parent_path(), error))
     there = there.parent_path();
-  watchFolder(there.parent_path(), {there.filename(), isState});
+  watchPlace({there.parent_path(), there.filename(), isState});
   const auto real = std::filesystem::canonical(path, error);
-  if (!error && real != path) watchFolder(real.parent_path(), {real.filename(), isState});
+  if (!error && real != path) watchPlace({real.parent_path(), real.filename(), isState});
 }
 
-void SourceWatch::watchFolder(const std::filesystem::path& folder, Place place) {
+void SourceWatch::watchPlace(Place place) {
   // The log of the database stays open while it is written.
   const int number =
-      ::inotify_add_watch(_events.get(), folder.c_str(), place.isState ? kChanges | IN_MODIFY : kChanges);
+      ::inotify_add_watch(_events.get(), place.folder.c_str(), place.isState ? kChanges | IN_MODIFY : kChanges);
   if (number >= 0) _places.emplace(number, std::move(place));
 }
 
@@ -92,7 +92,9 @@ void SourceWatch::readEvents() {
         isOfInterest = _hasChanged = true;
       for (auto place = begin; place != end; ++place) {
         const bool isMeant = !name.empty() && (place->second.name.empty() || place->second.name == name);
-        if (!isMeant || (!place->second.isState && (event.mask & IN_MODIFY))) continue;
+        if (!isMeant || (!place->second.isState && (event.mask & IN_MODIFY)) ||
+            isBegun(event, place->second.folder / name))
+          continue;
         isOfInterest = true;
         if (!place->second.isState) _hasChanged = true;
       }

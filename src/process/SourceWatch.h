@@ -28,8 +28,9 @@ class SourceWatch {
   static constexpr TimeInterval kSettling = 0.1;
 
  private:
-  /// What an event in a folder is about.
+  /// What of a folder is watched.
   struct Place {
+    std::filesystem::path folder;
     std::string name;  ///< of a file or folder in it; empty: of any
     bool isState = false;
   };
@@ -38,7 +39,7 @@ class SourceWatch {
   void watch();
   /// Watches a file, or a folder that is missing, in the nearest folder there is; and what a link leads to.
   void watchFile(const std::filesystem::path& path, bool isState = false);
-  void watchFolder(const std::filesystem::path& folder, Place place);
+  void watchPlace(Place place);
   void readEvents();
   void settle();
   /// Tells one state of what is of interest in the state database from another.
