@@ -223,12 +223,12 @@ void CommandLine::addStateCommands() {
   CLI::App* settings = _app.add_subcommand("settings", "Settings that widget and hosts share")->require_subcommand(1);
   CLI::App* get = add(*settings, "get", "Print a setting",
                       [this](const CommandContext& context) { return runSettingsGet(context, _key); });
-  CLI::App* set = add(*settings, "set", "Store a setting: true, false, or a text",
+  CLI::App* set = add(*settings, "set", "Store a setting: true, false, a number or a text",
                       [this](const CommandContext& context) { return runSettingsSet(context, _key, _value); });
   CLI::App* unset = add(*settings, "unset", "Remove a setting",
                         [this](const CommandContext& context) { return runSettingsUnset(context, _key); });
   for (CLI::App* command : {get, set, unset}) command->add_option("KEY", _key, "Name of the setting")->required();
-  set->add_option("VALUE", _value, "true, false, or a text")->required();
+  set->add_option("VALUE", _value, "true, false, a number or a text")->required();
 
   CLI::App* analytics = add(_app, "analytics", "Show the usage records that are kept, and never sent anywhere",
                             [this](const CommandContext& context) { return runAnalytics(context, _json); });

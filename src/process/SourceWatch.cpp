@@ -110,7 +110,7 @@ void SourceWatch::readEvents() {
 }
 
 void SourceWatch::settle() {
-  const bool isAnotherState = std::exchange(_stateMark, stateMark()) != _stateMark;
+  const bool isAnotherState = stateMark() != _stateMark;
   if (!std::exchange(_hasChanged, false) && !isAnotherState) return;
   // What changed while nothing was watched is told of by this, too.
   watch();

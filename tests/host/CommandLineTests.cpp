@@ -203,6 +203,8 @@ TEST(CommandLine, RefusesWhatItCannotDoAndSaysWhy) {
       {{"favorite", "remove", "city:m2"}, "m2"},
       {{"favorite", "move", "city:m1", "7"}, "There is no position 7 among 1 favorite line."},
       {{"settings", "get", "no.such.key"}, "no.such.key"},
+      {{"settings", "set", "refreshSeconds", "29"}, "from 30 to 3600"},
+      {{"settings", "set", "refreshSeconds", "60s"}, "from 30 to 3600"},
       {{"decode", programs.alertsFile()}, "alerts.pb"},
       {{"script", "/nonexistent"}, "/nonexistent"},
   };

@@ -160,14 +160,6 @@ ErrorRef waitsForServer(const Feed& feed, Date until) {
 
 }  // namespace
 
-void AlertsStore::keepWishes(const Feed& feed, const HTTPWishes& wishes, bool hasFailed) const {
-  const std::string address = feed.alerts.identity();
-  if (hasFailed) return keepDate(_cache.retryAt(address), retryDateOf(wishes, currentDate()));
-  const TimeInterval freshness = freshnessOf(wishes);
-  keepDate(_cache.freshUntil(address),
-           freshness > 0 ? std::optional(dateByAdding(currentDate(), freshness)) : std::nullopt);
-}
-
 void AlertsStore::write(const std::filesystem::path& path, AlertsState& state, const std::string& body) const {
   const TimeInterval age = ageOf(state.writtenAt);
   if (age >= 0 && age < kShortestBetweenWritings && !(_users && _users->hasOthers())) return;
@@ -235,8 +227,10 @@ Outcome<std::optional<AlertsFeed>> AlertsStore::fetchRemote(const Feed& feed, Al
                                            body += piece;
                                            return true;
                                          });
-  keepWishes(feed, wishes, !answer);
-  if (!answer) return answer.error();
+  if (!answer) {
+    keepDate(_cache.retryAt(feed.alerts.identity()), retryDateOf(wishes, currentDate()));
+    return answer.error();
+  }
   const bool isKept = kept && (answer->isUnchanged || body == kept->body);
   if (isKept) body = std::move(kept->body);
   const std::size_t hash = answer->isUnchanged && !needsFeed ? state.hash : hashOf(body);
@@ -260,6 +254,9 @@ Outcome<std::optional<AlertsFeed>> AlertsStore::fetchRemote(const Feed& feed, Al
   state.fetchedAt = currentDate();
   if (!isSame) state.changedAt = isKept ? kept->state.changedAt : state.fetchedAt;
   state.madeAt = dateOf(state);
+  const TimeInterval freshness = freshnessOf(wishes);
+  keepDate(_cache.freshUntil(feed.alerts.identity()),
+           freshness > 0 ? std::optional(dateByAdding(state.fetchedAt, freshness)) : std::nullopt);
   if (isKept)
     state.file = kept->state.file;
   else if (!isSame)

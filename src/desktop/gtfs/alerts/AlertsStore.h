@@ -74,8 +74,6 @@ class AlertsStore {
   Outcome<std::optional<AlertsFeed>> lastAnswer(const Feed& feed, AlertsState& state, bool needsFeed,
                                                 const ErrorRef& failure) const;
 
-  /// Keeps what a server wishes for all processes; the date at which it is to be asked again is of a failure.
-  void keepWishes(const Feed& feed, const HTTPWishes& wishes, bool hasFailed) const;
   void write(const std::filesystem::path& path, AlertsState& state, const std::string& body) const;
 
   FeedCache _cache;
