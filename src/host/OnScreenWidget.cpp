@@ -2,6 +2,8 @@
 
 #include <algorithm>
 
+#include "desktop/store/RefreshSetting.h"
+#include "host/HostPlatform.h"
 #include "platform/SystemServices.h"
 #include "platform/ui/Font.h"
 
@@ -40,9 +42,13 @@ protocol::InitializeParams initializationOf(const WidgetPresentation& presentati
                                      .kind = std::string(protocol::Bundle::kApplication), .identifier = application})}};
 }
 
-std::optional<std::string> failureOfUpdate(WidgetClient& client, bool shared) {
+TimeInterval sharedAge(const CommandContext& context) {
+  return refreshSecondsOf(*HostPlatform(context)->sharedSettings().groupStore()) / 2;
+}
+
+std::optional<std::string> failureOfUpdate(WidgetClient& client, std::optional<TimeInterval> maxAge) {
   while (true) {
-    const protocol::UpdateResult answer = client.call(protocol::kPerformUpdate, {shared});
+    const protocol::UpdateResult answer = client.call(protocol::kPerformUpdate, {maxAge});
     if (answer.updateResult != WidgetUpdateResult::Failed) return std::nullopt;
     const std::string reason = answer.reason.value_or("the update failed");
     // The download has a limit of its own.
@@ -60,7 +66,9 @@ OnScreenWidget::OnScreenWidget(const CommandContext& context, const WidgetPresen
     _client.call(step);
 }
 
-std::optional<std::string> OnScreenWidget::update(bool shared) { return failureOfUpdate(_client, shared); }
+std::optional<std::string> OnScreenWidget::update(std::optional<TimeInterval> maxAge) {
+  return failureOfUpdate(_client, maxAge);
+}
 
 void OnScreenWidget::expand() {
   if (_client.call(protocol::kSnapshot, {.rows = false}).largestAvailableDisplayMode == WidgetDisplayMode::Expanded)

@@ -34,9 +34,12 @@ protocol::DisplayModes displayModesOf(const WidgetPresentation& presentation);
 /// What presents the widget so, in the compact mode.
 protocol::InitializeParams initializationOf(const WidgetPresentation& presentation);
 
-/// Has the widget fetch, with `shared` unless another process has just done so, again while a static feed that has
-/// never been here is still coming. Absent when it succeeded, else why it failed.
-std::optional<std::string> failureOfUpdate(WidgetClient& client, bool shared);
+/// The `maxAge` of an update that shares what other processes got, by the user's setting.
+TimeInterval sharedAge(const CommandContext& context);
+
+/// Has the widget fetch, with this `maxAge`, again while a static feed that has never been here is still coming. Absent
+/// when it succeeded, else why it failed.
+std::optional<std::string> failureOfUpdate(WidgetClient& client, std::optional<TimeInterval> maxAge);
 
 /// A widget process that is on the screen as long as this lives: it appears on construction, disappears, and so saves
 /// its rows, on `close`. Operations throw WidgetClientFailure.
@@ -47,8 +50,8 @@ class OnScreenWidget {
                  const PictureMemory* pictures = nullptr);
 
   /// Waits for the fetch that runs; also for a static feed that has never been here, since a process that ends throws
-  /// away what has come of it. `shared` and the answer are those of `failureOfUpdate`.
-  std::optional<std::string> update(bool shared = false);
+  /// away what has come of it. `maxAge` and the answer are those of `failureOfUpdate`.
+  std::optional<std::string> update(std::optional<TimeInterval> maxAge = std::nullopt);
   /// Switches to the expanded mode where the widget offers it; else the compact row says it all.
   void expand();
   protocol::Lines lines() { return _client.call(protocol::kLines); }

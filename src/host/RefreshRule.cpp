@@ -5,8 +5,7 @@
 
 namespace nimbo {
 
-RefreshRule::RefreshRule(RunLoop& runLoop, RandomSource& random, std::function<bool()> spares,
-                         std::function<void()> ask)
+RefreshRule::RefreshRule(RunLoop& runLoop, RandomSource& random, std::function<bool()> spares, Ask ask)
     : _runLoop(runLoop), _random(random), _spares(std::move(spares)), _ask(std::move(ask)) {}
 
 RefreshRule::~RefreshRule() { cancel(); }
@@ -20,12 +19,12 @@ void RefreshRule::setOnScreen(bool isOnScreen) {
   cancel();
   _hasFailed = _asksAgain = false;
   _retries.reset();
-  if (isOnScreen) _ask();
+  if (isOnScreen) ask();
 }
 
 void RefreshRule::ask() {
   cancel();
-  _ask();
+  _ask(_period / 2);
 }
 
 void RefreshRule::askNow() {
@@ -44,14 +43,14 @@ void RefreshRule::networkReturned() {
 
 void RefreshRule::answered(const protocol::UpdateResult& result) {
   if (!_isOnScreen) return;
+  _period = result.refreshSeconds * (_spares() ? kSparingFactor : 1);
   if (std::exchange(_asksAgain, false)) return ask();
   _hasFailed = result.updateResult == WidgetUpdateResult::Failed;
   if (_hasFailed) return askIn(_retries.next());
   _retries.reset();
-  const TimeInterval period = result.refreshSeconds * (_spares() ? kSparingFactor : 1);
   // An older one serves since its server wants that: there is nothing to catch up with.
   const TimeInterval age = result.age.value_or(0);
-  askIn(period - (age <= period / 2 ? age : 0));
+  askIn(_period - (age <= _period / 2 ? age : 0));
 }
 
 void RefreshRule::askIn(TimeInterval seconds) {

@@ -16,9 +16,11 @@ namespace nimbo {
 /// and the others take that answer. What failed is tried again after a wait that doubles each time. Main thread only.
 class RefreshRule {
  public:
-  /// `ask` sends the request, with `shared`; its answer goes to `answered`. `spares` says whether the machine wants
-  /// less of it at the moment. The loop and the random numbers outlive this.
-  RefreshRule(RunLoop& runLoop, RandomSource& random, std::function<bool()> spares, std::function<void()> ask);
+  using Ask = std::function<void(TimeInterval maxAge)>;
+
+  /// `ask` sends the request with its `maxAge`, half of the time from one to the next; its answer goes to `answered`.
+  /// `spares` says whether the machine wants less of it at the moment. The loop and the random numbers outlive this.
+  RefreshRule(RunLoop& runLoop, RandomSource& random, std::function<bool()> spares, Ask ask);
   ~RefreshRule();
 
   /// A widget that is started anew has left the screen before.
@@ -47,7 +49,8 @@ class RefreshRule {
   RunLoop& _runLoop;
   RandomSource& _random;
   std::function<bool()> _spares;
-  std::function<void()> _ask;
+  Ask _ask;
+  TimeInterval _period = protocol::UpdateResult().refreshSeconds;  // from one to the next, by the last answer
   Backoff _retries{kFirstRetry, kLongestRetry};
   std::shared_ptr<Timer> _next;  // null while an answer is waited for, and off the screen
   bool _isOnScreen = false;

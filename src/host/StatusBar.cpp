@@ -136,7 +136,7 @@ int runStatusBar(const CommandContext& context, const std::optional<std::string>
   try {
     OnScreenWidget widget(context, presentation);
     // A bar may ask every few seconds.
-    const std::optional<std::string> failure = widget.update(true);
+    const std::optional<std::string> failure = widget.update(sharedAge(context));
     std::cout << statusBarLine(widget.snapshot({.rows = false})).value_or("") << "\n";
     widget.close();
     if (failure) throw CommandFailure(*failure);

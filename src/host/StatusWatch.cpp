@@ -11,7 +11,8 @@ StatusWatch::StatusWatch(const CommandContext& context, WidgetPresentation prese
       _presentation(std::move(presentation)),
       _show(std::move(show)),
       _refresh(
-          context.runLoop, _random, [this] { return _conditions.areScarce(); }, [this] { update(); }) {
+          context.runLoop, _random, [this] { return _conditions.areScarce(); },
+          [this](TimeInterval maxAge) { update(maxAge); }) {
   start();
 }
 
@@ -44,8 +45,8 @@ void StatusWatch::start() {
   look();
 }
 
-void StatusWatch::update() {
-  _widget->ask(protocol::kPerformUpdate, {.shared = true}, [this](const protocol::UpdateResult& result) {
+void StatusWatch::update(TimeInterval maxAge) {
+  _widget->ask(protocol::kPerformUpdate, {maxAge}, [this](const protocol::UpdateResult& result) {
     _refresh.answered(result);
     look();
   });

@@ -31,7 +31,7 @@ class StatusWatch {
 
  private:
   void start();
-  void update();
+  void update(TimeInterval maxAge);
   void look();
   void showSnapshot(const protocol::Snapshot& snapshot);
   void showLine(const std::string& line);

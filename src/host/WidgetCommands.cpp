@@ -144,7 +144,7 @@ int runUpdate(const CommandContext& context) {
   client.call(protocol::kInitialize);
   for (const auto& step : {protocol::kLoadView, protocol::kViewWillAppear}) client.call(step);
   // The rows of the last time stay when there are no newer ones.
-  if (const auto failure = failureOfUpdate(client, true)) throw CommandFailure(*failure);
+  if (const auto failure = failureOfUpdate(client, sharedAge(context))) throw CommandFailure(*failure);
   if (const auto failure = client.call(protocol::kViewWillDisappear).failure)
     throw CommandFailure("the rows cannot be kept: " + *failure);
   client.call(protocol::kViewDidDisappear);

@@ -19,7 +19,8 @@ WidgetHostProcess::WidgetHostProcess(GLibRunLoop& runLoop, const Clock& clock, s
       _arguments(std::move(arguments)),
       _delegate(delegate),
       _refresh(
-          runLoop, _random, [this] { return _conditions.areScarce(); }, [this] { fetch(true); }) {}
+          runLoop, _random, [this] { return _conditions.areScarce(); },
+          [this](TimeInterval maxAge) { fetch(maxAge); }) {}
 
 WidgetHostProcess::~WidgetHostProcess() {
   if (_hiddenTimer) _hiddenTimer->invalidate();
@@ -247,8 +248,9 @@ void WidgetHostProcess::show(const Content& content) {
   _delegate.widgetDidChange(snapshot, content.lines);
 }
 
-void WidgetHostProcess::fetch(bool shared, std::function<void(const protocol::UpdateResult&)> completion) {
-  _widget->ask(protocol::kPerformUpdate, {shared},
+void WidgetHostProcess::fetch(std::optional<TimeInterval> maxAge,
+                              std::function<void(const protocol::UpdateResult&)> completion) {
+  _widget->ask(protocol::kPerformUpdate, {maxAge},
                [this, completion = std::move(completion)](const protocol::UpdateResult& result) {
                  _refresh.answered(result);
                  if (completion) completion(result);
@@ -260,7 +262,7 @@ void WidgetHostProcess::fetch(bool shared, std::function<void(const protocol::Up
 void WidgetHostProcess::update() {
   if (!_widget || _isUpdating) return;
   setUpdating(true);
-  fetch(false, [this](const auto&) { setUpdating(false); });
+  fetch(std::nullopt, [this](const auto&) { setUpdating(false); });
 }
 
 void WidgetHostProcess::setUpdating(bool updating) {

@@ -127,7 +127,8 @@ class WidgetHostProcess {
   void setExpandedMode(bool expanded);
   void setUpdating(bool updating);
   /// Has the process fetch; `completion` hears when that has ended.
-  void fetch(bool shared, std::function<void(const protocol::UpdateResult&)> completion = nullptr);
+  void fetch(std::optional<TimeInterval> maxAge,
+             std::function<void(const protocol::UpdateResult&)> completion = nullptr);
 
   GLibRunLoop& _runLoop;
   const Clock& _clock;

@@ -256,11 +256,14 @@ void WidgetProcess::performUpdate(const protocol::UpdateParams& params, const JS
                                   bool isSecond) {
   if (!_controller) throw JSONRPCFailure(JSONRPCError::kInvalidState, "performUpdate needs \"initialize\" first");
   GTFSTransitLineService& lines = _platform->transitLines();
-  if (!params.shared) lines.askServersNext(true);
+  if (params.maxAge)
+    lines.shareNext(*params.maxAge);
+  else
+    lines.askServersNext(true);
   _controller->widgetPerformUpdateWithCompletionHandler(
       [this, &lines, params, responder, isSecond](WidgetUpdateResult result) {
-        if (!params.shared) lines.askServersNext(false);
-        if (!params.shared && !isSecond && lines.tookShared())
+        if (!params.maxAge) lines.askServersNext(false);
+        if (!params.maxAge && !isSecond && lines.tookShared())
           return _runLoop.dispatchAsync([this, params, responder] { performUpdate(params, responder, true); });
         protocol::UpdateResult answer{.updateResult = result,
                                       .refreshSeconds = refreshSecondsOf(*_platform->sharedSettings().groupStore())};

@@ -87,7 +87,8 @@ template <>
 constexpr std::tuple kFields<Initialized>{Field{"name", &Initialized::name}, Field{"version", &Initialized::version},
                                           Field{"protocol", &Initialized::protocol}};
 template <>
-constexpr std::tuple kFields<UpdateParams>{Field{"shared", &UpdateParams::shared, kMayBeLeftOut}};
+constexpr std::tuple kFields<UpdateParams>{
+    Field{"maxAge", &UpdateParams::maxAge, Rules{.mayBeLeftOut = true, .least = 0, .most = 86400}}};
 template <>
 constexpr std::tuple kFields<UpdateResult>{Field{"updateResult", &UpdateResult::updateResult},
                                            Field{"reason", &UpdateResult::reason, kMayBeLeftOut},

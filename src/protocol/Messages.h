@@ -51,7 +51,8 @@ struct Initialized {
 };
 
 struct UpdateParams {
-  bool shared = false;  ///< an answer that any process got within the last half of the refresh time serves
+  /// Seconds: an answer of a server that is no older serves, whichever process got it; absent: the servers are asked.
+  std::optional<double> maxAge;
 };
 
 struct UpdateResult {

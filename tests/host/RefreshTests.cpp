@@ -27,7 +27,11 @@ class RefreshTest : public testing::Test {
     explicit Host(RefreshTest& test)
         : service(test.paths),
           rule(
-              test.platform.loop, test.chance, [&test] { return test.areScarce; }, [&test, this] { test.ask(*this); }) {
+              test.platform.loop, test.chance, [&test] { return test.areScarce; },
+              [&test, this](TimeInterval maxAge) {
+                service.shareNext(maxAge);
+                test.ask(*this);
+              }) {
       service.setSharedAge([&test] { return test.refreshSeconds / 2; });
     }
     GTFSTransitLineService service;
@@ -125,7 +129,7 @@ TEST_F(RefreshTest, CostsTheServerAboutSixtyRequestsAnHourHoweverManyHosts) {
 TEST_F(RefreshTest, AsksAgainForWhatChangesWhileAnAnswerIsOnItsWay) {
   int asked = 0;
   RefreshRule rule(
-      platform.loop, chance, [] { return false; }, [&] { ++asked; });
+      platform.loop, chance, [] { return false; }, [&](TimeInterval) { ++asked; });
   const protocol::UpdateResult good{.refreshSeconds = 60},
       failed{.updateResult = WidgetUpdateResult::Failed, .refreshSeconds = 60};
   const auto isAskedIn = [&](TimeInterval seconds) {

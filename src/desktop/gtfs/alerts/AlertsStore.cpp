@@ -299,8 +299,8 @@ bool AlertsStore::takeShared(const Feed& feed, AlertsState& state, bool needsFee
   const std::filesystem::path path = _cache.alerts(feed.nameOfAlerts());
   const bool servesStill = keptDate(_cache.freshUntil(feed.alerts.identity()), kLongestFreshness).has_value();
   const auto serves = [&](Date answered) {
-    return answered <= currentDate() &&
-           (answered >= notBefore || (servesStill && ageOf(answered) <= kLongestFreshness));
+    const TimeInterval age = ageOf(answered);
+    return age >= 0 && ((age <= kLongestStandIn && answered >= notBefore) || (servesStill && age <= kLongestFreshness));
   };
   std::optional<KeptAlerts> kept;
   const auto written = fileChangeDate(path);

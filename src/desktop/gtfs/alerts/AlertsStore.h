@@ -50,9 +50,9 @@ class AlertsStore {
   static constexpr Date kNow = Date::max();
 
   /// The present alerts; absent when their bytes are those of `state` and the feed is not needed (`needsFeed`). An
-  /// answer that is no older than `notBefore`, or that its server lets serve still, is taken without asking, unless it
-  /// is stale. When the server fails, or does not want to be asked yet, the last answer stands in for at most 15
-  /// minutes. `state` is that of the last call for this feed, and becomes that of this one.
+  /// answer that is no older than `notBefore` and 15 minutes, or that its server lets serve still, is taken without
+  /// asking, unless it is stale. When the server fails, or does not want to be asked yet, the last answer stands in for
+  /// at most 15 minutes. `state` is that of the last call for this feed, and becomes that of this one.
   Outcome<std::optional<AlertsFeed>> load(const Feed& feed, AlertsState& state, bool needsFeed,
                                           const std::stop_token& stop, Date notBefore = kNow) const;
 

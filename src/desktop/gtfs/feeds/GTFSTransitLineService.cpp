@@ -245,8 +245,10 @@ void GTFSTransitLineService::lookup(const std::vector<MapItemIdentifierRef>& ide
     if (answered) answered();
     answer(items, error);
   };
-  const bool asks = _asksServers.exchange(false) || !_sharedAge;
-  const Date notBefore = asks ? AlertsStore::kNow : dateByAdding(currentDate(), -_sharedAge());
+  TimeInterval age = _nextAge.exchange(kUsualAge);
+  if (age == kUsualAge && _sharedAge) age = _sharedAge();
+  const bool asks = _asksServers.exchange(false) || age == kUsualAge;
+  const Date notBefore = asks ? AlertsStore::kNow : dateByAdding(currentDate(), -age);
   std::stop_source giveUp;
   const auto due =
       DueAnswer::start([shared = _shared, serviceStop = _stop.get_token(), giveUp, identifiers, handler]() mutable {

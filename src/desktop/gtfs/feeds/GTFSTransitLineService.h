@@ -40,6 +40,8 @@ class GTFSTransitLineService final : public TransitLineService {
   /// asked at the beginning of each lookup from now on, on its thread. Until set, servers are asked each time. Main
   /// thread.
   void setSharedAge(std::function<TimeInterval()> age) { _sharedAge = std::move(age); }
+  /// For the next lookup it is this age. Main thread.
+  void shareNext(TimeInterval age) { _nextAge = age; }
   /// Has the next lookup ask all servers, however young their answers are. Main thread.
   void askServersNext(bool asks) { _asksServers = asks; }
   /// Whether the last lookup took an answer that was there. Any thread.
@@ -83,7 +85,9 @@ class GTFSTransitLineService final : public TransitLineService {
   std::shared_ptr<Shared> _shared;
   std::function<void()> _answered;
   std::function<TimeInterval()> _sharedAge;
+  std::atomic<TimeInterval> _nextAge = kUsualAge;
   std::atomic<bool> _asksServers = false;
+  static constexpr TimeInterval kUsualAge = -1;
   std::stop_source _stop;
   SerialQueue _queue;
 };
