@@ -254,7 +254,7 @@ TEST(KnownFeeds, OfSeveralPartsFetchTheirAlertsOnce) {
   for (const FeedSourceRef& source : *sources) {
     EXPECT_TRUE(source->staticFeed({})) << "from the mirror where its server fails";
     AlertsState state;
-    EXPECT_TRUE(source->alerts(state, false, {}));
+    EXPECT_TRUE(source->alerts(state, false, AlertsStore::kNow, {}));
     EXPECT_EQ(state.feed->name, source->name());
     EXPECT_EQ(source->isRouteOfOther({})("x1"), source->name() == "city");
   }
