@@ -13,8 +13,8 @@ namespace nimbo {
 
 namespace {
 
-constexpr std::uint32_t kChanges = IN_CLOSE_WRITE | IN_CREATE | IN_DELETE | IN_MOVED_FROM | IN_MOVED_TO |
-                                   IN_DELETE_SELF | IN_MOVE_SELF | IN_ONLYDIR | IN_MASK_ADD;
+constexpr std::uint32_t kSourceEvents = IN_CLOSE_WRITE | IN_CREATE | IN_DELETE | IN_MOVED_FROM | IN_MOVED_TO |
+                                        IN_DELETE_SELF | IN_MOVE_SELF | IN_ONLYDIR | IN_MASK_ADD;
 
 /// Whether somebody begins a file, whose end is told of too.
 bool isBegun(const inotify_event& event, const std::filesystem::path& path) {
@@ -73,8 +73,8 @@ void SourceWatch::watchFile(const std::filesystem::path& path, bool isState) {
 
 void SourceWatch::watchPlace(Place place) {
   // The log of the database stays open while it is written.
-  const int number =
-      ::inotify_add_watch(_events.get(), place.folder.c_str(), place.isState ? kChanges | IN_MODIFY : kChanges);
+  const int number = ::inotify_add_watch(_events.get(), place.folder.c_str(),
+                                         place.isState ? kSourceEvents | IN_MODIFY : kSourceEvents);
   if (number >= 0) _places.emplace(number, std::move(place));
 }
 

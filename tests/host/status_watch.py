@@ -89,6 +89,7 @@ with tempfile.TemporaryDirectory() as folder:
         os.rename(path("new.pb"), path("alerts.pb"))
 
     def see(word):
+        signal.alarm(60)  # rather than to wait for ever
         seen = []
         while not seen or seen[-1] != word:
             seen.append(json.loads(bar.stdout.readline())["alt"])
