@@ -54,6 +54,7 @@ class DesktopPlatform {
   /// BCP 47.
   std::string languageTag() const;
   SQLiteSharedSettings& sharedSettings() { return _sharedSettings; }
+  const std::shared_ptr<StateDatabase>& database() const { return _database; }
 
   /// The first language of LANGUAGE ("de_AT:fr") that has texts here, else its first; without it the locale of LC_ALL,
   /// LC_MESSAGES or LANG, in this order. "en" where none of these is set or it is "C" or "POSIX", whatever LANGUAGE

@@ -1,12 +1,14 @@
 #include "process/LineReports.h"
 
 #include <algorithm>
+#include <set>
 #include <unordered_map>
 
 #include "desktop/gtfs/alerts/IncidentReader.h"
 #include "desktop/gtfs/feeds/TransitLineServiceError.h"
 #include "desktop/gtfs/static/LineItems.h"
 #include "platform/SystemServices.h"
+#include "platform/foundation/Hash.h"
 #include "process/FeedMessages.h"
 #include "process/Snapshot.h"
 
@@ -48,13 +50,29 @@ protocol::LineIncident lineIncidentOf(const TransitIncident& incident) {
     result.severity = static_cast<protocol::Severity>(fields.severity - kUnknownSeverity);
     result.effect = wordOf(kEffects, static_cast<std::int32_t>(fields.effect));
     result.cause = wordOf(kCauses, fields.cause);
+    result.concern = static_cast<protocol::Concern>(fields.concern);
+  } else if (incident.isBlockingIncident()) {
+    result.concern = protocol::Concern::noService;
   }
   return result;
+}
+
+std::uint64_t digestOf(const protocol::LineIncident& incident) {
+  std::uint64_t digest = hashOfBytes("incident");
+  for (const std::string& part :
+       {incident.title, incident.text.value_or(""), incident.effect,
+        std::to_string(static_cast<int>(incident.severity)), std::to_string(static_cast<int>(incident.concern))})
+    digest = hashOfBytes({"\0", 1}, hashOfBytes(part, digest));
+  return digest;
 }
 
 /// Makes the reports of one answer.
 class Reports {
  public:
+  /// `unseen` has the numbers of those that are new; absent: all are.
+  explicit Reports(std::optional<std::set<std::uint64_t>> unseen) : _unseen(std::move(unseen)) {}
+  bool isCut() const { return _isCut; }
+
   void addVerdict(protocol::LineReport& report, const LineVerdict& verdict) {
     if (verdict.unknownReason) {
       report.reason = fetchErrorOf(*verdict.unknownReason);
@@ -83,19 +101,55 @@ class Reports {
     constexpr std::size_t kFrame = 300;  // keys and dates
     const std::size_t size =
         kFrame + written.title.size() + written.text.value_or("").size() + written.url.value_or("").size();
-    if (size > _room) return;
+    if (size > _room) {
+      _isCut = true;
+      return;
+    }
     _room -= size;
+    written.isNew = !_unseen || _unseen->contains(incident.muid());
     list.push_back(std::move(written));
   }
 
   const Date _now = currentDate();
+  const std::optional<std::set<std::uint64_t>> _unseen;
   std::size_t _room = kRoomForIncidents;
+  bool _isCut = false;
 };
+
+/// Absent where nothing was seen.
+std::optional<std::set<std::uint64_t>> unseenOf(const GTFSTransitLineService& service, const SeenForms& seen) {
+  if (seen.isEmpty()) return std::nullopt;
+  std::set<std::uint64_t> unseen;
+  for (const auto& [muid, form] : incidentForms(service))
+    if (!seen.have(form, currentDate())) unseen.insert(muid);
+  return unseen;
+}
 
 }  // namespace
 
-protocol::Lines lineReports(const FavoritesEditor& editor, const GTFSTransitLineService& service) {
-  protocol::Lines result{.updated = service.updatedAt()};
+std::map<std::uint64_t, IncidentForm> incidentForms(const GTFSTransitLineService& service) {
+  std::map<std::uint64_t, IncidentForm> forms;
+  for (const LineVerdict& verdict : service.verdicts()) {
+    if (verdict.unknownReason) continue;
+    for (const TransitIncidentRef& incident : verdict.item->incidents()) {
+      IncidentForm& form = forms[incident->muid()];
+      if (form.lines.empty()) {
+        form.muid = incident->muid();
+        form.digest = digestOf(lineIncidentOf(*incident));
+      }
+      const std::uint64_t line = verdict.identifier->muid();
+      if (form.lines.empty() || form.lines.back() != line) form.lines.push_back(line);
+      const IncidentForm::Period period(incident->startDate(), incident->endDate());
+      if (std::find(form.periods.begin(), form.periods.end(), period) == form.periods.end())
+        form.periods.push_back(period);
+    }
+  }
+  return forms;
+}
+
+protocol::Lines lineReports(const FavoritesEditor& editor, const GTFSTransitLineService& service,
+                            const SeenForms& seen) {
+  protocol::Lines result{.updated = service.updatedAt(), .asked = service.askedAt()};
   const auto favorites = editor.left();
   const ErrorRef damage = favorites ? editor.list().error() : favorites.error();
   if (damage) result.error = fetchErrorOf(*damage);
@@ -106,7 +160,7 @@ protocol::Lines lineReports(const FavoritesEditor& editor, const GTFSTransitLine
   const ErrorRef notAsked = damage ? damage
                                    : transitLineServiceError(TransitLineServiceError::notAsked,
                                                              "The line has not been looked up yet. Update to see it.");
-  Reports reports;
+  Reports reports(unseenOf(service, seen));
   for (const FavoriteRef& favorite : *favorites) {
     const auto* kept = dynamic_cast<const FavoriteTransitLine*>(favorite.get());
     if (!kept || !kept->transitLine()) continue;
@@ -128,6 +182,7 @@ protocol::Lines lineReports(const FavoritesEditor& editor, const GTFSTransitLine
     }
     reports.addVerdict(report, verdict);
   }
+  result.isCut = reports.isCut();
   return result;
 }
 

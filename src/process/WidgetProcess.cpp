@@ -2,6 +2,7 @@
 
 #include <algorithm>
 #include <limits>
+#include <set>
 #include <utility>
 
 #include "desktop/drawing/DrawingPart.h"
@@ -73,6 +74,7 @@ WidgetProcess::WidgetProcess(Options options, int input, int output)
   addFeedMethod(protocol::kCheckFeed, &FeedRequests::checkFeed);
   addMethod(protocol::kCancel, &WidgetProcess::cancel);
   addMethod(protocol::kLines, &WidgetProcess::lines);
+  addMethod(protocol::kMarkSeen, &WidgetProcess::markSeen);
   addMethod(protocol::kDownloads, &WidgetProcess::downloads);
   addViewMethod(protocol::kViewWillAppear, &WidgetProcess::viewWillAppear);
   addViewMethod(protocol::kViewDidAppear, &WidgetProcess::viewDidAppear);
@@ -343,7 +345,31 @@ protocol::Snapshot WidgetProcess::snapshot(const protocol::SnapshotParams& param
 
 protocol::Lines WidgetProcess::lines(const Nothing&) {
   if (!_controller) throw JSONRPCFailure(JSONRPCError::kInvalidState, "lines needs \"initialize\" first");
-  return lineReports(_platform->favoritesEditor(), _platform->transitLines());
+  // What was seen cannot be read: everything is new, and whoever writes hears why.
+  const auto seen = SeenIncidents(_platform->database()).list();
+  return lineReports(_platform->favoritesEditor(), _platform->transitLines(), seen ? *seen : SeenForms());
+}
+
+protocol::Kept WidgetProcess::markSeen(const protocol::MarkSeenParams& params) {
+  if (!_controller) throw JSONRPCFailure(JSONRPCError::kInvalidState, "markSeen needs \"initialize\" first");
+  const SeenIncidents incidents(_platform->database());
+  const auto seen = incidents.list();
+  if (!seen) return {seen.error()->reason()};
+  const std::set<std::string, std::less<>> marked(params.ids.begin(), params.ids.end());
+  std::vector<IncidentForm> kept;
+  const Date now = currentDate();
+  bool isChange = false;
+  for (auto& [muid, form] : incidentForms(_platform->transitLines())) {
+    const bool wasSeen = seen->have(form, now);
+    if (!wasSeen && !marked.contains(std::to_string(muid))) continue;
+    isChange = isChange || !wasSeen;
+    kept.push_back(std::move(form));
+  }
+  if (!isChange) return {};
+  // What was seen before is kept in its present form, and for as long as it is there.
+  if (const ErrorRef failure = incidents.keep(kept, now)) return {failure->reason()};
+  notify(_connection, protocol::kUpdated, {});
+  return {};
 }
 
 protocol::Downloads WidgetProcess::downloads(const Nothing&) {

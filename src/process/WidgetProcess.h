@@ -64,6 +64,7 @@ class WidgetProcess {
   protocol::Highlighted highlightRow(const protocol::HighlightParams& params);
   protocol::Snapshot snapshot(const protocol::SnapshotParams& params);
   protocol::Lines lines(const Nothing&);
+  protocol::Kept markSeen(const protocol::MarkSeenParams& params);
   protocol::Downloads downloads(const Nothing&);
   protocol::Rendered render(const protocol::RenderParams& params);
   Nothing setAppearance(const protocol::AppearanceParams& params);

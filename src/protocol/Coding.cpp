@@ -226,7 +226,9 @@ constexpr std::tuple kFields<LineIncident>{Field{"id", &LineIncident::id},
                                            Field{"url", &LineIncident::url},
                                            Field{"severity", &LineIncident::severity},
                                            Field{"effect", &LineIncident::effect},
-                                           Field{"cause", &LineIncident::cause}};
+                                           Field{"cause", &LineIncident::cause},
+                                           Field{"concern", &LineIncident::concern},
+                                           Field{"new", &LineIncident::isNew}};
 template <>
 constexpr std::tuple kFields<LineReport>{
     Field{"id", &LineReport::id},          Field{"muid", &LineReport::muid},
@@ -236,7 +238,10 @@ constexpr std::tuple kFields<LineReport>{
     Field{"planned", &LineReport::planned}};
 template <>
 constexpr std::tuple kFields<Lines>{Field{"updated", &Lines::updated}, Field{"lines", &Lines::lines},
-                                    Field{"error", &Lines::error, kMayBeLeftOut}};
+                                    Field{"error", &Lines::error, kMayBeLeftOut},
+                                    Field{"asked", &Lines::asked, kMayBeLeftOut}, Field{"cut", &Lines::isCut}};
+template <>
+constexpr std::tuple kFields<MarkSeenParams>{Field{"ids", &MarkSeenParams::ids}};
 template <>
 constexpr std::tuple kFields<Download>{Field{"feed", &Download::feed}, Field{"received", &Download::received}};
 template <>
@@ -628,6 +633,7 @@ NIMBO_MESSAGE(Snapshot);
 NIMBO_MESSAGE(Lines);
 NIMBO_MESSAGE(LineReport);
 NIMBO_MESSAGE(LineIncident);
+NIMBO_MESSAGE(MarkSeenParams);
 NIMBO_MESSAGE(Downloads);
 NIMBO_MESSAGE(RenderParams);
 NIMBO_MESSAGE(Rendered);

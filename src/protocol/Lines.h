@@ -18,6 +18,10 @@ enum class LineState { good, affected, unknown };
 /// How grave a publisher says an incident is, the least first.
 enum class Severity { unknown, info, warning, severe };
 
+/// What an incident means for riders of its lines, the least first: by the detail of its effect where that is known,
+/// else by its effect. One that is severe is not none.
+enum class Concern { none, additionalService, other, detour, delays, reducedService, noService };
+
 /// An incident of a line, in one of its periods.
 struct LineIncident {
   std::string id;  ///< its number in decimal
@@ -29,6 +33,8 @@ struct LineIncident {
   Severity severity = Severity::unknown;
   std::string effect;  ///< the reference's word in lower case, such as "detour"
   std::string cause;   ///< the same, such as "construction"
+  Concern concern = Concern::other;
+  bool isNew = true;  ///< the rider has not seen it as it is
 };
 
 /// What is known of a favorite line.
@@ -49,6 +55,12 @@ struct Lines {
   std::optional<Date> updated;  ///< when a fetch last ended well; absent: none did
   std::vector<LineReport> lines;
   std::optional<FetchError> error;  ///< why not all favorites are known; left out where they are
+  std::optional<Date> asked;        ///< when the last fetch ended, well or not; left out where none did
+  bool isCut = false;               ///< incidents were left out for want of room
+};
+
+struct MarkSeenParams {
+  std::vector<std::string> ids;  ///< numbers of incidents in decimal
 };
 
 /// A static feed that is being downloaded.

@@ -44,6 +44,10 @@ inline constexpr std::array<std::string_view, 3> kNames<LineState>{"good", "affe
 template <>
 inline constexpr std::array<std::string_view, 4> kNames<Severity>{"unknown_severity", "info", "warning", "severe"};
 
+template <>
+inline constexpr std::array<std::string_view, 7> kNames<Concern>{"none",   "additional_service", "other",     "detour",
+                                                                 "delays", "reduced_service",    "no_service"};
+
 template <class Enumeration>
 constexpr std::string_view nameOf(Enumeration value) {
   return kNames<Enumeration>.at(static_cast<std::size_t>(value));

@@ -77,6 +77,33 @@ TEST(WidgetProcess, TellsTheStateOfLinesByItsLastFetch) {
   EXPECT_THAT(of({start, fetch, look}), ElementsAre("unknown 7"));
 }
 
+TEST(WidgetProcess, KnowsWhatWasSeenUntilItChanges) {
+  Programs programs;
+  const json start = appearing()[0], look = request("lines"), fetch = request("performUpdate");
+  const auto answersOf = [&](const std::vector<json>& events) {
+    std::vector<std::string> news, ids;
+    for (const json& line : programs.play(events)) {
+      if (!line.contains("result") || !line["result"].contains("lines")) continue;
+      for (const json& report : line["result"]["lines"])
+        for (const json& incident : report["incidents"]) {
+          news.push_back(incident["new"].dump());
+          ids.push_back(incident["id"]);
+        }
+    }
+    return std::pair(news, ids);
+  };
+  programs.setUpCity({"m1", "m2"}, {{"a", {"m1", "m2"}, "Works", "Slow."}, {"b", {"m2"}, "Storm", "Wind."}});
+  const auto [news, ids] = answersOf({start, fetch, look});
+  EXPECT_THAT(news, ElementsAre("true", "true", "true"));
+  EXPECT_THAT(answersOf({start, fetch, request("markSeen", {{"ids", {ids.at(0), "no number"}}}), look}).first,
+              ElementsAre("false", "false", "true"));
+  EXPECT_THAT(answersOf({start, fetch, look}).first, ElementsAre("false", "false", "true")) << "in another process";
+  programs.publish({{"c", {"m1"}, "Works", "Slow."}, {"b", {"m2"}, "Storm", "Wind."}});
+  EXPECT_THAT(answersOf({start, fetch, look}).first, ElementsAre("false", "true")) << "under another number";
+  programs.publish({{"a", {"m1"}, "Works", "Very slow."}, {"b", {"m2"}, "Storm", "Wind."}});
+  EXPECT_THAT(answersOf({start, fetch, look}).first, ElementsAre("true", "true"));
+}
+
 TEST(WidgetProcess, ChangesItsRowsOnTheSecond) {
   Programs programs;
   const std::int64_t now = Programs::unixNow();

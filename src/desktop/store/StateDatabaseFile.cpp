@@ -71,6 +71,37 @@ bool copyFavorites(SQLiteConnection& from, SQLiteConnection& into, std::size_t& 
   return isWhole && favoritesFit(from);
 }
 
+/// What version 3 added.
+std::string tablesOfWhatWasToldAndSeen(const std::string& kind) {
+  const std::string create = "CREATE " + kind + "TABLE ";
+  // `content` is JSON, `date` microseconds since 1970.
+  return create +
+         "seen(muid INTEGER PRIMARY KEY, digest INTEGER NOT NULL, content TEXT NOT NULL, date INTEGER NOT NULL);" +
+         create + "told(muid INTEGER PRIMARY KEY, content TEXT NOT NULL);" +
+         // One row, once something was told.
+         create + "telling(id INTEGER PRIMARY KEY, content TEXT NOT NULL);";
+}
+
+void addChecksums(SQLiteConnection& connection) {
+  connection.execute(
+      "ALTER TABLE favorites ADD COLUMN checksum INTEGER NOT NULL DEFAULT 0;"
+      "CREATE TABLE favorites_seal(id INTEGER PRIMARY KEY, count INTEGER, digest INTEGER, wereSet INTEGER, lostWith);"
+      "INSERT INTO favorites_seal VALUES (1, 0, 0, 0, NULL);");
+  sealSettingsOfVersion1(connection);
+  connection.execute("DELETE FROM settings WHERE key IN ('Nimbo.Favorites.wereSet', 'Nimbo.Favorites.lostWith')");
+  sealFavorites(connection);
+}
+
+/// Temporary tables stand before those of the file.
+void showChecksums(SQLiteConnection& connection) {
+  connection.execute(
+      "CREATE TEMP TABLE favorites AS SELECT id, position, kind, muid, content, 0 AS checksum FROM main.favorites;"
+      "CREATE TEMP TABLE favorites_seal(id, count, digest, wereSet, lostWith);"
+      "INSERT INTO favorites_seal VALUES (1, 0, 0, 0, NULL);");
+  sealSettingsOfVersion1(connection);
+  sealFavorites(connection);
+}
+
 }  // namespace
 
 void createStateSchema(SQLiteConnection& connection) {
@@ -86,32 +117,23 @@ void createStateSchema(SQLiteConnection& connection) {
       "INSERT INTO favorites_seal VALUES (1, 0, 0, 0, NULL);"
       // One entry a row as JSON, the newest last.
       "CREATE TABLE analytics(id INTEGER PRIMARY KEY, content TEXT NOT NULL);");
+  connection.execute(tablesOfWhatWasToldAndSeen("").c_str());
   sealFavorites(connection);
   connection.execute(("PRAGMA user_version = " + std::to_string(kStateSchemaVersion)).c_str());
   transaction.commit();
 }
 
-void upgradeStateSchema(SQLiteConnection& connection, Upgrade upgrade) {
+void upgradeStateSchema(SQLiteConnection& connection, std::int64_t from, Upgrade upgrade) {
   if (upgrade == Upgrade::shown) {
-    // Temporary tables stand before those of the file.
-    connection.execute(
-        "PRAGMA temp_store = MEMORY;"
-        "CREATE TEMP TABLE favorites AS SELECT id, position, kind, muid, content, 0 AS checksum FROM main.favorites;"
-        "CREATE TEMP TABLE favorites_seal(id, count, digest, wereSet, lostWith);"
-        "INSERT INTO favorites_seal VALUES (1, 0, 0, 0, NULL);");
-    sealSettingsOfVersion1(connection);
-    sealFavorites(connection);
+    connection.execute("PRAGMA temp_store = MEMORY");
+    if (from == 1) showChecksums(connection);
+    connection.execute(tablesOfWhatWasToldAndSeen("TEMP ").c_str());
     return;
   }
   {
     SQLiteTransaction transaction(connection, SQLiteTransaction::Kind::writing);
-    connection.execute(
-        "ALTER TABLE favorites ADD COLUMN checksum INTEGER NOT NULL DEFAULT 0;"
-        "CREATE TABLE favorites_seal(id INTEGER PRIMARY KEY, count INTEGER, digest INTEGER, wereSet INTEGER, lostWith);"
-        "INSERT INTO favorites_seal VALUES (1, 0, 0, 0, NULL);");
-    sealSettingsOfVersion1(connection);
-    connection.execute("DELETE FROM settings WHERE key IN ('Nimbo.Favorites.wereSet', 'Nimbo.Favorites.lostWith')");
-    sealFavorites(connection);
+    if (from == 1) addChecksums(connection);
+    connection.execute(tablesOfWhatWasToldAndSeen("").c_str());
     connection.execute(("PRAGMA user_version = " + std::to_string(kStateSchemaVersion)).c_str());
     transaction.commit();
   }
@@ -269,8 +291,8 @@ StateDatabaseFile::Opened StateDatabaseFile::openLocked(Purpose purpose) {
                                          "choose another state folder.",
                         _path));
   if (version == kStateSchemaVersion) return opened;
-  if (version == 1) {
-    upgrade(opened, purpose);
+  if (version > 0 && version < kStateSchemaVersion) {
+    upgrade(opened, version, purpose);
     return opened;
   }
   if (opened.connection->integer("SELECT count(*) FROM sqlite_schema") == 0)
@@ -281,14 +303,14 @@ StateDatabaseFile::Opened StateDatabaseFile::openLocked(Purpose purpose) {
                       _path));
 }
 
-void StateDatabaseFile::upgrade(Opened& opened, Purpose purpose) const {
+void StateDatabaseFile::upgrade(Opened& opened, std::int64_t from, Purpose purpose) const {
   try {
-    if (!opened.isSnapshot) return upgradeStateSchema(*opened.connection, Upgrade::kept);
+    if (!opened.isSnapshot) return upgradeStateSchema(*opened.connection, from, Upgrade::kept);
   } catch (const SQLiteFailure& failure) {
     if (purpose == Purpose::writing || failure.meansDamage()) throw;
     opened.isSnapshot = true;  // the next access tries again
   }
-  upgradeStateSchema(*opened.connection, Upgrade::shown);
+  upgradeStateSchema(*opened.connection, from, Upgrade::shown);
 }
 
 std::unique_ptr<SQLiteConnection> StateDatabaseFile::connect(bool& isSnapshot) const {

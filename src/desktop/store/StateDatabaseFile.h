@@ -29,8 +29,9 @@ class FolderLock final {
   FileDescriptor _folder;
 };
 
-/// Version of the tables, kept as the database's user_version. Version 1 had no checksums.
-inline constexpr std::int64_t kStateSchemaVersion = 2;
+/// Version of the tables, kept as the database's user_version. Version 1 had no checksums, version 2 nothing of what
+/// was seen and told.
+inline constexpr std::int64_t kStateSchemaVersion = 3;
 
 /// Puts the tables into an empty database, which from then on keeps a write-ahead log: all or nothing. Throws
 /// SQLiteFailure.
@@ -41,8 +42,8 @@ enum class Upgrade {
   shown,  ///< for this connection alone: the file lets nothing be written
 };
 
-/// Gives the tables of version 1 their checksums: all or nothing. Throws SQLiteFailure.
-void upgradeStateSchema(SQLiteConnection& connection, Upgrade upgrade);
+/// Gives the tables of the earlier version `from` what they lack: all or nothing. Throws SQLiteFailure.
+void upgradeStateSchema(SQLiteConnection& connection, std::int64_t from, Upgrade upgrade);
 
 struct SalvagedCounts {
   std::size_t favorites = 0;
@@ -104,7 +105,7 @@ class StateDatabaseFile final {
   // Each of these needs the folder's lock, and may throw SQLiteFailure.
   Opened openLocked(Purpose purpose);
   std::unique_ptr<SQLiteConnection> connect(bool& isSnapshot) const;
-  void upgrade(Opened& opened, Purpose purpose) const;
+  void upgrade(Opened& opened, std::int64_t from, Purpose purpose) const;
   Opened replaceLocked();
   /// Makes a database at `path`, in place of what is there.
   ErrorRef makeNew(const std::filesystem::path& path, const std::function<void(SQLiteConnection&)>& fill) const;

@@ -327,5 +327,37 @@ TEST(Incident, BlocksOnlyALineThatDoesNotRunAtAll) {
   EXPECT_EQ(incident->lastUpdated(), std::nullopt) << "the date of the feed is none of the incident";
 }
 
+TEST(Incident, ConcernsRidersByItsDetailBeforeItsEffect) {
+  const struct {
+    const char* detail;
+    int effect;
+    AlertConcern concern;
+  } cases[] = {
+      {"DELAY", 7, AlertConcern::delays},
+      {"Station closure", 1, AlertConcern::other},
+      {"SUSPENSION", 4, AlertConcern::noService},
+      {"EXTRA_SERVICE", 8, AlertConcern::additionalService},
+      {"ELEVATOR_CLOSURE", 8, AlertConcern::none},
+      {"INFORMATIONAL", 7, AlertConcern::none},
+      {"INFORMATIONAL", 4, AlertConcern::detour},
+      {"Track fire", 3, AlertConcern::delays},
+      {"", 2, AlertConcern::reducedService},
+      {"", 11, AlertConcern::none},
+      {"", 8, AlertConcern::other},
+  };
+  for (const auto& test : cases)
+    EXPECT_EQ(concernOf(AlertEffect{test.effect}, test.detail), test.concern) << test.detail;
+  // Of several alerts that are one incident the gravest counts, and what is severe is never nothing.
+  const std::string delay = "effect_detail { translation { text: 'DELAY' language: 'en' } } ";
+  const std::string lift = "effect_detail { translation { text: 'ELEVATOR_CLOSURE' } } ";
+  Reader reader;
+  const auto concern = [&](const std::string& entities) {
+    return dynamic_cast<const AlertIncident&>(*reader.read(entities).verdicts[0].incidents().at(0)).fields().concern;
+  };
+  EXPECT_EQ(concern(alert("a", "T", route("t1") + lift) + alert("b", "T", route("t1") + delay)), AlertConcern::delays);
+  EXPECT_EQ(concern(alert("a", "T", route("t1") + lift + "severity_level: 4")), AlertConcern::other);
+  EXPECT_EQ(concern(alert("a", "T", route("t1") + lift)), AlertConcern::none);
+}
+
 }  // namespace
 }  // namespace nimbo

@@ -23,7 +23,10 @@ class StoreTest : public testing::Test {
   std::filesystem::path folder() const { return _parent.path() / "state"; }
   std::filesystem::path file() const { return folder() / "state.sqlite"; }
 
-  /// Gives the database the form of version 1, with what version 2 keeps elsewhere among the settings.
+  void makeVersion2() {
+    connect().execute("DROP TABLE seen; DROP TABLE told; DROP TABLE telling; PRAGMA user_version = 2");
+  }
+  /// Gives the database, one of version 2, the form of version 1, with what that keeps elsewhere among the settings.
   void makeVersion1() {
     connect().execute(
         "INSERT INTO settings SELECT 'Nimbo.Favorites.wereSet', wereSet FROM favorites_seal;"

@@ -9,6 +9,7 @@
 #include "desktop/store/Fixture.h"
 #include "desktop/store/SQLiteAnalyticsPipeline.h"
 #include "desktop/store/SQLiteSharedSettings.h"
+#include "desktop/store/SeenIncidents.h"
 #include "desktop/store/StateDatabaseFile.h"
 
 namespace nimbo {
@@ -147,8 +148,9 @@ TEST_F(StateDatabaseTest, ShowsWhatIsStoredOnAFullDiskInEitherForm) {
     EXPECT_TRUE(favorites) << favorites.error()->reason();
     return favorites ? favorites->size() : 0;
   };
-  for (const int version : {2, 1}) {
+  for (const int version : {3, 2, 1}) {
     SCOPED_TRACE(version);
+    if (version == 2) makeVersion2();
     if (version == 1) makeVersion1();
     const std::string before = contentOf(file());
     {
@@ -160,11 +162,39 @@ TEST_F(StateDatabaseTest, ShowsWhatIsStoredOnAFullDiskInEitherForm) {
   EXPECT_EQ(count(), 1u);
   EXPECT_EQ(connect().integer("PRAGMA user_version"), kStateSchemaVersion);
   EXPECT_EQ(connect().integer("SELECT count(*) FROM settings"), 0);
+  EXPECT_TRUE(SeenIncidents(makeDatabase()).list());
   EXPECT_EQ(FavoritesEditor(makeDatabase(), nullptr).remove({1}), nullptr);
+  makeVersion2();
   makeVersion1();
   const auto first = [] { return std::vector<TransitLineRef>{lineItem(2, "B")}; };
   EXPECT_TRUE(FavoritesEditor(makeDatabase(), first).list()->empty()) << "an emptied list stays empty";
   EXPECT_TRUE(notices.empty());
+}
+
+TEST_F(StateDatabaseTest, KnowsWhatWasSeenUntilItChanges) {
+  const auto at = [this](int hours) { return std::optional(platform.time.now() + std::chrono::hours(hours)); };
+  const IncidentForm seen{1, 7, {10, 11}, {{at(-1), at(2)}, {at(24), at(26)}}};
+  const SeenIncidents incidents(makeDatabase());
+  ASSERT_EQ(incidents.keep({seen}, platform.time.now()), nullptr);
+  const struct {
+    IncidentForm form;
+    bool isSeen;
+    const char* what;
+  } cases[] = {
+      {seen, true, "the same"},
+      {{1, 8, {10}, seen.periods}, false, "other texts"},
+      {{1, 7, {10}, {{at(-1), at(3)}}}, false, "a later end"},
+      {{1, 7, {10}, {{at(0), at(2)}}}, true, "a beginning that moves with the clock"},
+      {{1, 7, {10}, {{at(24), at(26)}}}, true, "one of its periods"},
+      {{1, 7, {10}, {{at(48), at(50)}}}, false, "another period"},
+      {{2, 7, {11, 12}, seen.periods}, true, "renumbered, on a common line"},
+      {{2, 7, {12}, seen.periods}, false, "the same words on another line"},
+  };
+  const auto kept = SeenIncidents(makeDatabase()).list();
+  ASSERT_TRUE(kept);
+  for (const auto& test : cases) EXPECT_EQ(kept->have(test.form, platform.time.now()), test.isSeen) << test.what;
+  ASSERT_EQ(incidents.keep({{3, 3, {}, {}}}, platform.time.now() + std::chrono::days(91)), nullptr);
+  EXPECT_FALSE(incidents.list()->have(seen, platform.time.now())) << "old rows go";
 }
 
 TEST_F(StateDatabaseTest, IsReachedThroughLinkedFoldersOnly) {

@@ -28,6 +28,7 @@ struct Incident {
   AlertEffect effect;
   std::int32_t cause;
   std::int32_t severity;  // the greatest of its alerts
+  AlertConcern concern;   // the same
   struct OnLine {
     std::vector<AlertPeriod> periods;
     bool isWholeLine = false;
@@ -282,7 +283,12 @@ class IncidentBuilder {
     const auto [place, isNew] = _incidentOfTexts.try_emplace(
         {texts->title, texts->description.value_or(""), texts->linkURL.value_or(""), content.cause, content.effect},
         _incidents.size());
-    if (isNew) _incidents.push_back({keyOf(alert), *texts, content.effect, content.cause, view.severity, {}});
+    if (isNew)
+      _incidents.push_back(
+          {keyOf(alert), *texts, content.effect, content.cause, view.severity, AlertConcern::none, {}});
+    Incident& incident = _incidents[place->second];
+    const std::string detail = content.effectDetail.empty() ? std::string() : effectDetailIn(view.body);
+    incident.concern = std::max(incident.concern, concernOf(content.effect, detail));
     known->second = place->second;
     _sizesOfContents.insert(content.sizeHash());
     return place->second;
@@ -312,6 +318,8 @@ class IncidentBuilder {
     fields.effect = incident.effect;
     fields.cause = incident.cause;
     fields.severity = incident.severity;
+    fields.concern =
+        incident.severity == kSeveritySevere ? std::max(incident.concern, AlertConcern::other) : incident.concern;
     for (const auto& [place, onLine] : incident.lines)
       fields.affectedEntities.push_back(std::make_shared<const BasicAffectedEntity>(_query.lines[place].muid));
     const auto shared = std::make_shared<const AlertIncident::Fields>(std::move(fields));

@@ -5,6 +5,7 @@
 #include <string>
 #include <vector>
 
+#include "desktop/gtfs/alerts/AlertConcern.h"
 #include "desktop/gtfs/alerts/AlertsFeed.h"
 #include "desktop/gtfs/alerts/RealtimeFields.h"
 #include "desktop/gtfs/alerts/SelectorMatcher.h"
@@ -22,6 +23,8 @@ class AlertIncident final : public FieldsTransitIncident {
     AlertEffect effect = AlertEffect::unknownEffect;
     std::int32_t cause = kUnknownCause;
     std::int32_t severity = kUnknownSeverity;
+    /// Never none where it is severe.
+    AlertConcern concern = AlertConcern::other;
   };
 
   /// `alert` is not null; its dates and its blocking flag play no part.

@@ -16,6 +16,11 @@ namespace nimbo {
 struct GTFSTransitLineService::Shared {
   explicit Shared(const Paths& paths) : library(paths) {}
 
+  void setVerdicts(std::vector<LineVerdict> found) {
+    verdicts = std::move(found);
+    askedAt = currentDate();
+  }
+
   FeedLibrary library;
   std::map<std::string, HeldAnswer> held;  // by the names of feeds; of the one lookup that runs
   std::mutex lock;
@@ -25,6 +30,7 @@ struct GTFSTransitLineService::Shared {
   std::vector<KnownIncident> known;
   std::vector<LineVerdict> verdicts;
   std::optional<Date> updatedAt, youngestAnswer;
+  std::optional<Date> askedAt;  // of the verdicts
   bool tookShared = false;
 };
 
@@ -218,6 +224,11 @@ std::optional<Date> GTFSTransitLineService::updatedAt() const {
   return _shared->updatedAt;
 }
 
+std::optional<Date> GTFSTransitLineService::askedAt() const {
+  const std::lock_guard guard(_shared->lock);
+  return _shared->askedAt;
+}
+
 const FeedLibrary& GTFSTransitLineService::library() const { return _shared->library; }
 
 bool GTFSTransitLineService::tookShared() const {
@@ -257,7 +268,7 @@ void GTFSTransitLineService::lookup(const std::vector<MapItemIdentifierRef>& ide
         {
           const std::lock_guard guard(shared->lock);
           shared->known.clear();
-          shared->verdicts = verdictsOf(identifiers, {}, error);
+          shared->setVerdicts(verdictsOf(identifiers, {}, error));
         }
         if (!serviceStop.stop_requested()) handler({}, error);
       });
@@ -284,7 +295,7 @@ void GTFSTransitLineService::lookup(const std::vector<MapItemIdentifierRef>& ide
         if (items.empty() && !gone.empty()) error = allGone(gone);
       }
       const std::lock_guard guard(shared->lock);
-      shared->verdicts = std::move(verdicts);
+      shared->setVerdicts(std::move(verdicts));
       shared->tookShared = outcome && outcome->tookShared;
       shared->youngestAnswer = outcome ? outcome->youngest : std::nullopt;
       if (!error) shared->updatedAt = std::min(outcome->oldest.value_or(currentDate()), currentDate());
@@ -297,7 +308,7 @@ void GTFSTransitLineService::lookup(const std::vector<MapItemIdentifierRef>& ide
       error = transitLineServiceError(TransitLineServiceError::internal,
                                       std::string("Looking up the lines failed: ") + exception.what() + ".");
       const std::lock_guard guard(shared->lock);
-      shared->verdicts = verdictsOf(identifiers, {}, error);
+      shared->setVerdicts(verdictsOf(identifiers, {}, error));
     }
     if (stop.stop_requested()) return;
     Platform::current().mainRunLoop().dispatchAsync([due, serviceStop, handler, items = std::move(items), error] {

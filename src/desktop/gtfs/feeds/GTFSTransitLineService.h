@@ -75,6 +75,8 @@ class GTFSTransitLineService final : public TransitLineService {
   /// Of when the answers are that the last lookup which succeeded went by, the oldest of them; absent before that. Any
   /// thread.
   std::optional<Date> updatedAt() const;
+  /// When the verdicts were found; absent before the first lookup has ended. Any thread.
+  std::optional<Date> askedAt() const;
 
   /// When the publishers made the alerts that the last lookup which succeeded went by, by the names of their feeds;
   /// without those that do not say. Any thread.
