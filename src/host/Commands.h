@@ -124,9 +124,9 @@ struct StatusOptions {
 /// the status tells the state then too.
 int runStatus(const CommandContext& context, const StatusOptions& options);
 
-/// Fetches and saves the rows for the next start of the widget. A failed fetch fails, and leaves the rows of the last
-/// time.
-int runUpdate(const CommandContext& context);
+/// Fetches and saves the rows for the next start of the widget, and tells the desktop of incidents, with `notify` or
+/// where the settings have it so. A failed fetch fails, and leaves the rows of the last time.
+int runUpdate(const CommandContext& context, bool notify);
 
 struct RenderOptions {
   bool expanded = false;

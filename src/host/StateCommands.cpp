@@ -9,10 +9,12 @@
 
 #include "desktop/rpc/Base64.h"
 #include "desktop/store/RefreshSetting.h"
+#include "desktop/store/ToldIncidents.h"
 #include "host/Commands.h"
 #include "host/HostPlatform.h"
 #include "host/TerminalText.h"
 #include "host/WidgetClient.h"
+#include "host/notices/TellingSettings.h"
 
 namespace nimbo {
 
@@ -99,8 +101,12 @@ int runSettingsSet(const CommandContext& context, const std::string& key, const 
   if (key == kRefreshSecondsKey && !refreshSecondsIn(value))
     throw CommandFailure("the setting refreshSeconds is a whole number of seconds from 30 to 3600, and not \"" + value +
                          "\"");
+  if (const std::string problem = problemOfTellingSetting(key, value); !problem.empty()) throw CommandFailure(problem);
   HostPlatform platform(context);
-  require(Platform::current().sharedSettings().groupStore()->setValue_forKey(settingOfText(value), key));
+  const auto settings = Platform::current().sharedSettings().groupStore();
+  const bool wasOn = TellingSettings::read(*settings).isOn;
+  require(settings->setValue_forKey(settingOfText(value), key));
+  if (!wasOn && TellingSettings::read(*settings).isOn) require(ToldIncidents(platform->database()).beginAnew());
   return kExitSuccess;
 }
 

@@ -9,11 +9,13 @@
 #include <nlohmann/json.hpp>
 #include <vector>
 
+#include "host/HostPlatform.h"
 #include "host/LineStatus.h"
 #include "host/OnScreenWidget.h"
 #include "host/QuitOnSignal.h"
 #include "host/StatusWatch.h"
 #include "host/TerminalText.h"
+#include "host/notices/Teller.h"
 
 namespace nimbo {
 
@@ -147,14 +149,24 @@ int runStatusBar(const CommandContext& context, const std::optional<std::string>
   return kExitSuccess;
 }
 
-int runStatusWatch(const CommandContext& context) {
+int runStatusWatch(const CommandContext& context, bool notify) {
+  HostPlatform platform(context);
+  Teller teller(context.runLoop, *platform.operator->(), {.isAsked = notify});
   const GSourceHandle handles[] = {quitOnSignal(context.runLoop, SIGTERM), quitOnSignal(context.runLoop, SIGINT),
                                    context.runLoop.watchUrgent(STDOUT_FILENO, [&](bool inError) {
                                      // The reader of the pipe is gone.
                                      if (inError) context.runLoop.quit();
                                    })};
-  const StatusWatch watch(context, presentationForBar(), [&](const std::string& line) {
+  StatusWatch watch(context, presentationForBar(), [&](const std::string& line) {
     if (!(std::cout << line << std::endl)) context.runLoop.quit();
+  });
+  std::string toldFailure;
+  watch.setLinesObserver([&](const protocol::Lines& lines) {
+    teller.take(lines, [&](const ErrorRef& error) {
+      const std::string failure = error ? "cannot notify: " + error->reason() : "";
+      if (!failure.empty() && failure != toldFailure) context.tell(failure);
+      toldFailure = failure;
+    });
   });
   context.runLoop.run();
   return kExitSuccess;

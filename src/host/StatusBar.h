@@ -25,6 +25,7 @@ std::string statusBarErrorLine(const std::string& reason);
 int runStatusBar(const CommandContext& context, const std::optional<std::string>& now);
 
 /// Prints a line whenever there is another one, until SIGTERM or SIGINT comes or nobody reads the output any more.
-int runStatusWatch(const CommandContext& context);
+/// `notify`: incidents are told to the desktop too, as they are anyway where the settings have it so.
+int runStatusWatch(const CommandContext& context, bool notify);
 
 }  // namespace nimbo

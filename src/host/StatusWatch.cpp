@@ -53,6 +53,11 @@ void StatusWatch::update(TimeInterval maxAge) {
 }
 
 void StatusWatch::look() {
+  // More favorites than an answer has room for are no fault of the process.
+  if (_linesObserver)
+    _widget->call(protocol::kLines, {}, [this](const std::optional<protocol::Lines>& lines, const auto&) {
+      if (lines) _linesObserver(*lines);
+    });
   _widget->ask(protocol::kSnapshot, {.rows = false}, [this](const auto& snapshot) { showSnapshot(snapshot); });
 }
 

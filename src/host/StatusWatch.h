@@ -23,6 +23,10 @@ class StatusWatch {
   StatusWatch(const CommandContext& context, WidgetPresentation presentation, Show show);
   /// Takes the widget off the screen, which saves its rows, and ends the process.
   ~StatusWatch();
+  /// Hears what is known of the favorites whenever that may be new.
+  void setLinesObserver(std::function<void(const protocol::Lines& lines)> observer) {
+    _linesObserver = std::move(observer);
+  }
   StatusWatch(const StatusWatch&) = delete;
   StatusWatch& operator=(const StatusWatch&) = delete;
 
@@ -41,6 +45,7 @@ class StatusWatch {
   const CommandContext& _context;
   WidgetPresentation _presentation;
   Show _show;
+  std::function<void(const protocol::Lines&)> _linesObserver;  // null: nobody asks
   std::string _lastLine;
   Backoff _restarts{kFirstRestart, kLongestRestart};
   std::shared_ptr<Timer> _restart;

@@ -13,6 +13,7 @@
 #include "host/ScriptPlayer.h"
 #include "host/TerminalRows.h"
 #include "host/TerminalText.h"
+#include "host/notices/Teller.h"
 #include "protocol/Names.h"
 
 namespace nimbo {
@@ -134,22 +135,42 @@ void waitForDownloads(WidgetClient& client, GLibRunLoop& runLoop) {
   throw CommandFailure("a static feed is still being downloaded, and will be asked for again");
 }
 
+/// Tells the desktop what begins and ends. Absent when all went well.
+std::optional<std::string> failureOfTelling(const CommandContext& context, DesktopPlatform& platform,
+                                            WidgetClient& client, bool notify) {
+  Teller teller(context.runLoop, platform, {.isAsked = notify, .needsState = true});
+  if (!teller.isOn()) return std::nullopt;
+  std::optional<std::string> failure;
+  bool isDone = false;
+  teller.take(client.call(protocol::kLines), [&](const ErrorRef& error) {
+    if (error) failure = error->reason();
+    isDone = true;
+  });
+  client.waitUntil([&isDone] { return isDone; });
+  return failure;
+}
+
 }  // namespace
 
-int runUpdate(const CommandContext& context) {
+int runUpdate(const CommandContext& context, bool notify) {
+  HostPlatform platform(context);
   WidgetClient client(context.runLoop, context.widgetArguments);
   client.setNoticeHandler(context.tell);
   // Never on screen, so that no use of the widget is recorded, and without a host's sizes, so that the display mode
   // that was saved stays.
   client.call(protocol::kInitialize);
   for (const auto& step : {protocol::kLoadView, protocol::kViewWillAppear}) client.call(step);
+  const auto failed = failureOfUpdate(client, sharedAge(context));
+  // Of lines of feeds that answered it is known what begins and ends.
+  const auto untold = failureOfTelling(context, *platform.operator->(), client, notify);
   // The rows of the last time stay when there are no newer ones.
-  if (const auto failure = failureOfUpdate(client, sharedAge(context))) throw CommandFailure(*failure);
+  if (failed) throw CommandFailure(*failed);
   if (const auto failure = client.call(protocol::kViewWillDisappear).failure)
     throw CommandFailure("the rows cannot be kept: " + *failure);
   client.call(protocol::kViewDidDisappear);
   waitForDownloads(client, context.runLoop);
   client.call(protocol::kShutdown);
+  if (untold) throw CommandFailure("cannot notify: " + *untold);
   return kExitSuccess;
 }
 

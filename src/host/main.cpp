@@ -50,7 +50,7 @@ class CommandLine {
   std::optional<std::string> _virtualTime;
   std::string _file, _text, _key, _value;
   std::vector<std::string> _lines;
-  bool _json = false, _waybar = false, _watch = false;
+  bool _json = false, _waybar = false, _watch = false, _notify = false;
   std::set<std::string> _said;
 };
 
@@ -76,7 +76,7 @@ CLI::App* CommandLine::add(CLI::App& parent, const std::string& name, const std:
 
 void CommandLine::addWidgetCommands() {
   CLI::App* status = add(_app, "status", "Show how the favorite lines run", [this](const CommandContext& context) {
-    if (_watch) return runStatusWatch(context);
+    if (_watch) return runStatusWatch(context, _notify);
     return _waybar ? runStatusBar(context, _status.now) : runStatus(context, _status);
   });
   CLI::Option* expanded =
@@ -102,10 +102,14 @@ void CommandLine::addWidgetCommands() {
     planned->excludes(other);
   }
   saved->excludes(exitCode);
-  status->add_flag("--watch", _watch, "Go on printing a line whenever it changes")->needs(waybar)->excludes(now);
+  CLI::Option* watch =
+      status->add_flag("--watch", _watch, "Go on printing a line whenever it changes")->needs(waybar)->excludes(now);
+  status->add_flag("--notify", _notify, "Have the desktop tell of incidents that begin, get worse and end")
+      ->needs(watch);
 
-  add(_app, "update", "Fetch, and keep the rows for the widget's next start",
-      [](const CommandContext& context) { return runUpdate(context); });
+  add(_app, "update", "Fetch, and keep the rows for the widget's next start", [this](const CommandContext& context) {
+    return runUpdate(context, _notify);
+  })->add_flag("--notify", _notify, "Have the desktop tell of incidents that begin, get worse and end");
 
   CLI::App* render = add(_app, "render", "Draw the rows into a PNG file", [this](const CommandContext& context) {
     _render.size = sizeOfArgument(_text);

@@ -4,6 +4,7 @@
 #include <nlohmann/json.hpp>
 
 #include "desktop/raii/SQLite.h"
+#include "desktop/store/JSONDate.h"
 
 namespace nimbo {
 
@@ -11,15 +12,9 @@ using nlohmann::json;
 
 namespace {
 
-constexpr std::chrono::days kForgotten{90};
+constexpr std::chrono::days kSeenForgotten{90};
 /// Periods to come that a reading of the alerts tells at most; more of them follow.
 constexpr std::size_t kManyPeriods = 16;
-
-json jsonOfDate(std::optional<Date> date) { return date ? json(date->time_since_epoch().count()) : json(); }
-
-std::optional<Date> dateOfJSON(const json& date) {
-  return date.is_null() ? std::nullopt : std::optional(Date(std::chrono::microseconds(date.get<std::int64_t>())));
-}
 
 std::string contentOf(const IncidentForm& form) {
   json periods = json::array();
@@ -102,7 +97,7 @@ ErrorRef SeenIncidents::keep(const std::vector<IncidentForm>& forms, Date now) c
       insert.reset();
     }
     SQLiteStatement forget = connection.prepare("DELETE FROM seen WHERE date < ?");
-    forget.bind(1, Date(now - kForgotten).time_since_epoch().count());
+    forget.bind(1, Date(now - kSeenForgotten).time_since_epoch().count());
     forget.step();
     return nullptr;
   });

@@ -6,6 +6,7 @@
 #include <algorithm>
 
 #include "host/FeedAnswers.h"
+#include "host/IncidentWords.h"
 #include "host/window/LineStates.h"
 #include "host/window/ShieldImage.h"
 #include "host/window/Texts.h"
@@ -93,11 +94,7 @@ void IncidentCard::addMarks() {
   const protocol::LineIncident* known = incidentNumbered(_context.lines, _incident->muid());
   if (!known) return;
   if (known->severity != protocol::Severity::unknown) add_css_class(styleOfSeverity(known->severity));
-  std::string text;
-  for (const std::string& words :
-       {textOfSeverity(known->severity), textOfEffect(known->effect), textOfCause(known->cause)})
-    if (!words.empty()) text += (text.empty() ? "" : " · ") + words;
-  addSaid(text, "item-caption");
+  addSaid(marksOf(*known), "item-caption");
 }
 
 void IncidentCard::addTexts(const TransitIncident& incident) {

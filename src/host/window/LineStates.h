@@ -19,11 +19,6 @@ const protocol::LineIncident* incidentNumbered(const protocol::Lines& lines, std
 /// How a line runs, in the user's language: good service, how many incidents, or why nobody knows.
 std::string textOfState(const protocol::LineReport& line);
 
-/// Words of the reference in the user's language; empty for those that say nothing, such as "unknown_cause".
-std::string textOfSeverity(protocol::Severity severity);
-std::string textOfEffect(const std::string& effect);
-std::string textOfCause(const std::string& cause);
-
 /// The CSS class that colours such a text.
 const char* styleOfState(protocol::LineState state);
 
