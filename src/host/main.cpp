@@ -11,9 +11,9 @@
 #include <set>
 
 #include "desktop/gtfs/feeds/Feed.h"
+#include "desktop/system/StandardDescriptors.h"
 #include "host/Arguments.h"
 #include "host/Commands.h"
-#include "host/StandardDescriptors.h"
 #include "host/StatusBar.h"
 #include "platform/foundation/Version.h"
 

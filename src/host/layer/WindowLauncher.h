@@ -1,6 +1,5 @@
 #pragma once
 
-#include <filesystem>
 #include <functional>
 #include <string>
 #include <vector>
@@ -20,10 +19,6 @@ class WindowLauncher {
   bool open(const WidgetClient::Opening& opening) const;
   /// The window's first page, which leads to all others.
   bool openPages() const { return openURL("nimbo://"); }
-
-  /// Where the window's program is: beside the running one, or as built, or NIMBO_TRANSIT_DESKTOP; else a name to be
-  /// looked for in PATH.
-  static std::filesystem::path windowProgram();
 
  private:
   bool openURL(const std::string& url) const;

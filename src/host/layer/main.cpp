@@ -4,7 +4,7 @@
 #include <cstdio>
 
 #include "desktop/system/SmallMemory.h"
-#include "host/StandardDescriptors.h"
+#include "desktop/system/StandardDescriptors.h"
 #include "host/TerminalText.h"
 #include "host/layer/LayerHost.h"
 #include "platform/foundation/Version.h"

@@ -6,21 +6,10 @@
 #include <vector>
 
 #include "host/notices/Notice.h"
+#include "host/notices/NoticeError.h"
 #include "platform/RunLoop.h"
-#include "platform/foundation/Error.h"
 
 namespace nimbo {
-
-/// Domain of errors in telling the user something.
-inline constexpr std::string_view kNoticeErrorDomain = "org.nimbo.Notices";
-
-enum class NoticeError {
-  noBus = 1,  ///< there is no session bus, or it went away
-  noService,  ///< the desktop has no notification service
-  noAnswer,   ///< somebody on the bus did not answer in time
-  refused,    ///< somebody on the bus answered with an error, or with nonsense
-  tooMuch     ///< more notices, longer texts or other addresses than are taken; nothing was shown
-};
 
 /// Hands notices over to nimbo-transit-notices, which stays while they stand, replaces them and opens what is clicked.
 /// Where that is not installed, the notices are shown by this process: they open nothing, and desktops may take them
@@ -31,9 +20,8 @@ enum class NoticeError {
 /// a notice stands.
 class NoticeSender {
  public:
-  /// Null when all went well, which includes that there was nothing to do; else what went wrong first. On the main
-  /// thread, once, never before the call returns; never after the sender went.
-  using Completion = std::function<void(const ErrorRef& error)>;
+  /// Called on the main thread, once, never before the call returns; never after the sender went.
+  using Completion = NoticeCompletion;
 
   /// The run loop outlives the sender; it runs GLib's default main context.
   explicit NoticeSender(RunLoop& runLoop);
@@ -44,8 +32,8 @@ class NoticeSender {
   /// Shows notices, or changes those that stand under their keys. At most 50 at once, with keys of 200 bytes, titles of
   /// 1000, bodies of 10,000 and addresses of 2000; a key once. Answers within half a minute.
   void post(std::vector<Notice> notices, Completion completion);
-  /// Takes away what stands under the keys, and forgets what stood there. Starts no program for that. Answers within
-  /// half a minute.
+  /// Takes away what stands under the keys, at most 500, and forgets what stood there. Starts no program for that.
+  /// Answers within half a minute.
   void close(std::vector<std::string> keys, Completion completion);
 
  private:

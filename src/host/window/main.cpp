@@ -7,7 +7,7 @@
 #include <cstdlib>
 
 #include "desktop/system/SmallMemory.h"
-#include "host/StandardDescriptors.h"
+#include "desktop/system/StandardDescriptors.h"
 #include "host/window/WindowApplication.h"
 #include "platform/foundation/Version.h"
 
