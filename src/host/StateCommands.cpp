@@ -14,7 +14,7 @@
 #include "host/HostPlatform.h"
 #include "host/TerminalText.h"
 #include "host/WidgetClient.h"
-#include "host/notices/TellingSettings.h"
+#include "host/telling/TellingSettings.h"
 
 namespace nimbo {
 

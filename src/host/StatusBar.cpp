@@ -15,7 +15,7 @@
 #include "host/QuitOnSignal.h"
 #include "host/StatusWatch.h"
 #include "host/TerminalText.h"
-#include "host/notices/Teller.h"
+#include "host/telling/Teller.h"
 
 namespace nimbo {
 

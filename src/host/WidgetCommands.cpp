@@ -13,7 +13,7 @@
 #include "host/ScriptPlayer.h"
 #include "host/TerminalRows.h"
 #include "host/TerminalText.h"
-#include "host/notices/Teller.h"
+#include "host/telling/Teller.h"
 #include "protocol/Names.h"
 
 namespace nimbo {

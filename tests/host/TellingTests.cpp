@@ -2,8 +2,8 @@
 
 #include <gmock/gmock.h>
 
-#include "host/notices/TellingRule.h"
-#include "host/notices/TellingSettings.h"
+#include "host/telling/TellingRule.h"
+#include "host/telling/TellingSettings.h"
 #include "support/TestPlatform.h"
 
 namespace nimbo {

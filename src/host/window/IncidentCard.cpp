@@ -6,7 +6,7 @@
 #include <algorithm>
 
 #include "host/FeedAnswers.h"
-#include "host/IncidentWords.h"
+#include "host/telling/IncidentWords.h"
 #include "host/window/LineStates.h"
 #include "host/window/ShieldImage.h"
 #include "host/window/Texts.h"

@@ -3,7 +3,7 @@
 #include <string>
 #include <vector>
 
-#include "host/DateText.h"
+#include "host/telling/DateText.h"
 #include "platform/foundation/Error.h"
 #include "platform/transit/TransitIncident.h"
 #include "platform/transit/TransitLine.h"

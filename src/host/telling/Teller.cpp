@@ -1,9 +1,9 @@
-#include "host/notices/Teller.h"
+#include "host/telling/Teller.h"
 
 #include <algorithm>
 #include <iterator>
 
-#include "host/notices/TellingSettings.h"
+#include "host/telling/TellingSettings.h"
 #include "platform/Platform.h"
 #include "platform/SystemServices.h"
 #include "platform/foundation/Log.h"

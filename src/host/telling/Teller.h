@@ -8,7 +8,7 @@
 #include "desktop/DesktopPlatform.h"
 #include "desktop/store/ToldIncidents.h"
 #include "host/notices/NoticeSender.h"
-#include "host/notices/TellingRule.h"
+#include "host/telling/TellingRule.h"
 #include "protocol/Lines.h"
 
 namespace nimbo {

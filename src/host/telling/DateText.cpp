@@ -1,4 +1,4 @@
-#include "host/DateText.h"
+#include "host/telling/DateText.h"
 
 #include "desktop/DesktopPlatform.h"
 #include "desktop/strings/ICUStringTables.h"

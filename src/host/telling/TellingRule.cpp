@@ -1,4 +1,4 @@
-#include "host/notices/TellingRule.h"
+#include "host/telling/TellingRule.h"
 
 #include <algorithm>
 #include <charconv>

@@ -3,8 +3,8 @@
 #include <string>
 #include <vector>
 
-#include "host/DateText.h"
 #include "host/notices/Notice.h"
+#include "host/telling/DateText.h"
 #include "protocol/Lines.h"
 
 namespace nimbo {

@@ -5,7 +5,7 @@
 
 #include "desktop/store/ToldIncidents.h"
 #include "host/notices/Notice.h"
-#include "host/notices/NoticeTexts.h"
+#include "host/telling/NoticeTexts.h"
 #include "protocol/Lines.h"
 
 namespace nimbo {

@@ -1,9 +1,9 @@
-#include "host/notices/NoticeTexts.h"
+#include "host/telling/NoticeTexts.h"
 
 #include <algorithm>
 
 #include "desktop/gtfs/text/Utf8.h"
-#include "host/IncidentWords.h"
+#include "host/telling/IncidentWords.h"
 #include "platform/Localization.h"
 
 namespace nimbo {

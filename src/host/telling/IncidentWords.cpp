@@ -1,4 +1,4 @@
-#include "host/IncidentWords.h"
+#include "host/telling/IncidentWords.h"
 
 #include <string_view>
 

@@ -1,4 +1,4 @@
-#include "host/notices/TellingSettings.h"
+#include "host/telling/TellingSettings.h"
 
 #include <algorithm>
 #include <array>
