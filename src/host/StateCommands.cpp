@@ -9,11 +9,11 @@
 
 #include "desktop/rpc/Base64.h"
 #include "desktop/store/RefreshSetting.h"
-#include "desktop/store/ToldIncidents.h"
 #include "host/Commands.h"
 #include "host/HostPlatform.h"
 #include "host/TerminalText.h"
 #include "host/WidgetClient.h"
+#include "host/telling/Teller.h"
 #include "host/telling/TellingSettings.h"
 
 namespace nimbo {
@@ -103,10 +103,10 @@ int runSettingsSet(const CommandContext& context, const std::string& key, const 
                          "\"");
   if (const std::string problem = problemOfTellingSetting(key, value); !problem.empty()) throw CommandFailure(problem);
   HostPlatform platform(context);
-  const auto settings = Platform::current().sharedSettings().groupStore();
-  const bool wasOn = TellingSettings::read(*settings).isOn;
-  require(settings->setValue_forKey(settingOfText(value), key));
-  if (!wasOn && TellingSettings::read(*settings).isOn) require(ToldIncidents(platform->database()).beginAnew());
+  if (key == kNotifyKey)
+    require(setNotify(*platform.operator->(), value));
+  else
+    require(Platform::current().sharedSettings().groupStore()->setValue_forKey(settingOfText(value), key));
   return kExitSuccess;
 }
 

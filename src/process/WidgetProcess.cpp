@@ -2,7 +2,6 @@
 
 #include <algorithm>
 #include <limits>
-#include <set>
 #include <utility>
 
 #include "desktop/drawing/DrawingPart.h"
@@ -168,7 +167,11 @@ protocol::Initialized WidgetProcess::initialize(const protocol::InitializeParams
   _platform.reset();
   makePlatform(params.locale.value_or(""));
   // When the lines were looked up is told, also where they run as before.
-  _platform->transitLines().setAnswerObserver([this] { notify(_connection, protocol::kUpdated, {}); });
+  _platform->transitLines().setAnswerObserver([this] {
+    notify(_connection, protocol::kUpdated, {});
+    const std::set<std::string> early = std::exchange(_seenEarly, {});
+    if (const ErrorRef failure = early.empty() ? nullptr : keepSeen(early)) tellNotice(failure);
+  });
   Environment& environment = Environment::current();
   environment.setContentSizeCategory(params.textSize);
   environment.setScreenScale(params.scale);
@@ -352,24 +355,33 @@ protocol::Lines WidgetProcess::lines(const Nothing&) {
 
 protocol::Kept WidgetProcess::markSeen(const protocol::MarkSeenParams& params) {
   if (!_controller) throw JSONRPCFailure(JSONRPCError::kInvalidState, "markSeen needs \"initialize\" first");
+  if (!_platform->transitLines().askedAt()) {
+    _seenEarly.insert(params.ids.begin(), params.ids.end());
+    _controller->widgetPerformUpdateWithCompletionHandler([](WidgetUpdateResult) {});
+    return {};
+  }
+  const ErrorRef failure = keepSeen({params.ids.begin(), params.ids.end()});
+  return {failure ? std::optional(failure->reason()) : std::nullopt};
+}
+
+ErrorRef WidgetProcess::keepSeen(const std::set<std::string>& ids) {
   const SeenIncidents incidents(_platform->database());
   const auto seen = incidents.list();
-  if (!seen) return {seen.error()->reason()};
-  const std::set<std::string, std::less<>> marked(params.ids.begin(), params.ids.end());
+  if (!seen) return seen.error();
   std::vector<IncidentForm> kept;
   const Date now = currentDate();
   bool isChange = false;
   for (auto& [muid, form] : incidentForms(_platform->transitLines())) {
     const bool wasSeen = seen->have(form, now);
-    if (!wasSeen && !marked.contains(std::to_string(muid))) continue;
+    if (!wasSeen && !ids.contains(std::to_string(muid))) continue;
     isChange = isChange || !wasSeen;
     kept.push_back(std::move(form));
   }
-  if (!isChange) return {};
+  if (!isChange) return nullptr;
   // What was seen before is kept in its present form, and for as long as it is there.
-  if (const ErrorRef failure = incidents.keep(kept, now)) return {failure->reason()};
+  if (ErrorRef failure = incidents.keep(kept, now)) return failure;
   notify(_connection, protocol::kUpdated, {});
-  return {};
+  return nullptr;
 }
 
 protocol::Downloads WidgetProcess::downloads(const Nothing&) {

@@ -2,6 +2,8 @@
 
 #include <memory>
 #include <optional>
+#include <set>
+#include <string>
 
 #include "desktop/rpc/JSONRPCConnection.h"
 #include "desktop/system/Paths.h"
@@ -65,6 +67,8 @@ class WidgetProcess {
   protocol::Snapshot snapshot(const protocol::SnapshotParams& params);
   protocol::Lines lines(const Nothing&);
   protocol::Kept markSeen(const protocol::MarkSeenParams& params);
+  /// Keeps that these incidents, of those that the last fetch found, were seen.
+  ErrorRef keepSeen(const std::set<std::string>& ids);
   protocol::Downloads downloads(const Nothing&);
   protocol::Rendered render(const protocol::RenderParams& params);
   Nothing setAppearance(const protocol::AppearanceParams& params);
@@ -100,6 +104,7 @@ class WidgetProcess {
   std::shared_ptr<NBTransitIncidentsViewController> _controller;
   std::unique_ptr<SourceWatch> _sources;  // while it can be seen
   Stage _stage = Stage::created;
+  std::set<std::string> _seenEarly;  // before a fetch told what they are
   bool _hostChoseMode = false;
   bool _frameAnnounced = false;
 };

@@ -17,6 +17,13 @@ constexpr std::size_t kMostNotices = 50;
 
 }  // namespace
 
+ErrorRef setNotify(DesktopPlatform& platform, const std::string& value) {
+  const auto settings = platform.sharedSettings().groupStore();
+  const bool wasOn = TellingSettings::read(*settings).isOn;
+  if (ErrorRef failure = settings->setValue_forKey(value, kNotifyKey)) return failure;
+  return wasOn || !TellingSettings::read(*settings).isOn ? nullptr : ToldIncidents(platform.database()).beginAnew();
+}
+
 Teller::Teller(GLibRunLoop& runLoop, DesktopPlatform& platform, Options options)
     : _runLoop(runLoop),
       _options(std::move(options)),

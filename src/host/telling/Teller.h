@@ -13,6 +13,10 @@
 
 namespace nimbo {
 
+/// Turns the telling on or off, as the setting "notify" has it: from off to on, what runs now counts as told. Null on
+/// success.
+ErrorRef setNotify(DesktopPlatform& platform, const std::string& value);
+
 /// Tells the user what begins, worsens and ends on his lines, as his settings have it, once whatever programs run. Main
 /// thread only.
 class Teller {

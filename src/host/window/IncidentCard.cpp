@@ -1,7 +1,9 @@
 #include "host/window/IncidentCard.h"
 
+#include <gtkmm/adjustment.h>
 #include <gtkmm/label.h>
 #include <gtkmm/linkbutton.h>
+#include <gtkmm/scrolledwindow.h>
 
 #include <algorithm>
 
@@ -194,7 +196,8 @@ std::vector<TransitIncidents> groupedByNumber(const TransitIncidents& incidents,
 }  // namespace
 
 IncidentCards::IncidentCards(const PageContext& context, const TransitIncidents& incidents,
-                             std::optional<std::uint64_t> line) {
+                             std::optional<std::uint64_t> line)
+    : _context(context) {
   // Cards are stops for the keyboard, which also brings one that is out of sight into view.
   add_css_class("cards");
   set_selection_mode(Gtk::SelectionMode::NONE);
@@ -203,6 +206,32 @@ IncidentCards::IncidentCards(const PageContext& context, const TransitIncidents&
     append(*_cards.back());
   }
   lookUpLines(context, incidents);
+  signal_map().connect([this] { watchView(); });
+}
+
+void IncidentCards::watchView() {
+  auto* page = dynamic_cast<Gtk::ScrolledWindow*>(get_ancestor(Gtk::ScrolledWindow::get_type()));
+  if (!page) return;
+  // Not before they have a place.
+  add_tick_callback([this](const Glib::RefPtr<Gdk::FrameClock>&) { return !markWhatIsInView(); });
+  page->get_vadjustment()->signal_value_changed().connect(
+      sigc::hide_return(sigc::mem_fun(*this, &IncidentCards::markWhatIsInView)));
+}
+
+bool IncidentCards::markWhatIsInView() {
+  GtkWidget* page = gtk_widget_get_ancestor(GTK_WIDGET(gobj()), GTK_TYPE_SCROLLED_WINDOW);
+  graphene_rect_t place;
+  std::vector<std::string> seen;
+  bool havePlaces = false;
+  for (IncidentCard* card : _cards) {
+    if (!page || !gtk_widget_compute_bounds(GTK_WIDGET(card->gobj()), page, &place) || place.size.height <= 0) continue;
+    havePlaces = true;
+    const bool isInView =
+        place.origin.y < static_cast<float>(gtk_widget_get_height(page)) && place.origin.y + place.size.height > 0;
+    if (isInView && _marked.insert(card->id()).second) seen.push_back(card->id());
+  }
+  if (!seen.empty()) _context.navigator.markSeen(seen, false);
+  return havePlaces || _cards.empty();
 }
 
 void IncidentCards::lookUpLines(const PageContext& context, const TransitIncidents& incidents) {

@@ -6,6 +6,8 @@
 
 #include <map>
 #include <optional>
+#include <set>
+#include <string>
 
 #include "host/window/PageContext.h"
 
@@ -25,6 +27,9 @@ class IncidentCard final : public Gtk::ListBoxRow {
   void showAffectedLines(const LinesByNumber& lines);
   /// Says when the publisher of its lines made his alerts, where he does.
   void showAsOf(const LinesByNumber& lines);
+
+  /// The incident's number in decimal.
+  std::string id() const { return std::to_string(_incident->muid()); }
 
  private:
   static void addText(Gtk::Box& box, const std::string& text, const char* style);
@@ -47,7 +52,7 @@ class IncidentCard final : public Gtk::ListBoxRow {
 };
 
 /// A card for each of some incidents, those that are in force first. What they affect is looked up in the feeds by and
-/// by.
+/// by. A card that comes into view has been seen.
 class IncidentCards final : public Gtk::ListBox {
  public:
   /// `line` is the line whose incidents they are; absent for a list over lines.
@@ -55,8 +60,13 @@ class IncidentCards final : public Gtk::ListBox {
 
  private:
   void lookUpLines(const PageContext& context, const TransitIncidents& incidents);
+  void watchView();
+  /// NO before there is anything to see.
+  bool markWhatIsInView();
 
+  const PageContext& _context;
   std::vector<IncidentCard*> _cards;
+  std::set<std::string> _marked;  // by their numbers
   std::shared_ptr<WidgetHostProcess::Question> _lookup;
 };
 

@@ -2,6 +2,8 @@
 
 #include <gtkmm/label.h>
 
+#include <algorithm>
+
 #include "desktop/store/FavoritesEditor.h"
 #include "host/FeedAnswers.h"
 #include "host/window/IncidentCard.h"
@@ -23,6 +25,23 @@ Gtk::Label* makeLabel(const std::string& text, const char* style) {
   label->set_xalign(0);
   label->set_visible(!text.empty());
   return label;
+}
+
+/// Marks incidents as seen, those too that are out of view; where none is new there is no button to see.
+Gtk::Button* makeSeenButton(const PageContext& context, const TransitIncidents& incidents) {
+  std::vector<std::string> ids;
+  for (const TransitIncidentRef& incident : incidents) ids.push_back(std::to_string(incident->muid()));
+  const std::vector<std::string> unseen = newIncidents(context.lines);
+  auto* button = Gtk::make_managed<Gtk::Button>(LocalizedString("Window_Seen"));
+  button->set_halign(Gtk::Align::START);
+  button->set_visible(std::any_of(unseen.begin(), unseen.end(), [&ids](const std::string& id) {
+    return std::find(ids.begin(), ids.end(), id) != ids.end();
+  }));
+  button->signal_clicked().connect([&context, button, ids] {
+    context.navigator.markSeen(ids, true);
+    button->hide();
+  });
+  return button;
 }
 
 }  // namespace
@@ -97,6 +116,9 @@ LinePage::LinePage(const PageContext& context, const protocol::LineReport& line,
     addText(LocalizedString("Window_Planned_Title"), "item-heading");
     content().append(*Gtk::make_managed<IncidentCards>(context, incidentsOf(line.planned, lines), line.muid));
   }
+  TransitIncidents shown = incidentsOf(line.incidents, lines);
+  for (TransitIncidentRef& planned : incidentsOf(line.planned, lines)) shown.push_back(std::move(planned));
+  content().append(*makeSeenButton(context, shown));
   if (lines.updated && line.state != protocol::LineState::unknown)
     addText(LocalizedFormat(LocalizedString("Window_Updated"),
                             {DateText(context.preferences.locale()).textOf(*lines.updated)}),
@@ -114,6 +136,7 @@ IncidentListPage::IncidentListPage(const PageContext& context, const TransitInci
   if (incidents.empty())
     content().append(*Gtk::make_managed<Gtk::Label>(LocalizedString("Window_Line_NothingHandedOver")));
   content().append(*Gtk::make_managed<IncidentCards>(context, incidents, std::nullopt));
+  content().append(*makeSeenButton(context, incidents));
 }
 
 PlannedPage::PlannedPage(const PageContext& context, const protocol::Lines& lines)

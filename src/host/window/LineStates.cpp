@@ -58,6 +58,15 @@ const protocol::LineIncident* incidentNumbered(const protocol::Lines& lines, std
   return nullptr;
 }
 
+std::vector<std::string> newIncidents(const protocol::Lines& lines) {
+  std::set<std::string> ids;
+  for (const protocol::LineReport& line : lines.lines)
+    for (const auto* list : {&line.incidents, &line.planned})
+      for (const protocol::LineIncident& incident : *list)
+        if (incident.isNew) ids.insert(incident.id);
+  return {ids.begin(), ids.end()};
+}
+
 std::string textOfState(const protocol::LineReport& line) {
   switch (line.state) {
     case protocol::LineState::good:

@@ -16,6 +16,9 @@ TransitIncidents incidentsOf(const std::vector<protocol::LineIncident>& incident
 /// The incident of this number in force or planned on a line; null where none has it. Lives as long as `lines`.
 const protocol::LineIncident* incidentNumbered(const protocol::Lines& lines, std::uint64_t muid);
 
+/// The numbers of the incidents, in force and planned, that the user has not seen yet; each once.
+std::vector<std::string> newIncidents(const protocol::Lines& lines);
+
 /// How a line runs, in the user's language: good service, how many incidents, or why nobody knows.
 std::string textOfState(const protocol::LineReport& line);
 

@@ -10,6 +10,8 @@
 
 #include "desktop/rpc/Base64.h"
 #include "host/FeedAnswers.h"
+#include "host/telling/Teller.h"
+#include "host/telling/TellingSettings.h"
 #include "host/window/FavoritesPage.h"
 #include "host/window/FeedsPage.h"
 #include "host/window/HelpPages.h"
@@ -17,6 +19,7 @@
 #include "host/window/LineStates.h"
 #include "host/window/WidgetTexts.h"
 #include "platform/Localization.h"
+#include "platform/Platform.h"
 
 namespace nimbo {
 
@@ -60,12 +63,17 @@ Glib::RefPtr<Gio::MenuModel> makeMainMenu() {
   look->append_submenu(LocalizedString("Window_Language"), language);
   look->append_submenu(LocalizedString("Window_Refresh"), refresh);
 
+  const auto telling = Gio::Menu::create();
+  telling->append(LocalizedString("Window_Seen_All"), "win.mark-seen");
+  telling->append(LocalizedString("Window_Notify"), "win.notify");
+
   const auto last = Gio::Menu::create();
   last->append(LocalizedString("Window_Shortcuts"), "win.shortcuts");
   last->append(LocalizedString("Window_About"), "win.about");
   last->append(LocalizedString("Window_Quit"), "app.quit");
 
   const auto menu = Gio::Menu::create();
+  menu->append_section(telling);
   menu->append_section(texts);
   menu->append_section(look);
   menu->append_section(last);
@@ -87,6 +95,7 @@ MainWindow::MainWindow(const CommandContext& command, HostPlatform& platform, De
   set_child(_body);
   addActions();
   _pages.signalFrontChanged().connect([this] { showFront(); });
+  _widgetPage->signalTitleChanged().connect([this] { showTitle(); });
   showFront();
 }
 
@@ -140,6 +149,8 @@ void MainWindow::addActions() {
     if (const auto undo = std::exchange(_undo, nullptr)) undo();
   });
   add_action("update", [this] { _widgetPage->update(); });
+  add_action("mark-seen", [this] { markSeen(newIncidents(_lines), true); });
+  addNotifyAction();
   DesktopPreferences& preferences = _context.preferences;
   add_action("text-larger", [&preferences] { preferences.stepTextSize(1); });
   add_action("text-smaller", [&preferences] { preferences.stepTextSize(-1); });
@@ -174,8 +185,28 @@ void MainWindow::addActions() {
   add_controller(clicks);
 }
 
+void MainWindow::addNotifyAction() {
+  const bool isOn = TellingSettings::read(*Platform::current().sharedSettings().groupStore()).isOn;
+  const auto action = add_action_bool("notify", isOn);
+  action->signal_activate().connect([this, action](const Glib::VariantBase&) {
+    bool wasOn = false;
+    action->get_state(wasOn);
+    if (const ErrorRef failure = setNotify(*_context.platform.operator->(), wasOn ? "off" : "on"))
+      return tell(textOfError(*failure));
+    action->set_state(Glib::Variant<bool>::create(!wasOn));
+    _widgetPage->showNotifyQuestion();
+  });
+}
+
+void MainWindow::markSeen(const std::vector<std::string>& ids, bool isAsked) {
+  std::vector<std::string> marked;
+  for (const std::string& id : newIncidents(_lines))
+    if (std::find(ids.begin(), ids.end(), id) != ids.end()) marked.push_back(id);
+  if (!marked.empty()) _widgetPage->markSeen(marked, isAsked);
+}
+
 void MainWindow::showFront() {
-  set_title(_pages.front().title());
+  showTitle();
   const bool isFirst = _pages.depth() == 1;
   _back.set_visible(!isFirst);
   _update.set_visible(isFirst);

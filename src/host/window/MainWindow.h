@@ -26,12 +26,15 @@ class MainWindow final : public Gtk::ApplicationWindow, public Navigator {
   void open(const OpenRequest& request) override;
   void tell(const std::string& message) override;
   void tell(const std::string& message, std::function<void()> undo) override;
+  void markSeen(const std::vector<std::string>& ids, bool isAsked) override;
 
  private:
   void buildHeader();
   void buildMessageBar();
   void addActions();
   void showFront();
+  void showTitle() { set_title(_pages.front().title()); }
+  void addNotifyAction();
   void push(std::unique_ptr<Page> page);
   void openLine(const ShowFavoriteLine& show, const protocol::Lines& lines);
   void openIncident(const ShowIncident& show, const protocol::Lines& lines);

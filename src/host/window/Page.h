@@ -34,12 +34,20 @@ class Page : public Gtk::ScrolledWindow {
   explicit Page(std::string title);
 
   const std::string& title() const { return _title; }
+  /// It has another title.
+  sigc::signal<void()>& signalTitleChanged() { return _titleChanged; }
 
  protected:
+  void setTitle(std::string title) {
+    if (_title == title) return;
+    _title = std::move(title);
+    _titleChanged.emit();
+  }
   Gtk::Box& content() { return _content; }
 
  private:
   std::string _title;
+  sigc::signal<void()> _titleChanged;
   Gtk::Box _content{Gtk::Orientation::VERTICAL, 12};
   Column _column{_content};
 };

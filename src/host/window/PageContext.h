@@ -25,6 +25,9 @@ class Navigator {
   virtual void tell(const std::string& message) = 0;
   /// Tells the user of something that he did, and takes it back when he wishes so.
   virtual void tell(const std::string& message, std::function<void()> undo) = 0;
+  /// Notes that the user has seen the incidents of these numbers, those among them that are new. Where that cannot be
+  /// kept he is told so if he asked for it.
+  virtual void markSeen(const std::vector<std::string>& ids, bool isAsked) = 0;
 };
 
 /// What every page has at hand; all of it outlives the pages.

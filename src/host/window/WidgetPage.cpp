@@ -9,6 +9,7 @@
 
 #include "desktop/gtfs/feeds/TransitLineServiceError.h"
 #include "desktop/rpc/Base64.h"
+#include "host/telling/TellingSettings.h"
 #include "host/window/Texts.h"
 #include "host/window/WidgetTexts.h"
 #include "platform/Localization.h"
@@ -72,7 +73,8 @@ WidgetPage::WidgetPage(const PageContext& context)
     : Page(LocalizedString("Window_Title")),
       _context(context),
       _process(context.command.runLoop, Platform::current().clock(), context.command.widgetArguments, *this),
-      _wantsExpanded(Platform::current().sharedSettings().groupStore()->boolForKey(kExpandedKey)) {
+      _wantsExpanded(Platform::current().sharedSettings().groupStore()->boolForKey(kExpandedKey)),
+      _teller(context.command.runLoop, *context.platform.operator->(), {.locale = context.preferences.locale()}) {
   buildGone();
   buildCard();
   buildLines();
@@ -164,12 +166,56 @@ void WidgetPage::buildLines() {
   _planned.hide();
   content().append(_planned);
   content().append(_sampleNotice);
+  buildNotifyQuestion();
+  content().append(_notifyQuestion);
   content().append(_lines);
+}
+
+void WidgetPage::buildNotifyQuestion() {
+  _notifyQuestion.add_css_class("card");
+  _notifyQuestion.add_css_class("notice");
+  auto* text = Gtk::make_managed<Gtk::Label>(LocalizedString("Window_Notify_Question"));
+  text->set_xalign(0);
+  auto* answers = Gtk::make_managed<Gtk::Box>(Gtk::Orientation::HORIZONTAL, 8);
+  for (const auto& [key, value] : {std::pair("Window_Notify_Yes", "on"), {"Window_Notify_No", "off"}}) {
+    auto* button = Gtk::make_managed<Gtk::Button>(LocalizedString(key));
+    button->signal_clicked().connect([this, answer = std::string(value)] {
+      if (answer == "on") return static_cast<void>(activate_action("win.notify"));
+      if (const ErrorRef failure = setNotify(*_context.platform.operator->(), answer))
+        return _context.navigator.tell(textOfError(*failure));
+      showNotifyQuestion();
+    });
+    answers->append(*button);
+  }
+  _notifyQuestion.append(*text);
+  _notifyQuestion.append(*answers);
+  _notifyQuestion.hide();
+}
+
+void WidgetPage::showNotifyQuestion() {
+  const auto feeds = _context.feeds().feeds();
+  const bool hasOwn = feeds && !feeds->empty() && !_context.lines.lines.empty();
+  _notifyQuestion.set_visible(hasOwn && !Platform::current().sharedSettings().groupStore()->valueForKey(kNotifyKey));
+}
+
+void WidgetPage::markSeen(const std::vector<std::string>& ids, bool isAsked) {
+  _seenQuestion = _process.ask(protocol::kMarkSeen, {ids}, [this, isAsked](const Outcome<protocol::Kept>& kept) {
+    if (!isAsked || (kept && !kept->failure)) return;
+    _context.navigator.tell(kept ? *kept->failure : textOfError(*kept.error()));
+  });
 }
 
 void WidgetPage::showLines(const protocol::Lines& lines, std::optional<Date> updated) {
   _context.lines = lines;
   _lines.show(lines);
+  showNotifyQuestion();
+  const std::uint64_t unseen = newIncidents(lines).size();
+  setTitle(unseen == 0
+               ? LocalizedString("Window_Title")
+               : LocalizedFormat(LocalizedString("Window_Title_New"), {unseen, LocalizedString("Window_Title")}));
+  _teller.take(lines, [](const ErrorRef& error) {
+    if (error) writeLog({kDefaultLogSubsystem, "WidgetPage"}, LogLevel::error, "Not notified: %@", {error->reason()});
+  });
   const std::size_t planned = countOfPlanned(lines);
   _plannedText.set_text(LocalizedFormat(LocalizedString("Window_Planned_Count"), {std::uint64_t{planned}}));
   setAccessibleLabel(_planned, _plannedText.get_text());

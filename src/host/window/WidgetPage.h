@@ -6,6 +6,7 @@
 #include <gtkmm/spinner.h>
 
 #include "host/WidgetHostProcess.h"
+#include "host/telling/Teller.h"
 #include "host/window/LineStates.h"
 #include "host/window/Page.h"
 #include "host/window/PageContext.h"
@@ -26,9 +27,15 @@ class WidgetPage final : public Page, private WidgetHostProcess::Delegate {
   /// Gives what is known of the favourite lines: by the last fetch, else once one has ended.
   void withLines(std::function<void(const protocol::Lines&)> completion);
 
+  /// Keeps that the user has seen these incidents; `isAsked`: he hears where that fails.
+  void markSeen(const std::vector<std::string>& ids, bool isAsked);
+  /// Asks whether he wants to be told of incidents, once he has favorites of his own and until he has answered.
+  void showNotifyQuestion();
+
  private:
   void buildCard();
   void buildLines();
+  void buildNotifyQuestion();
   void showLines(const protocol::Lines& lines, std::optional<Date> updated);
   void buildGone();
   void buildPlaces();
@@ -76,6 +83,9 @@ class WidgetPage final : public Page, private WidgetHostProcess::Delegate {
   Gtk::Button _planned;
   LineStates _lines{_context};
   Gtk::Box _sampleNotice{Gtk::Orientation::VERTICAL, 8};
+  Gtk::Box _notifyQuestion{Gtk::Orientation::VERTICAL, 8};
+  Teller _teller;
+  std::shared_ptr<WidgetHostProcess::Question> _seenQuestion;
   Gtk::ListBox _places;
   std::shared_ptr<WidgetHostProcess::Question> _linesQuestion;
   std::vector<sigc::connection> _connections;
