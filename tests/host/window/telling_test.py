@@ -1,0 +1,142 @@
+#!/usr/bin/python3
+"""What a rider is told by window, bar and timer together, on a bus and before a notification service of the test's own.
+usage: telling_test.py NIMBO_TRANSIT_DESKTOP NIMBO_TRANSIT NIMBO_TRANSIT_NOTICES SERVICE_FILE GTFS_REALTIME_PROTO"""
+import json
+import os
+import pathlib
+import subprocess
+import sys
+import tempfile
+import time
+
+from notifications import NotificationService, start_bus, wait
+from window_session import Session, press
+
+desktop, command_line, notices, service_file, proto = sys.argv[1:]
+ALL_DAYS = "sun,mon,tue,wed,thu,fri,sat"
+
+
+def publish(folder, *alerts):
+    """Writes a city's feed with an alert for each header, its lines and its severity."""
+    folder.mkdir(exist_ok=True)
+    folder.joinpath("agency.txt").write_text(
+        "agency_id,agency_name,agency_url,agency_timezone\nM,Metro,https://example.org,UTC\n")
+    folder.joinpath("routes.txt").write_text(
+        "route_id,agency_id,route_short_name,route_long_name,route_type\nm1,M,1,Harbour,1\nm2,M,2,Castle,1\nm3,M,3,Ring,1\n")
+    text = f"header {{ gtfs_realtime_version: '2.0' timestamp: {int(time.time())} }}"
+    for number, header, lines, severity in alerts:
+        selectors = " ".join(f"informed_entity {{ route_id: '{line}' }}" for line in lines)
+        text += (f"entity {{ id: '{number}' alert {{ {selectors} effect: 3 severity_level: {severity} "
+                 f"header_text {{ translation {{ text: '{header}' }} }} }} }}")
+    alert_bytes = subprocess.run(["protoc", "-I", os.path.dirname(proto), "--encode=transit_realtime.FeedMessage",
+                                  os.path.basename(proto)], input=text.encode(), capture_output=True, check=True).stdout
+    folder.joinpath("new").write_bytes(alert_bytes)
+    folder.joinpath("new").rename(folder / "alerts.pb")
+
+
+def run(*arguments, status=0):
+    result = subprocess.run([command_line, *arguments], capture_output=True, text=True, timeout=60)
+    assert result.returncode == status, (arguments, result)
+    return result
+
+
+def incidents():
+    lines = json.loads(run("status", "--format", "json").stdout)["lines"]
+    return {incident["title"]: incident for line in lines for incident in line["incidents"]}
+
+
+with tempfile.TemporaryDirectory() as folder, Session(folder) as session:
+    bus, address = start_bus(folder, {"org.nimbo.Transit.Notices.service": (open(service_file).read(), notices)})
+    session.callback(bus.wait)
+    session.callback(bus.kill)
+    session.environment["DBUS_SESSION_BUS_ADDRESS"] = os.environ["DBUS_SESSION_BUS_ADDRESS"] = address
+    service = NotificationService(address)
+    city = pathlib.Path(folder, "city")
+    before = ("a", "Stairs are wet", ["m1"], 3)
+
+    def publish_and_ask(*alerts):
+        """All that runs hears of it at the same time: the timer twice, a bar that starts, and the window."""
+        publish(city, *alerts)
+        timers = [session.start([command_line, "update", "--notify"]) for _ in range(2)]
+        bar = session.start([command_line, "status", "--waybar", "--watch", "--notify"], stdout=subprocess.PIPE, text=True)
+        press("key", "F5")
+        for timer in timers:
+            assert timer.wait(60) == 0
+        wait("the bar", lambda: '"old"' not in bar.stdout.readline())
+        bar.terminate()
+        assert bar.wait(60) == 0
+
+    publish(city, before)
+    run("feed", "add", "city", "--static", city, "--alerts", city / "alerts.pb")
+    run("favorite", "add", "city:m1", "city:m2", "city:m3")
+    run("settings", "set", "notify", "on")
+    window = session.start([desktop])
+
+    def window_title():
+        found = subprocess.run(["xdotool", "search", "--onlyvisible", "--pid", str(window.pid), "getwindowname"],
+                               capture_output=True, text=True).stdout
+        return found.strip()
+
+    wait("the window", lambda: window_title() == "Nimbo Transit – 1 new")
+    press("windowfocus", subprocess.run(["xdotool", "search", "--onlyvisible", "--pid", str(window.pid)],
+                                        capture_output=True, text=True).stdout.split()[0])
+    publish_and_ask(before)
+    assert not service.shown, ("what ran before", service.shown)
+
+    signals = ("b", "Signals fail", ["m1", "m2", "m3"], 3)
+    publish_and_ask(before, signals)
+    told = service.see("1, 2, 3: Signals fail")
+    assert len(service.shown) == 1, service.shown
+    assert service.standing[told]["hints"]["urgency"] == 1 and "Significant delays" in service.standing[told]["body"]
+    wait("both counted", lambda: window_title() == "Nimbo Transit – 2 new")
+
+    signals = ("b", "Signals fail at the harbour", ["m1", "m2", "m3"], 3)
+    publish_and_ask(before, signals)
+    assert service.see("1, 2, 3: Signals fail at the harbour") == told
+    assert len(service.shown) == 2, service.shown
+
+    # A click opens the incident's page, and so it has been seen.
+    service.click(told)
+    wait("the page of the incident", lambda: window_title() == "Incidents")
+    wait("that it was seen", lambda: not incidents()["Signals fail at the harbour"]["new"])
+    assert incidents()["Stairs are wet"]["new"]
+    press("key", "Escape")
+    wait("one that is new", lambda: window_title() == "Nimbo Transit – 1 new")
+
+    publish_and_ask(before)
+    ended = service.see("1 incident has ended")
+    assert "Signals fail at the harbour" in service.standing[ended]["body"]
+    assert len(service.shown) == 3, service.shown
+
+    # In quiet hours nothing is told; then what still runs, but for what was seen meanwhile.
+    run("settings", "set", "quietDays", ALL_DAYS)
+    run("settings", "set", "quietHours", "around noon", status=1)
+    night = [("c", "Night works", ["m2"], 3), ("d", "Fog", ["m3"], 4), ("e", "Ice", ["m3"], 3), ("f", "Rain", ["m1"], 3)]
+    publish_and_ask(before, *night)
+    subprocess.run([desktop, "nimbo://incident?id=" + incidents()["Ice"]["id"]], check=True, timeout=60)
+    wait("that it was seen", lambda: not incidents()["Ice"]["new"])
+    press("key", "Escape")
+    publish_and_ask(before, *night[:3])
+    assert len(service.shown) == 3, service.shown
+    run("settings", "unset", "quietDays")
+    publish_and_ask(before, *night[:3])
+    summary = service.see("2 Advisories")
+    assert service.standing[summary]["body"].splitlines() == ["3, Ring: Fog", "2, Castle: Night works"]
+    assert service.standing[summary]["hints"]["urgency"] == 2 and len(service.shown) == 4, service.shown
+
+    # What cannot be shown is told later, and what cannot be kept is not told.
+    press("key", "ctrl+q")
+    assert window.wait(60) == 0
+    service.leave()
+    flood = ("g", "Flood", ["m2"], 3)
+    publish(city, before, *night[:3], flood)
+    assert "cannot notify" in run("update", "--notify", status=1).stderr
+    service = NotificationService(address, first_id=100)
+    assert "/dev/null" in run("--state", "/dev/null/state", "update", "--notify", status=1).stderr
+    run("update", "--notify")
+    service.see("2, Castle: Flood")
+    run("settings", "set", "notify", "off")
+    publish(city)
+    run("update")
+    assert len(service.shown) == 1, service.shown
+print("told")
