@@ -25,13 +25,12 @@ NoticeCompletion answerTo(const json& number) {
   };
 }
 
-/// nlohmann's writer refuses what is no UTF-8: it comes as the texts' bytes in Latin-1.
-std::string bytesOf(const json& text) { return text.get<std::string>(); }
-
+/// JSON holds no text that is no UTF-8: one that "isBroken" is made so.
 std::vector<Notice> noticesOf(const json& list) {
   std::vector<Notice> notices;
   for (const json& notice : list)
-    notices.push_back({notice.at("key"), bytesOf(notice.at("title")) + (notice.value("isBroken", false) ? "\xff" : ""),
+    notices.push_back({notice.at("key"),
+                       notice.at("title").get<std::string>() + (notice.value("isBroken", false) ? "\xff" : ""),
                        notice.value("body", ""), static_cast<Notice::Urgency>(notice.value("urgency", 1)),
                        notice.value("silent", false), notice.value("opens", "")});
   return notices;
@@ -45,13 +44,14 @@ int drive(bool serves) {
   std::unique_ptr<NoticeService> service;
   if (serves) {
     bus = std::move(*Bus::open());
-    service = std::make_unique<NoticeService>(
-        runLoop, *bus,
-        NoticeService::Events{[](const std::string& problem) { say({{"problem", problem}}); },
-                              [&] {
-                                say({{"ended", true}});
-                                runLoop.quit();
-                              }});
+    service = std::make_unique<NoticeService>(runLoop, *bus,
+                                              NoticeService::Events{[](const std::string& problem) {
+                                                                      say({{"problem", problem}});
+                                                                    },
+                                                                    [&] {
+                                                                      say({{"ended", true}});
+                                                                      runLoop.quit();
+                                                                    }});
   }
   std::string input;
   const auto watching = runLoop.watchReadable(STDIN_FILENO, [&] {
