@@ -31,6 +31,9 @@ _nimbo_transit() {
     esac
   done
 
+  case $command:$prev in
+    "settings set:notify") COMPREPLY=($(compgen -W "on off severe" -- "$cur")); return ;;
+  esac
   case $prev in
     --config | --state) _filedir -d; return ;;
     --static | --alerts | --key-file) _filedir; return ;;
@@ -48,7 +51,8 @@ _nimbo_transit() {
   local options="--help --config --state" names=""
   case $command in
     "") options+=" --version" names="status update render script feed lines favorite settings analytics decode" ;;
-    status) options+=" --expanded --lines --planned --saved --json --format --exit-code --now --waybar --watch" ;;
+    status) options+=" --expanded --lines --planned --saved --json --format --exit-code --now --waybar --watch --notify" ;;
+    update) options+=" --notify" ;;
     render) options+=" --expanded --size --scale --text-size --dark --locale --now" ;;
     script) options+=" --virtual-time" ;;
     analytics | lines | "feed list" | "favorite list") options+=" --json" ;;
@@ -66,7 +70,7 @@ _nimbo_transit() {
     "favorite remove" | "favorite move") names=$(_nimbo_transit_names favorite list | sed -n 's/^\([^ ]*:[^ ]*\).*/\1/p') ;;
     settings) names="get set unset" ;;
     "settings "*)
-      names="refreshSeconds Nimbo.TransitWidget.analytics.disabled Nimbo.TransitWidget.internal.injectFakeIncidents
+      names="notify quietHours quietDays refreshSeconds Nimbo.TransitWidget.analytics.disabled Nimbo.TransitWidget.internal.injectFakeIncidents
         Nimbo.TransitWidget.internal.randomNumberIncidents"
       ;;
   esac

@@ -79,6 +79,9 @@ complete -c nimbo-transit -n '__nimbo_transit_at status' -l exit-code -d 'The ex
 complete -c nimbo-transit -n '__nimbo_transit_at status' -l json -d 'The snapshot as JSON'
 complete -c nimbo-transit -n '__nimbo_transit_at status' -l waybar -d 'A line for a status bar'
 complete -c nimbo-transit -n '__nimbo_transit_at status' -l watch -d 'Go on printing lines'
+for command in status update
+    complete -c nimbo-transit -n "__nimbo_transit_at $command" -l notify -d 'Have the desktop tell of incidents'
+end
 complete -c nimbo-transit -n '__nimbo_transit_at render' -a '(__fish_complete_suffix .png)'
 complete -c nimbo-transit -n '__nimbo_transit_at render' -l size -x -d 'Most room, WIDTHxHEIGHT'
 complete -c nimbo-transit -n '__nimbo_transit_at render' -l scale -x -d 'Device pixels for each point'
@@ -127,5 +130,5 @@ complete -c nimbo-transit -n '__nimbo_transit_at favorite move' -a '(__nimbo_tra
 complete -c nimbo-transit -n '__nimbo_transit_at settings' -a 'get set unset'
 for command in get set unset
     complete -c nimbo-transit -n "__nimbo_transit_at settings $command" \
-        -a 'refreshSeconds Nimbo.TransitWidget.analytics.disabled Nimbo.TransitWidget.internal.injectFakeIncidents Nimbo.TransitWidget.internal.randomNumberIncidents'
+        -a 'notify quietHours quietDays refreshSeconds Nimbo.TransitWidget.analytics.disabled Nimbo.TransitWidget.internal.injectFakeIncidents Nimbo.TransitWidget.internal.randomNumberIncidents'
 end
