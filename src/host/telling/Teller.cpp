@@ -30,7 +30,15 @@ Teller::Teller(GLibRunLoop& runLoop, DesktopPlatform& platform, Options options)
       _settings(platform.sharedSettings().groupStore()),
       _told(platform.database()) {}
 
-Teller::~Teller() = default;
+Teller::~Teller() {
+  if (!_underWay.empty()) forget({_underWay.begin(), _underWay.end()});
+}
+
+void Teller::forget(const std::vector<std::string>& keys) {
+  if (const ErrorRef error = decide([&keys](ToldState& state) { forgetTold(state, keys); }))
+    writeLog({kDefaultLogSubsystem, "Teller"}, LogLevel::error, "What was not shown counts as told: %@",
+             {error->reason()});
+}
 
 bool Teller::isOn() const { return _options.isAsked || TellingSettings::read(*_settings).isOn; }
 
@@ -73,9 +81,11 @@ void Teller::post(Telling telling, const Completion& completion) {
     std::vector<std::string> aloud;
     for (auto notice = first; notice != end; ++notice)
       if (!notice->silent) aloud.push_back(notice->key);
+    _underWay.insert(aloud.begin(), aloud.end());
     std::vector<Notice> part(std::make_move_iterator(first), std::make_move_iterator(end));
     _sender->post(std::move(part), [this, posting, aloud](const ErrorRef& error) {
-      if (error && !aloud.empty()) decide([&aloud](ToldState& state) { forgetTold(state, aloud); });
+      for (const std::string& key : aloud) _underWay.erase(_underWay.find(key));
+      if (error && !aloud.empty()) forget(aloud);
       posting->take(error);
     });
     first = end;

@@ -3,6 +3,7 @@
 #include <functional>
 #include <memory>
 #include <optional>
+#include <set>
 #include <string>
 
 #include "desktop/DesktopPlatform.h"
@@ -34,6 +35,7 @@ class Teller {
 
   /// The platform is in force as long as this lives, and the run loop is that of GLib's default main context.
   Teller(GLibRunLoop& runLoop, DesktopPlatform& platform, Options options);
+  /// What is not known to have been shown is told with the next answer, by whichever program has it.
   ~Teller();
 
   /// Whether answers are told of now.
@@ -55,6 +57,7 @@ class Teller {
   };
   /// Decides in the state that is kept, and notes there what is told; its error.
   ErrorRef decide(const ToldIncidents::Change& change);
+  void forget(const std::vector<std::string>& keys);
   void post(Telling telling, const Completion& completion);
 
   GLibRunLoop& _runLoop;
@@ -64,6 +67,7 @@ class Teller {
   std::optional<ToldState> _remembered;   // in place of what cannot be kept
   std::optional<NoticeTexts> _texts;      // from the first answer that is to be told of
   std::unique_ptr<NoticeSender> _sender;  // from the first notice
+  std::multiset<std::string> _underWay;   // keys of what is being shown
 };
 
 }  // namespace nimbo
