@@ -203,8 +203,8 @@ class Decision {
 
   IncidentOnLines asTold(const ToldIncident& told) const {
     IncidentOnLines result{.title = told.title};
-    for (const std::uint64_t line : told.lines)
-      if (const auto report = _reports.find(line); report != _reports.end()) result.lines.push_back(report->second);
+    for (const LineReport& line : _answer.lines)  // in the order that the user gave them
+      if (has(told.lines, line.muid)) result.lines.push_back(&line);
     if (const auto present = _present.find(told.muid); present != _present.end())
       result.incident = present->second.incident;
     return result;
