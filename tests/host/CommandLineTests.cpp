@@ -455,7 +455,8 @@ TEST(CommandLine, TellsTheStateOfEachLine) {
   works.erase("id");
   EXPECT_EQ(works, json::parse(R"({"title": "Works", "text": "Slow.", "from": "2026-01-05T11:00:00Z",
                                    "until": "2026-01-05T13:00:00Z", "url": null, "severity": "info",
-                                   "effect": "detour", "cause": "construction"})"));
+                                   "effect": "detour", "cause": "construction", "concern": "detour",
+                                   "new": true})"));
   for (const json& each : status["lines"]) {
     EXPECT_EQ(each["planned"].size(), 1U);
     EXPECT_EQ(each["planned"][0]["title"], "Night works");

@@ -35,7 +35,7 @@ std::set<std::string> argumentsOf(const std::string& pattern) {
 
 /// The keys that the program's sources name.
 std::set<std::string> keysInSources() {
-  static const std::regex key("\"((?:TransitWidget|Transit_|Window_)\\w+)\"");
+  static const std::regex key("\"((?:TransitWidget|Transit_|Window_|Notice_)\\w+)\"");
   std::set<std::string> keys;
   for (const auto& entry : std::filesystem::recursive_directory_iterator(NIMBO_SOURCES)) {
     if (entry.path().extension() != ".cpp" && entry.path().extension() != ".h") continue;
