@@ -108,10 +108,17 @@ def tour(session, folder):
     press("key", "Escape")
 
     window.see("1, Harbour Line, .*4 Advisories", "push button")
+    window.see("Do you want to be told when incidents")
+    window.click("Not Now")
+    wait("no question any more", lambda: not window.find("Do you want to be told"))
+    assert subprocess.run([command_line, "settings", "get", "notify"], capture_output=True).stdout == b"off\n"
+    wait("what is new", lambda: window.frame().get_name() == "Nimbo Transit – 4 new")
     window.click("4 Advisories")
     for text in "Incidents", "Signals fail", "Music plays", "^As of ":
         window.see(text)
+    window.click("Mark as Seen")
     press("key", "Escape")
+    wait("nothing new", lambda: window.frame().get_name() == "Nimbo Transit")
     window.click("Show More")
     for row, page, text in (("1, Harbour Line, .*Signals fail", "1, Harbour Line", "Signals fail"),
                             ("Music plays", "1, Harbour Line", "Music plays"),
