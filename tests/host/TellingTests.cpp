@@ -50,6 +50,8 @@ class Rider {
         line = {.muid = muid, .name = line.name, .state = LineState::unknown};
       answer.lines.push_back(std::move(line));
     }
+    answer.isCut = isCut;
+    if (isDamaged) answer.error = protocol::FetchError();
     last = tellChanges(state, answer, now, limits, texts);
     now += std::chrono::minutes(1);
     std::vector<std::string> heard;
@@ -63,6 +65,7 @@ class Rider {
   ToldState state;
   std::vector<std::uint64_t> favorites{1, 2, 3};
   std::vector<std::uint64_t> unknown;
+  bool isCut = false, isDamaged = false;
   TellingLimits limits;
   Date now = TestPlatform::startDate();
   std::optional<Date> asked;  ///< absent: now
@@ -90,6 +93,10 @@ TEST(Telling, TellsBeginWorseningTextsAndEndOnce) {
     EXPECT_THAT(rider.last.notices.at(0).body, testing::StartsWith("Notice_Worse"));
     EXPECT_EQ(rider.last.notices.at(0).urgency, Notice::Urgency::critical);
   }
+  changed.concern = Concern::detour;
+  EXPECT_THAT(rider.hear({changed}), IsEmpty());
+  changed.concern = Concern::noService;
+  EXPECT_THAT(rider.hear({changed}), IsEmpty());
   changed.severity = Severity::warning;
   EXPECT_THAT(rider.hear({changed}), ElementsAre("~incident-7" + kSingle + "L1, L2, L3, Longer works)"));
   changed.severity = Severity::severe;
@@ -118,6 +125,14 @@ TEST(Telling, LeavesOutWhatDoesNotCount) {
       {"planned that begins", {}, {{.muid = 1, .isPlanned = true}}, {{.muid = 1}}, true},
       {"seen", {}, {}, {{.muid = 1, .isNew = false}}, false},
       {"renumbered", {}, {{.muid = 1}}, {{.muid = 2}}, false},
+      {"the same words on another line afterwards", {}, {{.muid = 1}}, {{.muid = 2, .lines = {2}}}, true},
+      {"the end of what was not told", {}, {{.muid = 1}}, {}, false},
+      {"worse", {}, {{.muid = 1}}, {{.muid = 1, .severity = Severity::severe}}, true},
+      {"worse in quiet hours",
+       [](Rider& rider) { rider.limits.isQuiet = true; },
+       {{.muid = 1}},
+       {{.muid = 1, .severity = Severity::severe}},
+       false},
       {"the same words elsewhere", {}, {{.muid = 1}}, {{.muid = 1}, {.muid = 2, .lines = {2}}}, true},
       {"a new favorite", [](Rider& rider) { rider.favorites.push_back(4); }, {}, {{.muid = 1, .lines = {4}}}, false},
       {"beside a new favorite",
@@ -161,6 +176,11 @@ TEST(Telling, EndsOnlyWhatIsKnownToBeOver) {
   EXPECT_THAT(rider.hear({}), IsEmpty()) << "it may go on on the other line";
   rider.unknown = {};
   EXPECT_THAT(rider.hear({wide}), IsEmpty());
+  for (bool* lack : {&rider.isCut, &rider.isDamaged}) {
+    *lack = true;
+    EXPECT_THAT(rider.hear({}), IsEmpty());
+    *lack = false;
+  }
   // Another program's answer from before it began.
   rider.asked = rider.now - std::chrono::hours(1);
   EXPECT_THAT(rider.hear({}), IsEmpty());
