@@ -174,8 +174,10 @@ TEST_F(StateDatabaseTest, ShowsWhatIsStoredOnAFullDiskInEitherForm) {
 TEST_F(StateDatabaseTest, KnowsWhatWasSeenUntilItChanges) {
   const auto at = [this](int hours) { return std::optional(platform.time.now() + std::chrono::hours(hours)); };
   const IncidentForm seen{1, 7, {10, 11}, {{at(-1), at(2)}, {at(24), at(26)}}};
+  IncidentForm nightly{4, 9, {10}, {}};  // as many as are told of those to come
+  for (int day = 1; day <= 16; ++day) nightly.periods.emplace_back(at(24 * day), at(24 * day + 5));
   const SeenIncidents incidents(makeDatabase());
-  ASSERT_EQ(incidents.keep({seen}, platform.time.now()), nullptr);
+  ASSERT_EQ(incidents.keep({seen, nightly}, platform.time.now()), nullptr);
   const struct {
     IncidentForm form;
     bool isSeen;
@@ -189,6 +191,8 @@ TEST_F(StateDatabaseTest, KnowsWhatWasSeenUntilItChanges) {
       {{1, 7, {10}, {{at(48), at(50)}}}, false, "another period"},
       {{2, 7, {11, 12}, seen.periods}, true, "renumbered, on a common line"},
       {{2, 7, {12}, seen.periods}, false, "the same words on another line"},
+      {{4, 9, {10}, {{at(24 * 17), at(24 * 17 + 5)}}}, true, "a period beyond those that were told"},
+      {{4, 9, {10}, {{at(24 * 3 + 8), at(24 * 3 + 9)}}}, false, "a period between them"},
   };
   const auto kept = SeenIncidents(makeDatabase()).list();
   ASSERT_TRUE(kept);
