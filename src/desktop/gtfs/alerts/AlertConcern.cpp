@@ -12,13 +12,13 @@ namespace {
 
 constexpr std::size_t kLongestDetail = 40;  // characters
 
-struct Word {
-  std::string_view detail;
+struct Detail {
+  std::string_view word;
   AlertConcern concern;
 };
 // The reference's words, and those of agencies that publish finer ones. Source of the latter:
 // https://www.mbta.com/developers/v3-api, "effect" of an alert.
-constexpr Word kWords[] = {
+constexpr Detail kDetails[] = {
     {"NO_SERVICE", AlertConcern::noService},
     {"SUSPENSION", AlertConcern::noService},
     {"REDUCED_SERVICE", AlertConcern::reducedService},
@@ -96,8 +96,8 @@ AlertConcern concernOf(AlertEffect effect) {
 AlertConcern concernOf(AlertEffect effect, std::string_view detail) {
   const std::string word = asWord(detail);
   const auto* const known =
-      std::find_if(std::begin(kWords), std::end(kWords), [&](const Word& listed) { return listed.detail == word; });
-  if (known != std::end(kWords)) return known->concern;
+      std::find_if(std::begin(kDetails), std::end(kDetails), [&](const Detail& listed) { return listed.word == word; });
+  if (known != std::end(kDetails)) return known->concern;
   // Of escalators, car parks and fares.
   const bool saysNothing = effect == AlertEffect::otherEffect || effect == AlertEffect::unknownEffect;
   if (word == "INFORMATIONAL" && saysNothing) return AlertConcern::none;
