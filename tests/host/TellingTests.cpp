@@ -35,7 +35,7 @@ class Rider {
   std::vector<std::string> hear(const std::vector<Happening>& happenings) {
     protocol::Lines answer{.asked = asked.value_or(now)};
     for (const std::uint64_t muid : favorites) {
-      LineReport line{.muid = muid, .name = "L" + std::to_string(muid), .state = LineState::good};
+      LineReport line{.id = feed + ":l", .muid = muid, .name = "L" + std::to_string(muid), .state = LineState::good};
       for (const Happening& one : happenings) {
         if (std::find(one.lines.begin(), one.lines.end(), muid) == one.lines.end()) continue;
         auto& list = one.isPlanned ? line.planned : line.incidents;
@@ -65,6 +65,7 @@ class Rider {
   ToldState state;
   std::vector<std::uint64_t> favorites{1, 2, 3};
   std::vector<std::uint64_t> unknown;
+  std::string feed = "city";
   bool isCut = false, isDamaged = false;
   TellingLimits limits;
   Date now = TestPlatform::startDate();
@@ -127,6 +128,7 @@ TEST(Telling, LeavesOutWhatDoesNotCount) {
       {"renumbered", {}, {{.muid = 1}}, {{.muid = 2}}, false},
       {"the same words on another line afterwards", {}, {{.muid = 1}}, {{.muid = 2, .lines = {2}}}, true},
       {"the end of what was not told", {}, {{.muid = 1}}, {}, false},
+      {"in the made-up city", [](Rider& rider) { rider.feed = "sample"; }, {}, {{.muid = 1}}, false},
       {"worse", {}, {{.muid = 1}}, {{.muid = 1, .severity = Severity::severe}}, true},
       {"worse in quiet hours",
        [](Rider& rider) { rider.limits.isQuiet = true; },

@@ -5,6 +5,7 @@
 #include <map>
 #include <set>
 
+#include "desktop/gtfs/feeds/FeedConfiguration.h"
 #include "platform/foundation/Hash.h"
 
 namespace nimbo {
@@ -43,6 +44,12 @@ bool counts(const LineIncident& incident, bool onlySevere) {
   if (incident.severity == Severity::info || incident.concern <= Concern::additionalService) return false;
   const bool isGraveWithoutSaying = incident.severity == Severity::unknown && incident.concern == Concern::noService;
   return !onlySevere || isGraveWithoutSaying;
+}
+
+/// Whether the favorites are those of the made-up city.
+bool isMadeUp(const protocol::Lines& lines) {
+  return std::any_of(lines.lines.begin(), lines.lines.end(),
+                     [](const LineReport& line) { return line.id.starts_with(std::string(kSampleFeedName) + ":"); });
 }
 
 bool isWorse(const LineIncident& incident, const ToldIncident& told) {
@@ -307,7 +314,7 @@ Telling tellChanges(ToldState& state, const protocol::Lines& lines, Date now, Te
                     const NoticeTexts& texts) {
   // Of a clock that was set back the later date says nothing.
   const bool isOld = lines.asked && state.asked && *lines.asked < *state.asked && *state.asked <= now;
-  if (!lines.asked || lines.error || isOld) return {};
+  if (!lines.asked || lines.error || isOld || isMadeUp(lines)) return {};
   const ToldState before = state;
   Telling telling = Decision(state, lines, now, limits, texts).decide();
   std::sort(state.incidents.begin(), state.incidents.end(),

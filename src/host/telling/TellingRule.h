@@ -27,7 +27,7 @@ struct TellingLimits {
 /// end, those of one answer in one notice; their notices follow their texts in silence. Once each: whatever the number
 /// of lines, under another number with the same texts on a common line, and in a period that begins within a day after
 /// the last one. What runs already on a line that is new in `state`, and what the user has seen, counts as told. An
-/// unknown state ends nothing, and an answer older than the one before it decides nothing.
+/// unknown state ends nothing, and an answer older than the one before it, or of the made-up city, decides nothing.
 Telling tellChanges(ToldState& state, const protocol::Lines& lines, Date now, TellingLimits limits,
                     const NoticeTexts& texts);
 
