@@ -2,6 +2,8 @@
 
 #include <gmock/gmock.h>
 
+#include "host/HostPlatform.h"
+#include "host/telling/Teller.h"
 #include "host/telling/TellingRule.h"
 #include "host/telling/TellingSettings.h"
 #include "support/TestPlatform.h"
@@ -251,6 +253,31 @@ TEST(Telling, TellsAgainWhatCouldNotBeShown) {
   EXPECT_THAT(rider.hear({{.muid = 1}}), ElementsAre(testing::StartsWith("+incident-1")));
   forgetTold(rider.state, {"incident-1"});
   EXPECT_THAT(rider.hear({{.muid = 1}}), ElementsAre(testing::StartsWith("+incident-1")));
+}
+
+TEST(Teller, RemembersWhatCannotBeKeptUnlessItWouldForgetThat) {
+  setenv("DBUS_SESSION_BUS_ADDRESS", "unix:path=/nonexistent", 1);
+  GLibRunLoop loop;
+  HostPlatform platform({loop, Paths::resolve("/dev/null/config", "/dev/null/state"), {}});
+  protocol::Lines lines{.lines = {{.id = "city:m1", .muid = 1, .name = "1"}}};
+  const auto errorDomainOf = [&](Teller& teller, LineState state, std::vector<LineIncident> incidents) {
+    lines.asked = currentDate();
+    lines.lines[0].state = state;
+    lines.lines[0].incidents = std::move(incidents);
+    std::optional<std::string> domain;
+    teller.take(lines, [&](const ErrorRef& error) { domain = error ? error->domain() : "none"; });
+    while (!domain) loop.runOnce();
+    return *domain;
+  };
+  Teller bar(loop, *platform.operator->(), {.isAsked = true});
+  Teller timer(loop, *platform.operator->(), {.isAsked = true, .needsState = true});
+  EXPECT_EQ(errorDomainOf(bar, LineState::good, {}), "none");
+  const LineIncident works{.id = "7", .title = "Works", .concern = Concern::delays};
+  EXPECT_EQ(errorDomainOf(bar, LineState::affected, {works}), kNoticeErrorDomain) << "it has tried to tell";
+  EXPECT_NE(errorDomainOf(timer, LineState::good, {}), "none");
+  EXPECT_NE(errorDomainOf(timer, LineState::affected, {works}), kNoticeErrorDomain);
+  Teller off(loop, *platform.operator->(), {});
+  EXPECT_EQ(errorDomainOf(off, LineState::affected, {works}), "none");
 }
 
 TEST(TellingSettings, AreQuietByHoursAndDays) {
