@@ -117,6 +117,7 @@ class NotificationService(Service):
     def say(self, signal, signature, *arguments, receiver=None):
         self.bus.emit_signal(receiver, NOTIFICATIONS_PATH, NOTIFICATIONS, signal,
                              GLib.Variant(signature, arguments))
+        self.bus.flush_sync(None)
 
     def close(self, number, reason=2):
         """As the user does (2), or time (1)."""

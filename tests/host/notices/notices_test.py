@@ -135,9 +135,10 @@ def try_shown():
         # Two programs at once.
         desktop.held = []
         first.say(post=[notice("Bus", key="4")]), second.say(post=[notice("Bus", key="4")])
-        wait("a call", lambda: desktop.held)
+        second.say(close=["no such"]), second.answered()  # what came before is taken, too
         first.say(post=[notice("Tram", key="4")]), first.say(close=["2"])
         first.answered()  # of the last: 2 is not held up by 4
+        wait("a call", lambda: desktop.held)
         desktop.answer_held()
         for sender in first, first, second:
             sender.answered()
