@@ -125,7 +125,7 @@ int NoticeService::post(sd_bus_message* message) {
     const auto reply = replyTo(message);
     const auto notices = readNotices(message, NoticeBoard::kMostPosted);
     if (!notices || _unanswered > kMostUnanswered)
-      return reply(noticeError(NoticeError::unfit, "more than 50 at once, or none of what there is"));
+      return reply(noticeError(NoticeError::unfit, "more than 50 at once, or of an unknown urgency"));
     _posters.insert(sd_bus_message_get_sender(message));
     _board.post(*notices, reply);
     considerEnd();

@@ -149,8 +149,10 @@ def try_shown():
         number, owner = desktop.see("Tram"), session.owner()
 
         # Others have no say in what the service shows.
-        other = connect(session.address)
+        other, service = connect(session.address), desktop.bus.get_unique_name()
         for receiver in None, owner:
+            other.emit_signal(receiver, "/org/freedesktop/DBus", "org.freedesktop.DBus", "NameOwnerChanged",
+                              GLib.Variant("(sss)", (NOTIFICATIONS, service, "")))
             for signal, signature, value in ("ActionInvoked", "(us)", "default"), ("NotificationClosed", "(uu)", 2):
                 other.emit_signal(receiver, desktop.path, NOTIFICATIONS, signal, GLib.Variant(signature, (number, value)))
         other.flush_sync(None)
@@ -167,6 +169,15 @@ def try_shown():
         desktop.click(desktop.see("Ferry"), "another")
         wait("opened", lambda: os.path.exists(f"{session.folder}/opened"))
         assert open(f"{session.folder}/opened").read() == "-- nimbo://incident?id=8 another\n"
+
+        # A number that is given again is another notification's.
+        first.post(notice("Cable car", key="5"))
+        desktop.next_id = desktop.see("Cable car")
+        del desktop.standing[desktop.next_id]
+        first.post(notice("Monorail", key="6"))
+        first.close("5")
+        assert desktop.titles() == ["Monorail"]
+        first.close("6")
 
         # Another service knows nothing of what stood: nothing is told twice, nor replaced there.
         first.post(notice("Metro"))
