@@ -9,7 +9,7 @@ namespace nimbo {
 
 namespace {
 
-constexpr std::size_t kLongestKey = 200, kLongestTitle = 1000, kLongestBody = 10'000, kLongestAddress = 2000;
+constexpr std::size_t kLongestKey = 200, kLongestTitle = 4000, kLongestBody = 50'000, kLongestAddress = 2000;
 constexpr std::string_view kScheme = "nimbo:";
 
 bool isText(const std::string& text, std::size_t longest) {
@@ -43,7 +43,7 @@ ErrorRef NoticeBoard::problemOf(const std::vector<Notice>& notices) {
 ErrorRef NoticeBoard::problemOfKeys(const std::vector<std::string>& keys) {
   if (keys.size() <= kMostKept && std::ranges::all_of(keys, [](const auto& key) { return isText(key, kLongestKey); }))
     return nullptr;
-  return noticeError(NoticeError::unfit, "more than 500 keys, or one that is too long");
+  return noticeError(NoticeError::unfit, "more than 200 keys, or one that is too long");
 }
 
 NoticeBoard::NoticeBoard(RunLoop& runLoop, Bus& bus, Events events)
@@ -82,7 +82,7 @@ void NoticeBoard::post(const std::vector<Notice>& notices, NoticeCompletion comp
   const auto answered = shared(notices.size(), std::move(completion));
   for (const Notice& notice : notices) {
     if (!_entries.contains(notice.key) && !makeRoom()) {
-      answered(noticeError(NoticeError::unfit, "500 stand already"));
+      answered(noticeError(NoticeError::unfit, "200 stand already"));
       continue;
     }
     _entries[notice.key].age = ++_posts;

@@ -24,7 +24,7 @@ namespace nimbo {
 class NoticeBoard {
  public:
   /// At most so many at once, under so many keys, and so many questions about one while the service is silent.
-  static constexpr std::size_t kMostPosted = 50, kMostKept = 500, kMostWaiting = 50;
+  static constexpr std::size_t kMostPosted = 50, kMostKept = 200, kMostWaiting = 50;
   /// Seconds in which posts and closings are answered.
   static constexpr TimeInterval kPatience = 20;
 

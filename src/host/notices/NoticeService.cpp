@@ -137,7 +137,7 @@ int NoticeService::close(sd_bus_message* message) {
   runGuarded("close", [&] {
     const auto reply = replyTo(message);
     const auto keys = readKeys(message, NoticeBoard::kMostKept);
-    if (!keys || _unanswered > kMostUnanswered) return reply(noticeError(NoticeError::unfit, "more than 500 keys"));
+    if (!keys || _unanswered > kMostUnanswered) return reply(noticeError(NoticeError::unfit, "more than 200 keys"));
     _board.close(*keys, reply);
   });
   return 1;
