@@ -41,9 +41,9 @@ ErrorRef NoticeBoard::problemOf(const std::vector<Notice>& notices) {
 }
 
 ErrorRef NoticeBoard::problemOfKeys(const std::vector<std::string>& keys) {
-  if (keys.size() <= kMostKept && std::ranges::all_of(keys, [](const auto& key) { return isText(key, kLongestKey); }))
+  if (keys.size() <= kMostClosed && std::ranges::all_of(keys, [](const auto& key) { return isText(key, kLongestKey); }))
     return nullptr;
-  return noticeError(NoticeError::unfit, "more than 200 keys, or one that is too long");
+  return noticeError(NoticeError::unfit, "more than 10,000 keys, or one that is too long");
 }
 
 NoticeBoard::NoticeBoard(RunLoop& runLoop, Bus& bus, Events events)

@@ -23,8 +23,9 @@ namespace nimbo {
 /// answers or ends, nothing more is asked of it under that key, and who posts gets the error.
 class NoticeBoard {
  public:
-  /// At most so many at once, under so many keys, and so many questions about one while the service is silent.
-  static constexpr std::size_t kMostPosted = 50, kMostKept = 200, kMostWaiting = 50;
+  /// At most so many posted and closed at once, under so many keys in all, and so many questions about one of them
+  /// while the service is silent.
+  static constexpr std::size_t kMostPosted = 50, kMostClosed = 10'000, kMostKept = 200, kMostWaiting = 50;
   /// Seconds in which posts and closings are answered.
   static constexpr TimeInterval kPatience = 20;
 

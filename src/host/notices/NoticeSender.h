@@ -32,7 +32,7 @@ class NoticeSender {
   /// Shows notices, or changes those that stand under their keys. At most 50 at once, with keys of 200 bytes, titles of
   /// 4000, bodies of 50,000 and addresses of 2000; a key once. Answers within half a minute.
   void post(std::vector<Notice> notices, Completion completion);
-  /// Takes away what stands under the keys, at most 200, and forgets what stood there. Starts no program for that.
+  /// Takes away what stands under the keys, at most 10,000, and forgets what stood there. Starts no program for that.
   /// Answers within half a minute.
   void close(std::vector<std::string> keys, Completion completion);
 

@@ -136,8 +136,8 @@ int NoticeService::post(sd_bus_message* message) {
 int NoticeService::close(sd_bus_message* message) {
   runGuarded("close", [&] {
     const auto reply = replyTo(message);
-    const auto keys = readKeys(message, NoticeBoard::kMostKept);
-    if (!keys || _unanswered > kMostUnanswered) return reply(noticeError(NoticeError::unfit, "more than 200 keys"));
+    const auto keys = readKeys(message, NoticeBoard::kMostClosed);
+    if (!keys || _unanswered > kMostUnanswered) return reply(noticeError(NoticeError::unfit, "more than 10,000 keys"));
     _board.close(*keys, reply);
   });
   return 1;
