@@ -33,8 +33,8 @@ std::string escapedForMarkup(const std::string& text) {
   return escaped.get();
 }
 
-/// The level of the hint "urgency" ("Urgency Levels"). Desktops pop up anew what replaces a notification, but for those
-/// of low urgency; what is critical stands on the screen still.
+/// The level of the hint "urgency" ("Urgency Levels"). What replaces a notification pops up anew on some desktops,
+/// which keep low urgency for what must not; what is critical stands on the screen still.
 std::uint8_t urgencyOf(const Notice& notice) {
   if (notice.silent && notice.urgency != Notice::Urgency::critical) return 0;
   return static_cast<std::uint8_t>(notice.urgency);
