@@ -277,6 +277,7 @@ TEST(Teller, RemembersWhatCannotBeKeptUnlessItWouldForgetThat) {
   EXPECT_NE(errorDomainOf(timer, LineState::good, {}), "none");
   EXPECT_NE(errorDomainOf(timer, LineState::affected, {works}), kNoticeErrorDomain);
   Teller off(loop, *platform.operator->(), {});
+  EXPECT_EQ(errorDomainOf(off, LineState::good, {}), "none");
   EXPECT_EQ(errorDomainOf(off, LineState::affected, {works}), "none");
 }
 
