@@ -1,5 +1,5 @@
 #!/usr/bin/env bash
-# Installs the Debian packages that are missing: setup.sh run|test|lint|bench|fuzz (all hold run, lint holds test).
+# Installs the Debian packages that are missing: setup.sh run|test|lint|bench|fuzz|package (all hold run, lint holds test).
 # Quick when nothing is missing. Needs root, or a user with sudo.
 set -euo pipefail
 purpose=${1:-run}
@@ -14,13 +14,13 @@ packages=(
 case $purpose in
   run) ;;
   test | lint) packages+=(libgtest-dev libgmock-dev protobuf-compiler libprotobuf-dev python3 python3-kiwisolver zlib1g-dev libssl-dev
-    desktop-file-utils appstream mandoc systemd zsh fish libxml2-utils
+    desktop-file-utils appstream mandoc systemd bash-completion zsh fish libxml2-utils
     xvfb xdotool dbus at-spi2-core python3-gi gir1.2-atspi-2.0 procps sway grim) ;;
   bench) packages+=(libbenchmark-dev protobuf-compiler libprotobuf-dev python3 python3-dev python3-kiwisolver
     libxdamage-dev xvfb dbus procps sway mako-notifier dunst) ;;
   fuzz) packages+=(clang libclang-rt-dev llvm) ;;  # the compiler with libFuzzer, the sanitizers, names in their reports
-  package) packages+=(dpkg-dev file) ;;
-  *) echo "usage: tools/setup.sh run|test|lint|bench|fuzz" >&2; exit 2 ;;
+  package) packages+=(dpkg-dev debhelper lintian) ;;
+  *) echo "usage: tools/setup.sh run|test|lint|bench|fuzz|package" >&2; exit 2 ;;
 esac
 [ "$purpose" != lint ] || packages+=(clang-format clang-tidy git libbenchmark-dev python3-dev libxdamage-dev)
 

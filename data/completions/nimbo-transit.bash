@@ -25,7 +25,7 @@ _nimbo_transit() {
       *)
         case $command in
           "") command=${words[i]} ;;
-          feed | favorite | settings) command+=" ${words[i]}" ;;
+          feed | favorite | settings | "settings "*) command+=" ${words[i]}" ;;
         esac
         ;;
     esac
@@ -44,7 +44,11 @@ _nimbo_transit() {
       return
       ;;
     --format) COMPREPLY=($(compgen -W "text json" -- "$cur")); return ;;
-    --mirror | --from | --key | --header | --static-header | --alerts-header | --maximum-age | \
+    --from)
+      COMPREPLY=($(compgen -W "$(_nimbo_transit_names feed find "" | cut -d ' ' -f 1)" -- "$cur"))
+      return
+      ;;
+    --mirror | --key | --header | --static-header | --alerts-header | --maximum-age | \
       --now | --virtual-time | --size | --scale | --locale) return ;;
   esac
 
@@ -69,6 +73,9 @@ _nimbo_transit() {
     "favorite add") names=$(_nimbo_transit_names lines | cut -d ' ' -f 1) ;;
     "favorite remove" | "favorite move") names=$(_nimbo_transit_names favorite list | sed -n 's/^\([^ ]*:[^ ]*\).*/\1/p') ;;
     settings) names="get set unset" ;;
+    "settings "*" "*)
+      [[ $command != "settings set "Nimbo.TransitWidget.* ]] || names="true false"
+      ;;
     "settings "*)
       names="notify quietHours quietDays refreshSeconds Nimbo.TransitWidget.analytics.disabled Nimbo.TransitWidget.internal.injectFakeIncidents
         Nimbo.TransitWidget.internal.randomNumberIncidents"

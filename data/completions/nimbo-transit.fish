@@ -21,9 +21,12 @@ function __nimbo_transit_lines
     __nimbo_transit_run $argv | string match -r '^\S+:.*' | string replace -r '\s+' \t
 end
 
-# Whether the command so far is this one, or this one and its sub-command.
-function __nimbo_transit_at
-    set -l words
+function __nimbo_transit_catalog
+    __nimbo_transit_run feed find '' | string replace -r '\s+' \t
+end
+
+# The words of the command so far.
+function __nimbo_transit_words
     set -l skip 0
     for word in (commandline -opc)[2..]
         if test $skip = 1
@@ -31,9 +34,14 @@ function __nimbo_transit_at
         else if contains -- $word --config --state
             set skip 1
         else if not string match -q -- '-*' $word
-            set -a words $word
+            echo $word
         end
     end
+end
+
+# Whether the command so far is this one, or this one and its sub-command.
+function __nimbo_transit_at
+    set -l words (__nimbo_transit_words)
     test (count $words) -ge (count $argv); or return 1
     for i in (seq (count $argv))
         test $words[$i] = $argv[$i]; or return 1
@@ -99,7 +107,7 @@ end
 
 complete -c nimbo-transit -n '__nimbo_transit_at feed' -a 'find add edit remove list check'
 complete -c nimbo-transit -n '__nimbo_transit_at feed find' -l json -d 'As JSON'
-complete -c nimbo-transit -n '__nimbo_transit_at feed add' -l from -x -d 'A feed of the catalog, by its ID'
+complete -c nimbo-transit -n '__nimbo_transit_at feed add' -l from -x -a '(__nimbo_transit_catalog)' -d 'A feed of the catalog, by its ID'
 complete -c nimbo-transit -n '__nimbo_transit_at feed edit' -l no-keys -d 'Forget its keys'
 complete -c nimbo-transit -n '__nimbo_transit_at feed edit' -a '(__nimbo_transit_feeds)'
 for command in add edit
@@ -129,6 +137,7 @@ complete -c nimbo-transit -n '__nimbo_transit_at favorite move' -a '(__nimbo_tra
 
 complete -c nimbo-transit -n '__nimbo_transit_at settings' -a 'get set unset'
 for command in get set unset
-    complete -c nimbo-transit -n "__nimbo_transit_at settings $command" \
+    complete -c nimbo-transit -n "__nimbo_transit_at settings $command; and test (count (__nimbo_transit_words)) = 2" \
         -a 'notify quietHours quietDays refreshSeconds Nimbo.TransitWidget.analytics.disabled Nimbo.TransitWidget.internal.injectFakeIncidents Nimbo.TransitWidget.internal.randomNumberIncidents'
 end
+complete -c nimbo-transit -n '__nimbo_transit_at settings set; and test (count (__nimbo_transit_words)) = 3' -a 'true false on off severe'
