@@ -9,6 +9,7 @@
 #include "desktop/gtfs/static/LineItems.h"
 #include "desktop/rpc/Base64.h"
 #include "desktop/store/RefreshSetting.h"
+#include "platform/foundation/Log.h"
 #include "platform/foundation/Version.h"
 #include "platform/ui/Color.h"
 #include "process/HandoffDecoder.h"
@@ -28,6 +29,9 @@ constexpr int kProtocolVersion = 1;
 
 /// Setting: when the fetch ended that the saved rows are of.
 constexpr std::string_view kSavedRowsDateKey = "Nimbo.TransitWidget.savedUIDate";
+
+/// Seconds after which lines are kept again though they run as before: a disk that sleeps is woken seldom.
+constexpr TimeInterval kKeepLinesAgain = 300;
 
 bool isDownloading(const Error& error) {
   return error.domain() == kTransitLineServiceErrorDomain &&
@@ -168,6 +172,7 @@ protocol::Initialized WidgetProcess::initialize(const protocol::InitializeParams
   makePlatform(params.locale.value_or(""));
   // When the lines were looked up is told, also where they run as before.
   _platform->transitLines().setAnswerObserver([this] {
+    keepLines();
     notify(_connection, protocol::kUpdated, {});
     const std::set<std::string> early = std::exchange(_seenEarly, {});
     if (const ErrorRef failure = early.empty() ? nullptr : keepSeen(early)) tellNotice(failure);
@@ -382,6 +387,33 @@ ErrorRef WidgetProcess::keepSeen(const std::set<std::string>& ids) {
   if (ErrorRef failure = incidents.keep(kept, now)) return failure;
   notify(_connection, protocol::kUpdated, {});
   return nullptr;
+}
+
+void WidgetProcess::keepLines() {
+  if (_virtualTime) return;  // true of another date
+  protocol::Lines lines = lineReports(_platform->favoritesEditor(), _platform->transitLines(), SeenForms());
+  for (protocol::LineReport& line : lines.lines) {
+    line.shield.reset();
+    for (auto* list : {&line.incidents, &line.planned})
+      for (protocol::LineIncident& incident : *list) {
+        incident.title.clear();
+        incident.text.reset();
+        incident.url.reset();
+      }
+  }
+  const auto written = [&lines] { return protocol::write(lines).dump(-1, ' ', false, json::error_handler_t::replace); };
+  lines.updated.reset();
+  std::string text = written();
+  const Date now = currentDate();
+  const TimeInterval age = intervalBetween(_keptLinesAt, now);
+  if (text == _keptLines && age >= 0 && age < kKeepLinesAgain) return;
+  _keptLines = std::move(text);
+  _keptLinesAt = now;
+  lines.updated = now;
+  if (const ErrorRef error =
+          _platform->sharedSettings().groupStore()->setValue_forKey(written(), protocol::kSavedLinesKey))
+    writeLog({kDefaultLogSubsystem, "WidgetProcess"}, LogLevel::error, "The states of the lines are not kept: %@",
+             {error->reason()});
 }
 
 protocol::Downloads WidgetProcess::downloads(const Nothing&) {

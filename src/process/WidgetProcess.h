@@ -90,6 +90,8 @@ class WidgetProcess {
   void resizeView(Size size);
   /// Sends the host what its user must hear. Any thread.
   void tellNotice(const ErrorRef& notice);
+  /// Keeps what the fetch that has just ended found out of each line, for programs that have no time to fetch.
+  void keepLines();
   /// Tells the host, once until it looks or renders, that what the widget shows has changed.
   void announceFrame();
 
@@ -107,6 +109,8 @@ class WidgetProcess {
   std::set<std::string> _seenEarly;  // before a fetch told what they are
   bool _hostChoseMode = false;
   bool _frameAnnounced = false;
+  std::string _keptLines;  // as kept last, without its date
+  Date _keptLinesAt;
 };
 
 }  // namespace nimbo

@@ -3,6 +3,7 @@
 #include <cstdint>
 #include <optional>
 #include <string>
+#include <string_view>
 #include <vector>
 
 #include "platform/foundation/Date.h"
@@ -62,6 +63,10 @@ struct Lines {
 struct MarkSeenParams {
   std::vector<std::string> ids;  ///< numbers of incidents in decimal
 };
+
+/// Setting: what the last fetch of any process found out, `Lines` as JSON, with the date of that fetch as `updated` and
+/// without texts and shields.
+inline constexpr std::string_view kSavedLinesKey = "Nimbo.TransitWidget.savedLines";
 
 /// A static feed that is being downloaded.
 struct Download {

@@ -30,11 +30,12 @@ void clear(Gtk::ListBox& list) {
 
 }  // namespace
 
-FavoritesPage::FavoritesPage(const PageContext& context)
+FavoritesPage::FavoritesPage(const PageContext& context, const std::string& query)
     : Page(LocalizedString("Window_Favorites_Title")), _context(context) {
   const std::string prompt = LocalizedString("Window_Favorites_Search");
   _query.property_placeholder_text() = prompt;
   setAccessibleLabel(_query, prompt);
+  _query.set_text(query);
   _query.signal_search_changed().connect([this] { search(); });
   _query.set_key_capture_widget(*this);
   _query.signal_stop_search().connect([this] {

@@ -17,7 +17,8 @@ namespace nimbo {
 /// The favourite lines in their order, and all lines of all feeds to choose from.
 class FavoritesPage final : public Page {
  public:
-  explicit FavoritesPage(const PageContext& context);
+  /// `query` is looked for among the lines; empty: nothing is.
+  FavoritesPage(const PageContext& context, const std::string& query);
 
  private:
   void addSection(Gtk::Label& title, const char* key, Gtk::ListBox& list);

@@ -67,20 +67,6 @@ std::vector<std::string> newIncidents(const protocol::Lines& lines) {
   return {ids.begin(), ids.end()};
 }
 
-std::string textOfState(const protocol::LineReport& line) {
-  switch (line.state) {
-    case protocol::LineState::good:
-      return LocalizedString("TransitWidget_GoodService_Title");
-    case protocol::LineState::affected:
-      return LocalizedFormat(LocalizedString("Window_Line_Affected"), {std::uint64_t{line.incidents.size()}});
-    case protocol::LineState::unknown:
-      break;
-  }
-  const std::string reason =
-      line.reason ? textOfError(*errorOf(*line.reason)) : LocalizedString("TransitWidgetLoadingError_Unknown");
-  return LocalizedFormat(LocalizedString("Window_Line_Unknown"), {reason});
-}
-
 const char* styleOfState(protocol::LineState state) {
   return state == protocol::LineState::good ? "good" : state == protocol::LineState::affected ? "affected" : "failed";
 }

@@ -19,9 +19,6 @@ const protocol::LineIncident* incidentNumbered(const protocol::Lines& lines, std
 /// The numbers of the incidents, in force and planned, that the user has not seen yet; each once.
 std::vector<std::string> newIncidents(const protocol::Lines& lines);
 
-/// How a line runs, in the user's language: good service, how many incidents, or why nobody knows.
-std::string textOfState(const protocol::LineReport& line);
-
 /// The CSS class that colours such a text.
 const char* styleOfState(protocol::LineState state);
 

@@ -220,7 +220,9 @@ void MainWindow::open(const OpenRequest& request) {
   struct Opener {
     MainWindow& window;
     void operator()(const ShowWidget&) { window._pages.popToFirst(); }
-    void operator()(const ShowFavorites&) { window.push(std::make_unique<FavoritesPage>(window._context)); }
+    void operator()(const ShowFavorites& show) {
+      window.push(std::make_unique<FavoritesPage>(window._context, show.query));
+    }
     void operator()(const ShowFeeds&) { window.push(std::make_unique<FeedsPage>(window._context)); }
     void operator()(const ShowLine& show) { window.push(std::make_unique<LinePage>(window._context, show.line)); }
     void operator()(const ShowIncidents& show) {

@@ -16,7 +16,9 @@ namespace nimbo {
 /// The widget screen.
 struct ShowWidget {};
 /// The favourites, with the lines there are to choose from.
-struct ShowFavorites {};
+struct ShowFavorites {
+  std::string query = {};  ///< what is looked for among the lines; empty: nothing yet
+};
 /// The feeds.
 struct ShowFeeds {};
 /// A line with its incidents, as handed over.

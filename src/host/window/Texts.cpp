@@ -4,6 +4,7 @@
 #include "desktop/store/FavoritesEditor.h"
 #include "desktop/store/StateDatabaseFile.h"
 #include "desktop/system/AtomicFile.h"
+#include "host/FeedAnswers.h"
 #include "platform/Localization.h"
 #include "platform/foundation/Log.h"
 #include "platform/transit/IncidentStringProvider.h"
@@ -158,6 +159,20 @@ std::string textOfError(const Error& error) {
   writeLog({kDefaultLogSubsystem, "Window"}, LogLevel::info, "%{private}@", {error.reason()});
   const char* key = keyOfError(error);
   return LocalizedFormat(LocalizedString(key ? key : "TransitWidgetLoadingError_Unknown"), {error.subject()});
+}
+
+std::string textOfState(const protocol::LineReport& line) {
+  switch (line.state) {
+    case protocol::LineState::good:
+      return LocalizedString("TransitWidget_GoodService_Title");
+    case protocol::LineState::affected:
+      return LocalizedFormat(LocalizedString("Window_Line_Affected"), {std::uint64_t{line.incidents.size()}});
+    case protocol::LineState::unknown:
+      break;
+  }
+  const std::string reason =
+      line.reason ? textOfError(*errorOf(*line.reason)) : LocalizedString("TransitWidgetLoadingError_Unknown");
+  return LocalizedFormat(LocalizedString("Window_Line_Unknown"), {reason});
 }
 
 }  // namespace nimbo

@@ -7,6 +7,7 @@
 #include "platform/foundation/Error.h"
 #include "platform/transit/TransitIncident.h"
 #include "platform/transit/TransitLine.h"
+#include "protocol/Lines.h"
 
 namespace nimbo {
 
@@ -26,5 +27,8 @@ std::vector<std::string> textsBelowTitle(const TransitIncident& incident);
 /// What failed and what to do about it, in the user's language; the error's own reason, which tells developers more, is
 /// logged. Main thread.
 std::string textOfError(const Error& error);
+
+/// How a line runs, in the user's language: good service, how many incidents, or why nobody knows. Main thread.
+std::string textOfState(const protocol::LineReport& line);
 
 }  // namespace nimbo

@@ -6,6 +6,13 @@
 
 namespace nimbo {
 
+namespace {
+
+/// Milliseconds for which the bus's application without a window waits for the next search.
+constexpr guint kPatience = 10'000;
+
+}  // namespace
+
 Glib::RefPtr<WindowApplication> WindowApplication::create(const CommandContext& context) {
   return Glib::make_refptr_for_instance(new WindowApplication(context));
 }
@@ -27,6 +34,7 @@ std::unique_ptr<HostPlatform> WindowApplication::makePlatform(const std::string&
 
 void WindowApplication::on_startup() {
   Gtk::Application::on_startup();
+  if (g_application_get_flags(Gio::Application::gobj()) & G_APPLICATION_IS_SERVICE) set_inactivity_timeout(kPatience);
   // The choice of a language stands in the settings that the platform reads.
   _platform = makePlatform({});
   _preferences = std::make_unique<DesktopPreferences>();
@@ -53,6 +61,8 @@ void WindowApplication::makeWindow() {
   _window->signal_close_request().connect(
       [this] {
         keepSize();
+        _closed = std::move(_window);
+        _context.runLoop.dispatchAsync([this] { _closed.reset(); });
         return false;
       },
       false);
@@ -82,10 +92,40 @@ void WindowApplication::changeLocale() {
   release();
 }
 
-void WindowApplication::on_activate() {
+void WindowApplication::present(guint32 time) {
   if (!_window) makeWindow();
   giveBackStack();
-  _window->present();
+  _window->present(time);
+}
+
+void WindowApplication::on_activate() { present(GDK_CURRENT_TIME); }
+
+bool WindowApplication::dbus_register_vfunc(const Glib::RefPtr<Gio::DBus::Connection>& connection,
+                                            const Glib::ustring& object_path) {
+  if (!Gtk::Application::dbus_register_vfunc(connection, object_path)) return false;
+  // Before the name is taken, at which the first search may come.
+  SearchProvider::Delegate& delegate = *this;
+  _search = std::make_unique<SearchProvider>(connection, object_path + "/SearchProvider", delegate);
+  return true;
+}
+
+void WindowApplication::dbus_unregister_vfunc(const Glib::RefPtr<Gio::DBus::Connection>& connection,
+                                              const Glib::ustring& object_path) {
+  _search.reset();
+  Gtk::Application::dbus_unregister_vfunc(connection, object_path);
+}
+
+std::vector<KnownLine> WindowApplication::searchedLines() {
+  // Begins the wait for the next search anew.
+  hold();
+  release();
+  return knownFavorites(*_platform, _preferences->locale());
+}
+
+void WindowApplication::openFound(const OpenRequest& request, guint32 time) {
+  present(time);
+  _window->open(ShowWidget());
+  _window->open(request);
 }
 
 void WindowApplication::on_open(const type_vec_files& files, const Glib::ustring&) {
@@ -102,8 +142,9 @@ void WindowApplication::on_open(const type_vec_files& files, const Glib::ustring
 }
 
 void WindowApplication::on_shutdown() {
-  if (_window && !get_windows().empty()) keepSize();  // a closed one has kept its size
+  if (_window) keepSize();
   _window.reset();
+  _closed.reset();
   _preferences.reset();
   _platform.reset();
   Gtk::Application::on_shutdown();

@@ -32,6 +32,9 @@ int main(int argc, char** argv) {
   app.add_option("--state", state, "Folder of favorites and last rows (default: $XDG_STATE_HOME/nimbo-transit)");
   app.add_option("URL", urls, "What to show, such as nimbo://?favorites=2&t=r");
   app.set_version_flag("--version", nimbo::kVersion);
+  std::string serviceOption = "--gapplication-service";  // GLib's
+  bool isService = false;
+  app.add_flag(serviceOption, isService)->group("");
   CLI11_PARSE(app, argc, argv);
 
   drawWithoutDriver();
@@ -49,6 +52,7 @@ int main(int argc, char** argv) {
     nimbo::GLibRunLoop runLoop;
     const nimbo::CommandContext context{runLoop, nimbo::Paths::resolve(config, state), std::move(folders)};
     std::vector<char*> arguments{argv[0]};
+    if (isService) arguments.push_back(serviceOption.data());
     for (std::string& url : urls) arguments.push_back(url.data());
     return nimbo::WindowApplication::create(context)->run(static_cast<int>(arguments.size()), arguments.data());
   } catch (const std::exception& failure) {

@@ -95,7 +95,8 @@ class Window:
             raise AssertionError(f"{vain}; there is\n{there}") from None
 
     def see_page(self, title):
-        wait(f"the page {title}", lambda: re.fullmatch(title + "( – .* new)?", self.frame().get_name()))
+        wait(f"the page {title}",
+             lambda: self.frame() and re.fullmatch(title + "( – .* new)?", self.frame().get_name()))
 
     def box(self, name, role):
         return self.see(name, role).get_extents(Atspi.CoordType.WINDOW)

@@ -1,5 +1,5 @@
 #!/usr/bin/python3
-"""The window as its user has it. usage: window_test.py tour|faults|catalog NIMBO_TRANSIT_DESKTOP NIMBO_TRANSIT WIDGET"""
+"""The window as its user has it. usage: window_test.py tour|faults|catalog|bus NIMBO_TRANSIT_DESKTOP NIMBO_TRANSIT WIDGET"""
 import bz2
 import http.server
 import json
@@ -15,6 +15,7 @@ import sys
 import tempfile
 import threading
 import time
+import types
 import urllib.parse
 import zipfile
 
@@ -369,5 +370,99 @@ def faults(session, folder):
         window.quit()
 
 
-with tempfile.TemporaryDirectory() as home, Session(home) as running:
-    {"tour": tour, "faults": faults, "catalog": catalog}[sys.argv[1]](running, home)
+def bus(session, folder):
+    """The bus starts the window: for the desktop's search, and for an address."""
+    from gi.repository import Gio, GLib
+    name, city, state = "org.nimbo.Transit", os.path.join(folder, "city"), folder + "/.local/state/nimbo-transit/state.sqlite"
+    services = pathlib.Path(folder, "dbus-1/services")  # of this session alone
+    service = pathlib.Path(desktop).parents[3].joinpath("data", name + ".service").read_text()
+    services.joinpath(name + ".service").write_text(re.sub("(?m)^Exec=/.*/nimbo-transit-desktop ", f"Exec={desktop} ", service))
+    connection = Gio.bus_get_sync(Gio.BusType.SESSION)
+
+    def call(destination, path, interface, method, signature, *arguments):
+        return connection.call_sync(destination, path, interface, method, GLib.Variant(signature, arguments), None,
+                                    Gio.DBusCallFlags.NONE, PATIENCE * 1000, None).unpack()
+
+    def search(method, signature, *arguments):
+        return call(name, "/org/nimbo/Transit/SearchProvider", "org.gnome.Shell.SearchProvider2", method, signature, *arguments)
+
+    def states():
+        metas, = search("GetResultMetas", "(as)", ["town:m2", "town:m1", "town:none"])
+        assert [(meta["id"], meta["name"], meta["gicon"]) for meta in metas] == [
+            ("town:m2", "2, Castle Line", name), ("town:m1", "1, Harbour Line", name)], metas
+        return " / ".join(meta["description"].removeprefix("Metro · ") for meta in metas)
+
+    def keep(change):
+        with sqlite3.connect(state) as database:
+            where = "WHERE key = 'Nimbo.TransitWidget.savedLines'"
+            kept = json.loads(database.execute(f"SELECT value FROM settings {where}").fetchone()[0])
+            database.execute(f"UPDATE settings SET value = ? {where}", [change(kept)])
+
+    def window():
+        found = Window.__new__(Window)
+        pid, = call("org.freedesktop.DBus", "/", "org.freedesktop.DBus", "GetConnectionUnixProcessID", "(s)", name)
+        found.process = types.SimpleNamespace(pid=pid)
+        return found
+
+    def open_by_bus(url):
+        call(name, "/org/nimbo/Transit", "org.freedesktop.Application", "Open", "(asa{sv})", [url], {})
+
+    def at(seconds):
+        return time.strftime("%Y-%m-%dT%H:%M:%SZ", time.gmtime(time.time() + seconds))
+
+    call("org.freedesktop.DBus", "/", "org.freedesktop.DBus", "ReloadConfig", "()")
+    assert search("GetInitialResultSet", "(as)", ["line"]) == ([],)  # of the sample city
+    publish(city, ["Signals fail"])
+    for arguments in (["feed", "add", "town", "--static", city, "--alerts", city + "/alerts.pb"],
+                      ["favorite", "add", "town:m1", "town:m2"]):
+        subprocess.run([command_line, *arguments], check=True, capture_output=True)
+    for words, lines in ((["castle"], ["town:m2"]), (["MÉTRO", "harb"], ["town:m1"]),
+                         (["town:m"], ["town:m1", "town:m2"]), (["castle", "harbour"], [])):
+        assert search("GetInitialResultSet", "(as)", words) == (lines,), words
+        assert search("GetSubsearchResultSet", "(asas)", ["town:m1"], words) == (lines,), words
+    assert states().startswith("Not known: "), states()  # never looked up
+    subprocess.run([command_line, "update"], check=True)
+    assert states() == "Good Service / 1 incident", states()
+
+    for change, told in (
+            (lambda kept: kept | {"updated": at(-3600)}, "Not known any more; last looked up .* / 1 incident · Updated "),
+            (lambda kept: kept | {"updated": at(3600)}, "Not known any more; .* / 1 incident · Updated "),
+            (lambda kept: kept["lines"][0]["incidents"][0].update(until=at(-60)), "Good Service / Not known any more"),
+            (lambda kept: kept["lines"][1]["planned"].append(kept["lines"][0]["incidents"][0] | {"from": at(-60)}),
+             "1 incident / 1 incident"),
+            (lambda kept: kept["lines"].remove(kept["lines"][1]), "Not known: .* / 1 incident"),
+            (lambda kept: kept.clear(), "Not known: .* / Not known: ")):
+        subprocess.run([command_line, "update"], check=True)
+        keep(lambda kept: json.dumps(change(kept) or kept))
+        assert re.match(told, states()), (told, states())
+    os.remove(city + "/alerts.pb")
+    assert subprocess.run([command_line, "update"], capture_output=True).returncode == 1
+    assert re.match("Not known: .* / Not known: ", states()), states()
+
+    publish(city, ["Signals fail"])
+    search("ActivateResult", "(sasu)", "town:m1", ["harbour"], 0)
+    window().see_page("1, Harbour Line")
+    window().see("Signals fail")
+    search("LaunchSearch", "(asu)", ["castle", "line"], 0)
+    window().see_page("Favorites")
+    wait("one line found", lambda: [node.get_name() for node in window().nodes() if node.get_role_name() == "list item"]
+         == ["2, Castle Line, Metro"])
+    first = window()
+    first.comes_to_front()
+    press("key", "ctrl+w")  # the service stays
+    wait("no window", lambda: not first.frame())
+    open_by_bus("nimbo://line?id=town:m2")
+    window().see_page("2, Castle Line")
+    assert window().process == first.process
+    window().comes_to_front()
+    press("key", "ctrl+q")
+    wait("the end", lambda: call("org.freedesktop.DBus", "/", "org.freedesktop.DBus", "NameHasOwner", "(s)", name) == (False,))
+    status = json.loads(subprocess.run([command_line, "status", "--format", "json"], capture_output=True, check=True).stdout)
+    open_by_bus("nimbo://incident?id=" + status["lines"][0]["incidents"][0]["id"])
+    window().see_page("Incidents")
+    window().see("Signals fail")
+
+
+# The portal that the toolkit asks for mounts a folder there, and ends after the bus.
+with tempfile.TemporaryDirectory(ignore_cleanup_errors=True) as home, Session(home) as running:
+    {"tour": tour, "faults": faults, "catalog": catalog, "bus": bus}[sys.argv[1]](running, home)

@@ -322,6 +322,10 @@ void GTFSTransitLineService::lookup(const std::vector<MapItemIdentifierRef>& ide
     const ErrorRef error = transitLineServiceError(
         TransitLineServiceError::internal,
         std::string("Cannot look the lines up: ") + failure.what() + ". Close some programs and try again.");
+    {
+      const std::lock_guard guard(_shared->lock);
+      _shared->verdicts = verdictsOf(identifiers, {}, error);
+    }
     Platform::current().mainRunLoop().dispatchAsync([serviceStop = _stop.get_token(), handler, error] {
       if (!serviceStop.stop_requested()) handler({}, error);
     });
