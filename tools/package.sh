@@ -1,9 +1,12 @@
 #!/usr/bin/env bash
-# Builds the Debian package build/deb/nimbo-transit_VERSION_ARCHITECTURE.deb.
+# Builds the Debian packages build/deb/*.deb from what stands in this folder.
 set -euo pipefail
 top=$(cd "$(dirname "$0")/.." && pwd)
 "$top/tools/setup.sh" package
-cd "$top"
-cmake --preset release -B build/deb -DCMAKE_INSTALL_PREFIX=/usr >/dev/null
-cmake --build build/deb
-(cd build/deb && cpack -G DEB)
+tree=$top/build/deb/nimbo-transit  # the packages come to lie beside it
+rm -rf "$top/build/deb"
+mkdir -p "$tree"
+tar -C "$top" --exclude=./build --exclude=./.git -c . | tar -C "$tree" -x
+cd "$tree"
+dpkg-buildpackage -b -us -uc
+lintian --pedantic --fail-on error,warning ../*.changes
