@@ -1,6 +1,7 @@
 #!/usr/bin/python3
 """The window as its user has it. usage: window_test.py tour|faults|catalog|bus NIMBO_TRANSIT_DESKTOP NIMBO_TRANSIT WIDGET"""
 import bz2
+import configparser
 import http.server
 import json
 import os
@@ -377,6 +378,10 @@ def bus(session, folder):
     services = pathlib.Path(folder, "dbus-1/services")  # of this session alone
     service = pathlib.Path(desktop).parents[3].joinpath("data", name + ".service").read_text()
     services.joinpath(name + ".service").write_text(re.sub("(?m)^Exec=/.*/nimbo-transit-desktop ", f"Exec={desktop} ", service))
+    provider = configparser.ConfigParser()
+    assert provider.read(pathlib.Path(__file__).parents[3] / "data" / (name + ".search-provider.ini"))
+    provider = provider["Shell Search Provider"]
+    assert (provider["DesktopId"], provider["Version"]) == (name + ".desktop", "2")
     connection = Gio.bus_get_sync(Gio.BusType.SESSION)
 
     def call(destination, path, interface, method, signature, *arguments):
@@ -384,7 +389,7 @@ def bus(session, folder):
                                     Gio.DBusCallFlags.NONE, PATIENCE * 1000, None).unpack()
 
     def search(method, signature, *arguments):
-        return call(name, "/org/nimbo/Transit/SearchProvider", "org.gnome.Shell.SearchProvider2", method, signature, *arguments)
+        return call(provider["BusName"], provider["ObjectPath"], "org.gnome.Shell.SearchProvider2", method, signature, *arguments)
 
     def states():
         metas, = search("GetResultMetas", "(as)", ["town:m2", "town:m1", "town:none"])
