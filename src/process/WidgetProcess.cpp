@@ -391,27 +391,27 @@ ErrorRef WidgetProcess::keepSeen(const std::set<std::string>& ids) {
 
 void WidgetProcess::keepLines() {
   if (_virtualTime) return;  // true of another date
+  // After an answer that is no other one the lines are the same objects.
+  std::vector<TransitLineItemRef> items;
+  for (const auto& verdict : _platform->transitLines().verdicts()) items.push_back(verdict.item);
+  const Date now = currentDate();
+  const TimeInterval age = intervalBetween(_keptLinesAt, now);
+  if (items == _keptLines && age >= 0 && age < kKeepLinesAgain) return;
   protocol::Lines lines = lineReports(_platform->favoritesEditor(), _platform->transitLines(), SeenForms());
   for (protocol::LineReport& line : lines.lines) {
     line.shield.reset();
     for (auto* list : {&line.incidents, &line.planned})
       for (protocol::LineIncident& incident : *list) {
-        incident.title.clear();
+        for (std::string* word : {&incident.id, &incident.title, &incident.effect, &incident.cause}) word->clear();
         incident.text.reset();
         incident.url.reset();
       }
   }
-  const auto written = [&lines] { return protocol::write(lines).dump(-1, ' ', false, json::error_handler_t::replace); };
-  lines.updated.reset();
-  std::string text = written();
-  const Date now = currentDate();
-  const TimeInterval age = intervalBetween(_keptLinesAt, now);
-  if (text == _keptLines && age >= 0 && age < kKeepLinesAgain) return;
-  _keptLines = std::move(text);
-  _keptLinesAt = now;
   lines.updated = now;
-  if (const ErrorRef error =
-          _platform->sharedSettings().groupStore()->setValue_forKey(written(), protocol::kSavedLinesKey))
+  const std::string text = protocol::write(lines).dump(-1, ' ', false, json::error_handler_t::replace);
+  _keptLines = std::move(items);
+  _keptLinesAt = now;
+  if (const ErrorRef error = _platform->sharedSettings().groupStore()->setValue_forKey(text, protocol::kSavedLinesKey))
     writeLog({kDefaultLogSubsystem, "WidgetProcess"}, LogLevel::error, "The states of the lines are not kept: %@",
              {error->reason()});
 }

@@ -4,6 +4,7 @@
 #include <optional>
 #include <set>
 #include <string>
+#include <vector>
 
 #include "desktop/rpc/JSONRPCConnection.h"
 #include "desktop/system/Paths.h"
@@ -109,7 +110,7 @@ class WidgetProcess {
   std::set<std::string> _seenEarly;  // before a fetch told what they are
   bool _hostChoseMode = false;
   bool _frameAnnounced = false;
-  std::string _keptLines;  // as kept last, without its date
+  std::vector<TransitLineItemRef> _keptLines;  // of the answer that was kept last
   Date _keptLinesAt;
 };
 

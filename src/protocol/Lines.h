@@ -65,7 +65,7 @@ struct MarkSeenParams {
 };
 
 /// Setting: what the last fetch of any process found out, `Lines` as JSON, with the date of that fetch as `updated` and
-/// without texts and shields.
+/// without shields and what its incidents say.
 inline constexpr std::string_view kSavedLinesKey = "Nimbo.TransitWidget.savedLines";
 
 /// A static feed that is being downloaded.
