@@ -48,9 +48,8 @@ int drive(bool serves) {
                                               NoticeService::Events{[](const std::string& problem) {
                                                                       say({{"problem", problem}});
                                                                     },
-                                                                    [&] {
+                                                                    [] {
                                                                       say({{"ended", true}});
-                                                                      runLoop.quit();
                                                                     }});
   }
   std::string input;

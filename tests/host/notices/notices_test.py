@@ -261,7 +261,7 @@ def try_faults():
         assert session.driver("serve").hear()["problem"], "there is one"
         third.process.stdin.close()
         wait("the end", lambda: third.process.poll() is not None)
-        wait("its end", lambda: not keeper.lines.empty() or keeper.process.poll() or keeper.say(advance=10) < 0)
+        wait("its end", lambda: not keeper.lines.empty() or keeper.say(advance=10) < 0)
         assert keeper.hear() == {"ended": True} and not session.owner()
         session.driver().post(notice())
         assert session.owner() and len(desktop.shown) == 3, "the bus starts the next one"
