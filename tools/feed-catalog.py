@@ -9,6 +9,7 @@ Transitland Atlas: one alerts feed a line, with the static feeds that it goes wi
 """
 import argparse
 import bz2
+import collections
 import json
 import pathlib
 import re
@@ -16,6 +17,8 @@ import re
 HERE = pathlib.Path(__file__).resolve().parent
 SOURCES = {"alert-feeds.jsonl": "Mobility Database (CC0 1.0)", "alert-feeds-atlas.jsonl": "Transitland Atlas (CC BY 4.0)"}
 MOST_AGENCIES, KEPT_AGENCIES = 4, 3
+# What is in feeds of one agency that their catalogs name alike, as their static parts say.
+KINDS = {"2338": "Tram", "2599": "Tram, Bus, Mobilis", "f-ztp~krakow~bus~rt": "Bus", "1848": "Bus", "1851": "Rail"}
 
 
 def places():
@@ -60,6 +63,27 @@ def feed_of(feed, table):
             "static": [part_of(part, feed["provider"]) for part in feed["static"]]}
 
 
+def looks(feed):
+    """What a list shows of it."""
+    title = feed["provider"] + (f" ({feed['name']})" if "name" in feed else "")
+    return (title, *(feed.get(field, "").casefold() for field in ("country", "subdivision", "municipality")))
+
+
+def tell_apart(feeds):
+    """Adds what feeds that look alike differ in: what is in them, else the first such part of their addresses."""
+    alike = collections.defaultdict(list)
+    for feed in feeds:
+        alike[looks(feed)].append(feed)
+    for group in alike.values():
+        # The scheme comes last.
+        parts = {feed["id"]: re.split(r"[/?]+", re.sub(r"^(\w+)://(.*)", r"\2/\1", feed["alerts"]["url"])) for feed in group}
+        shared = set.intersection(*map(set, parts.values()))
+        for feed in group:
+            own = KINDS.get(feed["id"]) or next((part for part in parts[feed["id"]] if part not in shared), "")
+            feed["provider"] += f" – {own}" if own else ""
+    assert len(set(map(looks, feeds))) == len(feeds), "feeds that look alike"
+
+
 def main():
     parser = argparse.ArgumentParser(description=__doc__, formatter_class=argparse.RawDescriptionHelpFormatter)
     parser.add_argument("folder", type=pathlib.Path)
@@ -68,6 +92,7 @@ def main():
     table = places()
     feeds = [feed_of(json.loads(line), table) for name in SOURCES
              for line in (arguments.folder / name).read_text().splitlines()]
+    tell_apart(feeds)
     feeds.sort(key=lambda feed: (feed.get("country", "~"), feed.get("subdivision", ""), feed["provider"], feed["id"]))
     document = {"version": 1, "sources": list(SOURCES.values()), "feeds": feeds}
     packed = bz2.compress(json.dumps(document, ensure_ascii=False, separators=(",", ":")).encode())

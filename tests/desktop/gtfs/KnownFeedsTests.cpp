@@ -58,9 +58,10 @@ TEST(KnownFeeds, AreFoundByAgencyNameIdentifierAndPlace) {
   const auto known = KnownFeeds::read();
   ASSERT_TRUE(known) << known.error()->reason();
   EXPECT_GT(known->all().size(), 500u);
-  std::set<std::string> ids;
+  std::set<std::string> ids, looks;
   for (const KnownFeed& feed : known->all()) {
     EXPECT_TRUE(ids.insert(feed.id).second) << feed.id;
+    EXPECT_TRUE(looks.insert(feed.title() + feed.municipality + feed.subdivision).second) << feed.title();
     EXPECT_FALSE(feed.country.empty()) << feed.id;
     EXPECT_LT(feed.provider.size(), 120u) << feed.id;
     EXPECT_FALSE(FeedConfiguration::checkName(nameForFeed(feed, {}))) << feed.id;
@@ -69,7 +70,7 @@ TEST(KnownFeeds, AreFoundByAgencyNameIdentifierAndPlace) {
     const char *text, *locale, *first;
   } cases[] = {{"TRIMET", "en", "1709"},
                {"portland trimet", "en", "1709"},
-               {"krakow ztp bus", "en", "f-ztp~krakow~bus~rt"},
+               {"krakow ztp bus", "en", "2599"},
                {"Lviv", "en", "f-u8c5-lvivavtodor~rt"},
                {"ЛЬВІВ", "en", "f-u8c5-lvivavtodor~rt"},
                {"f-u1-delijn~rt", "en", "f-u1-delijn~rt"},
