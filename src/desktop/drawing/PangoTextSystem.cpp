@@ -128,6 +128,48 @@ void joinLines(std::string& text) {
   text = std::move(joined);
 }
 
+bool isVowel(gunichar letter) {
+  gunichar base = letter;
+  g_unichar_fully_decompose(letter, FALSE, &base, 1);
+  constexpr std::u32string_view kVowels = U"aeiouyæœøаеёиіоуыэюяєαεηιουω";
+  return kVowels.find(static_cast<char32_t>(g_unichar_tolower(base))) != std::u32string_view::npos;
+}
+
+/// Puts soft hyphens into words that are too wide for a line, where Pango would leave a letter or two of them for the
+/// next one ("Retraso-s"): before a syllable of three letters or more. Whether there are such words.
+bool hyphenate(PangoLayout* layout, std::string& text) {
+  constexpr std::ptrdiff_t kFewest = 3, kMost = 6;
+  int count = 0;
+  const PangoLogAttr* const attributes = pango_layout_get_log_attrs_readonly(layout, &count);
+  std::vector<std::size_t> places;
+  for (int i = 0; i + 1 < pango_layout_get_line_count(layout); ++i) {
+    const PangoLayoutLine* const line = pango_layout_get_line_readonly(layout, i);
+    const char* const rest = text.c_str() + line->start_index + line->length;
+    const glong offset = g_utf8_pointer_to_offset(text.c_str(), rest);
+    if (offset + 1 >= count || attributes[offset].is_line_break) continue;
+    glong end = offset;
+    while (end + 1 < count && !attributes[end].is_word_end) ++end;
+    if (end - offset >= kFewest) continue;
+    // From the end of the word, whose letters are of a script that has hyphens.
+    const char* at = g_utf8_offset_to_pointer(text.c_str(), end);
+    std::size_t place = 0;
+    bool isBeforeVowel = false, isFound = false;
+    for (std::ptrdiff_t letters = 1; letters <= kMost && at > text.c_str() && !isFound; ++letters) {
+      at = g_utf8_prev_char(at);
+      const gunichar letter = g_utf8_get_char(at);
+      const GUnicodeScript script = g_unichar_get_script(letter);
+      if (script != G_UNICODE_SCRIPT_LATIN && script != G_UNICODE_SCRIPT_CYRILLIC && script != G_UNICODE_SCRIPT_GREEK)
+        break;
+      isFound = letters >= kFewest && isBeforeVowel && !isVowel(letter);
+      if (letters == kFewest || isFound) place = static_cast<std::size_t>(at - text.c_str());
+      isBeforeVowel = isVowel(letter);
+    }
+    if (place > static_cast<std::size_t>(line->start_index)) places.push_back(place);
+  }
+  for (auto place = places.rbegin(); place != places.rend(); ++place) text.insert(*place, "\u00AD");
+  return !places.empty();
+}
+
 /// Digits belong to no script. The user's language would give "17" another font than "F1", and shields with them.
 void drawAsLatinIfASCII(PangoLayout* layout, const std::string& text) {
   if (!std::all_of(text.begin(), text.end(), [](char byte) { return g_ascii_isprint(byte); })) return;
@@ -193,6 +235,8 @@ TextLayoutRef PangoTextSystem::layOut(const std::string& text, const FontDescrip
     pango_layout_set_ellipsize(layout.get(), PANGO_ELLIPSIZE_END);
     pango_layout_set_height(layout.get(), -static_cast<int>(std::min<std::size_t>(maxLines, 1'000'000)));
   }
+  if (hyphenate(layout.get(), shown))
+    pango_layout_set_text(layout.get(), shown.data(), static_cast<int>(shown.size()));
   if (pango_layout_get_unknown_glyphs_count(layout.get()) > 0) logMissingCharacters();
   return std::make_shared<const PangoTextLayout>(std::move(layout), scale, rightToLeft, wasCut);
 }

@@ -73,6 +73,14 @@ TEST_F(PangoText, BreaksLinesAndCutsTheLastOne) {
   EXPECT_EQ(layOut("", 100, 1)->lineCount(), 1u);
 }
 
+TEST_F(PangoText, LeavesNoLetterOrTwoOfAWordForTheNextLine) {
+  for (const auto& [word, first] : {std::pair{"Retrasos", "Retra-"}, {"Verspätungen", "Verspätun-"}, {"Ааааск", "Ааа-"}}) {
+    const auto broken = layOut(word, layOut(word)->size().width - 1);
+    EXPECT_EQ(broken->lineCount(), 2u) << word;
+    EXPECT_NEAR(broken->size().width, layOut(first)->size().width, 1) << word;
+  }
+}
+
 TEST_F(PangoText, RunsInTheDirectionOfItsFirstLetter) {
   const int width = 200;
   const struct {
