@@ -1,4 +1,3 @@
-#include <algorithm>
 #include <iostream>
 
 #include "desktop/gtfs/static/LineItems.h"
@@ -11,21 +10,6 @@
 namespace nimbo {
 
 namespace {
-
-/// Says which lines are gone, and which feeds cannot tell.
-void tellGoneLines(const CommandContext& context, const std::vector<TransitLineRef>& lines) {
-  protocol::DescribeLinesParams params;
-  for (const TransitLineRef& line : lines)
-    if (line->identifier()->locator()) params.lines.push_back(keyOf(*line->identifier()));
-  if (params.lines.empty()) return;
-  const auto described = WidgetWithProgress(context).call(protocol::kDescribeLines, params);
-  for (std::size_t i = 0; i < std::min(described.lines.size(), params.lines.size()); ++i)
-    if (described.lines[i].isGone) printMessage(goneLineText(*params.lines[i].id));
-  for (const protocol::FetchError& failure : described.failures) {
-    if (!failure.feed) throw CommandFailure(failure.reason);
-    printMessage(failure.reason);
-  }
-}
 
 /// Of a damaged database those that are left.
 std::vector<TransitLineRef> favoriteLines(HostPlatform& platform) {
@@ -85,7 +69,6 @@ int runFavoriteList(const CommandContext& context, bool json) {
   printLines(lines, json);
   require(platform->favoritesEditor().list().error());
   if (lines.empty() && !json) std::cout << "No favorite lines. Add some with \"favorite add FEED:ROUTE_ID\".\n";
-  tellGoneLines(context, lines);
   return kExitSuccess;
 }
 

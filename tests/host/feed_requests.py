@@ -121,9 +121,9 @@ def check_cache(folder, _):
         def log_message(self, *_):
             pass
 
-    def run(*arguments):
+    def run(*arguments, **environment):
         return subprocess.run([command_line, "--config", folder, "--state", folder, *arguments], capture_output=True,
-                              text=True)
+                              text=True, env=os.environ | environment)
 
     with http.server.HTTPServer(("127.0.0.1", 0), Zip) as server:
         threading.Thread(target=server.serve_forever, daemon=True).start()
@@ -135,6 +135,7 @@ def check_cache(folder, _):
         done = run(*arguments)
         assert done.returncode == 0 and not done.stderr, done
         assert arguments[1] == "add" or "city:R" in done.stdout, done
+    assert "city:R" in run("favorite", "list", NIMBO_TRANSIT_WIDGET="/none").stdout, "asks no feed"
     assert run("feed", "check").returncode == 1
 
 
