@@ -3,10 +3,10 @@
 #include <gtkmm/dialog.h>
 
 #include <algorithm>
+#include <charconv>
 
 #include "desktop/gtfs/feeds/FeedSetup.h"
 #include "host/FeedAnswers.h"
-#include "host/window/Texts.h"
 #include "host/window/WidgetTexts.h"
 #include "platform/Localization.h"
 
@@ -30,13 +30,22 @@ FeedForm::FeedForm(const PageContext& context, std::optional<Feed> edited, Kept 
     _alerts.entry.set_text(_edited->alerts.text());
     _minorAlerts.set_active(_edited->minorAlerts);
     _combined.set_active(_edited->isCombined);
+    if (_edited->staticMirror) _mirror.entry.set_text(_edited->staticMirror->text());
+    if (_edited->maximumAlertsAge) _maximumAge.entry.set_text(std::to_string(_edited->maximumAlertsAge->count()));
   } else {
     addField(_name, "Window_Feed_Name", "Window_Feed_NamePrompt");
   }
   addField(_static, "Window_Feed_Static", "Window_Feed_StaticPrompt");
   addField(_alerts, "Window_Feed_Alerts", "Window_Feed_AlertsPrompt");
+  if (_edited) {
+    addField(_mirror, "Window_Feed_Mirror", "Window_Feed_MirrorPrompt");
+    addField(_maximumAge, "Window_Feed_MaximumAge", "Window_Feed_MaximumAgePrompt");
+  }
   addField(_key, "Window_Feed_Key", hasKey ? "Window_Feed_KeyKept" : "Window_Feed_KeyPrompt");
   _key.entry.set_visibility(false);
+  _removeKeys.set_label(LocalizedString("Window_Feed_RemoveKeys"));
+  _removeKeys.set_visible(hasKey);
+  append(_removeKeys);
   _minorAlerts.set_label(LocalizedString("Window_Feed_MinorAlerts"));
   append(_minorAlerts);
   // Of a new feed asked only where the answer does not tell.
@@ -132,13 +141,49 @@ std::optional<Feed> FeedForm::feed() {
   const auto alerts = addressIn(_alerts, _edited ? std::optional(_edited->alerts) : std::nullopt);
   if (problem || !staticFeed || !alerts) return std::nullopt;
   Feed feed = _edited.value_or(Feed{.name = name, .staticFeed = *staticFeed, .alerts = *alerts});
-  if (feed.staticFeed != *staticFeed) feed.staticMirror.reset();
   feed.staticFeed = *staticFeed;
   feed.alerts = *alerts;
+  if (_removeKeys.get_active())
+    for (FeedAddress* address : {&feed.staticFeed, &feed.alerts}) *address = address->withKey({});
+  if (_edited && !(takeMirror(feed) && takeMaximumAge(feed))) return std::nullopt;
   feed.minorAlerts = _minorAlerts.get_active();
   feed.isCombined = _combined.get_active();
   if (!takeKey(feed)) return std::nullopt;
   return feed;
+}
+
+bool FeedForm::takeMirror(Feed& feed) {
+  const std::string text = _mirror.entry.get_text();
+  const bool isAsBefore = feed.staticMirror && text == feed.staticMirror->text();
+  // A copy is one of the address that there was.
+  if (text.empty() || (isAsBefore && feed.staticFeed.text() != _edited->staticFeed.text())) {
+    feed.staticMirror.reset();
+    return true;
+  }
+  const auto address = FeedAddress::parse(text);
+  if (!address || !address->isRemote()) {
+    showProblem(_mirror, LocalizedString("Window_Feed_MirrorProblem"));
+    return false;
+  }
+  feed.staticMirror = *address;
+  return true;
+}
+
+bool FeedForm::takeMaximumAge(Feed& feed) {
+  const std::string text = _maximumAge.entry.get_text();
+  feed.maximumAlertsAge.reset();
+  if (text.empty()) return true;
+  const int least = feed.alerts.isRemote() ? 1 : 0;
+  int minutes = -1;
+  const auto [end, error] = std::from_chars(text.data(), text.data() + text.size(), minutes);
+  if (error != std::errc() || end != text.data() + text.size() || minutes < least ||
+      minutes > kLongestAlertsAgeMinutes) {
+    showProblem(_maximumAge, LocalizedFormat(LocalizedString("Window_Feed_MaximumAgeProblem"),
+                                             {std::to_string(least), std::to_string(kLongestAlertsAgeMinutes)}));
+    return false;
+  }
+  feed.maximumAlertsAge = std::chrono::minutes(minutes);
+  return true;
 }
 
 bool FeedForm::takeKey(Feed& feed) {
@@ -161,11 +206,11 @@ bool FeedForm::takeKey(Feed& feed) {
   return true;
 }
 
-void FeedForm::showProblem(Field& field, const ErrorRef& problem) {
+void FeedForm::showProblem(Field& field, const std::string& problem) {
   const auto all = fields();
   const bool isFirst =
       std::none_of(all.begin(), all.end(), [](const Field* other) { return other->problem.get_visible(); });
-  field.problem.set_text(textOfError(*problem));
+  field.problem.set_text(problem);
   field.problem.show();
   field.entry.add_css_class("error");
   setAccessibleDescription(field.entry, field.problem.get_text());
@@ -180,7 +225,7 @@ void FeedForm::clear(Field& field) {
 
 void FeedForm::setBusy(bool busy) {
   for (Field* field : fields()) field->entry.set_sensitive(!busy);
-  for (Gtk::Widget* widget : std::initializer_list<Gtk::Widget*>{&_minorAlerts, &_combined, &_keep})
+  for (Gtk::Widget* widget : std::initializer_list<Gtk::Widget*>{&_removeKeys, &_minorAlerts, &_combined, &_keep})
     widget->set_sensitive(!busy);
 }
 
