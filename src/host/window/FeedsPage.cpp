@@ -1,5 +1,7 @@
 #include "host/window/FeedsPage.h"
 
+#include <gtkmm/flowbox.h>
+#include <gtkmm/flowboxchild.h>
 #include <gtkmm/label.h>
 
 #include "desktop/gtfs/feeds/FeedCache.h"
@@ -25,7 +27,12 @@ FeedRow::FeedRow(const PageContext& context, const Feed& feed, std::function<voi
   addText(feed.staticFeed.publicText(), "item-caption");
   addText(feed.alerts.publicText(), "item-caption");
   box->append(_check);
-  auto* buttons = Gtk::make_managed<Gtk::Box>(Gtk::Orientation::HORIZONTAL, 8);
+  // Beside each other where they fit.
+  auto* buttons = Gtk::make_managed<Gtk::FlowBox>();
+  buttons->set_selection_mode(Gtk::SelectionMode::NONE);
+  buttons->set_column_spacing(8);
+  buttons->set_row_spacing(8);
+  buttons->set_halign(Gtk::Align::START);
   _checkButton.set_label(LocalizedString("Window_Feed_Check"));
   _checkButton.signal_clicked().connect([this] { check(); });
   auto* removeButton = Gtk::make_managed<Gtk::Button>(LocalizedString("Window_Feed_Remove"));
@@ -33,9 +40,13 @@ FeedRow::FeedRow(const PageContext& context, const Feed& feed, std::function<voi
   auto* editButton = Gtk::make_managed<Gtk::Button>(LocalizedString("Window_Feed_Edit"));
   editButton->signal_clicked().connect([this] { edit(); });
   removeButton->add_css_class("destructive-action");
-  buttons->append(_checkButton);
-  buttons->append(*editButton);
-  buttons->append(*removeButton);
+  for (Gtk::Button* button : {&_checkButton, editButton, removeButton}) {
+    auto* place = Gtk::make_managed<Gtk::FlowBoxChild>();
+    place->set_focusable(false);  // the button is what the keyboard stops at
+    place->set_child(*button);
+    buttons->append(*place);
+  }
+  buttons->set_max_children_per_line(3);
   box->append(*buttons);
   set_child(*box);
   wrapTexts(*box);

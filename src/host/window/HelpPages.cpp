@@ -1,6 +1,7 @@
 #include "host/window/HelpPages.h"
 
 #include <gtkmm/grid.h>
+#include <gtkmm/icontheme.h>
 #include <gtkmm/image.h>
 #include <gtkmm/label.h>
 #include <gtkmm/linkbutton.h>
@@ -29,11 +30,15 @@ constexpr std::pair<const char*, const char*> kKeys[] = {
 }  // namespace
 
 AboutPage::AboutPage() : Page(LocalizedString("Window_About")) {
-  auto* icon = Gtk::make_managed<Gtk::Image>();
-  icon->set_from_icon_name("org.nimbo.Transit");
-  icon->set_pixel_size(64);
-  hideFromAccessibility(*icon);
-  content().append(*icon);
+  // A program that is not installed has none.
+  if (Gtk::IconTheme::get_for_display(Gdk::Display::get_default())->has_icon("org.nimbo.Transit")) {
+    auto* icon = Gtk::make_managed<Gtk::Image>();
+    icon->set_from_icon_name("org.nimbo.Transit");
+    icon->set_pixel_size(64);
+    icon->set_halign(Gtk::Align::START);
+    hideFromAccessibility(*icon);
+    content().append(*icon);
+  }
   content().append(*makeText(LocalizedString("Window_Title") + " " + kVersion, "line-title"));
   content().append(*makeText(LocalizedString("Window_About_Text"), "item-text"));
   content().append(*makeText(LocalizedString("Window_About_Sources"), "item-heading"));

@@ -129,6 +129,7 @@ Gtk::Widget* LineStates::makeRow(const protocol::LineReport& line, const DateTex
   box->add_css_class("item");
   box->append(shieldOfRow(_context.preferences, artworkOf(line.shield)));
   auto* texts = Gtk::make_managed<Gtk::Box>(Gtk::Orientation::VERTICAL, 2);
+  texts->set_hexpand();
   std::vector<std::string> said{line.name};
   const auto add = [&](const std::string& text, const char* style) {
     if (text.empty()) return;
