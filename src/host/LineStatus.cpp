@@ -91,6 +91,9 @@ json statusAsJSON(const protocol::Lines& lines) {
     json written = protocol::write(line);
     for (const char* own : {"muid", "shield"}) written.erase(own);
     written["reason"] = line.reason ? json(line.reason->reason) : json();
+    for (const char* list : {"incidents", "planned"})
+      for (json& incident : written[list])
+        for (const char* own : {"image", "imageText"}) incident.erase(own);
     result["lines"].push_back(std::move(written));
   }
   return result;

@@ -4,6 +4,7 @@
 
 #include "desktop/store/RefreshSetting.h"
 #include "host/HostPlatform.h"
+#include "host/ProgressLine.h"
 #include "platform/SystemServices.h"
 #include "platform/ui/Font.h"
 
@@ -48,7 +49,10 @@ TimeInterval sharedAge(const CommandContext& context) {
 
 std::optional<std::string> failureOfUpdate(WidgetClient& client, std::optional<TimeInterval> maxAge) {
   while (true) {
-    const protocol::UpdateResult answer = client.call(protocol::kPerformUpdate, {maxAge});
+    const protocol::UpdateResult answer = [&client, maxAge] {
+      const DownloadProgress progress(client);
+      return client.call(protocol::kPerformUpdate, {maxAge});
+    }();
     if (answer.updateResult != WidgetUpdateResult::Failed) return std::nullopt;
     const std::string reason = answer.reason.value_or("the update failed");
     // The download has a limit of its own.

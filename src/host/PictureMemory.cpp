@@ -33,17 +33,24 @@ std::size_t PictureMemory::bytesOf(const protocol::Rendered& drawn) {
   return size <= kSize ? size : 0;
 }
 
-std::optional<WidgetPicture> PictureMemory::take(const protocol::Rendered& drawn) const {
+std::optional<WidgetPicture> PictureMemory::take(const protocol::Rendered& drawn, std::size_t offset) const {
   const std::size_t size = bytesOf(drawn);
-  if (size == 0) return std::nullopt;
+  if (size == 0 || offset > kSize - size) return std::nullopt;
   WidgetPicture picture{drawn, std::vector<std::uint8_t>(size)};
   for (std::size_t taken = 0; taken < size;) {
-    const ssize_t count = pread(_memory.get(), picture.pixels.data() + taken, size - taken, static_cast<off_t>(taken));
+    const ssize_t count =
+        pread(_memory.get(), picture.pixels.data() + taken, size - taken, static_cast<off_t>(offset + taken));
     if (count < 0 && errno == EINTR) continue;
     if (count <= 0) return std::nullopt;
     taken += static_cast<std::size_t>(count);
   }
   return picture;
+}
+
+void PictureMemory::drop(std::size_t offset) const {
+  // A system that cannot keeps it.
+  (void)fallocate(_memory.get(), FALLOC_FL_PUNCH_HOLE | FALLOC_FL_KEEP_SIZE, static_cast<off_t>(offset),
+                  static_cast<off_t>(kSize - offset));
 }
 
 }  // namespace nimbo

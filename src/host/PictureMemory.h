@@ -26,11 +26,15 @@ class PictureMemory {
   int descriptor() const { return _memory.get(); }
   /// The bytes that such a picture takes; 0 where it is none, or larger than the memory.
   static std::size_t bytesOf(const protocol::Rendered& drawn);
-  /// A copy of what the process says it drew; absent when it says what no picture is.
-  std::optional<WidgetPicture> take(const protocol::Rendered& drawn) const;
+  /// A copy of what the process says it drew, so many bytes from the beginning; absent when it says what no picture is.
+  std::optional<WidgetPicture> take(const protocol::Rendered& drawn, std::size_t offset = 0) const;
+  /// Gives back the memory that is behind the offset.
+  void drop(std::size_t offset) const;
 
   /// Bytes: 64 million pixels.
   static constexpr std::size_t kSize = 256'000'000;
+  /// Where images of incidents go, for a host that shows them: the largest one takes 64 MiB.
+  static constexpr std::size_t kImageOffset = 188'000'000;
 
  private:
   FileDescriptor _memory;

@@ -17,7 +17,11 @@ std::string textOf(const protocol::ProgressParams& progress) {
   text += progress.feed;
   if (progress.total > 1)
     text += ", feed " + std::to_string(progress.done + 1) + " of " + std::to_string(progress.total);
-  if (progress.received > 0) text += ": " + std::to_string(progress.received >> 20) + " MiB have come";
+  if (progress.received > 0) {
+    text += ": " + std::to_string(progress.received >> 20);
+    if (progress.length) text += " of " + std::to_string(*progress.length >> 20);
+    text += " MiB have come";
+  }
   return printableText(text);
 }
 
@@ -40,6 +44,26 @@ void ProgressLine::clear() {
   if (!std::exchange(_isShown, false)) return;
   std::fputs("\r\x1b[K", stderr);
   std::fflush(stderr);
+}
+
+DownloadProgress::DownloadProgress(WidgetClient& client) {
+  if (!_line.isSeen()) return;
+  _timer = client.runLoop().scheduleTimer(1, true, [this, &client](Timer&) {
+    client.connection().call(protocol::kDownloads.name, nlohmann::json::object(),
+                             [this, alive = std::weak_ptr(_alive)](const nlohmann::json& answer, const auto& error) {
+                               if (!alive.expired() && !error) show(protocol::read<protocol::Downloads>(answer));
+                             });
+  });
+}
+
+DownloadProgress::~DownloadProgress() {
+  if (_timer) _timer->invalidate();
+}
+
+void DownloadProgress::show(const protocol::Downloads& downloads) {
+  if (downloads.downloads.empty()) return _line.clear();
+  const protocol::Download& first = downloads.downloads.front();
+  _line.show({.feed = first.feed, .received = first.received, .length = first.length});
 }
 
 WidgetWithProgress::WidgetWithProgress(const CommandContext& context)

@@ -67,6 +67,7 @@ class WidgetClient {
   /// Hears of what is no message, or no such one as it says, in place of the widget, which else gets an error.
   void setNonsenseHandler(std::function<void(const std::string& problem)> handler);
   JSONRPCConnection& connection() { return *_connection; }
+  GLibRunLoop& runLoop() const { return _runLoop; }
   bool isRunning() const { return _running; }
   /// Ends a process that is not to be trusted to end by itself.
   void kill();

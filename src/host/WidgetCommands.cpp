@@ -10,6 +10,7 @@
 #include "host/HostPlatform.h"
 #include "host/LineStatus.h"
 #include "host/OnScreenWidget.h"
+#include "host/ProgressLine.h"
 #include "host/ScriptPlayer.h"
 #include "host/TerminalRows.h"
 #include "host/TerminalText.h"
@@ -123,6 +124,7 @@ void waitForDownloads(WidgetClient& client, GLibRunLoop& runLoop) {
   constexpr TimeInterval kLook = 0.2;
   constexpr int kLooks = 660 * 5;  // a minute more than a download takes at most
   bool isSaid = false;
+  const DownloadProgress progress(client);
   for (int i = 0; i < kLooks; ++i) {
     const protocol::Downloads under = client.call(protocol::kDownloads);
     if (under.downloads.empty()) return;

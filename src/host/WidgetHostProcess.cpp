@@ -134,6 +134,12 @@ void WidgetHostProcess::setUpConnection() {
   client.connection().setHandler(protocol::kChanged.name,
                                  [this](const auto&, const JSONRPCResponder&) { _refresh.askNow(); });
   client.setNoticeHandler([this](const std::string& message) { _delegate.widgetTells(message); });
+  client.setProgressHandler([this](const protocol::ProgressParams& progress) {
+    for (const auto& waiting : _questions)
+      if (const auto asked = waiting.lock();
+          asked && asked->_fail && asked->_progress && progress.request == protocol::RequestID(asked->_request))
+        asked->_progress(progress);
+  });
   client.setOpenHandler([this](const WidgetClient::Opening& opening) { return _delegate.widgetOpens(opening); });
 }
 

@@ -160,6 +160,8 @@ class WidgetHostProcess {
 
 class WidgetHostProcess::Question {
  public:
+  /// Hears every second how far an answer is that takes longer.
+  void setProgressHandler(WidgetClient::ProgressHandler handler) { _progress = std::move(handler); }
   ~Question() {
     if (_cancel) _cancel();
   }
@@ -168,6 +170,8 @@ class WidgetHostProcess::Question {
   friend class WidgetHostProcess;
   std::function<void(const ErrorRef& failure)> _fail;  // null once answered
   std::function<void()> _cancel;                       // null where nothing is to be told
+  std::int64_t _request = 0;                           // its identifier
+  WidgetClient::ProgressHandler _progress;             // null: nobody hears
 };
 
 template <class Params, class Result>
@@ -185,6 +189,7 @@ std::shared_ptr<WidgetHostProcess::Question> WidgetHostProcess::ask(
         asked->_cancel = nullptr;
         answer ? completion(*answer) : completion(failure(error.message));
       });
+  question->_request = request;
   if (method.waitsForFeeds && question->_fail)
     question->_cancel = [this, request, process = std::weak_ptr(_processMark)] {
       if (!process.expired()) _widget->call(protocol::kCancel, {request}, [](const auto&, const auto&) {});

@@ -1,11 +1,14 @@
 #include "process/FeedRequests.h"
 
+#include <limits>
 #include <mutex>
 #include <thread>
 
 #include "desktop/gtfs/feeds/FeedCheck.h"
 #include "desktop/gtfs/feeds/FeedMuid.h"
+#include "process/AlertImages.h"
 #include "process/FeedMessages.h"
+#include "process/PictureOutput.h"
 #include "process/RemoteHost.h"
 #include "process/Snapshot.h"
 #include "protocol/Coding.h"
@@ -60,18 +63,27 @@ struct FeedRequests::Running {
     progress.feed = feed;
     progress.part = protocol::FeedPart::staticFeed;
     progress.received = 0;
+    progress.length.reset();
     progress.done = feedsDone;
     progress.total = feedsToRead;
   }
 
   const JSONRPCResponder responder;
+  /// Set by its thread: makes the answer on the main thread, unless the request has been cancelled by then.
+  std::function<json()> conclude;
   std::mutex lock;
   protocol::ProgressParams progress;
   std::jthread thread;  // last: it ends before the rest goes
 };
 
-FeedRequests::FeedRequests(const FeedLibrary& library, RunLoop& runLoop, JSONRPCConnection& connection)
-    : _library(library), _catalog(library), _runLoop(runLoop), _connection(connection) {}
+FeedRequests::FeedRequests(const GTFSTransitLineService& service, RunLoop& runLoop, JSONRPCConnection& connection,
+                           int pictures)
+    : _service(service),
+      _library(service.library()),
+      _catalog(_library),
+      _runLoop(runLoop),
+      _connection(connection),
+      _pictures(pictures) {}
 
 FeedRequests::~FeedRequests() {
   for (const auto& timer : {_second, _leisure})
@@ -92,13 +104,21 @@ void FeedRequests::start(const JSONRPCResponder& responder, Work work) {
     std::optional<JSONRPCError> error;
     try {
       result = work(*to, stop);
+    } catch (const JSONRPCFailure& failure) {
+      error = failure.error;
     } catch (const std::exception& exception) {
       error = {JSONRPCError::kInternalError, exception.what()};
     }
-    if (stop.stop_requested()) error = kCancelled;
-    _runLoop.dispatchAsync([this, number, alive, responder = to->responder, result = std::move(result), error] {
+    _runLoop.dispatchAsync([this, number, alive, result = std::move(result), error]() mutable {
       if (alive.expired()) return;
-      error ? responder.fail(*error) : responder.answer(result);
+      const Running& ended = *_running.at(number);
+      if (ended.thread.get_stop_token().stop_requested()) error = kCancelled;
+      try {
+        if (!error && ended.conclude) result = ended.conclude();
+      } catch (const JSONRPCFailure& failure) {
+        error = failure.error;
+      }
+      error ? ended.responder.fail(*error) : ended.responder.answer(result);
       finish(number);
     });
   });
@@ -128,9 +148,12 @@ void FeedRequests::tellProgress() {
     const auto& id = running->responder.id();
     if (progress.feed.empty() || !id || !(id->is_string() || id->is_number_integer())) continue;
     progress.request = id->is_string() ? protocol::RequestID(id->get<std::string>()) : id->get<std::int64_t>();
-    for (const auto& [feed, received] : downloads)
-      if (feed == progress.feed && progress.part == protocol::FeedPart::staticFeed)
-        progress.received = std::max<std::uint64_t>(progress.received, received);
+    for (const StaticFeedDownloads::Progress& download : downloads)
+      if (download.feed == progress.feed && progress.part == protocol::FeedPart::staticFeed &&
+          download.received >= progress.received) {
+        progress.received = download.received;
+        progress.length = download.length;
+      }
     notify(_connection, protocol::kProgress, progress);
   }
 }
@@ -203,13 +226,33 @@ void FeedRequests::checkFeed(const protocol::CheckFeedParams& params, const JSON
                                            const std::lock_guard guard(running.lock);
                                            running.progress.part = protocol::FeedPart::alerts;
                                            running.progress.received = 0;
+                                           running.progress.length.reset();
                                          },
                                      .receives =
-                                         [&](std::size_t bytes) {
+                                         [&](std::uint64_t bytes, std::optional<std::uint64_t> length) {
                                            const std::lock_guard guard(running.lock);
-                                           running.progress.received += bytes;
+                                           running.progress.received = bytes;
+                                           running.progress.length = length;
                                          }};
     return protocol::write(writtenReport(nimbo::checkFeed(feed, _library.cache(), stop, progress)));
+  });
+}
+
+void FeedRequests::image(const protocol::ImageParams& params, const JSONRPCResponder& responder) {
+  if (_pictures < 0) throw JSONRPCFailure(JSONRPCError::kDrawingFailed, "there is no memory for images");
+  const auto address = imageOfIncident(params.incident, _service);
+  if (!address) throw JSONRPCFailure(JSONRPCError::kDrawingFailed, address.error()->reason());
+  start(responder, [this, params, address = *address](Running& running, const std::stop_token& stop) {
+    const auto image = fetchImage(address, params.width, stop);
+    if (!image) throw JSONRPCFailure(JSONRPCError::kDrawingFailed, image.error()->reason());
+    running.conclude = [this, params, image = *image] {
+      if (const ErrorRef error = writePicture(*image, _pictures, params.offset.value_or(0),
+                                              params.capacity.value_or(std::numeric_limits<std::uint64_t>::max())))
+        throw JSONRPCFailure(JSONRPCError::kDrawingFailed, error->reason());
+      return protocol::write(
+          protocol::Rendered{image->pixelWidth(), image->pixelHeight(), image->stride(), image->scale()});
+    };
+    return json();
   });
 }
 

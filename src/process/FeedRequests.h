@@ -6,9 +6,11 @@
 #include <stop_token>
 
 #include "desktop/gtfs/feeds/FeedCatalog.h"
+#include "desktop/gtfs/feeds/GTFSTransitLineService.h"
 #include "desktop/rpc/JSONRPCConnection.h"
 #include "platform/RunLoop.h"
 #include "protocol/Feeds.h"
+#include "protocol/Messages.h"
 
 namespace nimbo {
 
@@ -17,8 +19,8 @@ namespace nimbo {
 /// hears every second how far it is. Main thread only.
 class FeedRequests {
  public:
-  /// The library, the loop and the connection outlive this.
-  FeedRequests(const FeedLibrary& library, RunLoop& runLoop, JSONRPCConnection& connection);
+  /// The service, the loop and the connection outlive this. `pictures` is the host's memory for images; -1: none.
+  FeedRequests(const GTFSTransitLineService& service, RunLoop& runLoop, JSONRPCConnection& connection, int pictures);
   /// Ends what still runs, with an error as its answer.
   ~FeedRequests();
 
@@ -27,6 +29,8 @@ class FeedRequests {
   void findLines(const protocol::FindLinesParams& params, const JSONRPCResponder& responder);
   void describeLines(const protocol::DescribeLinesParams& params, const JSONRPCResponder& responder);
   void checkFeed(const protocol::CheckFeedParams& params, const JSONRPCResponder& responder);
+  /// Fetches an image of an incident that the last lookup found, and puts it into the host's memory.
+  void image(const protocol::ImageParams& params, const JSONRPCResponder& responder);
   /// Ends a request that still runs, with an error as its answer.
   void cancel(const protocol::RequestID& request);
 
@@ -41,10 +45,12 @@ class FeedRequests {
   void finish(std::uint64_t number);
   void tellProgress();
 
+  const GTFSTransitLineService& _service;
   const FeedLibrary& _library;
   FeedCatalog _catalog;
   RunLoop& _runLoop;
   JSONRPCConnection& _connection;
+  int _pictures;
   std::map<std::uint64_t, std::shared_ptr<Running>> _running;
   std::uint64_t _nextNumber = 0;
   std::shared_ptr<Timer> _second;   // while something runs

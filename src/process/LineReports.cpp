@@ -51,6 +51,8 @@ protocol::LineIncident lineIncidentOf(const TransitIncident& incident) {
     result.effect = wordOf(kEffects, static_cast<std::int32_t>(fields.effect));
     result.cause = wordOf(kCauses, fields.cause);
     result.concern = static_cast<protocol::Concern>(fields.concern);
+    result.hasImage = fields.image.address.has_value();
+    result.imageText = fields.image.text;
   } else if (incident.isBlockingIncident()) {
     result.concern = protocol::Concern::noService;
   }
@@ -99,8 +101,8 @@ class Reports {
   void add(std::vector<protocol::LineIncident>& list, const TransitIncident& incident) {
     protocol::LineIncident written = lineIncidentOf(incident);
     constexpr std::size_t kFrame = 300;  // keys and dates
-    const std::size_t size =
-        kFrame + written.title.size() + written.text.value_or("").size() + written.url.value_or("").size();
+    const std::size_t size = kFrame + written.title.size() + written.text.value_or("").size() +
+                             written.url.value_or("").size() + written.imageText.value_or("").size();
     if (size > _room) {
       _isCut = true;
       return;

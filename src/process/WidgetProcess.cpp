@@ -75,6 +75,7 @@ WidgetProcess::WidgetProcess(Options options, int input, int output)
   addFeedMethod(protocol::kFindLines, &FeedRequests::findLines);
   addFeedMethod(protocol::kDescribeLines, &FeedRequests::describeLines);
   addFeedMethod(protocol::kCheckFeed, &FeedRequests::checkFeed);
+  addFeedMethod(protocol::kImage, &FeedRequests::image);
   addMethod(protocol::kCancel, &WidgetProcess::cancel);
   addMethod(protocol::kLines, &WidgetProcess::lines);
   addMethod(protocol::kMarkSeen, &WidgetProcess::markSeen);
@@ -161,7 +162,7 @@ void WidgetProcess::makePlatform(const std::string& locale) {
                                .activityLauncher = _host,
                                .logSink = std::move(logSink),
                                .notice = [this](const ErrorRef& notice) { tellNotice(notice); }});
-  _feedRequests = std::make_unique<FeedRequests>(_platform->transitLines().library(), _runLoop, _connection);
+  _feedRequests = std::make_unique<FeedRequests>(_platform->transitLines(), _runLoop, _connection, _options.pictures);
 }
 
 protocol::Initialized WidgetProcess::initialize(const protocol::InitializeParams& params) {
@@ -419,8 +420,8 @@ void WidgetProcess::keepLines() {
 protocol::Downloads WidgetProcess::downloads(const Nothing&) {
   protocol::Downloads result;
   if (_platform)
-    for (auto& [feed, received] : _platform->transitLines().library().downloads().underWay())
-      result.downloads.push_back({feed, received});
+    for (const auto& download : _platform->transitLines().library().downloads().underWay())
+      result.downloads.push_back({download.feed, download.received, download.length});
   return result;
 }
 

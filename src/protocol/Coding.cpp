@@ -130,6 +130,10 @@ template <>
 constexpr std::tuple kFields<Rendered>{Field{"width", &Rendered::width}, Field{"height", &Rendered::height},
                                        Field{"stride", &Rendered::stride}, Field{"scale", &Rendered::scale}};
 template <>
+constexpr std::tuple kFields<ImageParams>{
+    Field{"incident", &ImageParams::incident}, Field{"width", &ImageParams::width},
+    Field{"offset", &ImageParams::offset, kMayBeLeftOut}, Field{"capacity", &ImageParams::capacity, kMayBeLeftOut}};
+template <>
 constexpr std::tuple kFields<AdvanceParams>{
     Field{"seconds", &AdvanceParams::seconds, Rules{.least = 0, .most = 366.0 * 86400}}};
 template <>
@@ -228,7 +232,9 @@ constexpr std::tuple kFields<LineIncident>{Field{"id", &LineIncident::id},
                                            Field{"effect", &LineIncident::effect},
                                            Field{"cause", &LineIncident::cause},
                                            Field{"concern", &LineIncident::concern},
-                                           Field{"new", &LineIncident::isNew}};
+                                           Field{"new", &LineIncident::isNew},
+                                           Field{"image", &LineIncident::hasImage},
+                                           Field{"imageText", &LineIncident::imageText}};
 template <>
 constexpr std::tuple kFields<LineReport>{
     Field{"id", &LineReport::id},          Field{"muid", &LineReport::muid},
@@ -243,7 +249,8 @@ constexpr std::tuple kFields<Lines>{Field{"updated", &Lines::updated}, Field{"li
 template <>
 constexpr std::tuple kFields<MarkSeenParams>{Field{"ids", &MarkSeenParams::ids}};
 template <>
-constexpr std::tuple kFields<Download>{Field{"feed", &Download::feed}, Field{"received", &Download::received}};
+constexpr std::tuple kFields<Download>{Field{"feed", &Download::feed}, Field{"received", &Download::received},
+                                       Field{"length", &Download::length, kMayBeLeftOut}};
 template <>
 constexpr std::tuple kFields<Downloads>{Field{"downloads", &Downloads::downloads}};
 
@@ -356,10 +363,13 @@ constexpr std::tuple kFields<FeedReport>{Field{"name", &FeedReport::name},
 template <>
 constexpr std::tuple kFields<CancelParams>{Field{"request", &CancelParams::request}};
 template <>
-constexpr std::tuple kFields<ProgressParams>{
-    Field{"request", &ProgressParams::request}, Field{"feed", &ProgressParams::feed},
-    Field{"part", &ProgressParams::part},       Field{"received", &ProgressParams::received},
-    Field{"done", &ProgressParams::done},       Field{"total", &ProgressParams::total}};
+constexpr std::tuple kFields<ProgressParams>{Field{"request", &ProgressParams::request},
+                                             Field{"feed", &ProgressParams::feed},
+                                             Field{"part", &ProgressParams::part},
+                                             Field{"received", &ProgressParams::received},
+                                             Field{"length", &ProgressParams::length, kMayBeLeftOut},
+                                             Field{"done", &ProgressParams::done},
+                                             Field{"total", &ProgressParams::total}};
 
 template <class T>
 constexpr bool kMayBeAbsent = false;
@@ -637,6 +647,7 @@ NIMBO_MESSAGE(MarkSeenParams);
 NIMBO_MESSAGE(Downloads);
 NIMBO_MESSAGE(RenderParams);
 NIMBO_MESSAGE(Rendered);
+NIMBO_MESSAGE(ImageParams);
 NIMBO_MESSAGE(AdvanceParams);
 NIMBO_MESSAGE(Advanced);
 NIMBO_MESSAGE(DecodeParams);

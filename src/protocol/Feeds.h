@@ -168,9 +168,10 @@ struct ProgressParams {
   RequestID request;
   std::string feed;  ///< the one that is read
   FeedPart part = FeedPart::staticFeed;
-  std::uint64_t received = 0;  ///< bytes of it that have come
-  std::uint64_t done = 0;      ///< feeds that have been read
-  std::uint64_t total = 0;     ///< feeds that are to be read
+  std::uint64_t received = 0;           ///< bytes of it that have come
+  std::optional<std::uint64_t> length;  ///< bytes that it has, where its server says so
+  std::uint64_t done = 0;               ///< feeds that have been read
+  std::uint64_t total = 0;              ///< feeds that are to be read
 };
 
 }  // namespace nimbo::protocol

@@ -35,7 +35,9 @@ struct LineIncident {
   std::string effect;  ///< the reference's word in lower case, such as "detour"
   std::string cause;   ///< the same, such as "construction"
   Concern concern = Concern::other;
-  bool isNew = true;  ///< the rider has not seen it as it is
+  bool isNew = true;                     ///< the rider has not seen it as it is
+  bool hasImage = false;                 ///< `image` can be asked for it
+  std::optional<std::string> imageText;  ///< what the image of the alert says, also of one that cannot be shown
 };
 
 /// What is known of a favorite line.
@@ -71,7 +73,8 @@ inline constexpr std::string_view kSavedLinesKey = "Nimbo.TransitWidget.savedLin
 /// A static feed that is being downloaded.
 struct Download {
   std::string feed;
-  std::uint64_t received = 0;  ///< bytes
+  std::uint64_t received = 0;           ///< bytes
+  std::optional<std::uint64_t> length;  ///< bytes that it has; left out where its server does not say
 };
 
 struct Downloads {

@@ -128,6 +128,14 @@ struct Rendered {
   double scale = 1;
 };
 
+/// The image of an incident of a favorite line, drawn into the memory as `render` does.
+struct ImageParams {
+  std::string incident;     ///< its number in decimal
+  std::uint32_t width = 0;  ///< pixels that there is room for: a wider image is scaled down
+  std::optional<std::uint64_t> offset;
+  std::optional<std::uint64_t> capacity;
+};
+
 struct AdvanceParams {
   double seconds = 0;
 };

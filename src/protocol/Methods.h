@@ -47,6 +47,7 @@ inline constexpr Method<DecodeParams, Handoff> kDecode{"decode"};
 inline constexpr Method<FindLinesParams, FoundLines> kFindLines{"findLines", true};
 inline constexpr Method<DescribeLinesParams, DescribedLines> kDescribeLines{"describeLines", true};
 inline constexpr Method<CheckFeedParams, FeedReport> kCheckFeed{"checkFeed", true};
+inline constexpr Method<ImageParams, Rendered> kImage{"image", true};
 inline constexpr Method<CancelParams> kCancel{"cancel"};
 inline constexpr Method<Nothing> kShutdown{"shutdown"};
 

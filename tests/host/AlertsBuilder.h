@@ -24,6 +24,8 @@ class AlertsBuilder {
     std::int32_t effect = 8;  ///< UNKNOWN_EFFECT
     std::int32_t cause = 1;   ///< UNKNOWN_CAUSE
     std::int32_t severity = 1;
+    std::string image = {};  ///< address of a PNG file
+    std::string imageText = {};
   };
 
   static std::string feed(Date timestamp, const std::vector<Alert>& alerts) {
@@ -54,7 +56,14 @@ class AlertsBuilder {
     body.add_enum(6, alert.cause);
     body.add_enum(7, alert.effect);
     body.add_enum(14, alert.severity);
-    for (const auto& [field, text] : {std::pair{10u, &alert.header}, {11u, &alert.description}}) {
+    if (!alert.image.empty()) {
+      protozero::pbf_writer translated(body, 15);
+      protozero::pbf_writer image(translated, 1);
+      image.add_string(1, alert.image);
+      image.add_string(2, "image/png");
+    }
+    for (const auto& [field, text] :
+         {std::pair{10u, &alert.header}, {11u, &alert.description}, {16u, &alert.imageText}}) {
       if (text->empty()) continue;
       protozero::pbf_writer translated(body, field);
       protozero::pbf_writer(translated, 1).add_string(1, *text);

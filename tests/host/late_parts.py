@@ -43,6 +43,7 @@ def main(cmake, build):
     assert "4 Advisories" in bar.stdout
     drawing = [name for name in LIBRARIES.findall(bar.stderr) if name in ("libpango", "libcairo")]
     assert not drawing, f"a status bar loads {drawing}"
+    assert "libnimbo-images" not in run("status", LD_DEBUG="files").stderr
     assert "4 Advisories" in run("status").stdout
     assert without("libnimbo-drawing.so", "status").returncode != 0
     without("libnimbo-strings.so", "status")

@@ -74,6 +74,10 @@ void FeedCheckView::check(const protocol::CheckFeedParams& feed, Done done) {
     addText(textOfError(*report.error()), "failed");
     done(nullptr);
   });
+  _question->setProgressHandler([label](const protocol::ProgressParams& progress) {
+    const std::string received = textOfReceived(progress.received, progress.length);
+    label->set_text(LocalizedString("Window_Feed_Reading") + (received.empty() ? "" : "\n" + received));
+  });
 }
 
 void FeedCheckView::show(const protocol::FeedReport& report) {

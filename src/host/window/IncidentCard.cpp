@@ -1,8 +1,8 @@
 #include "host/window/IncidentCard.h"
 
 #include <gtkmm/adjustment.h>
-#include <gtkmm/label.h>
 #include <gtkmm/linkbutton.h>
+#include <gtkmm/picture.h>
 #include <gtkmm/scrolledwindow.h>
 
 #include <algorithm>
@@ -10,9 +10,11 @@
 #include "host/FeedAnswers.h"
 #include "host/telling/IncidentWords.h"
 #include "host/window/LineStates.h"
+#include "host/window/Page.h"
 #include "host/window/ShieldImage.h"
 #include "host/window/Texts.h"
 #include "host/window/WidgetTexts.h"
+#include "host/window/WidgetView.h"
 #include "platform/Localization.h"
 #include "platform/Platform.h"
 #include "platform/transit/IncidentStringProvider.h"
@@ -69,6 +71,7 @@ IncidentCard::IncidentCard(const PageContext& context, const TransitIncidents& p
   if (incident.isBlockingIncident()) addSaid(LocalizedString("Window_Incident_Blocking"), "failed");
   addDates(periods);
   addTexts(incident);
+  addImage();
   _box.append(_affectedLines);
   showAffectedLines({});
   if (incident.linkURL()) addLink(*incident.linkURL());
@@ -77,19 +80,41 @@ IncidentCard::IncidentCard(const PageContext& context, const TransitIncidents& p
   setAccessibleDescription(*this, _said);
 }
 
-void IncidentCard::addSaid(const std::string& text, const char* style) {
-  addText(_box, text, style);
+Gtk::Label* IncidentCard::addSaid(const std::string& text, const char* style) {
   if (!text.empty()) _said += (_said.empty() ? "" : "\n") + text;
+  return addText(_box, text, style);
 }
 
-void IncidentCard::addText(Gtk::Box& box, const std::string& text, const char* style) {
-  if (text.empty()) return;
+Gtk::Label* IncidentCard::addText(Gtk::Box& box, const std::string& text, const char* style) {
+  if (text.empty()) return nullptr;
   auto* label = Gtk::make_managed<Gtk::Label>(text);
   label->set_wrap();
   label->set_wrap_mode(Pango::WrapMode::WORD_CHAR);
   alignByDirection(*label);
   label->add_css_class(style);
   box.append(*label);
+  return label;
+}
+
+void IncidentCard::addImage() {
+  const protocol::LineIncident* known = incidentNumbered(_context.lines, _incident->muid());
+  if (!known) return;
+  const std::string text = known->imageText.value_or("");
+  Gtk::Label* const label = addSaid(text, "item-text");
+  if (!known->hasImage) return;
+  auto* place = Gtk::make_managed<Gtk::Box>();
+  _box.append(*place);
+  const std::string name = text.empty() ? IncidentStringProvider::cellTitleForIncident(_incident.get()) : text;
+  const int width = Column::kLargestWidth * get_scale_factor();
+  _image = _context.images->ask(known->id, width, [place, label, name](const auto& image) {
+    if (!image) return;
+    auto* picture = Gtk::make_managed<Gtk::Picture>(textureOf(image));
+    picture->set_can_shrink();
+    picture->set_halign(Gtk::Align::START);
+    setAccessibleLabel(*picture, name);
+    place->append(*picture);
+    if (label) label->hide();
+  });
 }
 
 void IncidentCard::addMarks() {
@@ -133,10 +158,11 @@ void IncidentCard::showAsOf(const LinesByNumber& lines) {
     if (line == lines.end() || !line->second->identifier()->locator()) continue;
     const auto date = _context.asOf.find(line->second->identifier()->locator()->feed);
     if (date == _context.asOf.end()) continue;
-    return addText(_asOf,
-                   LocalizedFormat(LocalizedString("Window_Incident_Updated"),
-                                   {DateText(_context.preferences.locale()).textOf(date->second)}),
-                   "item-caption");
+    addText(_asOf,
+            LocalizedFormat(LocalizedString("Window_Incident_Updated"),
+                            {DateText(_context.preferences.locale()).textOf(date->second)}),
+            "item-caption");
+    return;
   }
 }
 

@@ -1,6 +1,7 @@
 #pragma once
 
 #include <gtkmm/box.h>
+#include <gtkmm/label.h>
 #include <gtkmm/listbox.h>
 #include <gtkmm/listboxrow.h>
 
@@ -32,12 +33,14 @@ class IncidentCard final : public Gtk::ListBoxRow {
   std::string id() const { return std::to_string(_incident->muid()); }
 
  private:
-  static void addText(Gtk::Box& box, const std::string& text, const char* style);
+  static Gtk::Label* addText(Gtk::Box& box, const std::string& text, const char* style);
   /// Adds a text of the incident, which is also said to a screen reader.
-  void addSaid(const std::string& text, const char* style);
+  Gtk::Label* addSaid(const std::string& text, const char* style);
   /// Says how grave it is, its effect and its cause, where the widget told that.
   void addMarks();
   void addTexts(const TransitIncident& incident);
+  /// Shows the text of the image until the image itself has come, and where none comes.
+  void addImage();
   void addDates(const TransitIncidents& periods);
   void addLink(const std::string& url);
 
@@ -49,6 +52,7 @@ class IncidentCard final : public Gtk::ListBoxRow {
   Gtk::Box _box{Gtk::Orientation::VERTICAL, 6};
   Gtk::Box _affectedLines{Gtk::Orientation::VERTICAL, 4};
   Gtk::Box _asOf;
+  std::shared_ptr<IncidentImages::Request> _image;
 };
 
 /// A card for each of some incidents, those that are in force first. What they affect is looked up in the feeds by and

@@ -110,7 +110,7 @@ LinePage::LinePage(const PageContext& context, const protocol::LineReport& line,
   addHeader(context, artworkOf(line.shield), nameBesideShield(line), line.agency.value_or(""),
             Gtk::make_managed<FavoriteStar>(context, line.muid, nullptr, line.name));
   addText(textOfState(line), styleOfState(line.state));
-  if (line.reason) addText(line.reason->reason, "item-caption");
+  if (line.reason) addText(detailOfError(*errorOf(*line.reason)), "item-caption");
   content().append(*Gtk::make_managed<IncidentCards>(context, incidentsOf(line.incidents, lines), line.muid));
   if (!line.planned.empty()) {
     addText(LocalizedString("Window_Planned_Title"), "item-heading");

@@ -85,6 +85,7 @@ MainWindow::MainWindow(const CommandContext& command, HostPlatform& platform, De
       _widgetPage(new WidgetPage(_context)),
       _pages(std::unique_ptr<Page>(_widgetPage)) {
   _context.process = &_widgetPage->process();
+  _context.images = &_widgetPage->images();
   const auto [width, height] = preferences.windowSize();
   set_default_size(width, height);
   set_icon_name("org.nimbo.Transit");

@@ -6,12 +6,6 @@
 
 namespace nimbo {
 
-namespace {
-
-constexpr int kLargestWidth = 600;
-
-}  // namespace
-
 Column::Column(Gtk::Widget& child) : _child(child) { _child.set_parent(*this); }
 
 Column::~Column() { _child.unparent(); }

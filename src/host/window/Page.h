@@ -18,6 +18,9 @@ class Column final : public Gtk::Widget {
   explicit Column(Gtk::Widget& child);
   ~Column() override;
 
+  /// Points.
+  static constexpr int kLargestWidth = 600;
+
  protected:
   Gtk::SizeRequestMode get_request_mode_vfunc() const override { return Gtk::SizeRequestMode::HEIGHT_FOR_WIDTH; }
   void measure_vfunc(Gtk::Orientation orientation, int forSize, int& minimum, int& natural, int& minimumBaseline,

@@ -9,6 +9,7 @@
 #include "host/HostPlatform.h"
 #include "host/WidgetHostProcess.h"
 #include "host/window/DesktopPreferences.h"
+#include "host/window/IncidentImages.h"
 #include "host/window/OpenRequest.h"
 #include "platform/foundation/Date.h"
 #include "protocol/Lines.h"
@@ -42,6 +43,8 @@ struct PageContext {
   protocol::Lines& lines;
   /// Whom to ask about feeds. The widget screen's; null until that is made.
   WidgetHostProcess* process = nullptr;
+  /// Whom to ask for images, in the same way.
+  IncidentImages* images = nullptr;
 
   FeedConfiguration feeds() const { return FeedConfiguration(command.paths.config); }
 };

@@ -155,6 +155,15 @@ const char* keyOfError(const Error& error) {
 
 }  // namespace
 
+std::string textOfReceived(std::uint64_t received, std::optional<std::uint64_t> length) {
+  constexpr std::uint64_t kMiB = 1 << 20;
+  if (received < kMiB) return {};
+  if (!length) return LocalizedFormat(LocalizedString("Window_Received"), {received / kMiB});
+  return LocalizedFormat(LocalizedString("Window_ReceivedOf"), {received / kMiB, (*length + kMiB - 1) / kMiB});
+}
+
+std::string detailOfError(const Error& error) { return keyOfError(error) ? std::string() : error.reason(); }
+
 std::string textOfError(const Error& error) {
   writeLog({kDefaultLogSubsystem, "Window"}, LogLevel::info, "%{private}@", {error.reason()});
   const char* key = keyOfError(error);

@@ -24,9 +24,15 @@ std::string systemNameOfLine(const TransitLine& line);
 /// the description does not say that too.
 std::vector<std::string> textsBelowTitle(const TransitIncident& incident);
 
+/// How many bytes have come, of how many where that is known; empty below a MiB.
+std::string textOfReceived(std::uint64_t received, std::optional<std::uint64_t> length);
+
 /// What failed and what to do about it, in the user's language; the error's own reason, which tells developers more, is
 /// logged. Main thread.
 std::string textOfError(const Error& error);
+
+/// The error's own reason where that says more than `textOfError`, which has no words for it; else empty.
+std::string detailOfError(const Error& error);
 
 /// How a line runs, in the user's language: good service, how many incidents, or why nobody knows. Main thread.
 std::string textOfState(const protocol::LineReport& line);

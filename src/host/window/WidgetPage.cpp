@@ -89,6 +89,7 @@ WidgetPage::WidgetPage(const PageContext& context)
 
 WidgetPage::~WidgetPage() {
   for (sigc::connection& connection : _connections) connection.disconnect();
+  if (_downloadTimer) _downloadTimer->invalidate();
 }
 
 void WidgetPage::buildGone() {
@@ -146,9 +147,12 @@ void WidgetPage::buildCard() {
 
   _card.add_css_class("card");
   _card.set_overflow(Gtk::Overflow::HIDDEN);
-  for (Gtk::Widget* child :
-       {static_cast<Gtk::Widget*>(header), static_cast<Gtk::Widget*>(&_failure), static_cast<Gtk::Widget*>(&_waiting),
-        static_cast<Gtk::Widget*>(&_view), static_cast<Gtk::Widget*>(&_gone)})
+  _downloadText.set_xalign(0);
+  _downloadText.add_css_class("notice");
+  _downloadText.hide();
+  for (Gtk::Widget* child : {static_cast<Gtk::Widget*>(header), static_cast<Gtk::Widget*>(&_downloadText),
+                             static_cast<Gtk::Widget*>(&_failure), static_cast<Gtk::Widget*>(&_waiting),
+                             static_cast<Gtk::Widget*>(&_view), static_cast<Gtk::Widget*>(&_gone)})
     _card.append(*child);
   content().append(_card);
   showExpandButton();
@@ -327,7 +331,7 @@ void WidgetPage::widgetDidChange(const protocol::Snapshot& snapshot, const proto
   _view.setContent(content);
   _waiting.hide();
   if (content->failure)
-    showFailure(textOfFailedFetch(*content), content->failure->reason());
+    showFailure(textOfFailedFetch(*content), detailOfError(*content->failure));
   else
     _failure.hide();
   showLines(content->lines, content->failure ? std::nullopt : content->updated);
@@ -339,6 +343,7 @@ void WidgetPage::widgetDidChange(const protocol::Snapshot& snapshot, const proto
 void WidgetPage::showFailure(const std::string& text, const std::string& detail) {
   if (_failureReason.get_text().raw() != text) _failureReason.set_text(text);
   if (_failureDetail.get_text().raw() != detail) _failureDetail.set_text(detail);
+  _failureDetail.set_visible(!detail.empty());
   _failure.show();
 }
 
@@ -366,7 +371,26 @@ void WidgetPage::widgetDidFail(WidgetHostProcess::Failure failure, const std::st
 
 void WidgetPage::widgetTells(const std::string& message) { _context.navigator.tell(message); }
 
-void WidgetPage::widgetIsUpdating(bool updating) { _updating.set_spinning(updating); }
+void WidgetPage::widgetIsUpdating(bool updating) {
+  _updating.set_spinning(updating);
+  if (_downloadTimer) std::exchange(_downloadTimer, nullptr)->invalidate();
+  _downloadQuestion = nullptr;
+  _downloadText.hide();
+  if (updating) _downloadTimer = _context.command.runLoop.scheduleTimer(1, true, [this](Timer&) { showDownload(); });
+}
+
+void WidgetPage::showDownload() {
+  _downloadQuestion = _process.ask(protocol::kDownloads, {}, [this](const Outcome<protocol::Downloads>& downloads) {
+    std::string text;
+    if (downloads && !downloads->downloads.empty()) {
+      const protocol::Download& first = downloads->downloads.front();
+      text = textOfReceived(first.received, first.length);
+      if (!text.empty()) text = CommaDelimitedList({first.feed, text});
+    }
+    _downloadText.set_text(text);
+    _downloadText.set_visible(!text.empty());
+  });
+}
 
 bool WidgetPage::widgetOpens(const WidgetClient::Opening& opening) {
   const auto request = [&]() -> Outcome<OpenRequest> {

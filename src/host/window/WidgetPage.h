@@ -23,6 +23,7 @@ class WidgetPage final : public Page, private WidgetHostProcess::Delegate {
   /// Fetches now.
   void update() { _process.update(); }
   WidgetHostProcess& process() { return _process; }
+  IncidentImages& images() { return _images; }
 
   /// Gives what is known of the favourite lines: by the last fetch, else once one has ended.
   void withLines(std::function<void(const protocol::Lines&)> completion);
@@ -42,15 +43,20 @@ class WidgetPage final : public Page, private WidgetHostProcess::Delegate {
   void watchVisibility();
   void updateVisibility();
   void toggleExpanded();
+  /// Says how far a static feed is that an update waits for.
+  void showDownload();
   void showExpandButton();
   WidgetPresentation presentation() const;
 
   /// What to do about the failure that is told of.
   void tryAgain();
-  /// `detail` is for whoever is told of the failure.
+  /// `detail` is for whoever is told of the failure; may be empty.
   void showFailure(const std::string& text, const std::string& detail);
 
   const PictureMemory& newPictureMemory() override { return _pictures.emplace(); }
+  std::optional<protocol::RenderParams> roomForPicture() override {
+    return protocol::RenderParams{.capacity = PictureMemory::kImageOffset};
+  }
   bool widgetDrew(const protocol::Rendered& picture) override;
   bool wantsLines() const override { return true; }
   void widgetDidChange(const protocol::Snapshot& snapshot, const protocol::Lines& lines) override;
@@ -65,6 +71,7 @@ class WidgetPage final : public Page, private WidgetHostProcess::Delegate {
   std::optional<PictureMemory> _pictures;         // of the process that runs
   std::shared_ptr<const WidgetPicture> _picture;  // drawn last
   WidgetHostProcess _process;
+  IncidentImages _images{_process, _pictures};
   WidgetContentRef _content;
   bool _wantsExpanded;
   bool _processFailed = false;  // not started again by itself
@@ -72,6 +79,8 @@ class WidgetPage final : public Page, private WidgetHostProcess::Delegate {
 
   Gtk::Box _card{Gtk::Orientation::VERTICAL};
   Gtk::Spinner _updating;
+  Gtk::Label _downloadText;
+  std::shared_ptr<Timer> _downloadTimer;  // while an update runs
   Gtk::Button _expand;
   WidgetView _view;
   Gtk::Spinner _waiting;
@@ -87,7 +96,7 @@ class WidgetPage final : public Page, private WidgetHostProcess::Delegate {
   Teller _teller;
   std::shared_ptr<WidgetHostProcess::Question> _seenQuestion;
   Gtk::ListBox _places;
-  std::shared_ptr<WidgetHostProcess::Question> _linesQuestion;
+  std::shared_ptr<WidgetHostProcess::Question> _linesQuestion, _downloadQuestion;
   std::vector<sigc::connection> _connections;
   std::shared_ptr<bool> _alive = std::make_shared<bool>(true);
 };

@@ -17,7 +17,8 @@ namespace {
 
 constexpr double kAnimationSeconds = 0.25;
 
-/// The picture's own memory as a texture.
+}  // namespace
+
 Glib::RefPtr<Gdk::Texture> textureOf(const std::shared_ptr<const WidgetPicture>& picture) {
   const auto keep = new std::shared_ptr<const WidgetPicture>(picture);
   GBytes* bytes = g_bytes_new_with_free_func(
@@ -29,8 +30,6 @@ Glib::RefPtr<Gdk::Texture> textureOf(const std::shared_ptr<const WidgetPicture>&
   return Gdk::MemoryTexture::create(layout.width, layout.height, format, Glib::wrap(bytes),
                                     static_cast<gsize>(layout.stride));
 }
-
-}  // namespace
 
 WidgetView::WidgetView() {
   add_css_class("widget-view");

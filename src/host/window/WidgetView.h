@@ -10,6 +10,9 @@
 
 namespace nimbo {
 
+/// The picture's own memory as a texture.
+Glib::RefPtr<Gdk::Texture> textureOf(const std::shared_ptr<const WidgetPicture>& picture);
+
 /// The widget on the screen: its picture, and over each row a button that draws only the focus, so that keyboard and
 /// screen reader reach the rows. Takes another height in an animation, where the desktop wants any.
 class WidgetView final : public Gtk::Widget {

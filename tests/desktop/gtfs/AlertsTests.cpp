@@ -247,6 +247,32 @@ TEST(Alert, TextsComeFromWhatThereIs) {
   }
 }
 
+TEST(Alert, ImageIsOfTheBestLanguageAndOfAKindThatIsShown) {
+  const auto localized = [](const std::string& url, const std::string& kind, const std::string& language) {
+    return "localized_image { url: '" + url + "' media_type: '" + kind + "' language: '" + language + "' } ";
+  };
+  const std::string text =
+      "image_alternative_text { translation { text: 'Map' } translation { text: 'Plan' language: 'de' } }";
+  const std::string en = localized("https://a/en", "image/png", "en"),
+                    de = localized(" https://a/de", "IMAGE/JPEG ", "de");
+  const struct {
+    std::string images;
+    std::optional<std::string> address;
+  } cases[] = {{en + de, "https://a/de"},
+               {de + en, "https://a/de"},
+               {en + localized("https://a/de", "image/svg+xml", "de"), "https://a/en"},
+               {localized("https://a/de", "image/webp", "de"), {}},
+               {localized("file:///etc/passwd", "image/png", "de"), {}},
+               {"", {}}};
+  for (const auto& [images, address] : cases) {
+    transit_realtime::Alert message;
+    ASSERT_TRUE(google::protobuf::TextFormat::ParseFromString("image { " + images + "} " + text, &message));
+    const AlertImage image = alertImageIn(message.SerializeAsString(), {"de", ""});
+    EXPECT_EQ(image.address, address) << images;
+    EXPECT_EQ(image.text, "Plan");
+  }
+}
+
 TEST(Alert, SummaryLeavesOutATitleThatStandsByItself) {
   const struct {
     const char *title, *description, *summary;

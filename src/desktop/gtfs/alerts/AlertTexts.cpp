@@ -131,7 +131,55 @@ bool isWebAddress(std::string_view text) {
          text.find_first_of(" \n\"<>") == std::string_view::npos && !text.ends_with("…");  // cut, it leads elsewhere
 }
 
+/// A localized image as a translation whose text is its address; empty for one of another kind than are shown.
+Translation readLocalizedImage(std::string_view body) {
+  Translation result;
+  std::string kind;
+  for (auto image = messageIn<LocalizedImageField>(body); image.next();) {
+    switch (image.tag()) {
+      case LocalizedImageField::url:
+        result.text = trimmed(takeView(image));
+        break;
+      case LocalizedImageField::mediaType:
+        kind = asciiLowerCase(trimmed(takeView(image)));
+        break;
+      case LocalizedImageField::language:
+        result.language = takeView(image);
+        break;
+      default:
+        image.skip();
+    }
+  }
+  const bool isShown = kind == "image/png" || kind == "image/jpeg" || kind == "image/jpg";
+  return isShown && result.text.size() <= kLongestAddress && isWebAddress(result.text) ? result : Translation();
+}
+
+std::vector<Translation> imagesIn(std::string_view alert) {
+  constexpr std::size_t kMostImages = 1000;
+  std::vector<Translation> images;
+  auto message = messageIn<AlertField>(alert);
+  while (images.size() < kMostImages && message.next(AlertField::image)) {
+    auto all = messageIn<TranslatedImageField>(takeView(message));
+    try {
+      while (images.size() < kMostImages && all.next(TranslatedImageField::localizedImage))
+        images.push_back(readLocalizedImage(takeView(all)));
+    } catch (const protozero::exception&) {
+      continue;
+    }
+  }
+  return images;
+}
+
 }  // namespace
+
+AlertImage alertImageIn(std::string_view alert, const LanguagePreference& preference) {
+  AlertImage image;
+  if (const std::string_view address = chooseTranslation(imagesIn(alert), preference); !address.empty())
+    image.address = address;
+  if (std::string text = textIn(alert, AlertField::imageAlternativeText, preference, kLongestTitle); !text.empty())
+    image.text = std::move(text);
+  return image;
+}
 
 std::string summaryOfText(std::string_view text) {
   std::string paragraph(firstLine(text));

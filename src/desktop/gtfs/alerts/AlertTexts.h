@@ -23,6 +23,18 @@ struct AlertTexts {
   bool operator==(const AlertTexts&) const = default;
 };
 
+/// The image of an alert. Either may be absent.
+struct AlertImage {
+  std::optional<std::string> address;  ///< http or https, of a PNG or JPEG file as its publisher says
+  std::optional<std::string> text;     ///< plain; says the same, also where the image is of another kind
+
+  bool operator==(const AlertImage&) const = default;
+};
+
+/// The image of an Alert message and its text, each in the best of its languages. Throws protozero::exception for
+/// damaged bytes.
+AlertImage alertImageIn(std::string_view alert, const LanguagePreference& preference);
+
 /// The texts of an Alert message in the best of its languages. The title is its header, else the first line of its
 /// description, else the detail of its effect, else the words of its effect. Absent when it says nothing at all.
 /// Throws protozero::exception for damaged bytes.

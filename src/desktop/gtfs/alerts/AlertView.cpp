@@ -60,6 +60,11 @@ bool readField(protozero::pbf_message<AlertField>& message, std::string_view ale
     case AlertField::severityLevel:
       view.severity = severityOf(takeNumber(message));
       break;
+    case AlertField::image:
+    case AlertField::imageAlternativeText:
+      view.hasImage = true;
+      message.skip();
+      break;
     default:
       message.skip();
   }

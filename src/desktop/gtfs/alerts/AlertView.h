@@ -40,6 +40,7 @@ struct AlertView {
   AlertContent content;
   std::size_t selectors = 0;
   std::int32_t severity = kUnknownSeverity;  ///< one of those that are known
+  bool hasImage = false;                     ///< or the text of one
   bool isDamaged = false;                    ///< it breaks off, or one of its selectors does
 
   /// Whether the alert changes nothing for most riders: it has no effect or is about accessibility, and is not severe,

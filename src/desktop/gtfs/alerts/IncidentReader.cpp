@@ -8,7 +8,6 @@
 #include <unordered_set>
 
 #include "desktop/gtfs/alerts/AlertPeriods.h"
-#include "desktop/gtfs/alerts/AlertTexts.h"
 #include "desktop/gtfs/alerts/AlertView.h"
 #include "desktop/gtfs/feeds/FeedMuid.h"
 #include "desktop/gtfs/feeds/TransitLineServiceError.h"
@@ -25,6 +24,7 @@ constexpr std::size_t kMostIncidents = 5000;     // whole countries have fewer; 
 struct Incident {
   std::string key;  // the least of its alerts
   AlertTexts texts;
+  AlertImage image;
   AlertEffect effect;
   std::int32_t cause;
   std::int32_t severity;  // the greatest of its alerts
@@ -285,10 +285,12 @@ class IncidentBuilder {
         _incidents.size());
     if (isNew)
       _incidents.push_back(
-          {keyOf(alert), *texts, content.effect, content.cause, view.severity, AlertConcern::none, {}});
+          {keyOf(alert), *texts, {}, content.effect, content.cause, view.severity, AlertConcern::none, {}});
     Incident& incident = _incidents[place->second];
     const std::string detail = content.effectDetail.empty() ? std::string() : effectDetailIn(view.body);
     incident.concern = std::max(incident.concern, concernOf(content.effect, detail));
+    // Of alerts that say the same the first one that has an image shows it.
+    if (view.hasImage && incident.image == AlertImage()) incident.image = alertImageIn(view.body, _query.language);
     known->second = place->second;
     _sizesOfContents.insert(content.sizeHash());
     return place->second;
@@ -320,6 +322,7 @@ class IncidentBuilder {
     fields.severity = incident.severity;
     fields.concern =
         incident.severity == kSeveritySevere ? std::max(incident.concern, AlertConcern::other) : incident.concern;
+    fields.image = incident.image;
     for (const auto& [place, onLine] : incident.lines)
       fields.affectedEntities.push_back(std::make_shared<const BasicAffectedEntity>(_query.lines[place].muid));
     const auto shared = std::make_shared<const AlertIncident::Fields>(std::move(fields));

@@ -6,6 +6,7 @@
 #include <vector>
 
 #include "desktop/gtfs/alerts/AlertConcern.h"
+#include "desktop/gtfs/alerts/AlertTexts.h"
 #include "desktop/gtfs/alerts/AlertsFeed.h"
 #include "desktop/gtfs/alerts/RealtimeFields.h"
 #include "desktop/gtfs/alerts/SelectorMatcher.h"
@@ -25,6 +26,7 @@ class AlertIncident final : public FieldsTransitIncident {
     std::int32_t severity = kUnknownSeverity;
     /// Never none where it is severe.
     AlertConcern concern = AlertConcern::other;
+    AlertImage image;
   };
 
   /// `alert` is not null; its dates and its blocking flag play no part.

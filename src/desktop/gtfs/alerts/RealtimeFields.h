@@ -29,6 +29,8 @@ enum class AlertField : std::uint32_t {
   headerText = 10,
   descriptionText = 11,
   severityLevel = 14,
+  image = 15,
+  imageAlternativeText = 16,
   effectDetail = 18,
 };
 
@@ -48,6 +50,10 @@ enum class TripDescriptorField : std::uint32_t { tripID = 1, routeID = 5 };
 enum class TranslatedStringField : std::uint32_t { translation = 1 };
 
 enum class TranslationField : std::uint32_t { text = 1, language = 2 };
+
+enum class TranslatedImageField : std::uint32_t { localizedImage = 1 };
+
+enum class LocalizedImageField : std::uint32_t { url = 1, mediaType = 2, language = 3 };
 
 /// Alert.Effect.
 enum class AlertEffect : std::int32_t {

@@ -61,7 +61,7 @@ struct FeedCheckReport {
 /// checks.
 struct FeedCheckProgress {
   std::function<void()> beginsAlerts;
-  std::function<void(std::size_t bytes)> receives;
+  std::function<void(std::uint64_t received, std::optional<std::uint64_t> length)> receives;
 };
 
 /// Reads both halves of a feed from their sources, whatever the cache holds, and checks them. Blocks its thread.

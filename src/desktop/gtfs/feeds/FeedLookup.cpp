@@ -63,9 +63,10 @@ class HeldObjects {
     return {incident.muid(), incident.startDate(), incident.isBlockingIncident()};
   }
   /// What records leave out.
-  static std::tuple<AlertEffect, std::int32_t, std::int32_t, AlertConcern> kindOf(const TransitIncidentRef& incident) {
+  static std::tuple<AlertEffect, std::int32_t, std::int32_t, AlertConcern, AlertImage> kindOf(
+      const TransitIncidentRef& incident) {
     const AlertIncident::Fields& fields = static_cast<const AlertIncident&>(*incident).fields();
-    return {fields.effect, fields.cause, fields.severity, fields.concern};
+    return {fields.effect, fields.cause, fields.severity, fields.concern, fields.image};
   }
   static Bytes recordOf(const TransitIncidentRef& incident) {
     return StoredTransitIncident::initWithIncident(incident)->data();

@@ -53,6 +53,7 @@ struct Transfer {
   std::size_t takePiece(std::string_view piece) {
     if (!hasDocument()) return piece.size();  // the page of a redirect or an error
     bool isTaken = false;
+    if (received == 0 && isPlain()) tellLength();
     if (isPlain()) {
       isTaken = keep(piece);
     } else if (isGzip()) {
@@ -60,6 +61,12 @@ struct Transfer {
       isTaken = packed->take(piece, [this](std::string_view unpacked) { return keep(unpacked); });
     }
     return isTaken ? piece.size() : 0;
+  }
+
+  void tellLength() const {
+    curl_off_t length = -1;
+    curl_easy_getinfo(handle, CURLINFO_CONTENT_LENGTH_DOWNLOAD_T, &length);
+    if (length > 0 && request.onLength) request.onLength(static_cast<std::uint64_t>(length));
   }
 
   bool keep(std::string_view piece) {

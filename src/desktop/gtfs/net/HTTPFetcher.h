@@ -33,6 +33,8 @@ struct HTTPRequest {
   std::uint64_t limit;             ///< bytes, unpacked
   std::chrono::seconds timeLimit;  ///< for everything, redirects too
   HTTPWishes* wishes = nullptr;    ///< set by whatever answer came last, also one that is an error; null: not needed
+  /// Hears how long the document is before its first piece comes, where the server says so.
+  std::function<void(std::uint64_t bytes)> onLength = {};
 };
 
 /// What a server answered.

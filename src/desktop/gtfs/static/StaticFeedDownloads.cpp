@@ -42,7 +42,7 @@ void writeAttempts(const std::filesystem::path& path, int count) {
   if (const ErrorRef error = writeFileAtomically(path, text)) logCacheFailure(error->reason());
 }
 
-ErrorRef downloading(const std::string& feed, std::size_t received) {
+ErrorRef downloading(const std::string& feed, std::uint64_t received) {
   const std::string size = std::to_string(received >> 20) + " MiB";
   return transitLineServiceError(TransitLineServiceError::downloading,
                                  "The static feed of \"" + feed + "\" is still being downloaded: " + size +
@@ -62,8 +62,9 @@ struct StaticFeedDownloads::Download {
   std::mutex lock;
   std::condition_variable_any changed;
   std::optional<Outcome<LoadedStaticFeed>> result;
-  std::size_t received = 0;  // bytes
-  std::jthread thread;       // last: it ends before the rest goes
+  std::uint64_t received = 0;           // bytes
+  std::optional<std::uint64_t> length;  // bytes, where the server says
+  std::jthread thread;                  // last: it ends before the rest goes
 };
 
 void StaticFeedDownloads::Download::run(const StaticFeedStore& store, const FeedCache& cache,
@@ -73,9 +74,10 @@ void StaticFeedDownloads::Download::run(const StaticFeedStore& store, const Feed
     // It counts as one in vain until it is over: the process may end before.
     const std::filesystem::path attempts = cache.attempts(feed.name);
     if (isHeld) writeAttempts(attempts, readAttempts(attempts).count + 1);
-    outcome = store.load(feed, stop, [this](std::size_t bytes) {
+    outcome = store.load(feed, stop, [this](std::uint64_t bytes, std::optional<std::uint64_t> all) {
       const std::lock_guard guard(lock);
-      received += bytes;
+      received = bytes;
+      length = all;
     });
     if (const auto now = store.held(feed, stop); now && !now->isDue) {
       std::error_code ignored;
@@ -165,7 +167,7 @@ std::vector<StaticFeedDownloads::Progress> StaticFeedDownloads::underWay() const
   std::vector<Progress> all;
   for (const auto& [name, download] : _downloads) {
     const std::lock_guard downloadGuard(download->lock);
-    if (!download->result) all.push_back({name, download->received});
+    if (!download->result) all.push_back({name, download->received, download->length});
   }
   return all;
 }

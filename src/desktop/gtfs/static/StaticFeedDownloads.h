@@ -27,7 +27,8 @@ class StaticFeedDownloads {
   /// A download that has not ended.
   struct Progress {
     std::string feed;
-    std::size_t received = 0;  ///< bytes
+    std::uint64_t received = 0;                ///< bytes
+    std::optional<std::uint64_t> length = {};  ///< bytes that it has; absent where its server does not say
   };
   /// The downloads under way, of feeds that were here before too.
   std::vector<Progress> underWay() const;

@@ -185,9 +185,14 @@ Outcome<std::optional<FreshStaticFeed>> StaticFeedStore::fetchFrom(const Feed& f
   const FileDescriptor file = temporaryFile(_cache.folder());
   if (!file) return fileError("write in", _cache.folder(), errno);
   std::string beginning;
-  const HTTPRequest request{address, validators, kLargestDownload, kDownloadTimeLimit};
+  std::uint64_t received = 0;
+  std::optional<std::uint64_t> length;
+  const HTTPRequest request{address,          validators,
+                            kLargestDownload, kDownloadTimeLimit,
+                            nullptr,          [&length](std::uint64_t bytes) { length = bytes; }};
   const auto answer = HTTPFetcher::fetch(request, stop, [&](std::string_view piece) {
-    if (progress) progress(piece.size());
+    received += piece.size();
+    if (progress) progress(received, length);
     if (beginning.size() < kTellingBytes) beginning += piece.substr(0, kTellingBytes);
     return writeAll(file, piece);
   });

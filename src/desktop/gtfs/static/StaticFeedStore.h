@@ -29,8 +29,8 @@ class StaticFeedStore {
  public:
   explicit StaticFeedStore(FeedCache cache) : _cache(std::move(cache)) {}
 
-  /// Hears of bytes as they come. Called on the thread that loads.
-  using Progress = std::function<void(std::size_t bytes)>;
+  /// Hears how many bytes have come of how many; absent where the server does not say. Called on the thread that loads.
+  using Progress = std::function<void(std::uint64_t received, std::optional<std::uint64_t> length)>;
 
   /// From the cache where that is as good as the source. A remote source that does not answer costs nothing but time
   /// while the cache has an older state. `stop` also ends a reading of the trips that comes later.
