@@ -42,9 +42,9 @@ class Session(ExitStack):
         return process
 
 
-def wait(what, condition):
+def wait_for(condition, seconds):
     """The condition's first answer that is true; asked again whenever something happens, and every 20 ms."""
-    deadline, context = time.monotonic() + PATIENCE, GLib.MainContext.default()
+    deadline, context = time.monotonic() + seconds, GLib.MainContext.default()
     while time.monotonic() < deadline:
         try:
             if answer := condition():
@@ -53,6 +53,11 @@ def wait(what, condition):
             pass  # what was looked at is gone
         GLib.timeout_add(20, lambda: False)
         context.iteration(True)
+
+
+def wait(what, condition):
+    if answer := wait_for(condition, PATIENCE):
+        return answer
     raise AssertionError(f"waited in vain: {what}")
 
 
@@ -118,6 +123,17 @@ class Window:
         # Until it stands still.
         wait(f"rest of {name}", lambda: places.append(wait(name, place)) or places[-3:].count(places[-1]) == 3)
         press("mousemove", *map(str, places[-1]), "click", "1")
+
+    def drag(self, name, target, done, role="list item"):
+        """Drags a row onto another one, anew while the display was too slow for the pointer."""
+        def is_done():
+            source, place = self.box(name, role), self.box(target, role)
+            for step in range(9):
+                press("mousemove", str(source.x + 90), str(source.y + 30 + (place.y - source.y) * step // 8),
+                      *(["mousedown", "1"] if step == 0 else []))
+            press("mouseup", "1")
+            return wait_for(done, 2)
+        wait(f"{name} on {target}", is_done)
 
     def comes_to_front(self):
         """There is no window manager that would raise a window and give it the keyboard."""

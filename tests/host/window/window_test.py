@@ -19,6 +19,7 @@ import time
 import types
 import urllib.parse
 import zipfile
+import zlib
 
 from window_session import PATIENCE, Session, Window, press, wait
 
@@ -38,17 +39,26 @@ def message(*fields):
     return b"".join(encoded(number, value) for number, value in fields)
 
 
-def publish(folder, headers):
-    """Writes a city's feed, with an alert for line 1 under each header."""
+def publish(folder, headers, image=None):
+    """Writes a city's feed, with an alert for line 1 under each header, and an image at this address."""
     os.makedirs(folder, exist_ok=True)
     tables = {"agency.txt": "agency_id,agency_name,agency_url,agency_timezone\nM,Metro,https://example.org,UTC\n",
               "routes.txt": "route_id,agency_id,route_short_name,route_long_name,route_type,route_color\n"
                             "m1,M,1,Harbour Line,1,005599\nm2,M,2,Castle Line,1,CC0000\nm3,M,3,Ring,1,\n"}
     for name, table in tables.items():
         pathlib.Path(folder, name).write_text(table)
-    alerts = [(2, message((1, header), (5, message((5, message((2, "m1"))), (10, message((1, message((1, header)))))))))
+    shown = [(15, message((1, message((1, image), (2, "image/png"))))), (16, message((1, message((1, "A map")))))] if image else []
+    alerts = [(2, message((1, header), (5, message((5, message((2, "m1"))), (10, message((1, message((1, header))))), *shown))))
               for header in headers]
     pathlib.Path(folder, "alerts.pb").write_bytes(message((1, message((1, "2.0"), (3, int(time.time())))), *alerts))
+
+
+def chunk(kind, data):
+    return len(data).to_bytes(4, "big") + kind + data + zlib.crc32(kind + data).to_bytes(4, "big")
+
+
+PNG = (b"\x89PNG\r\n\x1a\n" + chunk(b"IHDR", b"\0\0\0\x40\0\0\0\x20\x08\x02\0\0\0")
+       + chunk(b"IDAT", zlib.compress((b"\0" + b"\0\0\xff" * 64) * 32)) + chunk(b"IEND", b""))
 
 
 def open_url(url):
@@ -104,8 +114,17 @@ def tour(session, folder):
         window.click("Search", "entry")
     press("key", "Escape")
     window.click("Move 1, Harbour Line up")
-    wait("the new order", lambda: [node.get_name() for node in window.nodes() if node.get_role_name() == "list item"]
-         [:2] == ["1, Harbour Line, Metro", "2, Castle Line, Metro"])
+
+    def is_order(*lines):
+        return lambda: [node.get_name()[:1] for node in window.nodes() if node.get_role_name() == "list item"][:2] == [*lines]
+    wait("the new order", is_order("1", "2"))
+    window.drag("2, Castle Line, Metro", "1, Harbour Line, Metro", is_order("2", "1"))
+    window.click("Remove 2, Castle Line from favorites")
+    wait("one favorite", lambda: not window.find("Move 2, Castle Line"))
+    window.click("Undo")
+    wait("the old place", is_order("2", "1"))
+    window.click("Move 1, Harbour Line up")
+    wait("the new order again", is_order("1", "2"))
     window.click("Search", "entry")
     press("key", "Escape")
 
@@ -211,7 +230,9 @@ def tour(session, folder):
             window.click(entry, "text")
             press("type", address)
         press("key", "Return")
-        window.see("Reading the feed")
+        connection = silent.accept()[0]
+        connection.sendall(b"HTTP/1.1 200 OK\r\nContent-Length: 12582912\r\n\r\n" + bytes(3 << 20))
+        window.see("Reading the feed…\n3 of 12 MiB received")
         press("key", "Escape")
         window.see_page("Nimbo Transit")
         window.quit()
@@ -221,6 +242,7 @@ def catalog(session, folder):
     """From nothing to the state of an agency's line, with its name and a key alone."""
     city, asked = os.path.join(folder, "city"), []
     publish(city, ["Signals fail"])
+    pathlib.Path(city, "map.png").write_bytes(PNG)
     with zipfile.ZipFile(city + "/city.zip", "w") as archive:
         for name in "agency.txt", "routes.txt":
             archive.write(os.path.join(city, name), name)
@@ -228,10 +250,13 @@ def catalog(session, folder):
     class Agency(http.server.BaseHTTPRequestHandler):
         def do_GET(self):
             asked.append((self.path, self.headers.get("X-Key")))
-            isLetIn = self.headers.get("X-Key") == "s3cret"
+            isLetIn = self.headers.get("X-Key") == "s3cret" or self.path.endswith(".png")
             self.send_response(200 if isLetIn else 401)
             self.end_headers()
-            if isLetIn:
+            if self.path == "/slow.png":
+                self.connection.recv(1)
+                asked.append("left")
+            elif isLetIn:
                 self.wfile.write(pathlib.Path(city + self.path).read_bytes())
 
         def log_message(self, *arguments):
@@ -266,12 +291,33 @@ def catalog(session, folder):
         press("key", "alt+Left")
         window.click("^Edit$")
         window.see("Edit “metro”")
+        for entry, text in ("Minutes", "0"), ("Copy", address + "/copy.zip"):
+            window.click(entry, "text")
+            press("type", text)
+        press("key", "Return")
+        window.see("Enter a number of minutes from 1 to 527040")
+        window.click("Minutes", "text")
+        press("key", "ctrl+a", "type", "30")
+        press("key", "Return")
+        wait("the form gone", lambda: not window.find("Edit “metro”"))
+        settings = json.loads(pathlib.Path(folder, ".config/nimbo-transit/feeds.json").read_text())["feeds"][0]
+        assert settings["maximumAlertsAgeMinutes"] == 30 and settings["staticMirror"].endswith("/copy.zip"), settings
+        window.click("^Edit$")
         window.click("Lines", "text")
         press("key", "ctrl+a", "type", city + "/alerts.pb")
         press("key", "Return")
         window.see("is the other half of a feed")
         press("key", "alt+Left")
         window.see("Signals fail", "push button")
+        for image in "map.png", "slow.png":
+            publish(city, [f"See {image}"], f"{address}/{image}")
+            press("key", "F5")
+            window.see(f"See {image}", "push button")
+            window.click("1, Harbour Line, 1 incident", "list item")
+            window.see("A map", "image" if image == "map.png" else "label")
+            press("key", "alt+Left")
+        wait("the image given up", lambda: asked[-1] == "left")
+        assert ("/map.png", None) in asked, "without a key"
         press("key", "ctrl+question")
         window.see_page("Keyboard Shortcuts")
         window.see("Ctrl.W")
@@ -280,6 +326,11 @@ def catalog(session, folder):
         assert window.process.wait(PATIENCE) == 0
         server.shutdown()
     assert ("/alerts.pb", "s3cret") in asked and ("/city.zip", "wrong") in asked, asked
+
+
+def size_of(identifier):
+    return subprocess.run(["xdotool", "getwindowgeometry", "--shell", identifier], capture_output=True, text=True,
+                          check=True).stdout.splitlines()[3:5]
 
 
 FAULTS = {  # what the widget program does, and what the window says
@@ -332,6 +383,7 @@ def faults(session, folder):
     os.chmod(path, stat.S_IRWXU)
     window = Window(session, desktop, "--state", path + ".state", NIMBO_TRANSIT_WIDGET=path)
     identifier = window.comes_to_front()
+    size_of_default = size_of(identifier)
     window.click("Menu")
     press("key", "Escape")
     pathlib.Path(gate).write_text("The window has its size before it hears of the widget's.\n")
@@ -350,13 +402,14 @@ def faults(session, folder):
     window.comes_to_front()
     window.click("Show More")
     window.see("Show Less")
+    kept = size_of(identifier)
     window.quit()
     with sqlite3.connect(path + ".state/state.sqlite") as state:  # as before the first rows
         state.execute("DELETE FROM settings WHERE key = 'Nimbo.TransitWidget.savedUIData'")
     window = Window(session, desktop, "--state", path + ".state", NIMBO_TRANSIT_WIDGET=path)
     pathlib.Path(gate).write_text("\n")
     window.see("Show Less")
-    window.comes_to_front()
+    assert size_of(window.comes_to_front()) == kept != size_of_default, (kept, size_of_default)
     window.quit()
     with open(told) as file:
         modes = [line["params"]["mode"] for line in map(json.loads, file) if line.get("method") == "setActiveDisplayMode"]
