@@ -60,7 +60,7 @@ std::uint32_t bigEndianAt(std::string_view bytes, std::size_t place) {
 }
 
 Outcome<CairoSurfaceHandle> decodePNG(std::string_view file) {
-  // Source: the PNG specification, 11.2.1: the first chunk is IHDR, with width and height.
+  // Source: ISO/IEC 15948 (PNG), 11.2.2: the first chunk is IHDR, with width and height.
   constexpr std::size_t kType = 12, kWidth = 16, kHeight = 20, kEnd = 24;
   if (file.size() < kEnd || file.substr(kType, 4) != "IHDR") return broken("it has no header");
   if (ErrorRef error = checkSize(bigEndianAt(file, kWidth), bigEndianAt(file, kHeight))) return error;

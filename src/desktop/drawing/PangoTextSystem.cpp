@@ -235,8 +235,7 @@ TextLayoutRef PangoTextSystem::layOut(const std::string& text, const FontDescrip
     pango_layout_set_ellipsize(layout.get(), PANGO_ELLIPSIZE_END);
     pango_layout_set_height(layout.get(), -static_cast<int>(std::min<std::size_t>(maxLines, 1'000'000)));
   }
-  if (hyphenate(layout.get(), shown))
-    pango_layout_set_text(layout.get(), shown.data(), static_cast<int>(shown.size()));
+  if (hyphenate(layout.get(), shown)) pango_layout_set_text(layout.get(), shown.data(), static_cast<int>(shown.size()));
   if (pango_layout_get_unknown_glyphs_count(layout.get()) > 0) logMissingCharacters();
   return std::make_shared<const PangoTextLayout>(std::move(layout), scale, rightToLeft, wasCut);
 }

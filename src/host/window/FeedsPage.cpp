@@ -1,7 +1,5 @@
 #include "host/window/FeedsPage.h"
 
-#include <gtkmm/flowbox.h>
-#include <gtkmm/flowboxchild.h>
 #include <gtkmm/label.h>
 
 #include "desktop/gtfs/feeds/FeedCache.h"
@@ -27,12 +25,7 @@ FeedRow::FeedRow(const PageContext& context, const Feed& feed, std::function<voi
   addText(feed.staticFeed.publicText(), "item-caption");
   addText(feed.alerts.publicText(), "item-caption");
   box->append(_check);
-  // Beside each other where they fit.
-  auto* buttons = Gtk::make_managed<Gtk::FlowBox>();
-  buttons->set_selection_mode(Gtk::SelectionMode::NONE);
-  buttons->set_column_spacing(8);
-  buttons->set_row_spacing(8);
-  buttons->set_halign(Gtk::Align::START);
+  auto* buttons = Gtk::make_managed<Gtk::Box>(Gtk::Orientation::HORIZONTAL, 8);
   _checkButton.set_label(LocalizedString("Window_Feed_Check"));
   _checkButton.signal_clicked().connect([this] { check(); });
   auto* removeButton = Gtk::make_managed<Gtk::Button>(LocalizedString("Window_Feed_Remove"));
@@ -40,13 +33,17 @@ FeedRow::FeedRow(const PageContext& context, const Feed& feed, std::function<voi
   auto* editButton = Gtk::make_managed<Gtk::Button>(LocalizedString("Window_Feed_Edit"));
   editButton->signal_clicked().connect([this] { edit(); });
   removeButton->add_css_class("destructive-action");
-  for (Gtk::Button* button : {&_checkButton, editButton, removeButton}) {
-    auto* place = Gtk::make_managed<Gtk::FlowBoxChild>();
-    place->set_focusable(false);  // the button is what the keyboard stops at
-    place->set_child(*button);
-    buttons->append(*place);
-  }
-  buttons->set_max_children_per_line(3);
+  buttons->append(_checkButton);
+  buttons->append(*editButton);
+  buttons->append(*removeButton);
+  // Large texts do not fit beside each other, and would make the window wider.
+  const auto arrange = [&context, buttons] {
+    constexpr double kLargestBeside = 1.4;
+    const bool isBeside = context.preferences.textScale() <= kLargestBeside;
+    buttons->set_orientation(isBeside ? Gtk::Orientation::HORIZONTAL : Gtk::Orientation::VERTICAL);
+  };
+  arrange();
+  _lookChanged = context.preferences.signalLookChanged().connect(arrange);
   box->append(*buttons);
   set_child(*box);
   wrapTexts(*box);

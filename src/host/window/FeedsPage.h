@@ -22,6 +22,7 @@ class FeedRow final : public Gtk::ListBoxRow {
  public:
   /// `remove` hears that the user wants it gone, `changed` that it is another one now.
   FeedRow(const PageContext& context, const Feed& feed, std::function<void()> remove, FeedForm::Kept changed);
+  ~FeedRow() override { _lookChanged.disconnect(); }
 
   const std::string& name() const { return _feed.name; }
   /// Shows what was found when the feed was read.
@@ -38,6 +39,7 @@ class FeedRow final : public Gtk::ListBoxRow {
   FeedForm* _form = nullptr;  // while it is edited
   FeedCheckView _check;
   Gtk::Button _checkButton;
+  sigc::connection _lookChanged;
 };
 
 /// The feeds that the user set up, and a form for another one.

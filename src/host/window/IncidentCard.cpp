@@ -6,6 +6,7 @@
 #include <gtkmm/scrolledwindow.h>
 
 #include <algorithm>
+#include <cmath>
 
 #include "host/FeedAnswers.h"
 #include "host/telling/IncidentWords.h"
@@ -39,6 +40,41 @@ void alignByDirection(Gtk::Label& label) {
   const bool isRightToLeft = pango_layout_line_get_resolved_direction(line) == PANGO_DIRECTION_RTL;
   label.set_xalign(isRightToLeft == (label.get_direction() == Gtk::TextDirection::RTL) ? 0 : 1);
 }
+
+/// An image at its own size, or smaller where its room is narrower. Without it a list would give an image that may be
+/// smaller no height.
+class ImageFrame final : public Gtk::Widget {
+ public:
+  ImageFrame(const Glib::RefPtr<Gdk::Texture>& image, const std::string& name) : _image(image), _picture(image) {
+    _picture.set_parent(*this);
+    setAccessibleLabel(_picture, name);
+  }
+  ~ImageFrame() override { _picture.unparent(); }
+
+ protected:
+  Gtk::SizeRequestMode get_request_mode_vfunc() const override { return Gtk::SizeRequestMode::HEIGHT_FOR_WIDTH; }
+  void measure_vfunc(Gtk::Orientation orientation, int forSize, int& minimum, int& natural, int& minimumBaseline,
+                     int& naturalBaseline) const override {
+    minimumBaseline = naturalBaseline = -1;
+    natural = orientation == Gtk::Orientation::HORIZONTAL ? _image->get_width() : heightFor(forSize);
+    minimum = orientation == Gtk::Orientation::HORIZONTAL ? 0 : natural;
+  }
+  void size_allocate_vfunc(int width, int, int baseline) override {
+    const bool isAtTheRight = get_direction() == Gtk::TextDirection::RTL;
+    const int shown = std::min(width, _image->get_width());
+    _picture.size_allocate({isAtTheRight ? width - shown : 0, 0, shown, heightFor(width)}, baseline);
+  }
+
+ private:
+  int heightFor(int width) const {
+    if (width < 0 || width >= _image->get_width()) return _image->get_height();
+    return std::max(
+        1, static_cast<int>(std::lround(static_cast<double>(_image->get_height()) * width / _image->get_width())));
+  }
+
+  Glib::RefPtr<Gdk::Texture> _image;
+  Gtk::Picture _picture;
+};
 
 /// The publisher's host of a web address; empty for any other address, which is not offered.
 std::string hostOfLink(const std::string& url) {
@@ -108,11 +144,7 @@ void IncidentCard::addImage() {
   const int width = Column::kLargestWidth * get_scale_factor();
   _image = _context.images->ask(known->id, width, [place, label, name](const auto& image) {
     if (!image) return;
-    auto* picture = Gtk::make_managed<Gtk::Picture>(textureOf(image));
-    picture->set_can_shrink();
-    picture->set_halign(Gtk::Align::START);
-    setAccessibleLabel(*picture, name);
-    place->append(*picture);
+    place->append(*Gtk::make_managed<ImageFrame>(textureOf(image), name));
     if (label) label->hide();
   });
 }

@@ -74,7 +74,8 @@ TEST_F(PangoText, BreaksLinesAndCutsTheLastOne) {
 }
 
 TEST_F(PangoText, LeavesNoLetterOrTwoOfAWordForTheNextLine) {
-  for (const auto& [word, first] : {std::pair{"Retrasos", "Retra-"}, {"Verspätungen", "Verspätun-"}, {"Ааааск", "Ааа-"}}) {
+  for (const auto& [word, first] :
+       {std::pair{"Retrasos", "Retra-"}, {"Verspätungen", "Verspätun-"}, {"Ааааск", "Ааа-"}}) {
     const auto broken = layOut(word, layOut(word)->size().width - 1);
     EXPECT_EQ(broken->lineCount(), 2u) << word;
     EXPECT_NEAR(broken->size().width, layOut(first)->size().width, 1) << word;

@@ -314,6 +314,8 @@ def catalog(session, folder):
             press("key", "F5")
             window.see(f"See {image}", "push button")
             window.click("1, Harbour Line, 1 incident", "list item")
+            if image == "map.png":
+                wait("the map in sight", lambda: window.box("A map", "image").height == 32)
             window.see("A map", "image" if image == "map.png" else "label")
             press("key", "alt+Left")
         wait("the image given up", lambda: asked[-1] == "left")
