@@ -47,9 +47,10 @@ class ImageFrame final : public Gtk::Widget {
  public:
   ImageFrame(const Glib::RefPtr<Gdk::Texture>& image, const std::string& name) : _image(image), _picture(image) {
     _picture.set_parent(*this);
+    // In the destructor the toolkit's part is gone.
+    signal_destroy().connect([this] { _picture.unparent(); });
     setAccessibleLabel(_picture, name);
   }
-  ~ImageFrame() override { _picture.unparent(); }
 
  protected:
   Gtk::SizeRequestMode get_request_mode_vfunc() const override { return Gtk::SizeRequestMode::HEIGHT_FOR_WIDTH; }
