@@ -31,9 +31,6 @@ _nimbo_transit() {
     esac
   done
 
-  case $command:$prev in
-    "settings set:notify") COMPREPLY=($(compgen -W "on off severe" -- "$cur")); return ;;
-  esac
   case $prev in
     --config | --state) _filedir -d; return ;;
     --static | --alerts | --key-file) _filedir; return ;;
@@ -73,9 +70,10 @@ _nimbo_transit() {
     "favorite add") names=$(_nimbo_transit_names lines | cut -d ' ' -f 1) ;;
     "favorite remove" | "favorite move") names=$(_nimbo_transit_names favorite list | sed -n 's/^\([^ ]*:[^ ]*\).*/\1/p') ;;
     settings) names="get set unset" ;;
-    "settings "*" "*)
-      [[ $command != "settings set "Nimbo.TransitWidget.* ]] || names="true false"
-      ;;
+    "settings "*" "*" "*) ;;
+    "settings set notify") names="on off severe" ;;
+    "settings set "Nimbo.*) names="true false" ;;
+    "settings "*" "*) ;;
     "settings "*)
       names="notify quietHours quietDays refreshSeconds Nimbo.TransitWidget.analytics.disabled Nimbo.TransitWidget.internal.injectFakeIncidents
         Nimbo.TransitWidget.internal.randomNumberIncidents"

@@ -140,4 +140,10 @@ for command in get set unset
     complete -c nimbo-transit -n "__nimbo_transit_at settings $command; and test (count (__nimbo_transit_words)) = 2" \
         -a 'notify quietHours quietDays refreshSeconds Nimbo.TransitWidget.analytics.disabled Nimbo.TransitWidget.internal.injectFakeIncidents Nimbo.TransitWidget.internal.randomNumberIncidents'
 end
-complete -c nimbo-transit -n '__nimbo_transit_at settings set; and test (count (__nimbo_transit_words)) = 3' -a 'true false on off severe'
+# Whether the value of this setting comes next; the name may have a star.
+function __nimbo_transit_sets
+    set -l words (__nimbo_transit_words)
+    test (count $words) = 3; and string match -q -- "settings set $argv" "$words"
+end
+complete -c nimbo-transit -n '__nimbo_transit_sets notify' -a 'on off severe'
+complete -c nimbo-transit -n '__nimbo_transit_sets "Nimbo.*"' -a 'true false'

@@ -26,6 +26,8 @@ CASES = {
     "nimbo-transit settings se": ["set"],
     "nimbo-transit settings set Nimbo.TransitWidget.ana": [KEY],
     f"nimbo-transit settings set {KEY} ": ["false", "true"],
+    "nimbo-transit settings set notify ": ["off", "on", "severe"],
+    "nimbo-transit settings set quietHours ": [],
     f"nimbo-transit settings unset {KEY} ": [],
     "nimbo-transit-layer --layer o": ["overlay"],
 }
