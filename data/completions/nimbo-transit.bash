@@ -40,7 +40,7 @@ _nimbo_transit() {
         accessibilityExtraExtraExtraLarge" -- "$cur"))
       return
       ;;
-    --format) COMPREPLY=($(compgen -W "text json" -- "$cur")); return ;;
+    --format) COMPREPLY=($(compgen -W "text json waybar i3bar line" -- "$cur")); return ;;
     --from)
       COMPREPLY=($(compgen -W "$(_nimbo_transit_names feed find "" | cut -d ' ' -f 1)" -- "$cur"))
       return

@@ -82,10 +82,10 @@ end
 complete -c nimbo-transit -n '__nimbo_transit_at status' -l lines -d 'Each favorite line with its state'
 complete -c nimbo-transit -n '__nimbo_transit_at status' -l planned -d 'What is to come within seven days'
 complete -c nimbo-transit -n '__nimbo_transit_at status' -l saved -d 'The rows of the last time, without a fetch'
-complete -c nimbo-transit -n '__nimbo_transit_at status' -l format -x -a 'text json' -d 'Form of what is printed'
+complete -c nimbo-transit -n '__nimbo_transit_at status' -l format -x -a 'text json waybar i3bar line' -d 'Form of what is printed'
 complete -c nimbo-transit -n '__nimbo_transit_at status' -l exit-code -d 'The exit status tells the state'
 complete -c nimbo-transit -n '__nimbo_transit_at status' -l json -d 'The snapshot as JSON'
-complete -c nimbo-transit -n '__nimbo_transit_at status' -l waybar -d 'A line for a status bar'
+complete -c nimbo-transit -n '__nimbo_transit_at status' -l waybar -d 'Short for --format waybar'
 complete -c nimbo-transit -n '__nimbo_transit_at status' -l watch -d 'Go on printing lines'
 for command in status update
     complete -c nimbo-transit -n "__nimbo_transit_at $command" -l notify -d 'Have the desktop tell of incidents'

@@ -116,7 +116,8 @@ struct StatusOptions {
   bool planned = false;            ///< what is to come within seven days, instead of the rows
   bool saved = false;              ///< the rows of the last time, without a fetch
   bool exitCode = false;           ///< the exit status tells the state
-  std::string format = "text";     ///< "json": the state of each favourite line as docs/formats.md has it
+  /// "json": the state of each favourite line as docs/formats.md has it; a bar's format is no concern of `runStatus`.
+  std::string format = "text";
   std::optional<std::string> now;  ///< ISO date by which incidents are judged
 };
 

@@ -2,122 +2,24 @@
 
 #include <unistd.h>
 
-#include <algorithm>
 #include <csignal>
-#include <ctime>
+#include <cstring>
 #include <iostream>
-#include <nlohmann/json.hpp>
+#include <optional>
 #include <vector>
 
+#include "desktop/system/SystemClock.h"
+#include "host/BarClicks.h"
+#include "host/BarOutput.h"
 #include "host/HostPlatform.h"
-#include "host/LineStatus.h"
 #include "host/OnScreenWidget.h"
 #include "host/QuitOnSignal.h"
+#include "host/SavedRows.h"
 #include "host/StatusWatch.h"
-#include "host/TerminalText.h"
+#include "host/WindowLauncher.h"
 #include "host/telling/Teller.h"
 
 namespace nimbo {
-
-using nlohmann::json;
-
-namespace {
-
-constexpr const char* kErrorWord = "error";
-constexpr const char* kGoneWord = "gone";
-constexpr const char* kOldWord = "old";
-
-/// A line without a line end, which a bar has no room for.
-std::string inOneLine(std::string text) {
-  std::replace(text.begin(), text.end(), '\n', ' ');
-  return text;
-}
-
-std::string lineOf(const std::string& text, const std::vector<std::string>& words, const std::string& tooltip) {
-  json line{{"text", inOneLine(text)}, {"alt", words.front()}, {"class", words.front()}, {"tooltip", tooltip}};
-  if (words.size() > 1) line["class"] = words;
-  return printableJSON(line.dump());
-}
-
-const std::string& titleOf(const protocol::TransitItem& item) {
-  static const std::string kNone;
-  return item.primaryText ? *item.primaryText : kNone;
-}
-const std::string& titleOf(const protocol::SummaryItem& item) { return item.primaryText; }
-
-std::string secondaryTextOf(const protocol::TransitItem& item) { return item.secondaryText.value_or(""); }
-std::string secondaryTextOf(const protocol::SummaryItem&) { return {}; }
-
-/// Tells the rows apart by what they open: incidents an activity, good service and no favourites a URL, an error
-/// nothing.
-std::string wordOf(const protocol::TransitItem& item, bool isFetched) {
-  if (!item.openable) return isFetched ? "advisories" : kErrorWord;
-  if (!item.openable->url) return "advisories";
-  return item.artwork ? "good" : "none";
-}
-std::string wordOf(const protocol::SummaryItem&, bool) { return "advisories"; }
-
-/// "[12] " for a row with the shield of a line.
-std::string shieldOf(const protocol::TransitItem& item) {
-  if (!item.artwork || !item.artwork->shield) return {};
-  const std::string text = item.artwork->shield->text.value_or("");
-  return text.empty() ? text : "[" + text + "] ";
-}
-std::string shieldOf(const protocol::SummaryItem&) { return {}; }
-
-std::string headingOf(const protocol::Item& row) {
-  return std::visit([](const auto& item) { return markupText(shieldOf(item) + titleOf(item)); }, row);
-}
-
-std::string tooltipOf(const protocol::Snapshot& snapshot) {
-  std::vector<protocol::Item> rows = snapshot.listItem.expandedItems;
-  if (rows.empty() && snapshot.listItem.summaryItem) rows.push_back(*snapshot.listItem.summaryItem);
-  std::string tooltip;
-  const auto addLine = [&](const std::string& markup) { tooltip += (tooltip.empty() ? "" : "\n") + markup; };
-  if (!snapshot.result) addLine("<i>as it was the last time; asking now</i>");
-  for (const protocol::Item& row : rows) {
-    addLine("<b>" + headingOf(row) + "</b>");
-    const std::string text = std::visit([](const auto& item) { return secondaryTextOf(item); }, row);
-    if (!text.empty()) addLine(markupText(text));
-  }
-  if (snapshot.error) addLine(markupText(snapshot.error->reason));
-  for (const auto& [line, title] : snapshot.knownIncidents)
-    addLine(markupText(line).append(": ").append(markupText(title)));
-  if (snapshot.updated && !snapshot.error)
-    addLine("<i>" + updatedText(*snapshot.updated, dateFromUnixTime(static_cast<TimeInterval>(std::time(nullptr)))) +
-            "</i>");
-  for (const std::string& line : snapshot.goneLines) addLine("<i>" + markupText(goneLineText(line)) + "</i>");
-  return tooltip;
-}
-
-}  // namespace
-
-std::optional<std::string> statusBarLine(const protocol::Snapshot& snapshot) {
-  const auto& row = snapshot.listItem.summaryItem;
-  if (!row) return std::nullopt;
-  const bool isFetched = snapshot.result.has_value();
-  const bool hasFailed = snapshot.result == protocol::FetchResult::error;
-  const std::string word =
-      hasFailed ? kErrorWord : std::visit([&](const auto& item) { return wordOf(item, isFetched); }, *row);
-  if (!isFetched && word != "good" && word != "advisories") return std::nullopt;
-  std::string text = headingOf(*row);
-  std::vector<std::string> words{word};
-  if (!isFetched) {
-    words = {kOldWord};
-    text += " (old)";
-  }
-  if (!snapshot.goneLines.empty()) {
-    // Good service of the others is no good service of all.
-    words = word == "good" && isFetched ? std::vector<std::string>{kGoneWord}
-                                        : std::vector{words.front(), std::string(kGoneWord)};
-    text += " · " + goneLinesTitle(snapshot.goneLines);
-  }
-  return lineOf(text, words, tooltipOf(snapshot));
-}
-
-std::string statusBarErrorLine(const std::string& reason) {
-  return lineOf("⚠", {kErrorWord}, "<b>Nimbo Transit</b>\n" + markupText(reason));
-}
 
 namespace {
 
@@ -130,45 +32,124 @@ WidgetPresentation presentationForBar() {
   return presentation;
 }
 
+/// A bar that somebody reads, and what he does there.
+class BarSession {
+ public:
+  BarSession(const CommandContext& context, const BarFormat& format, bool notifies)
+      : _context(context),
+        _format(format),
+        _output(context.runLoop, STDOUT_FILENO, [this](int failure) { end(failure); }),
+        _launcher(context.widgetArguments, [this](const std::string& message) { tell(message); }),
+        _platform(context),
+        _teller(context.runLoop, *_platform.operator->(), {.isAsked = notifies}),
+        _watch(context, _clock, presentationForBar(), [this](const BarContent& content) { show(content); }) {
+    _output.begin(format.beginning);
+    _watch.setLinesObserver([this](const protocol::Lines& lines) { notify(lines); });
+    for (const int signal : {SIGTERM, SIGINT}) _signals.push_back(quitOnSignal(context.runLoop, signal));
+    if (!format.takesClicks) return;
+    _signals.push_back(onSignal(kBarHiddenSignal, [this] { _watch.setVisible(false); }));
+    _signals.push_back(onSignal(kBarShownSignal, [this] { _watch.setVisible(true); }));
+    _clicks.emplace(context.runLoop, STDIN_FILENO, [this](int button) { click(button); });
+  }
+  ~BarSession() {
+    if (_told) _told->invalidate();
+  }
+
+  void run() {
+    _context.runLoop.run();
+    if (_failure != 0)
+      throw CommandFailure(std::string("cannot write to the standard output: ") + std::strerror(_failure));
+  }
+
+ private:
+  void show(const BarContent& content) {
+    _line = _format.write(content);
+    if (!_told) _output.show(_line);
+  }
+
+  void click(int button) {
+    constexpr int kLeft = 1, kMiddle = 2, kRight = 3;
+    if (button == kLeft) _launcher.openURL("nimbo://");
+    if (button == kMiddle) _watch.markSeen();
+    if (button == kRight) _launcher.openURL("nimbo://planned");
+  }
+
+  void notify(const protocol::Lines& lines) {
+    _teller.take(lines, [this](const ErrorRef& error) {
+      const std::string failure = error ? "cannot notify: " + error->reason() : "";
+      if (!failure.empty() && failure != _toldFailure) _context.tell(failure);
+      _toldFailure = failure;
+    });
+  }
+
+  /// Tells what a click has come to in the place of the rows, for a while.
+  void tell(const std::string& message) {
+    constexpr TimeInterval kPatience = 10;
+    printMessage(message);
+    BarContent content = barContentOfFailure(message);
+    content.text = message;
+    _output.show(_format.write(content));
+    if (_told) _told->invalidate();
+    _told = _context.runLoop.scheduleTimer(kPatience, false, [this](Timer&) {
+      _told = nullptr;
+      _output.show(_line);
+    });
+  }
+
+  void end(int failure) {
+    _failure = failure;
+    _context.runLoop.quit();
+  }
+
+  const CommandContext& _context;
+  const BarFormat& _format;
+  SystemClock _clock;
+  int _failure = 0;
+  std::string _line;             // of what the widget shows
+  std::shared_ptr<Timer> _told;  // while something else stands there
+  BarOutput _output;
+  WindowLauncher _launcher;
+  std::vector<GSourceHandle> _signals;
+  HostPlatform _platform;
+  Teller _teller;
+  std::string _toldFailure;  // of the desktop's notifications
+  StatusWatch _watch;
+  std::optional<BarClicks> _clicks;
+};
+
+void print(const BarFormat& format, const BarContent& content) {
+  std::cout << format.beginning << format.write(content) << "\n" << format.end;
+}
+
 }  // namespace
 
-int runStatusBar(const CommandContext& context, const std::optional<std::string>& now) {
+int runStatusBar(const CommandContext& context, const BarFormat& format, const StatusOptions& options) {
   WidgetPresentation presentation = presentationForBar();
-  presentation.virtualTime = now;
+  presentation.virtualTime = options.now;
+  const Date now = options.now ? *dateFromISOText(*options.now) : SystemClock().now();
+  const auto printRows = [&](const protocol::Snapshot& snapshot, const protocol::Lines& lines) {
+    print(format, barContentOf(snapshot, lines, now).value_or(BarContent()));
+  };
   try {
+    if (options.saved) {
+      printRows(savedSnapshot(context, presentation, WidgetDisplayMode::Compact, {.rows = false}), {});
+      return kExitSuccess;
+    }
     OnScreenWidget widget(context, presentation);
     // A bar may ask every few seconds.
     const std::optional<std::string> failure = widget.update(sharedAge(context));
-    std::cout << statusBarLine(widget.snapshot({.rows = false})).value_or("") << "\n";
+    printRows(widget.snapshot({.rows = false}), widget.lines());
     widget.close();
     if (failure) throw CommandFailure(*failure);
   } catch (const WidgetClientFailure& failure) {
-    std::cout << statusBarErrorLine(failure.what()) << "\n";
+    print(format, barContentOfFailure(failure.what()));
     throw;
   }
   return kExitSuccess;
 }
 
-int runStatusWatch(const CommandContext& context, bool notify) {
-  HostPlatform platform(context);
-  Teller teller(context.runLoop, *platform.operator->(), {.isAsked = notify});
-  const GSourceHandle handles[] = {quitOnSignal(context.runLoop, SIGTERM), quitOnSignal(context.runLoop, SIGINT),
-                                   context.runLoop.watchUrgent(STDOUT_FILENO, [&](bool inError) {
-                                     // The reader of the pipe is gone.
-                                     if (inError) context.runLoop.quit();
-                                   })};
-  StatusWatch watch(context, presentationForBar(), [&](const std::string& line) {
-    if (!(std::cout << line << std::endl)) context.runLoop.quit();
-  });
-  std::string toldFailure;
-  watch.setLinesObserver([&](const protocol::Lines& lines) {
-    teller.take(lines, [&](const ErrorRef& error) {
-      const std::string failure = error ? "cannot notify: " + error->reason() : "";
-      if (!failure.empty() && failure != toldFailure) context.tell(failure);
-      toldFailure = failure;
-    });
-  });
-  context.runLoop.run();
+int runStatusWatch(const CommandContext& context, const BarFormat& format, bool notify) {
+  BarSession(context, format, notify).run();
   return kExitSuccess;
 }
 

@@ -1,13 +1,12 @@
 #include "host/StatusWatch.h"
 
-#include "host/StatusBar.h"
-
 namespace nimbo {
 
 using nlohmann::json;
 
-StatusWatch::StatusWatch(const CommandContext& context, WidgetPresentation presentation, Show show)
+StatusWatch::StatusWatch(const CommandContext& context, const Clock& clock, WidgetPresentation presentation, Show show)
     : _context(context),
+      _clock(clock),
       _presentation(std::move(presentation)),
       _show(std::move(show)),
       _refresh(
@@ -17,11 +16,32 @@ StatusWatch::StatusWatch(const CommandContext& context, WidgetPresentation prese
 }
 
 StatusWatch::~StatusWatch() {
-  if (_restart) _restart->invalidate();
-  if (!_widget) return;
+  for (auto* timer : {&_restart, &_stale}) cancel(*timer);
   // The process does what it was asked before it finds its input closed.
+  if (_widget && _isVisible) disappear();
+}
+
+void StatusWatch::setVisible(bool visible) {
+  if (std::exchange(_isVisible, visible) == visible || !_widget) return;
+  if (visible) return appear();
+  _refresh.setOnScreen(false);
+  cancel(_stale);
+  disappear();
+}
+
+void StatusWatch::appear() {
+  for (const auto& step : {protocol::kViewWillAppear, protocol::kViewDidAppear}) _widget->ask(step);
+  _refresh.setOnScreen(true);
+  look();
+}
+
+void StatusWatch::disappear() {
   _widget->ask(protocol::kViewWillDisappear);
   _widget->ask(protocol::kViewDidDisappear);
+}
+
+void StatusWatch::cancel(std::shared_ptr<Timer>& timer) {
+  if (timer) std::exchange(timer, nullptr)->invalidate();
 }
 
 void StatusWatch::start() {
@@ -39,10 +59,18 @@ void StatusWatch::start() {
                                  [this](const json&, const JSONRPCResponder&) { _refresh.askNow(); });
   client.setNoticeHandler(_context.tell);
   _widget->ask(protocol::kInitialize, initializationOf(_presentation));
-  for (const auto& step : {protocol::kLoadView, protocol::kViewWillAppear, protocol::kViewDidAppear})
-    _widget->ask(step);
-  _refresh.setOnScreen(true);
-  look();
+  _widget->ask(protocol::kLoadView);
+  if (_isVisible) appear();
+}
+
+void StatusWatch::markSeen() {
+  protocol::MarkSeenParams marked;
+  for (const protocol::LineReport& line : _lines.lines)
+    for (const protocol::LineIncident& incident : line.incidents) marked.ids.push_back(incident.id);
+  if (!_widget || marked.ids.empty()) return;
+  _widget->ask(protocol::kMarkSeen, marked, [this](const protocol::Kept& kept) {
+    if (kept.failure) _context.tell("what was seen cannot be kept: " + *kept.failure);
+  });
 }
 
 void StatusWatch::update(TimeInterval maxAge) {
@@ -54,32 +82,37 @@ void StatusWatch::update(TimeInterval maxAge) {
 
 void StatusWatch::look() {
   // More favorites than an answer has room for are no fault of the process.
-  if (_linesObserver)
-    _widget->call(protocol::kLines, {}, [this](const std::optional<protocol::Lines>& lines, const auto&) {
-      if (lines) _linesObserver(*lines);
-    });
+  _widget->call(protocol::kLines, {}, [this](const std::optional<protocol::Lines>& lines, const auto&) {
+    _lines = lines.value_or(protocol::Lines());
+    if (lines && _linesObserver) _linesObserver(*lines);
+  });
   _widget->ask(protocol::kSnapshot, {.rows = false}, [this](const auto& snapshot) { showSnapshot(snapshot); });
 }
 
 void StatusWatch::showSnapshot(const protocol::Snapshot& snapshot) {
-  if (const auto line = statusBarLine(snapshot)) showLine(*line);
+  if (!_isVisible) return;
+  const Date now = _clock.now();
+  const auto content = barContentOf(snapshot, _lines, now);
+  if (content) _show(*content);
+  cancel(_stale);
+  if (content && !content->isStale && snapshot.result == protocol::FetchResult::success && snapshot.updated)
+    _stale = _context.runLoop.scheduleTimer(kBarStaleAfter - intervalBetween(*snapshot.updated, now) + 1, false,
+                                            [this](Timer&) {
+                                              _stale = nullptr;
+                                              look();
+                                            });
   if (snapshot.result) _restarts.reset();
-}
-
-void StatusWatch::showLine(const std::string& line) {
-  if (line == _lastLine) return;
-  _lastLine = line;
-  _show(line);
 }
 
 void StatusWatch::restartAfter(const std::string& failure) {
   _refresh.setOnScreen(false);
   _widget.reset();
+  cancel(_stale);
   _restart = _context.runLoop.scheduleTimer(_restarts.next(), false, [this](Timer&) {
     _restart = nullptr;
     start();
   });
-  showLine(statusBarErrorLine(failure + " It is started again."));
+  _show(barContentOfFailure(failure + " It is started again."));
 }
 
 }  // namespace nimbo

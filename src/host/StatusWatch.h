@@ -2,25 +2,25 @@
 
 #include <functional>
 #include <memory>
-#include <string>
 
 #include "desktop/system/SystemClock.h"
+#include "host/BarContent.h"
 #include "host/MachineConditions.h"
 #include "host/OnScreenWidget.h"
 #include "host/RefreshRule.h"
 #include "host/WatchedWidget.h"
+#include "platform/SystemServices.h"
 
 namespace nimbo {
 
-/// Follows a widget on screen for a status bar: tells a line of `statusBarLine` whenever it is another one than the
-/// line before. It asks again by the rule of `RefreshRule`; a process that fails is replaced, after waiting times that
-/// grow. Main thread only.
+/// Follows a widget on screen for a status bar: tells what to show whenever that may have changed. It asks again by the
+/// rule of `RefreshRule`; a process that fails is replaced, after waiting times that grow. Main thread only.
 class StatusWatch {
  public:
-  using Show = std::function<void(const std::string& line)>;
+  using Show = std::function<void(const BarContent& content)>;
 
-  /// Starts the widget. `context`, and what `show` holds, outlive this.
-  StatusWatch(const CommandContext& context, WidgetPresentation presentation, Show show);
+  /// Starts the widget. `context`, `clock`, and what `show` holds, outlive this.
+  StatusWatch(const CommandContext& context, const Clock& clock, WidgetPresentation presentation, Show show);
   /// Takes the widget off the screen, which saves its rows, and ends the process.
   ~StatusWatch();
   /// Hears what is known of the favorites whenever that may be new.
@@ -30,6 +30,11 @@ class StatusWatch {
   StatusWatch(const StatusWatch&) = delete;
   StatusWatch& operator=(const StatusWatch&) = delete;
 
+  /// Whether the bar can be seen, as it can at first: a widget that cannot fetches nothing.
+  void setVisible(bool visible);
+  /// Marks the incidents in force that were told last as seen.
+  void markSeen();
+
   /// Seconds before the first and the later attempts to start a process.
   static constexpr TimeInterval kFirstRestart = 1, kLongestRestart = 300;
 
@@ -37,18 +42,23 @@ class StatusWatch {
   void start();
   void update(TimeInterval maxAge);
   void look();
+  void appear();
+  void disappear();
   void showSnapshot(const protocol::Snapshot& snapshot);
-  void showLine(const std::string& line);
   /// Another process follows later.
   void restartAfter(const std::string& failure);
+  static void cancel(std::shared_ptr<Timer>& timer);
 
   const CommandContext& _context;
+  const Clock& _clock;
   WidgetPresentation _presentation;
   Show _show;
   std::function<void(const protocol::Lines&)> _linesObserver;  // null: nobody asks
-  std::string _lastLine;
+  bool _isVisible = true;
+  protocol::Lines _lines;  // as the widget told last
   Backoff _restarts{kFirstRestart, kLongestRestart};
   std::shared_ptr<Timer> _restart;
+  std::shared_ptr<Timer> _stale;  // when the rows become old
   SystemRandom _random;
   MachineConditions _conditions{[this] { _refresh.networkReturned(); }};
   RefreshRule _refresh;

@@ -59,13 +59,17 @@ void addName(const protocol::Shield& shield, NamesOfShields& names) {
   if (shield.text) names[*shield.text].insert(shield.accessibilityText.value_or(""));
 }
 
-NamesOfShields namesOfShields(const protocol::Snapshot& snapshot) {
+std::vector<protocol::Item> itemsOnScreen(const protocol::Snapshot& snapshot) {
+  if (snapshot.expanded) return snapshot.listItem.expandedItems;
+  return snapshot.listItem.summaryItem ? std::vector{*snapshot.listItem.summaryItem} : std::vector<protocol::Item>();
+}
+
+NamesOfShields namesOfShields(const std::vector<protocol::Item>& items) {
   NamesOfShields names;
-  for (const protocol::Row& row : snapshot.rows) {
-    if (!row.item) continue;
-    if (const auto* summary = std::get_if<protocol::SummaryItem>(&*row.item))
+  for (const protocol::Item& item : items) {
+    if (const auto* summary = std::get_if<protocol::SummaryItem>(&item))
       for (const protocol::Shield& shield : summary->artworks) addName(shield, names);
-    else if (const auto& artwork = std::get<protocol::TransitItem>(*row.item).artwork; artwork && artwork->shield)
+    else if (const auto& artwork = std::get<protocol::TransitItem>(item).artwork; artwork && artwork->shield)
       addName(*artwork->shield, names);
   }
   return names;
@@ -165,10 +169,11 @@ std::string shieldAsText(const protocol::Shield& shield, const TerminalStyle& st
 std::string rowsAsText(const protocol::Snapshot& snapshot, const TerminalStyle& style,
                        const std::function<std::string(const std::string& title)>& timeOf) {
   std::string text;
-  const NamesOfShields names = namesOfShields(snapshot);
+  const std::vector<protocol::Item> items = itemsOnScreen(snapshot);
+  const NamesOfShields names = namesOfShields(items);
   const RowContext context{style, names, timeOf};
-  for (const protocol::Row& row : snapshot.rows)
-    if (row.item) text += std::visit([&](const auto& item) { return textOfItem(item, context); }, *row.item);
+  for (const protocol::Item& item : items)
+    text += std::visit([&](const auto& shown) { return textOfItem(shown, context); }, item);
   if (!snapshot.goneLines.empty()) {
     text += titleText(goneLinesTitle(snapshot.goneLines), styled("⚠", kBold, style), style);
     for (const std::string& line : snapshot.goneLines) text += indented(printableText(line), style);

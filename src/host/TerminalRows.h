@@ -20,9 +20,9 @@ struct TerminalStyle {
 /// A shield as " 12 " on its colour, or as [12]; empty for one without a text.
 std::string shieldAsText(const protocol::Shield& shield, const TerminalStyle& style);
 
-/// The rows of a snapshot as lines of text: title and shield on one line, the secondary text below; and a row for lines
-/// that are gone from their feeds. Lines that share a short name are told apart by their full names. `timeOf` gives
-/// what to say of the time of an incident by its title; null: nothing is said.
+/// The rows of a snapshot, whether or not as laid out, as lines of text: title and shield on one line, the secondary
+/// text below; and a row for lines that are gone from their feeds. Lines that share a short name are told apart by
+/// their full names. `timeOf` gives what to say of the time of an incident by its title; null: nothing is said.
 std::string rowsAsText(const protocol::Snapshot& snapshot, const TerminalStyle& style,
                        const std::function<std::string(const std::string& title)>& timeOf = nullptr);
 

@@ -131,6 +131,22 @@ void printTable(const std::vector<std::vector<std::string>>& rows) {
   }
 }
 
+std::string shortenedText(std::string_view text, int columns) {
+  const std::size_t room = 8 * static_cast<std::size_t>(columns);  // marks have no width, and may be any number
+  std::string result;
+  std::size_t end = 0;  // of what stands before an ellipsis
+  int width = 0;
+  bool isCut = false;
+  forEachValidCharacter(text, [&](gunichar c, std::string_view bytes) {
+    width += widthOfCharacter(c);
+    isCut = isCut || width > columns || result.size() + bytes.size() > room;
+    if (isCut) return;
+    result += c == '\n' ? " " : bytes;
+    if (width < columns) end = result.size();
+  });
+  return isCut ? result.substr(0, end) + "…" : result;
+}
+
 std::vector<std::string> foldedText(std::string_view text, int columns) {
   columns = std::max(columns, 2);
   std::vector<std::string> lines;

@@ -44,6 +44,9 @@ int terminalWidth(std::string_view text);
 /// Prints rows of texts that are printable, each with as many, in columns. An empty column takes no room.
 void printTable(const std::vector<std::vector<std::string>>& rows);
 
+/// `text` in one line of valid UTF-8, at most so many columns wide, with an ellipsis in the last one where it was cut.
+std::string shortenedText(std::string_view text, int columns);
+
 /// The text's lines, folded at blanks to `columns`; a word that is wider is cut. An empty text has no line.
 std::vector<std::string> foldedText(std::string_view text, int columns);
 

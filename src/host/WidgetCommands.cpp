@@ -7,10 +7,10 @@
 
 #include "desktop/drawing/DrawingPart.h"
 #include "host/Commands.h"
-#include "host/HostPlatform.h"
 #include "host/LineStatus.h"
 #include "host/OnScreenWidget.h"
 #include "host/ProgressLine.h"
+#include "host/SavedRows.h"
 #include "host/ScriptPlayer.h"
 #include "host/TerminalRows.h"
 #include "host/TerminalText.h"
@@ -74,18 +74,8 @@ WidgetPresentation presentationForStatus(const StatusOptions& options) {
 
 /// The rows of the last time.
 int runSavedStatus(const CommandContext& context, const StatusOptions& options) {
-  if (!HostPlatform(context)->sharedSettings().groupStore()->valueForKey("Nimbo.TransitWidget.savedUIData"))
-    throw CommandFailure("no rows are kept yet. \"status\" and \"update\" keep them.");
-  std::vector<std::string> arguments = context.widgetArguments;
-  if (options.now) arguments.insert(arguments.end(), {"--virtual-time", *options.now});
-  WidgetClient client(context.runLoop, arguments);
-  client.setNoticeHandler(context.tell);
-  protocol::InitializeParams initialization = initializationOf(presentationForStatus(options));
-  if (options.expanded) initialization.activeDisplayMode = WidgetDisplayMode::Expanded;
-  client.call(protocol::kInitialize, initialization);
-  client.call(protocol::kLoadView);
-  const protocol::Snapshot snapshot = client.call(protocol::kSnapshot);
-  printRows(snapshot, options, {});
+  const auto mode = options.expanded ? WidgetDisplayMode::Expanded : WidgetDisplayMode::Compact;
+  printRows(savedSnapshot(context, presentationForStatus(options), mode, {.rows = options.json}), options, {});
   return kExitSuccess;
 }
 
@@ -96,7 +86,7 @@ int runStatus(const CommandContext& context, const StatusOptions& options) {
   OnScreenWidget widget(context, presentationForStatus(options));
   const std::optional<std::string> failure = widget.update();
   if (options.expanded) widget.expand();
-  const protocol::Snapshot snapshot = widget.snapshot();
+  const protocol::Snapshot snapshot = widget.snapshot({.rows = options.json});
   const protocol::Lines lines = widget.lines();
   const TerminalStyle style = TerminalStyle::ofStandardOutput();
   if (options.format == "json")

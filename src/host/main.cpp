@@ -50,7 +50,7 @@ class CommandLine {
   std::optional<std::string> _virtualTime;
   std::string _file, _text, _key, _value;
   std::vector<std::string> _lines;
-  bool _json = false, _waybar = false, _watch = false, _notify = false;
+  bool _json = false, _watch = false, _notify = false;
   std::set<std::string> _said;
 };
 
@@ -75,37 +75,49 @@ CLI::App* CommandLine::add(CLI::App& parent, const std::string& name, const std:
 }
 
 void CommandLine::addWidgetCommands() {
-  CLI::App* status = add(_app, "status", "Show how the favorite lines run", [this](const CommandContext& context) {
-    if (_watch) return runStatusWatch(context, _notify);
-    return _waybar ? runStatusBar(context, _status.now) : runStatus(context, _status);
-  });
+  CLI::App* status = _app.add_subcommand("status", "Show how the favorite lines run");
   CLI::Option* expanded =
       status->add_flag("--expanded", _status.expanded, "One row for each incident instead of one for all");
   CLI::Option* json = status->add_flag("--json", _status.json, "The widget's snapshot as JSON");
   CLI::Option* now =
       status->add_option("--now", _status.now, "ISO date by which incidents are judged")->check(checkDate);
-  CLI::Option* waybar = status->add_flag("--waybar", _waybar, "One line of JSON for a status bar");
+  CLI::Option* waybar = status->add_flag_callback(
+      "--waybar", [this] { _status.format = "waybar"; }, "Short for --format waybar");
   CLI::Option* lines = status->add_flag("--lines", _status.lines, "Each favorite line with its state");
   CLI::Option* planned =
       status->add_flag("--planned", _status.planned, "What is to come within seven days, by line and day");
   CLI::Option* saved =
       status->add_flag("--saved", _status.saved, "The rows of the last time with their date, without a fetch");
-  CLI::Option* format = status->add_option("--format", _status.format, "text, or json: the state of each favorite line")
-                            ->check(CLI::IsMember({"text", "json"}));
+  CLI::Option* format = status
+                            ->add_option("--format", _status.format,
+                                         "text; json: the state of each favorite line; or for a status bar waybar, "
+                                         "i3bar, or line: plain text")
+                            ->check(CLI::IsMember({"text", "json", "waybar", "i3bar", "line"}));
   CLI::Option* exitCode = status->add_flag("--exit-code", _status.exitCode,
                                            "Exit with 0 for good service, 3 affected, 4 unknown, 5 no favorites");
-  for (CLI::Option* other : {expanded, json, lines, planned, saved, format, exitCode}) waybar->excludes(other);
-  for (CLI::Option* other : {expanded, json, lines, planned, saved}) format->excludes(other);
+  for (CLI::Option* bars : {waybar, format})
+    for (CLI::Option* other : {expanded, json, lines, planned}) bars->excludes(other);
+  waybar->excludes(format)->excludes(exitCode);
   lines->excludes(planned);
   for (CLI::Option* other : {expanded, json, saved}) {
     lines->excludes(other);
     planned->excludes(other);
   }
   saved->excludes(exitCode);
-  CLI::Option* watch =
-      status->add_flag("--watch", _watch, "Go on printing a line whenever it changes")->needs(waybar)->excludes(now);
+  CLI::Option* watch = status->add_flag("--watch", _watch, "Go on printing a line whenever it changes");
+  watch->excludes(now)->excludes(saved);
   status->add_flag("--notify", _notify, "Have the desktop tell of incidents that begin, get worse and end")
       ->needs(watch);
+  status->callback([this, saved, exitCode] {
+    const BarFormat* bar = barFormatNamed(_status.format);
+    if (_watch && !bar) throw CLI::RequiresError("--watch", "--format waybar, i3bar or line");
+    if (bar && *exitCode) throw CLI::ExcludesError("--format " + _status.format, "--exit-code");
+    if (_status.format == "json" && *saved) throw CLI::ExcludesError("--format json", "--saved");
+    _chosen = [this, bar](const CommandContext& context) {
+      if (!bar) return runStatus(context, _status);
+      return _watch ? runStatusWatch(context, *bar, _notify) : runStatusBar(context, *bar, _status);
+    };
+  });
 
   add(_app, "update", "Fetch, and keep the rows for the widget's next start", [this](const CommandContext& context) {
     return runUpdate(context, _notify);
@@ -282,7 +294,7 @@ int CommandLine::outputStatus() {
   const int failure = errno;  // 0 where an earlier write has failed
   // Who closes his end of a pipe has read enough.
   pollfd output{STDOUT_FILENO, 0, 0};
-  if (poll(&output, 1, 0) == 1 && (output.revents & POLLERR)) return kExitSuccess;
+  if (poll(&output, 1, 0) == 1 && (output.revents & (POLLERR | POLLHUP))) return kExitSuccess;
   say("cannot write to the standard output" + (failure ? std::string(": ") + std::strerror(failure) : ""));
   return kExitFailure;
 }

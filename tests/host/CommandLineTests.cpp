@@ -245,7 +245,7 @@ TEST(CommandLine, SaysWhatIsWrongWithArguments) {
       {{"render", "--text-size", "tiny", "x.png"}, R"(--text-size: "tiny" is no text size)"},
       {{"render", "out.jpg"}, R"(OUT: "out.jpg" is written as PNG alone: let its name end in .png.)"},
       {{"status", "--now", "today"}, R"(--now: "today" is no ISO date)"},
-      {{"status", "--watch"}, "--watch requires --waybar"},
+      {{"status", "--watch"}, "--watch requires --format waybar, i3bar or line"},
       {{"status", "--config", ""}, "--config: the name of the folder is empty"},
   };
   for (const auto& c : cases) {
@@ -286,7 +286,7 @@ TEST(TerminalRows, TellsLinesOfOneShortNameApart) {
   protocol::SummaryItem summary{.primaryText = "2 Advisories"};
   for (const char* name : {"1, Harbour Line", "1, Airport Bus", "2, Castle Line"})
     summary.artworks.push_back({.text = std::string(name, 1), .accessibilityText = name});
-  const protocol::Snapshot snapshot{.rows = {{.item = summary}}};
+  const protocol::Snapshot snapshot{.listItem = {.summaryItem = summary}};
   EXPECT_EQ(rowsAsText(snapshot, {}), "2 Advisories\n  [1, Harbour Line] [1, Airport Bus] [2]\n");
 }
 
@@ -392,24 +392,27 @@ TEST(CommandLine, PrintsALineForAStatusBar) {
   const Programs programs;
   const auto bar = [&] { return json::parse(programs.run({"status", "--waybar", kNow}).output); };
   programs.setUpCity({}, {});
-  EXPECT_EQ(bar()["class"], "none");
+  EXPECT_EQ(bar()["class"], json{"none"});
   programs.run({"favorite", "add", "city:m1"});
-  EXPECT_EQ(bar()["class"], "good");
+  EXPECT_EQ(bar()["class"], json{"good"});
   programs.publish({{"a", {"m1"}, "Lift <&> \"stairs\"", "On two lines"}});
   json lift = bar();
   EXPECT_THAT(lift["tooltip"].get<std::string>(),
               testing::StartsWith("<b>[1] Lift &lt;&amp;&gt; &quot;stairs&quot;</b>\nOn two lines\n<i>Updated "));
   lift.erase("tooltip");
-  EXPECT_EQ(
-      lift,
-      (json{{"class", "advisories"}, {"alt", "advisories"}, {"text", "[1] Lift &lt;&amp;&gt; &quot;stairs&quot;"}}));
+  EXPECT_EQ(lift, (json{{"class", {"advisories", "new"}},
+                        {"alt", "advisories"},
+                        {"percentage", 0},
+                        {"text", "● [1] Lift &lt;&amp;&gt; &quot;stairs&quot;"}}));
+  EXPECT_EQ(programs.run({"status", "--format", "line", kNow}).output, "● [1] Lift ‹&› \"stairs\"\n");
+  EXPECT_EQ(programs.run({"status", "--format", "line", "--saved", kNow}).output, "[1] Lift ‹&› \"stairs\" (old)\n");
   programs.folder.write("feed/routes.txt", "route_id,agency_id,route_short_name,route_type\nm2,M,2,1\n");
   programs.run({"favorite", "add", "city:m2"});
   programs.publish({});
-  EXPECT_EQ(bar()["class"], "gone");
+  EXPECT_EQ(bar()["class"], json{"gone"});
   EXPECT_THAT(bar()["text"].get<std::string>(), HasSubstr("1 line gone"));
   programs.publish({{"a", {"m2"}, "Works", "Slow."}});
-  EXPECT_EQ(bar()["class"], (json{"advisories", "gone"}));
+  EXPECT_EQ(bar()["class"], (json{"advisories", "gone", "new"}));
   programs.publishBytes("<no feed>");
   EXPECT_EQ(bar()["alt"], "error");
   EXPECT_THAT(bar()["tooltip"].get<std::string>(), AllOf(HasSubstr("alerts.pb"), Not(HasSubstr("<no"))));

@@ -10,8 +10,6 @@
 namespace nimbo {
 namespace {
 
-using nlohmann::json;
-
 TEST(StatusWatch, TriesAgainWhatFails) {
   std::signal(SIGPIPE, SIG_IGN);
   const Programs programs;
@@ -23,15 +21,15 @@ TEST(StatusWatch, TriesAgainWhatFails) {
                                {},
                                {"--config", programs.folder.path() / "config", "--state",
                                 programs.folder.path() / "state", "--virtual-time", isoTextOfDate(Programs::now())}};
-  json shown = json::object();
-  const auto show = [&](const std::string& line) { shown = json::parse(line); };
-  const auto waitFor = [&](const std::string& word) {
-    while (shown.value("class", "") != word) loop.runOnce();
+  BarContent shown;
+  const auto show = [&](const BarContent& content) { shown = content; };
+  const auto waitFor = [&](const std::string& state) {
+    while (shown.state != state) loop.runOnce();
   };
   {
     // A fetch that failed: the widget itself, whose time stands still, does nothing more.
     setenv("NIMBO_TRANSIT_WIDGET", NIMBO_TRANSIT_WIDGET, 1);
-    const StatusWatch watch(context, {}, show);
+    const StatusWatch watch(context, time, {}, show);
     waitFor("error");
     programs.publish({});
     time.advance(2 * RefreshRule::kFirstRetry);
@@ -42,7 +40,7 @@ TEST(StatusWatch, TriesAgainWhatFails) {
   std::filesystem::permissions(talker, std::filesystem::perms::owner_all);
   for (const std::string& program : {std::string("/bin/false"), std::string("/nonexistent"), talker}) {
     setenv("NIMBO_TRANSIT_WIDGET", program.c_str(), 1);
-    const StatusWatch watch(context, {}, show);
+    const StatusWatch watch(context, time, {}, show);
     waitFor("error");
     setenv("NIMBO_TRANSIT_WIDGET", NIMBO_TRANSIT_WIDGET, 1);
     time.advance(StatusWatch::kFirstRestart);

@@ -39,13 +39,13 @@ def main(cmake, build):
 
     for arguments in ["favorite", "list"], ["lines", "red"], ["settings", "get", "x"], ["feed", "check"]:
         assert not loaded(*arguments), f"{arguments} loads {loaded(*arguments)}"
-    bar = run("status", "--waybar", LD_DEBUG="files")  # of both processes
-    assert "4 Advisories" in bar.stdout
-    drawing = [name for name in LIBRARIES.findall(bar.stderr) if name in ("libpango", "libcairo")]
-    assert not drawing, f"a status bar loads {drawing}"
-    assert "libnimbo-images" not in run("status", LD_DEBUG="files").stderr
-    assert "4 Advisories" in run("status").stdout
-    assert without("libnimbo-drawing.so", "status").returncode != 0
+    for arguments in ["--waybar"], [], ["--saved"]:
+        status = run("status", *arguments, LD_DEBUG="files")  # of both processes
+        assert "4 Advisories" in status.stdout
+        drawing = [name for name in LIBRARIES.findall(status.stderr) if name in ("libpango", "libcairo")]
+        assert not drawing, f"status {arguments} loads {drawing}"
+        assert "libnimbo-images" not in status.stderr
+    assert without("libnimbo-drawing.so", "status", "--json").returncode != 0
     without("libnimbo-strings.so", "status")
 
     feed = folder / "feed"

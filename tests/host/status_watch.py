@@ -4,6 +4,7 @@ programs change meanwhile. usage: status_watch.py NIMBO_TRANSIT WIDGET"""
 import json
 import os
 import signal
+import socket
 import subprocess
 import sys
 import tempfile
@@ -48,19 +49,20 @@ with tempfile.TemporaryDirectory() as folder:
     os.chmod(script, 0o700)
     command = [program, "--config", folder, "--state", folder]
 
-    def watch():
-        return subprocess.Popen(command + ["status", "--waybar", "--watch"], stdout=subprocess.PIPE,
+    def watch(output=subprocess.PIPE):
+        return subprocess.Popen(command + ["status", "--waybar", "--watch"], stdout=output,
                                 env=dict(os.environ, NIMBO_TRANSIT_WIDGET=script, TEST_ADVANCES=fifo, LC_ALL="C.UTF-8"))
 
     bar = watch()
     first = json.loads(bar.stdout.readline())
-    assert first["class"] == first["alt"] == "advisories" and "Weavers&apos; Row" in first["tooltip"], first
+    # The machine's clock is far ahead of the widget's.
+    assert first["class"] == ["advisories", "new", "stale"] and first["alt"] == "advisories" and "Weavers&apos; Row" in first["tooltip"], first
     with open(fifo, "wb", buffering=0) as advances:
         for seconds in (b"5400\n", b"1800\n"):  # an incident ends, and another one starts or ends
             before = first
             advances.write(seconds)
             first = json.loads(bar.stdout.readline())
-            assert first != before and set(first) == {"text", "alt", "tooltip", "class"}, first
+            assert first != before and set(first) == {"text", "alt", "tooltip", "class", "percentage"}, first
         bar.send_signal(signal.SIGTERM)
         rest = bar.stdout.read()
         assert bar.wait() == 0 and b"error" not in rest, rest
@@ -70,9 +72,20 @@ with tempfile.TemporaryDirectory() as folder:
     bar = watch()
     with open(fifo, "wb"):
         first = json.loads(bar.stdout.readline())
-        assert first["class"] == first["alt"] == "old" and first["text"].endswith("(old)"), first
+        assert first["class"] == ["old", "stale"] and first["alt"] == "old" and first["text"].endswith("(old)"), first
         bar.stdout.close()
         assert bar.wait() == 0, "a bar without a reader ends by itself"
+    ours, theirs = socket.socketpair()
+    bar = watch(theirs)
+    theirs.close()
+    with open(fifo, "wb"):
+        assert ours.recv(1)
+        ours.close()
+        assert bar.wait() == 0, "so does one whose reader held a socket"
+
+    header, lines = subprocess.run(command + ["status", "--format", "i3bar", "--now", "2026-01-05T12:00:00Z"], check=True,
+                                   capture_output=True, text=True).stdout.split("\n", 1)
+    assert json.loads(header)["version"] == 1 and json.loads(lines)[1][0]["full_text"] == "● 4 Advisories", lines
 
 # What other processes change shows at once: nothing else would make a bar look again before a minute has passed.
 with tempfile.TemporaryDirectory() as folder:

@@ -20,7 +20,7 @@ void deleteCallback(gpointer data) {
 }
 
 gboolean descriptorIsReady(gint, GIOCondition condition, gpointer data) {
-  const bool inError = condition & (G_IO_ERR | G_IO_NVAL);
+  const bool inError = condition & (G_IO_ERR | G_IO_NVAL | G_IO_HUP);
   runGuarded("descriptor callback", [&] { (*static_cast<DescriptorCallback*>(data))(inError); });
   return G_SOURCE_CONTINUE;
 }
@@ -39,7 +39,10 @@ gboolean dispatchWakeable(GSource* source, GSourceFunc callback, gpointer data) 
 }  // namespace
 
 GSourceHandle attachDescriptorSource(GMainContext* context, int fd, Readiness readiness, DescriptorCallback callback) {
-  const int condition = (readiness == Readiness::readable ? G_IO_IN : G_IO_PRI) | G_IO_ERR | G_IO_HUP;
+  const GIOCondition ready = readiness == Readiness::readable   ? G_IO_IN
+                             : readiness == Readiness::writable ? G_IO_OUT
+                                                                : G_IO_PRI;
+  const int condition = ready | G_IO_ERR | G_IO_HUP;
   GSourceHandle source(g_unix_fd_source_new(fd, static_cast<GIOCondition>(condition)));
   g_source_set_callback(source.get(), G_SOURCE_FUNC(descriptorIsReady), new DescriptorCallback(std::move(callback)),
                         deleteCallback<DescriptorCallback>);
@@ -103,6 +106,11 @@ std::shared_ptr<Timer> GLibRunLoop::scheduleTimer(TimeInterval interval, bool re
 
 GSourceHandle GLibRunLoop::watchReadable(int fd, std::function<void()> callback) {
   return attachDescriptorSource(_context.get(), fd, Readiness::readable,
+                                [callback = std::move(callback)](bool) { callback(); });
+}
+
+GSourceHandle GLibRunLoop::watchWritable(int fd, std::function<void()> callback) {
+  return attachDescriptorSource(_context.get(), fd, Readiness::writable,
                                 [callback = std::move(callback)](bool) { callback(); });
 }
 

@@ -16,12 +16,13 @@ namespace nimbo {
 /// What a watched descriptor has to be ready with.
 enum class Readiness {
   readable,  ///< data, or the end of it
+  writable,  ///< room for some data
   urgent     ///< exceptional data (POLLPRI), as kernel files announce events
 };
 
 /// Attaches a source to `context` that calls `callback` for as long as `fd` is ready or in error, and says whether it
-/// is in error. Kernel files tell each event to the first who polls: the callback must not poll again. The descriptor
-/// stays the caller's and outlives the source.
+/// is in error or its other end is gone. Kernel files tell each event to the first who polls: the callback must not
+/// poll again. The descriptor stays the caller's and outlives the source.
 GSourceHandle attachDescriptorSource(GMainContext* context, int fd, Readiness readiness,
                                      std::function<void(bool inError)> callback);
 
@@ -56,6 +57,8 @@ class GLibRunLoop final : public RunLoop {
   /// Calls `callback` on the main thread for as long as `fd` has something to read, is at its end or in error, until
   /// the handle goes. The descriptor stays the caller's and outlives the handle. Main thread only.
   GSourceHandle watchReadable(int fd, std::function<void()> callback);
+  /// The same for as long as it takes something to write.
+  GSourceHandle watchWritable(int fd, std::function<void()> callback);
   /// The same for exceptional conditions (POLLPRI), by which kernel files announce events. Each event is told once, by
   /// the call itself: polling again finds nothing. Told `inError`, the file is gone and nothing else will come of it.
   GSourceHandle watchUrgent(int fd, std::function<void(bool inError)> callback);

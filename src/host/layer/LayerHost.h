@@ -9,7 +9,7 @@
 #include "host/layer/Compositor.h"
 #include "host/layer/LayerArguments.h"
 #include "host/layer/OutputWidget.h"
-#include "host/layer/WindowLauncher.h"
+#include "host/WindowLauncher.h"
 
 namespace nimbo {
 

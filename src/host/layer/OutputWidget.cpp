@@ -169,7 +169,7 @@ void OutputWidget::pressed(LayerSurface::Button button, Point place) {
     case LayerSurface::Button::middle:
       return setExpanded(!_isExpanded);
     case LayerSurface::Button::right:
-      _context.launcher.openPages();
+      _context.launcher.openURL("nimbo://");
   }
 }
 
@@ -228,7 +228,7 @@ void OutputWidget::keyPressed(std::uint32_t code, bool isShifted) {
     case KEY_F5:
       return _process.update();
     case KEY_COMPOSE:
-      _context.launcher.openPages();
+      _context.launcher.openURL("nimbo://");
   }
 }
 

@@ -10,7 +10,7 @@
 #include "host/layer/LayerArguments.h"
 #include "host/layer/LayerSurface.h"
 #include "host/layer/PicturePool.h"
-#include "host/layer/WindowLauncher.h"
+#include "host/WindowLauncher.h"
 
 namespace nimbo {
 

@@ -17,7 +17,8 @@ namespace nimbo {
 namespace {
 
 constexpr std::string_view kOpenErrorDomain = "org.nimbo.Open";
-constexpr std::string_view kActivityHost = "activity", kLineHost = "line", kIncidentHost = "incident";
+constexpr std::string_view kActivityHost = "activity", kLineHost = "line", kIncidentHost = "incident",
+                           kPlannedHost = "planned";
 
 ErrorRef refusal(std::string_view key, const std::string& detail) {
   return Error::errorWithDomain_code_reason(std::string(kOpenErrorDomain), 0,
@@ -117,6 +118,7 @@ Outcome<OpenRequest> openRequestOfURL(std::string_view text) {
     if (const auto [stop, error] = std::from_chars(id->second.data(), end, number); error == std::errc() && stop == end)
       return OpenRequest(ShowIncident{number});
   }
+  if (parts->host == kPlannedHost) return OpenRequest(ShowPlanned());
   if (!parts->host.empty()) return refusal("Window_Open_BadURL", url);
   // Without favourites the widget opens the transit map, whose place here is the lines to choose from.
   if (parts->query.contains("favorites") || parts->query.contains("t")) return OpenRequest(ShowFavorites());

@@ -53,8 +53,8 @@ using OpenRequest = std::variant<ShowWidget, ShowFavorites, ShowFeeds, ShowLine,
 
 /// What a URL of the application's scheme asks for: "nimbo://?favorites=2&t=r" and "nimbo://?t=r" for the favourites,
 /// "nimbo://" for the widget screen, "nimbo://line?id=FEED:ROUTE_ID" for a line, "nimbo://incident?id=NUMBER" for an
-/// incident of the favourites, or a hand-off as "nimbo://activity?type=TYPE&KEY=BASE64", percent-encoded. Errors
-/// tell the user what is wrong with it.
+/// incident of the favourites, "nimbo://planned" for what is to come on them, or a hand-off as
+/// "nimbo://activity?type=TYPE&KEY=BASE64", percent-encoded. Errors tell the user what is wrong with it.
 Outcome<OpenRequest> openRequestOfURL(std::string_view url);
 
 /// What a hand-off activity asks for, from its payload alone.

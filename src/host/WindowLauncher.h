@@ -8,7 +8,7 @@
 
 namespace nimbo {
 
-/// Opens in the window what the widget hands over. Main thread only.
+/// Opens pages of the window, and there what the widget hands over. Main thread only.
 class WindowLauncher {
  public:
   /// `folders` are arguments that give the window the same folders; `tell` hears what the user must be told.
@@ -17,12 +17,10 @@ class WindowLauncher {
 
   /// Answers whether the window was started for it.
   bool open(const WidgetClient::Opening& opening) const;
-  /// The window's first page, which leads to all others.
-  bool openPages() const { return openURL("nimbo://"); }
-
- private:
+  /// The same for an address of the window's scheme: "nimbo://" is its first page, which leads to all others.
   bool openURL(const std::string& url) const;
 
+ private:
   std::vector<std::string> _folders;
   std::function<void(const std::string&)> _tell;
 };

@@ -1,4 +1,4 @@
-#include "host/layer/WindowLauncher.h"
+#include "host/WindowLauncher.h"
 
 #include <glib.h>
 
