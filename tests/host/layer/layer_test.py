@@ -1,75 +1,20 @@
 #!/usr/bin/python3
 """The widget on the desktop as its user has it. usage: layer_test.py faults|sway NIMBO_TRANSIT_LAYER WIDGET COMPOSITOR"""
 import os
-import queue
-import re
 import signal
 import socket
-import struct
 import subprocess
 import sys
-import tempfile
-import threading
-import time
-from contextlib import ExitStack
 
-PATIENCE = 60  # seconds for anything to come true
-LEFT, RIGHT, MIDDLE, TAB, ENTER, ESCAPE = 0x110, 0x111, 0x112, 15, 28, 1
-NOBODY = 65534
+from sway_session import LEFT, MIDDLE, RIGHT, Home, Pointer, Program, wait
+
+TAB, ENTER, ESCAPE = 15, 28, 1
 layer, widget, compositor = sys.argv[2:]
 
 
-def wait(what, condition):
-    deadline = time.monotonic() + PATIENCE
-    while not (answer := condition()):
-        if time.monotonic() > deadline:
-            raise AssertionError(f"waited in vain: {what}")
-        threading.Event().wait(0.02)
-    return answer
-
-
-class Program:
-    """A program with its lines of standard output, or of standard error."""
-
-    def __init__(self, session, *command, errors=False, **options):
-        streams = {"stderr" if errors else "stdout": subprocess.PIPE}
-        self.process = subprocess.Popen(command, stdin=subprocess.PIPE, text=True, bufsize=1, env=session.environment,
-                                        **streams, **options)
-        session.callback(self.process.wait)
-        session.callback(self.process.kill)
-        self.lines = queue.Queue()
-        stream = self.process.stderr if errors else self.process.stdout
-        threading.Thread(target=lambda: [self.lines.put(line.strip()) for line in stream], daemon=True).start()
-
-    def say(self, line):
-        self.process.stdin.write(line + "\n")
-
-    def see(self, pattern):
-        """The next line that holds the pattern; those before are passed over."""
-        seen = []
-        while not seen or not re.search(pattern, seen[-1]):
-            try:
-                seen.append(self.lines.get(timeout=PATIENCE))
-            except queue.Empty:
-                raise AssertionError(f"waited in vain: {pattern}; there was {seen}") from None
-        return seen[-1]
-
-
-class Session(ExitStack):
-    """A home, a log of what the widget is asked, and a program in the window's place that keeps what it is to open."""
-
+class Session(Home):
     def __init__(self):
-        super().__init__()
-        self.folder = self.enter_context(tempfile.TemporaryDirectory())
-        os.chown(self.folder, os.getuid() or NOBODY, -1)
-        for name, script in (("widget", f'tee -a "{self.folder}/requests" | "{widget}" "$@"'),
-                             ("window", f'echo "$@" >>"{self.folder}/opened"')):
-            with open(f"{self.folder}/{name}", "w") as file:
-                file.write("#!/bin/sh\n" + script + "\n")
-            os.chmod(file.name, 0o755)
-        self.environment = {
-            "PATH": os.environ["PATH"], "HOME": self.folder, "XDG_RUNTIME_DIR": self.folder, "LANG": "C.UTF-8",
-            "NIMBO_TRANSIT_WIDGET": f"{self.folder}/widget", "NIMBO_TRANSIT_DESKTOP": f"{self.folder}/window"}
+        super().__init__(widget)
 
     def compositor(self, *without):
         program = Program(self, compositor, *without)
@@ -79,14 +24,6 @@ class Session(ExitStack):
     def layer(self, *arguments):
         folders = ["--config", self.folder, "--state", self.folder]
         return Program(self, layer, *folders, *arguments, errors=True)
-
-    def kept(self, name):
-        path = f"{self.folder}/{name}"
-        return open(path).read() if os.path.exists(path) else ""
-
-    def opened(self, pattern):
-        wait(f"{pattern} opened", lambda: re.search(pattern, self.kept("opened")))
-        os.remove(f"{self.folder}/opened")
 
 
 def try_faults():
@@ -198,64 +135,15 @@ def try_faults():
         assert waiting.process.wait() == 1
 
 
-class Pointer:
-    """A pointer of the tests' own: the few messages of zwlr_virtual_pointer_v1 that a click takes, as they are sent."""
-
-    def __init__(self, path):
-        self.socket = socket.socket(socket.AF_UNIX)
-        self.socket.connect(path)
-        self.send(1, 1, 2)  # wl_display.get_registry
-        self.send(1, 0, 3)  # wl_display.sync
-        globals_, received = {}, b""
-        while 3 not in globals_:
-            received += self.socket.recv(65536)
-            while len(received) >= 8 and len(received) >= (size := struct.unpack_from("=I", received, 4)[0] >> 16):
-                sender, words = struct.unpack_from("=I", received)[0], received[8:size]
-                if sender == 2:
-                    name, length = struct.unpack_from("=II", words)
-                    globals_[words[8:8 + length - 1].decode()] = name
-                globals_[sender] = True
-                received = received[size:]
-        interface = b"zwlr_virtual_pointer_manager_v1\0"
-        self.send(2, 0, globals_[interface[:-1].decode()], len(interface), interface, 1, 4)  # wl_registry.bind
-        self.send(4, 0, 0, 5)  # create_virtual_pointer, for any seat
-
-    def send(self, sender, request, *arguments):
-        body = b"".join(a + bytes(-len(a) % 4) if isinstance(a, bytes) else struct.pack("=I", a) for a in arguments)
-        self.socket.sendall(struct.pack("=II", sender, (len(body) + 8) << 16 | request) + body)
-
-    def click(self, x, y, width, height):
-        for request, *arguments in ((1, 0, x, y, width, height), (4,), (2, 0, LEFT, 1), (4,), (2, 0, LEFT, 0), (4,)):
-            self.send(5, request, *arguments)
-
-
 def try_sway():
     with Session() as session:
-        session.environment |= {"WLR_BACKENDS": "headless", "WLR_RENDERER": "pixman", "WLR_HEADLESS_OUTPUTS": "2",
-                                "WLR_LIBINPUT_NO_DEVICES": "1", "SWAYSOCK": f"{session.folder}/sway.sock"}
-        with open(f"{session.folder}/config", "w") as config:
-            config.write("xwayland disable\noutput HEADLESS-1 resolution 800x600 position 0 0 scale 1\n"
-                         "output HEADLESS-2 resolution 1600x1200 position 800 0 scale 2\n")
-
         def sway():
-            # It refuses to be root.
-            somebody = {"user": NOBODY, "group": NOBODY, "extra_groups": []} if os.getuid() == 0 else {}
-            started = Program(session, "sway", "-c", config.name, stderr=subprocess.DEVNULL, **somebody)
-            for path in ("wayland-1", "sway.sock"):
-                wait(path, lambda: os.path.exists(f"{session.folder}/{path}"))
-            return started
-
-        def picture(output):
-            """Width, height and pixels of an output."""
-            taken = subprocess.run(["grim", "-t", "ppm", "-o", output, "-"], env=session.environment, capture_output=True)
-            if taken.returncode != 0:
-                return 0, 0, b""
-            _, width, height, _, pixels = re.fullmatch(rb"(P6)\s(\d+)\s(\d+)\s(\d+)\s(.*)", taken.stdout, re.S).groups()
-            return int(width), int(height), pixels
+            return session.sway("output HEADLESS-1 resolution 800x600 position 0 0 scale 1",
+                                "output HEADLESS-2 resolution 1600x1200 position 800 0 scale 2")
 
         def is_shown(output, scale, heights):
             """Whether the widget stands at the top right, so high, and is not blank."""
-            width, _, pixels = picture(output)
+            width, _, pixels = session.picture(output)
             if not width:
                 return False
 
@@ -269,7 +157,6 @@ def try_sway():
             return edges and high in heights and len(row) > 4 and high
 
         compositor_ = sway()
-        session.environment["WAYLAND_DISPLAY"] = "wayland-1"
         pointer = Pointer(f"{session.folder}/wayland-1")
         host = session.layer(*(word for number in "123" for word in ("--output", f"HEADLESS-{number}")))
         host.see("waiting for the output HEADLESS-3; there are: HEADLESS-1, HEADLESS-2")
@@ -285,8 +172,6 @@ def try_sway():
 
         compositor_.process.kill()
         compositor_.process.wait()
-        for path in ("wayland-1", "sway.sock"):
-            os.remove(f"{session.folder}/{path}")
         host.see("the compositor is gone; looking")
         sway()
         for output, scale in screens:
