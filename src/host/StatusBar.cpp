@@ -47,7 +47,8 @@ class BarSession {
     _watch.setLinesObserver([this](const protocol::Lines& lines) { notify(lines); });
     for (const int signal : {SIGTERM, SIGINT}) _signals.push_back(quitOnSignal(context.runLoop, signal));
     if (!format.takesClicks) return;
-    _signals.push_back(onSignal(kBarHiddenSignal, [this] { _watch.setVisible(false); }));
+    // Who is told of incidents on the desktop is told of them behind a window too.
+    _signals.push_back(onSignal(kBarHiddenSignal, [this, notifies] { _watch.setVisible(notifies); }));
     _signals.push_back(onSignal(kBarShownSignal, [this] { _watch.setVisible(true); }));
     _clicks.emplace(context.runLoop, STDIN_FILENO, [this](int button) { click(button); });
   }
