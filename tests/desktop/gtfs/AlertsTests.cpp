@@ -383,6 +383,7 @@ TEST(Incident, ConcernsRidersByItsDetailBeforeItsEffect) {
   EXPECT_EQ(concern(alert("a", "T", route("t1") + lift) + alert("b", "T", route("t1") + delay)), AlertConcern::delays);
   EXPECT_EQ(concern(alert("a", "T", route("t1") + lift + "severity_level: 4")), AlertConcern::other);
   EXPECT_EQ(concern(alert("a", "T", route("t1") + lift)), AlertConcern::none);
+  EXPECT_EQ(concern(alert("a", "T", route("t1") + "effect: 5 severity_level: 4")), AlertConcern::additionalService);
 }
 
 }  // namespace

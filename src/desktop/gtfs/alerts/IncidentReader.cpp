@@ -320,8 +320,9 @@ class IncidentBuilder {
     fields.effect = incident.effect;
     fields.cause = incident.cause;
     fields.severity = incident.severity;
-    fields.concern =
-        incident.severity == kSeveritySevere ? std::max(incident.concern, AlertConcern::other) : incident.concern;
+    fields.concern = incident.concern;
+    if (fields.concern == AlertConcern::none && fields.severity == kSeveritySevere)
+      fields.concern = AlertConcern::other;
     fields.image = incident.image;
     for (const auto& [place, onLine] : incident.lines)
       fields.affectedEntities.push_back(std::make_shared<const BasicAffectedEntity>(_query.lines[place].muid));
