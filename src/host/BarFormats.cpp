@@ -1,6 +1,5 @@
 #include "host/BarFormats.h"
 
-#include <csignal>
 #include <nlohmann/json.hpp>
 
 #include "host/TerminalText.h"
@@ -10,8 +9,6 @@ namespace nimbo {
 using nlohmann::json;
 
 namespace {
-
-static_assert(kBarHiddenSignal == SIGUSR1 && kBarShownSignal == SIGUSR2, "the header of i3bar's protocol names them");
 
 /// `text` for a bar that may take some of it for an order: polybar's "%{", tmux's "#{", and what genmon and Pango find
 /// between angle brackets.
@@ -72,14 +69,15 @@ std::string i3barLine(const BarContent& content) {
   return "," + printableJSON(json::array({block}).dump());
 }
 
-constexpr BarFormat kFormats[] = {
-    {.name = "waybar", .write = waybarLine},
-    {.name = "i3bar",
-     .write = i3barLine,
-     .beginning = "{\"version\":1,\"click_events\":true,\"stop_signal\":10,\"cont_signal\":12}\n[[]\n",
-     .end = "]\n",
-     .takesClicks = true},
-    {.name = "line", .write = plainLine}};
+// Bars stop who writes to them while they are hidden, by the signal that the header names: none, since the desktop is
+// told of incidents all the same.
+constexpr BarFormat kFormats[] = {{.name = "waybar", .write = waybarLine},
+                                  {.name = "i3bar",
+                                   .write = i3barLine,
+                                   .beginning = "{\"version\":1,\"click_events\":true,\"stop_signal\":0}\n[[]\n",
+                                   .end = "]\n",
+                                   .takesClicks = true},
+                                  {.name = "line", .write = plainLine}};
 
 }  // namespace
 

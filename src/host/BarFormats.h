@@ -17,9 +17,6 @@ struct BarFormat {
   bool takesClicks = false;    ///< whether its bar writes click events to the standard input
 };
 
-/// The signals by which a bar of i3bar's protocol tells that it is hidden and that it is shown again.
-inline constexpr int kBarHiddenSignal = 10, kBarShownSignal = 12;  // SIGUSR1, SIGUSR2
-
 /// The blocks' name in i3bar's protocol, by which click events are known.
 inline constexpr std::string_view kBarBlockName = "nimbo-transit";
 

@@ -46,11 +46,7 @@ class BarSession {
     _output.begin(format.beginning);
     _watch.setLinesObserver([this](const protocol::Lines& lines) { notify(lines); });
     for (const int signal : {SIGTERM, SIGINT}) _signals.push_back(quitOnSignal(context.runLoop, signal));
-    if (!format.takesClicks) return;
-    // Who is told of incidents on the desktop is told of them behind a window too.
-    _signals.push_back(onSignal(kBarHiddenSignal, [this, notifies] { _watch.setVisible(notifies); }));
-    _signals.push_back(onSignal(kBarShownSignal, [this] { _watch.setVisible(true); }));
-    _clicks.emplace(context.runLoop, STDIN_FILENO, [this](int button) { click(button); });
+    if (format.takesClicks) _clicks.emplace(context.runLoop, STDIN_FILENO, [this](int button) { click(button); });
   }
   ~BarSession() {
     if (_told) _told->invalidate();

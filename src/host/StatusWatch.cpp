@@ -17,25 +17,8 @@ StatusWatch::StatusWatch(const CommandContext& context, const Clock& clock, Widg
 
 StatusWatch::~StatusWatch() {
   for (auto* timer : {&_restart, &_stale}) cancel(*timer);
+  if (!_widget) return;
   // The process does what it was asked before it finds its input closed.
-  if (_widget && _isVisible) disappear();
-}
-
-void StatusWatch::setVisible(bool visible) {
-  if (std::exchange(_isVisible, visible) == visible || !_widget) return;
-  if (visible) return appear();
-  _refresh.setOnScreen(false);
-  cancel(_stale);
-  disappear();
-}
-
-void StatusWatch::appear() {
-  for (const auto& step : {protocol::kViewWillAppear, protocol::kViewDidAppear}) _widget->ask(step);
-  _refresh.setOnScreen(true);
-  look();
-}
-
-void StatusWatch::disappear() {
   _widget->ask(protocol::kViewWillDisappear);
   _widget->ask(protocol::kViewDidDisappear);
 }
@@ -59,8 +42,10 @@ void StatusWatch::start() {
                                  [this](const json&, const JSONRPCResponder&) { _refresh.askNow(); });
   client.setNoticeHandler(_context.tell);
   _widget->ask(protocol::kInitialize, initializationOf(_presentation));
-  _widget->ask(protocol::kLoadView);
-  if (_isVisible) appear();
+  for (const auto& step : {protocol::kLoadView, protocol::kViewWillAppear, protocol::kViewDidAppear})
+    _widget->ask(step);
+  _refresh.setOnScreen(true);
+  look();
 }
 
 void StatusWatch::markSeen() {
@@ -90,7 +75,6 @@ void StatusWatch::look() {
 }
 
 void StatusWatch::showSnapshot(const protocol::Snapshot& snapshot) {
-  if (!_isVisible) return;
   const Date now = _clock.now();
   const auto content = barContentOf(snapshot, _lines, now);
   if (content) _show(*content);

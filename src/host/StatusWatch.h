@@ -30,8 +30,6 @@ class StatusWatch {
   StatusWatch(const StatusWatch&) = delete;
   StatusWatch& operator=(const StatusWatch&) = delete;
 
-  /// Whether the bar can be seen, as it can at first: a widget that cannot fetches nothing.
-  void setVisible(bool visible);
   /// Marks the incidents in force that were told last as seen.
   void markSeen();
 
@@ -42,8 +40,6 @@ class StatusWatch {
   void start();
   void update(TimeInterval maxAge);
   void look();
-  void appear();
-  void disappear();
   void showSnapshot(const protocol::Snapshot& snapshot);
   /// Another process follows later.
   void restartAfter(const std::string& failure);
@@ -54,8 +50,7 @@ class StatusWatch {
   WidgetPresentation _presentation;
   Show _show;
   std::function<void(const protocol::Lines&)> _linesObserver;  // null: nobody asks
-  bool _isVisible = true;
-  protocol::Lines _lines;  // as the widget told last
+  protocol::Lines _lines;                                      // as the widget told last
   Backoff _restarts{kFirstRestart, kLongestRestart};
   std::shared_ptr<Timer> _restart;
   std::shared_ptr<Timer> _stale;  // when the rows become old

@@ -7,6 +7,7 @@
 
 #include "desktop/drawing/DrawingPart.h"
 #include "host/Commands.h"
+#include "host/HostPlatform.h"
 #include "host/LineStatus.h"
 #include "host/OnScreenWidget.h"
 #include "host/ProgressLine.h"

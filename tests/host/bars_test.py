@@ -90,12 +90,6 @@ def try_swaybar(session):
     pointer.click(WIDTH - 40, BAR // 2, WIDTH, HEIGHT, MIDDLE)
     pointer.click(WIDTH // 2, HEIGHT // 2, WIDTH, HEIGHT)  # out of the picture
     shows(session, take, block("4 Advisories", color="#ffb000"))
-
-    # Out of sight nothing is fetched.
-    os.truncate(f"{session.folder}/requests", 0)
-    for mode, step in (("invisible", "viewDidDisappear"), ("dock", "viewDidAppear")):
-        subprocess.run(["swaymsg", "bar", "shown", "mode", mode], env=session.environment, check=True, capture_output=True)
-        wait(step, lambda: step in session.kept("requests"))
     return take, block("Good Service"), bars[0]
 
 
