@@ -408,7 +408,8 @@ void WidgetProcess::keepLines() {
         incident.url.reset();
       }
   }
-  lines.updated = now;
+  // Answers that were there are as old as the oldest of them.
+  if (!_platform->transitLines().tookShared()) lines.updated = now;
   const std::string text = protocol::write(lines).dump(-1, ' ', false, json::error_handler_t::replace);
   _keptLines = std::move(items);
   _keptLinesAt = now;

@@ -33,22 +33,22 @@ protocol::Lines savedLines(HostPlatform& platform) {
 }
 
 /// How a line ran at `updated`, as it can be told of `now`.
-std::string textOfSavedState(protocol::LineReport line, std::optional<Date> updated, Date now, const DateText& dates) {
-  if (line.state == protocol::LineState::unknown || !updated) return textOfState(line);
+std::string textOfSavedState(protocol::LineReport line, Date updated, Date now, const DateText& dates) {
+  if (line.state == protocol::LineState::unknown) return textOfState(line);
   const bool wasGood = line.state == protocol::LineState::good;
   const auto begun = [now](const protocol::LineIncident& incident) { return !incident.from || *incident.from <= now; };
   std::copy_if(line.planned.begin(), line.planned.end(), std::back_inserter(line.incidents), begun);
   std::erase_if(line.incidents, [now](const auto& incident) { return incident.until && *incident.until < now; });
-  const TimeInterval age = intervalBetween(*updated, now);
+  const TimeInterval age = intervalBetween(updated, now);
   const bool isFresh = age >= 0 && age <= kFreshFor;
   if (line.incidents.empty()) {
     // Where all incidents have ended, others may have come since.
     if (isFresh && wasGood) return textOfState(line);
-    return LocalizedFormat(LocalizedString("Window_Line_Old"), {dates.textOf(*updated)});
+    return LocalizedFormat(LocalizedString("Window_Line_Old"), {dates.textOf(updated)});
   }
   line.state = protocol::LineState::affected;
   if (isFresh) return textOfState(line);
-  return textOfState(line) + " · " + LocalizedFormat(LocalizedString("Window_Updated"), {dates.textOf(*updated)});
+  return textOfState(line) + " · " + LocalizedFormat(LocalizedString("Window_Updated"), {dates.textOf(updated)});
 }
 
 }  // namespace
@@ -58,7 +58,8 @@ std::vector<KnownLine> knownFavorites(HostPlatform& platform, const std::string&
   if (!favorites) return {};
   const protocol::Lines saved = savedLines(platform);
   std::map<std::string, const protocol::LineReport*> reports;
-  for (const protocol::LineReport& report : saved.lines) reports.emplace(report.id, &report);
+  if (saved.updated)
+    for (const protocol::LineReport& report : saved.lines) reports.emplace(report.id, &report);
   const protocol::LineReport notAsked{
       .reason = protocol::FetchError{std::string(kTransitLineServiceErrorDomain),
                                      static_cast<std::int64_t>(TransitLineServiceError::notAsked),
@@ -76,9 +77,9 @@ std::vector<KnownLine> knownFavorites(HostPlatform& platform, const std::string&
     if (locator && locator->feed == kSampleFeedName) continue;
     const std::string id = writtenNameOfLine(*line.identifier());
     const auto report = reports.find(id);
-    lines.push_back(
-        {id, nameOfLine(line), systemNameOfLine(line),
-         textOfSavedState(report == reports.end() ? notAsked : *report->second, saved.updated, now, dates)});
+    lines.push_back({id, nameOfLine(line), systemNameOfLine(line),
+                     textOfSavedState(report == reports.end() ? notAsked : *report->second, saved.updated.value_or(now),
+                                      now, dates)});
   }
   return lines;
 }

@@ -487,6 +487,7 @@ def bus(session, folder):
     for change, told in (
             (lambda kept: kept | {"updated": at(-3600)}, "Not known any more; last looked up .* / 1 incident · Updated "),
             (lambda kept: kept | {"updated": at(3600)}, "Not known any more; .* / 1 incident · Updated "),
+            (lambda kept: kept | {"updated": None}, "Not known: .* / Not known: "),
             (lambda kept: kept["lines"][0]["incidents"][0].update(until=at(-60)), "Good Service / Not known any more"),
             (lambda kept: kept["lines"][1]["planned"].append(kept["lines"][0]["incidents"][0] | {"from": at(-60)}),
              "1 incident / 1 incident"),

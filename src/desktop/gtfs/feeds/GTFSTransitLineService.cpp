@@ -324,7 +324,7 @@ void GTFSTransitLineService::lookup(const std::vector<MapItemIdentifierRef>& ide
         std::string("Cannot look the lines up: ") + failure.what() + ". Close some programs and try again.");
     {
       const std::lock_guard guard(_shared->lock);
-      _shared->verdicts = verdictsOf(identifiers, {}, error);
+      _shared->setVerdicts(verdictsOf(identifiers, {}, error));
     }
     Platform::current().mainRunLoop().dispatchAsync([serviceStop = _stop.get_token(), handler, error] {
       if (!serviceStop.stop_requested()) handler({}, error);
