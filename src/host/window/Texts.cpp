@@ -5,6 +5,7 @@
 #include "desktop/store/StateDatabaseFile.h"
 #include "desktop/system/AtomicFile.h"
 #include "host/FeedAnswers.h"
+#include "host/notices/NoticeError.h"
 #include "platform/Localization.h"
 #include "platform/foundation/Log.h"
 #include "platform/transit/IncidentStringProvider.h"
@@ -150,6 +151,7 @@ const char* keyOfError(const Error& error) {
     return keyOfCode(static_cast<TransitLineServiceError>(error.code()));
   if (error.domain() == kFavoritesErrorDomain) return keyOfCode(static_cast<FavoritesError>(error.code()));
   if (error.domain() == kStateDatabaseErrorDomain) return keyOfCode(static_cast<StateDatabaseError>(error.code()));
+  if (error.domain() == kNoticeErrorDomain) return "Window_Error_Notices";
   return error.domain() == kFileErrorDomain ? "Window_Error_Unwritable" : nullptr;
 }
 
