@@ -111,11 +111,11 @@ int runDecode(const CommandContext& context, const std::string& file);
 
 struct StatusOptions {
   bool expanded = false;
-  bool json = false;               ///< the snapshot of docs/protocol.md instead of text
-  bool lines = false;              ///< each favourite line with its state, instead of the rows
-  bool planned = false;            ///< what is to come within seven days, instead of the rows
-  bool saved = false;              ///< the rows of the last time, without a fetch
-  bool exitCode = false;           ///< the exit status tells the state
+  bool json = false;      ///< the snapshot of docs/protocol.md instead of text
+  bool lines = false;     ///< each favourite line with its state, instead of the rows
+  bool planned = false;   ///< what is to come within seven days, instead of the rows
+  bool saved = false;     ///< the rows of the last time, without a fetch
+  bool exitCode = false;  ///< the exit status tells the state
   /// "json": the state of each favourite line as docs/formats.md has it; a bar's format is no concern of `runStatus`.
   std::string format = "text";
   std::optional<std::string> now;  ///< ISO date by which incidents are judged

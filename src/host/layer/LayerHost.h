@@ -6,10 +6,10 @@
 #include "desktop/system/SystemClock.h"
 #include "host/ColorSchemePortal.h"
 #include "host/Commands.h"
+#include "host/WindowLauncher.h"
 #include "host/layer/Compositor.h"
 #include "host/layer/LayerArguments.h"
 #include "host/layer/OutputWidget.h"
-#include "host/WindowLauncher.h"
 
 namespace nimbo {
 

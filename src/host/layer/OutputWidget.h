@@ -7,10 +7,10 @@
 #include <vector>
 
 #include "host/WidgetHostProcess.h"
+#include "host/WindowLauncher.h"
 #include "host/layer/LayerArguments.h"
 #include "host/layer/LayerSurface.h"
 #include "host/layer/PicturePool.h"
-#include "host/WindowLauncher.h"
 
 namespace nimbo {
 
