@@ -50,8 +50,7 @@ ErrorRef noticeError(NoticeError code, const std::string& detail) {
 
 NoticeCompletion answeredWithin(RunLoop& runLoop, TimeInterval limit, NoticeCompletion completion) {
   return [state = std::make_shared<AnswerLimit>(runLoop, limit, std::move(completion))](const ErrorRef& error) {
-    const auto keep = state;
-    keep->answer(error);
+    std::shared_ptr(state)->answer(error);  // which may be the last that holds this function
   };
 }
 

@@ -223,6 +223,7 @@ class Decision {
       return std::pair(one->severity, one->concern) > std::pair(other->severity, other->concern);
     });
     std::vector<IncidentOnLines> result;
+    result.reserve(told.size());
     for (const ToldIncident* one : told) result.push_back(asTold(*one));
     return result;
   }
