@@ -91,7 +91,7 @@ with tempfile.TemporaryDirectory() as folder, Session(folder) as session:
     def title_of():
         return xdotool("getwindowname", xdotool("search", "--onlyvisible", "--pid", str(window.pid)))
 
-    see_title("Nimbo Transit – 1 new")
+    see_title("1 new – Nimbo Transit")
     press("windowfocus", xdotool("search", "--onlyvisible", "--pid", str(window.pid)))
     publish_and_ask(before)
     assert not service.shown, ("what ran before", service.shown)
@@ -101,7 +101,7 @@ with tempfile.TemporaryDirectory() as folder, Session(folder) as session:
     told = service.see("1, 2, 3: Signals fail")
     assert len(service.shown) == 1, service.shown
     assert service.standing[told]["hints"]["urgency"] == 1 and "Significant delays" in service.standing[told]["body"]
-    see_title("Nimbo Transit – 2 new")
+    see_title("2 new – Nimbo Transit")
 
     signals = ("b", "Signals fail at the harbour", ["m1", "m2", "m3"], 3)
     publish_and_ask(before, signals)
@@ -114,7 +114,7 @@ with tempfile.TemporaryDirectory() as folder, Session(folder) as session:
     wait("that it was seen", lambda: not incidents()["Signals fail at the harbour"]["new"])
     assert incidents()["Stairs are wet"]["new"]
     press("key", "Escape")
-    see_title("Nimbo Transit – 1 new")
+    see_title("1 new – Nimbo Transit")
 
     publish_and_ask(before)
     over = service.see("1 incident has ended")

@@ -101,7 +101,7 @@ class Window:
 
     def see_page(self, title):
         wait(f"the page {title}",
-             lambda: self.frame() and re.fullmatch(title + "( – .* new)?", self.frame().get_name()))
+             lambda: self.frame() and re.fullmatch("(.* new – )?" + title, self.frame().get_name()))
 
     def box(self, name, role):
         return self.see(name, role).get_extents(Atspi.CoordType.WINDOW)

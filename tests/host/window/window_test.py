@@ -133,7 +133,7 @@ def tour(session, folder):
     window.click("Not Now")
     wait("no question any more", lambda: not window.find("Do you want to be told"))
     assert subprocess.run([command_line, "settings", "get", "notify"], capture_output=True).stdout == b"off\n"
-    wait("what is new", lambda: window.frame().get_name() == "Nimbo Transit – 4 new")
+    wait("what is new", lambda: window.frame().get_name() == "4 new – Nimbo Transit")
     window.click("4 Advisories")
     for text in "Incidents", "Signals fail", "Music plays", "^As of ":
         window.see(text)
