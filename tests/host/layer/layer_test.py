@@ -5,8 +5,13 @@ import signal
 import socket
 import subprocess
 import sys
+import threading
 
+from gi.repository import GLib
 from sway_session import LEFT, MIDDLE, RIGHT, Home, Pointer, Program, wait
+
+sys.path.insert(0, f"{os.path.dirname(os.path.abspath(__file__))}/../../support")
+from notifications import Service, start_bus  # noqa: E402
 
 TAB, ENTER, ESCAPE = 15, 28, 1
 layer, widget, compositor = sys.argv[2:]
@@ -24,6 +29,24 @@ class Session(Home):
     def layer(self, *arguments):
         folders = ["--config", self.folder, "--state", self.folder]
         return Program(self, layer, *folders, *arguments, errors=True)
+
+
+class Portal(Service):
+    """The desktop's, of a user who wants it dark. Source: XDG Desktop Portal, org.freedesktop.portal.Settings."""
+
+    def __init__(self, address):
+        super().__init__(address, "org.freedesktop.portal.Desktop", "/org/freedesktop/portal/desktop",
+                         """<interface name="org.freedesktop.portal.Settings"><method name="Read">
+                         <arg type="s" direction="in"/><arg type="s" direction="in"/><arg type="v" direction="out"/>
+                         </method></interface>""")
+
+    def Read(self, invocation, namespace, key):
+        assert (namespace, key) == ("org.freedesktop.appearance", "color-scheme")
+        invocation.return_value(GLib.Variant("(v)", (GLib.Variant("v", GLib.Variant("u", 1)),)))
+
+    def prefer(self, scheme):
+        self.bus.emit_signal(None, self.path, "org.freedesktop.portal.Settings", "SettingChanged", GLib.Variant(
+            "(ssv)", ("org.freedesktop.appearance", "color-scheme", GLib.Variant("u", scheme))))
 
 
 def try_faults():
@@ -131,6 +154,16 @@ def try_faults():
         for program in (host, other):
             program.process.send_signal(signal.SIGTERM)
             assert program.process.wait() == 0
+        bus, session.environment["DBUS_SESSION_BUS_ADDRESS"] = start_bus(f"{session.folder}/bus")
+        session.callback(bus.wait), session.callback(bus.kill)
+        portal = Portal(session.environment["DBUS_SESSION_BUS_ADDRESS"])
+        threading.Thread(target=GLib.MainLoop().run, daemon=True).start()
+        session.layer()
+        for scheme, row in ((2, "1e1e20"), (1, "f6f6f8"), (0, "1e1e20")):
+            screen.see(f"shown 539x165 .* row #{row}")
+            portal.prefer(scheme)
+        screen.see("shown 539x165 .* row #f6f6f8")
+
         waiting.see("the compositor does not answer")
         assert waiting.process.wait() == 1
 
