@@ -21,13 +21,13 @@ using protocol::FetchResult;
 using protocol::LineState;
 using testing::ElementsAre;
 
-const Date kNow = *dateFromISOText("2026-01-05T12:00:00Z");
+const Date kBarTime = *dateFromISOText("2026-01-05T12:00:00Z");
 
 protocol::Snapshot snapshotOf(std::optional<FetchResult> result, bool isAffected, TimeInterval age = 60) {
   protocol::TransitItem row{.primaryText = isAffected ? "Works" : "Good service", .artwork = protocol::Artwork()};
   row.openable.emplace();
   if (!isAffected) row.openable->url = "nimbo://";
-  return {.result = result, .listItem = {.summaryItem = row}, .updated = dateByAdding(kNow, -age)};
+  return {.result = result, .listItem = {.summaryItem = row}, .updated = dateByAdding(kBarTime, -age)};
 }
 
 protocol::Lines linesOf(const std::vector<LineState>& states, bool isNew = true) {
@@ -41,7 +41,7 @@ protocol::Lines linesOf(const std::vector<LineState>& states, bool isNew = true)
 
 /// What Waybar is told, but for the tooltip, and whether an i3bar block is urgent.
 std::string toldOf(const protocol::Snapshot& snapshot, const protocol::Lines& lines) {
-  const auto content = barContentOf(snapshot, lines, kNow);
+  const auto content = barContentOf(snapshot, lines, kBarTime);
   if (!content) return "nothing";
   json line = json::parse(barFormatNamed("waybar")->write(*content));
   const json block = json::parse(barFormatNamed("i3bar")->write(*content).substr(1))[0];
@@ -100,7 +100,7 @@ void turn(GLibRunLoop& loop) {
 }
 
 TEST(Bars, SendClicksAndWhateverElse) {
-  VirtualTime time(kNow);
+  VirtualTime time(kBarTime);
   GLibRunLoop loop(&time);
   Pipe pipe;
   std::vector<int> buttons;
