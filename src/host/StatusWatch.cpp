@@ -61,16 +61,17 @@ void StatusWatch::markSeen() {
 void StatusWatch::update(TimeInterval maxAge) {
   _widget->ask(protocol::kPerformUpdate, {maxAge}, [this](const protocol::UpdateResult& result) {
     _refresh.answered(result);
-    look();
+    if (result.updateResult == WidgetUpdateResult::Failed) look();  // others are told by `updated`
   });
 }
 
 void StatusWatch::look() {
   // More favorites than an answer has room for are no fault of the process.
-  _widget->call(protocol::kLines, {}, [this](const std::optional<protocol::Lines>& lines, const auto&) {
-    _lines = lines.value_or(protocol::Lines());
-    if (lines && _linesObserver) _linesObserver(*lines);
-  });
+  _widget->call(protocol::kLines, {.texts = _linesObserver != nullptr},
+                [this](const std::optional<protocol::Lines>& lines, const auto&) {
+                  _lines = lines.value_or(protocol::Lines());
+                  if (lines && _linesObserver) _linesObserver(*lines);
+                });
   _widget->ask(protocol::kSnapshot, {.rows = false}, [this](const auto& snapshot) { showSnapshot(snapshot); });
 }
 

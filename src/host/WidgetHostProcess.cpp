@@ -234,7 +234,7 @@ void WidgetHostProcess::askForContent() {
 }
 
 void WidgetHostProcess::askForLines(std::function<void(const protocol::Lines&)> completion) {
-  _widget->call(protocol::kLines, protocol::Nothing(),
+  _widget->call(protocol::kLines, protocol::LinesParams(),
                 [completion = std::move(completion)](const std::optional<protocol::Lines>& lines, const auto& error) {
                   // More favorites than an answer has room for are no fault of the process.
                   if (error.code != JSONRPCError::kConnectionClosed) completion(lines.value_or(protocol::Lines()));

@@ -72,7 +72,7 @@ std::uint64_t digestOf(const protocol::LineIncident& incident) {
 class Reports {
  public:
   /// `unseen` has the numbers of those that are new; absent: all are.
-  explicit Reports(std::optional<std::set<std::uint64_t>> unseen) : _unseen(std::move(unseen)) {}
+  Reports(std::optional<std::set<std::uint64_t>> unseen, bool texts) : _unseen(std::move(unseen)), _texts(texts) {}
   bool isCut() const { return _isCut; }
 
   void addVerdict(protocol::LineReport& report, const LineVerdict& verdict) {
@@ -100,6 +100,10 @@ class Reports {
  private:
   void add(std::vector<protocol::LineIncident>& list, const TransitIncident& incident) {
     protocol::LineIncident written = lineIncidentOf(incident);
+    if (!_texts) {
+      written.title.clear();
+      for (auto* text : {&written.text, &written.url, &written.imageText}) text->reset();
+    }
     constexpr std::size_t kFrame = 300;  // keys and dates
     const std::size_t size = kFrame + written.title.size() + written.text.value_or("").size() +
                              written.url.value_or("").size() + written.imageText.value_or("").size();
@@ -114,6 +118,7 @@ class Reports {
 
   const Date _now = currentDate();
   const std::optional<std::set<std::uint64_t>> _unseen;
+  const bool _texts;
   std::size_t _room = kRoomForIncidents;
   bool _isCut = false;
 };
@@ -149,8 +154,8 @@ std::map<std::uint64_t, IncidentForm> incidentForms(const GTFSTransitLineService
   return forms;
 }
 
-protocol::Lines lineReports(const FavoritesEditor& editor, const GTFSTransitLineService& service,
-                            const SeenForms& seen) {
+protocol::Lines lineReports(const FavoritesEditor& editor, const GTFSTransitLineService& service, const SeenForms& seen,
+                            bool texts) {
   protocol::Lines result{.updated = service.updatedAt(), .asked = service.askedAt()};
   const auto favorites = editor.left();
   const ErrorRef damage = favorites ? editor.list().error() : favorites.error();
@@ -162,7 +167,7 @@ protocol::Lines lineReports(const FavoritesEditor& editor, const GTFSTransitLine
   const ErrorRef notAsked = damage ? damage
                                    : transitLineServiceError(TransitLineServiceError::notAsked,
                                                              "The line has not been looked up yet. Update to see it.");
-  Reports reports(unseenOf(service, seen));
+  Reports reports(unseenOf(service, seen), texts);
   for (const FavoriteRef& favorite : *favorites) {
     const auto* kept = dynamic_cast<const FavoriteTransitLine*>(favorite.get());
     if (!kept || !kept->transitLine()) continue;

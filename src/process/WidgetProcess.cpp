@@ -352,11 +352,11 @@ protocol::Snapshot WidgetProcess::snapshot(const protocol::SnapshotParams& param
   return snapshot;
 }
 
-protocol::Lines WidgetProcess::lines(const Nothing&) {
+protocol::Lines WidgetProcess::lines(const protocol::LinesParams& params) {
   if (!_controller) throw JSONRPCFailure(JSONRPCError::kInvalidState, "lines needs \"initialize\" first");
   // What was seen cannot be read: everything is new, and whoever writes hears why.
   const auto seen = SeenIncidents(_platform->database()).list();
-  return lineReports(_platform->favoritesEditor(), _platform->transitLines(), seen ? *seen : SeenForms());
+  return lineReports(_platform->favoritesEditor(), _platform->transitLines(), seen ? *seen : SeenForms(), params.texts);
 }
 
 protocol::Kept WidgetProcess::markSeen(const protocol::MarkSeenParams& params) {
@@ -398,15 +398,12 @@ void WidgetProcess::keepLines() {
   const Date now = currentDate();
   const TimeInterval age = intervalBetween(_keptLinesAt, now);
   if (items == _keptLines && age >= 0 && age < kKeepLinesAgain) return;
-  protocol::Lines lines = lineReports(_platform->favoritesEditor(), _platform->transitLines(), SeenForms());
+  protocol::Lines lines = lineReports(_platform->favoritesEditor(), _platform->transitLines(), SeenForms(), false);
   for (protocol::LineReport& line : lines.lines) {
     line.shield.reset();
     for (auto* list : {&line.incidents, &line.planned})
-      for (protocol::LineIncident& incident : *list) {
-        for (std::string* word : {&incident.id, &incident.title, &incident.effect, &incident.cause}) word->clear();
-        incident.text.reset();
-        incident.url.reset();
-      }
+      for (protocol::LineIncident& incident : *list)
+        for (std::string* word : {&incident.id, &incident.effect, &incident.cause}) word->clear();
   }
   // Answers that were there are as old as the oldest of them.
   if (!_platform->transitLines().tookShared()) lines.updated = now;

@@ -66,7 +66,7 @@ class WidgetProcess {
   protocol::Selected selectRow(const protocol::RowParams& params);
   protocol::Highlighted highlightRow(const protocol::HighlightParams& params);
   protocol::Snapshot snapshot(const protocol::SnapshotParams& params);
-  protocol::Lines lines(const Nothing&);
+  protocol::Lines lines(const protocol::LinesParams& params);
   protocol::Kept markSeen(const protocol::MarkSeenParams& params);
   /// Keeps that these incidents, of those that the last fetch found, were seen.
   ErrorRef keepSeen(const std::set<std::string>& ids);

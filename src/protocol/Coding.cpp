@@ -247,6 +247,8 @@ constexpr std::tuple kFields<Lines>{Field{"updated", &Lines::updated}, Field{"li
                                     Field{"error", &Lines::error, kMayBeLeftOut},
                                     Field{"asked", &Lines::asked, kMayBeLeftOut}, Field{"cut", &Lines::isCut}};
 template <>
+constexpr std::tuple kFields<LinesParams>{Field{"texts", &LinesParams::texts, kMayBeLeftOut}};
+template <>
 constexpr std::tuple kFields<MarkSeenParams>{Field{"ids", &MarkSeenParams::ids}};
 template <>
 constexpr std::tuple kFields<Download>{Field{"feed", &Download::feed}, Field{"received", &Download::received},
@@ -643,6 +645,7 @@ NIMBO_MESSAGE(Snapshot);
 NIMBO_MESSAGE(Lines);
 NIMBO_MESSAGE(LineReport);
 NIMBO_MESSAGE(LineIncident);
+NIMBO_MESSAGE(LinesParams);
 NIMBO_MESSAGE(MarkSeenParams);
 NIMBO_MESSAGE(Downloads);
 NIMBO_MESSAGE(RenderParams);

@@ -62,6 +62,10 @@ struct Lines {
   bool isCut = false;               ///< incidents were left out for want of room
 };
 
+struct LinesParams {
+  bool texts = true;  ///< without them incidents have no title, text, address and text of their image
+};
+
 struct MarkSeenParams {
   std::vector<std::string> ids;  ///< numbers of incidents in decimal
 };

@@ -38,7 +38,7 @@ inline constexpr Method<ScaleParams> kSetScale{"setScale"};
 inline constexpr Method<RowParams, Selected> kSelectRow{"selectRow"};
 inline constexpr Method<HighlightParams, Highlighted> kHighlightRow{"highlightRow"};
 inline constexpr Method<SnapshotParams, Snapshot> kSnapshot{"snapshot"};
-inline constexpr Method<Nothing, Lines> kLines{"lines"};
+inline constexpr Method<LinesParams, Lines> kLines{"lines"};
 inline constexpr Method<MarkSeenParams, Kept> kMarkSeen{"markSeen"};
 inline constexpr Method<Nothing, Downloads> kDownloads{"downloads"};
 inline constexpr Method<RenderParams, Rendered> kRender{"render"};

@@ -29,13 +29,11 @@ namespace {
 constexpr std::pair<const char*, const char*> kLanguages[] = {{"ar", "العربية"}, {"de", "Deutsch"},  {"en", "English"},
                                                               {"es", "Español"}, {"fr", "Français"}, {"ja", "日本語"}};
 
-/// Seconds to choose from.
-constexpr std::uint64_t kRefreshChoices[] = {30, 60, 300, 1800};
-
-std::string refreshText(std::uint64_t seconds) {
-  return seconds < 60 ? LocalizedFormat(LocalizedString("Window_Refresh_Seconds"), {seconds})
-                      : LocalizedFormat(LocalizedString("Window_Refresh_Minutes"), {seconds / 60});
-}
+/// Seconds to choose from. Their texts need no plural forms, for which ICU would be opened with the window.
+constexpr std::pair<const char*, const char*> kRefreshChoices[] = {{"30", "Window_Refresh_30"},
+                                                                   {"60", "Window_Refresh_60"},
+                                                                   {"300", "Window_Refresh_300"},
+                                                                   {"1800", "Window_Refresh_1800"}};
 
 }  // namespace
 
@@ -55,8 +53,8 @@ Glib::RefPtr<Gio::MenuModel> makeMainMenu() {
   for (const auto& [tag, name] : kLanguages) language->append(name, std::string("win.language::") + tag);
 
   const auto refresh = Gio::Menu::create();
-  for (const std::uint64_t seconds : kRefreshChoices)
-    refresh->append(refreshText(seconds), "win.refresh::" + std::to_string(seconds));
+  for (const auto& [seconds, key] : kRefreshChoices)
+    refresh->append(LocalizedString(key), std::string("win.refresh::") + seconds);
 
   const auto look = Gio::Menu::create();
   look->append_submenu(LocalizedString("Window_Appearance"), appearance);
