@@ -62,17 +62,20 @@ TEST(WidgetProcess, TellsTheStateOfLinesByItsLastFetch) {
     std::vector<std::string> seen;
     for (const json& line : programs.play(events))
       if (line.contains("result") && line["result"].contains("lines"))
-        for (const json& report : line["result"]["lines"])
+        for (const json& report : line["result"]["lines"]) {
           seen.push_back(report["state"].get<std::string>() +
                          (report["reason"].is_null() ? "" : " " + report["reason"]["code"].dump()));
+          for (const json& incident : report["incidents"]) seen.back() += " " + incident["title"].get<std::string>();
+        }
     return seen;
   };
   const json start = appearing()[0];
-  EXPECT_THAT(of({start, look, fetch, look}), ElementsAre("unknown 22", "affected"));
+  EXPECT_THAT(of({start, look, fetch, look, request("lines", {{"texts", false}})}),
+              ElementsAre("unknown 22", "affected Works", "affected "));
   // An incident that ends is over without a fetch.
   programs.publish({{"a", {"m1"}, "Works", "Slow.", 0, Programs::unixNow() + 60}});
   EXPECT_THAT(of({start, fetch, look, request("advanceTime", {{"seconds", 61}}), look}),
-              ElementsAre("affected", "good"));
+              ElementsAre("affected Works", "good"));
   programs.publishBytes("no feed");
   EXPECT_THAT(of({start, fetch, look}), ElementsAre("unknown 7"));
 }
