@@ -31,7 +31,7 @@ constexpr int kProtocolVersion = 1;
 constexpr std::string_view kSavedRowsDateKey = "Nimbo.TransitWidget.savedUIDate";
 
 /// Seconds after which lines are kept again though they run as before: a disk that sleeps is woken seldom.
-constexpr TimeInterval kKeepLinesAgain = 300;
+constexpr TimeInterval kKeepLinesAgain = 600;
 
 bool isDownloading(const Error& error) {
   return error.domain() == kTransitLineServiceErrorDomain &&
