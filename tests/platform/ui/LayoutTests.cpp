@@ -282,6 +282,8 @@ TEST_F(Layout, LabelTakesTheLinesItsWidthNeeds) {
     if (c.height > 0) text->heightAnchor().constraintLessThanOrEqualToConstant(c.height)->setActive(true);
     const auto marker = constrainedView(*view, "marker");
     marker->topAnchor().constraintEqualToAnchor(text->lastBaselineAnchor())->setActive(true);
+    const auto first = constrainedView(*view, "first");
+    first->topAnchor().constraintEqualToAnchor(text->firstBaselineAnchor())->setActive(true);
     const auto stretch = text->heightAnchor().constraintEqualToConstant(400);
     stretch->setPriority(kLayoutPriorityHugging - 1);
     stretch->setActive(true);
@@ -298,6 +300,7 @@ TEST_F(Layout, LabelTakesTheLinesItsWidthNeeds) {
     EXPECT_EQ(text->frame(), (Rect{0, 0, c.width, c.expectedHeight}));
     const double descent = c.clipped ? c.height - marker->frame().y : 3.4;
     EXPECT_EQ(marker->frame().y, std::round(c.expectedHeight - descent));
+    EXPECT_EQ(first->frame().y, 14);
     RecordingPainter painter;
     view->draw(painter);
     EXPECT_EQ(painter.texts.empty() ? 0 : painter.texts[0].lines, c.drawnLines);
