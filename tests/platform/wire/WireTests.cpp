@@ -350,6 +350,8 @@ TEST(Wire, ReadingFollowsItsRulesAtTheEdges) {
        "a group is closed that is not open, at byte 4"},
       {"a length beyond the end", "\x10\x01\x1a\x05x", false, true, 1,
        "searchString: the length exceeds the bytes that follow, at byte 3"},
+      {"a text that comes again and breaks off", "\x1a\x01x\x1a\x05y", false, false, 0,
+       "searchString: the length exceeds the bytes that follow, at byte 4"},
       {"a length beyond the record around it", "\x3a\x02\x12\x05long!", false, false, 0,
        "directionsPlan.originString: the length exceeds the bytes that follow, at byte 3"},
   };
