@@ -66,11 +66,13 @@ void StatusWatch::update(TimeInterval maxAge) {
 }
 
 void StatusWatch::look() {
+  const bool hasTexts = _linesObserver != nullptr;
   // More favorites than an answer has room for are no fault of the process.
-  _widget->call(protocol::kLines, {.texts = _linesObserver != nullptr},
-                [this](const std::optional<protocol::Lines>& lines, const auto&) {
+  _widget->call(protocol::kLines, {.texts = hasTexts},
+                [this, hasTexts](const std::optional<protocol::Lines>& lines, const auto&) {
                   _lines = lines.value_or(protocol::Lines());
-                  if (lines && _linesObserver) _linesObserver(*lines);
+                  // Whoever has begun to listen meanwhile wants to hear what incidents say.
+                  if (lines && hasTexts && _linesObserver) _linesObserver(*lines);
                 });
   _widget->ask(protocol::kSnapshot, {.rows = false}, [this](const auto& snapshot) { showSnapshot(snapshot); });
 }

