@@ -44,7 +44,7 @@ class BarSession {
         _teller(context.runLoop, *_platform.operator->(), {.isAsked = notifies}),
         _watch(context, _clock, presentationForBar(), [this](const BarContent& content) { show(content); }) {
     _output.begin(format.beginning);
-    _watch.setLinesObserver([this](const protocol::Lines& lines) { notify(lines); });
+    _watch.setLinesObserver([this](const protocol::Lines& lines) { notify(lines); }, [this] { return _teller.isOn(); });
     for (const int signal : {SIGTERM, SIGINT}) _signals.push_back(quitOnSignal(context.runLoop, signal));
     if (format.takesClicks) _clicks.emplace(context.runLoop, STDIN_FILENO, [this](int button) { click(button); });
   }

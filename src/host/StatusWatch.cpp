@@ -66,12 +66,11 @@ void StatusWatch::update(TimeInterval maxAge) {
 }
 
 void StatusWatch::look() {
-  const bool hasTexts = _linesObserver != nullptr;
+  const bool hasTexts = _linesObserver && _wantsLines();
   // More favorites than an answer has room for are no fault of the process.
   _widget->call(protocol::kLines, {.texts = hasTexts},
                 [this, hasTexts](const std::optional<protocol::Lines>& lines, const auto&) {
                   _lines = lines.value_or(protocol::Lines());
-                  // Whoever has begun to listen meanwhile wants to hear what incidents say.
                   if (lines && hasTexts && _linesObserver) _linesObserver(*lines);
                 });
   _widget->ask(protocol::kSnapshot, {.rows = false}, [this](const auto& snapshot) { showSnapshot(snapshot); });

@@ -23,9 +23,10 @@ class StatusWatch {
   StatusWatch(const CommandContext& context, const Clock& clock, WidgetPresentation presentation, Show show);
   /// Takes the widget off the screen, which saves its rows, and ends the process.
   ~StatusWatch();
-  /// Hears what is known of the favorites whenever that may be new.
-  void setLinesObserver(std::function<void(const protocol::Lines& lines)> observer) {
+  /// Hears what is known of the favorites, with all that incidents say, whenever that may be new and `wants` says so.
+  void setLinesObserver(std::function<void(const protocol::Lines& lines)> observer, std::function<bool()> wants) {
     _linesObserver = std::move(observer);
+    _wantsLines = std::move(wants);
   }
   StatusWatch(const StatusWatch&) = delete;
   StatusWatch& operator=(const StatusWatch&) = delete;
@@ -50,6 +51,7 @@ class StatusWatch {
   WidgetPresentation _presentation;
   Show _show;
   std::function<void(const protocol::Lines&)> _linesObserver;  // null: nobody asks
+  std::function<bool()> _wantsLines;                           // with the observer
   protocol::Lines _lines;                                      // as the widget told last
   Backoff _restarts{kFirstRestart, kLongestRestart};
   std::shared_ptr<Timer> _restart;
