@@ -174,6 +174,11 @@ bool wereSet(SQLiteConnection& connection) {
              "SELECT EXISTS (SELECT 1 FROM favorites) OR EXISTS (SELECT 1 FROM favorites_seal WHERE wereSet)") != 0;
 }
 
+/// Another one for other favourites.
+std::int64_t sealedDigest(SQLiteConnection& connection) {
+  return connection.integer("SELECT digest FROM favorites_seal WHERE id = 1");
+}
+
 /// Whether a damaged database has just been replaced: what was asked for can be asked again.
 bool isOfReplacement(const ErrorRef& error) {
   return error && error->domain() == kStateDatabaseErrorDomain &&
@@ -238,7 +243,7 @@ Outcome<Favorites> FavoritesEditor::left() const { return read(Loss::isPassedOve
 std::int64_t FavoritesEditor::mark() const {
   std::int64_t mark = 0;
   const ErrorRef unread = _database->read([&](SQLiteConnection& connection) -> ErrorRef {
-    if (wereSet(connection)) mark = connection.integer("SELECT digest FROM favorites_seal");
+    if (wereSet(connection)) mark = sealedDigest(connection);
     return nullptr;
   });
   return unread ? 0 : mark;
@@ -249,7 +254,7 @@ Outcome<Favorites> FavoritesEditor::read(Loss loss) const {
   const auto readOnce = [&] {
     return _database->read([&](SQLiteConnection& connection) -> ErrorRef {
       requireFittingFavorites(connection);
-      const std::int64_t digest = connection.integer("SELECT digest FROM favorites_seal WHERE id = 1");
+      const std::int64_t digest = sealedDigest(connection);
       if (*_memory && (*_memory)->digest == digest) {
         stored = (*_memory)->favorites;
         return nullptr;

@@ -35,9 +35,8 @@ class FavoritesEditor final {
   /// Throws std::invalid_argument without a database; `firstFavorites` may be null.
   FavoritesEditor(std::shared_ptr<StateDatabase> database, FirstFavorites firstFavorites);
 
-  /// Sets `favorites` to all favourites in their order; while none were ever set, to the first ones. A line whose
-  /// content cannot be read is a favourite without a line. Null on success, otherwise `favorites` stays: also after
-  /// damage that took some of them, until the next change.
+  /// All favourites in their order; while none were ever set, the first ones. A line whose content cannot be read is a
+  /// favourite without a line. An error also after damage that took some of them, until the next change.
   Outcome<Favorites> list() const;
   /// The same, but after such damage those that are left.
   Outcome<Favorites> left() const;
