@@ -54,7 +54,7 @@ class OnScreenWidget {
   std::optional<std::string> update(std::optional<TimeInterval> maxAge = std::nullopt);
   /// Switches to the expanded mode where the widget offers it; else the compact row says it all.
   void expand();
-  protocol::Lines lines() { return _client.call(protocol::kLines); }
+  protocol::Lines lines(const protocol::LinesParams& params = {}) { return _client.call(protocol::kLines, params); }
   protocol::Snapshot snapshot(const protocol::SnapshotParams& params = {}) {
     return _client.call(protocol::kSnapshot, params);
   }

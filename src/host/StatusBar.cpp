@@ -135,7 +135,7 @@ int runStatusBar(const CommandContext& context, const BarFormat& format, const S
     OnScreenWidget widget(context, presentation);
     // A bar may ask every few seconds.
     const std::optional<std::string> failure = widget.update(sharedAge(context));
-    printRows(widget.snapshot({.rows = false}), widget.lines());
+    printRows(widget.snapshot({.rows = false}), widget.lines({.texts = false}));
     widget.close();
     if (failure) throw CommandFailure(*failure);
   } catch (const WidgetClientFailure& failure) {
