@@ -124,22 +124,33 @@ class Window:
         wait(f"rest of {name}", lambda: places.append(wait(name, place)) or places[-3:].count(places[-1]) == 3)
         press("mousemove", *map(str, places[-1]), "click", "1")
 
+    def surfaces(self):
+        """The visible windows of the program: a row that is dragged is one of its own."""
+        return subprocess.run(["xdotool", "search", "--onlyvisible", "--pid", str(self.process.pid)],
+                              capture_output=True, text=True).stdout.split()
+
     def drag(self, name, target, done, role="list item"):
-        """Drags a row onto another one, anew while the display was too slow for the pointer."""
+        """Drags a row onto another one, anew where it was let go before the row under it had answered."""
         def is_done():
             source, place = self.box(name, role), self.box(target, role)
-            for step in range(9):
-                press("mousemove", str(source.x + 90), str(source.y + 30 + (place.y - source.y) * step // 8),
-                      *(["mousedown", "1"] if step == 0 else []))
+            resting = len(self.surfaces())
+            press("mousemove", str(source.x + 90), str(source.y + 30), "mousedown", "1")
+            # The pointer's release is lost while the display is still being asked for the pointer.
+            for step in range(1, 9):
+                press("mousemove", str(source.x + 90), str(source.y + 30 + (place.y - source.y) * step // 8))
+                if step == 4 and not wait_for(lambda: len(self.surfaces()) > resting, 2):
+                    break
             press("mouseup", "1")
-            return wait_for(done, 2)
+            if wait_for(done, 2):
+                return True
+            if len(self.surfaces()) > resting:
+                press("key", "Escape")
+                wait("the row back in its place", lambda: len(self.surfaces()) <= resting)
         wait(f"{name} on {target}", is_done)
 
     def comes_to_front(self):
         """There is no window manager that would raise a window and give it the keyboard."""
-        window = wait("the window", lambda: subprocess.run(
-            ["xdotool", "search", "--onlyvisible", "--pid", str(self.process.pid)],
-            capture_output=True, text=True).stdout.split())[0]
+        window = wait("the window", self.surfaces)[0]
         press("windowraise", window, "windowfocus", "--sync", window)
         return window
 
