@@ -33,7 +33,6 @@ void NBTransitSummaryCell::_createSubviews() {
   _artworksLabel->setShieldSize(kShieldSize);
   _artworksLabel->setSpaceBetweenShields(kSpaceBetweenShields);
   _artworksLabel->setFont(Font::preferredFont(TextStyle::body));
-  _artworksLabel->setUsesAutomaticConstraints(false);
   _artworksLabel->setTextColor(SystemColor::systemGrey);
   _stackView->addArrangedSubview(_artworksLabel);
 

@@ -1,6 +1,9 @@
 #include <gtest/gtest.h>
 
+#include <cmath>
 #include <cstdlib>
+#include <limits>
+#include <stdexcept>
 
 #include "platform/ui/layout/LayoutSolver.h"
 
@@ -25,6 +28,18 @@ TEST(LayoutSolver, NeverTradesAPriorityForLowerOnes) {
   EXPECT_DOUBLE_EQ(solver.value(x), 7);
   solver.removeConstraint(required.id);
   EXPECT_DOUBLE_EQ(solver.value(x), 3);
+}
+
+TEST(LayoutSolver, RefusesNumbersThatAreNone) {
+  LayoutSolver solver;
+  const auto x = solver.addVariable();
+  const auto good = solver.addConstraint(bound(x, equal, 1));
+  for (const double bad : {std::nan(""), std::numeric_limits<double>::infinity()}) {
+    EXPECT_THROW(solver.setConstant(good.id, bad), std::invalid_argument);
+    EXPECT_THROW(solver.addConstraint(bound(x, equal, bad)), std::invalid_argument);
+    EXPECT_THROW(solver.addConstraint(bound(x, equal, 1, bad)), std::invalid_argument);
+    EXPECT_THROW(solver.addConstraint({{{x, bad}}, 0, equal, 1000}), std::invalid_argument);
+  }
 }
 
 TEST(LayoutSolver, EndsWhenEveryStepIsADeadHeat) {

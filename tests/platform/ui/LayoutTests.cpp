@@ -306,6 +306,13 @@ TEST_F(Layout, LabelTakesTheLinesItsWidthNeeds) {
     EXPECT_EQ(painter.texts.empty() ? 0 : painter.texts[0].lines, c.drawnLines);
     EXPECT_EQ(painter.clips.at(0) == text->bounds(), c.clipped);
   }
+  const auto free = label("aaaa");
+  free->setUsesAutomaticConstraints(false);
+  root->addSubview(free);
+  const auto stretch = free->widthAnchor().constraintEqualToConstant(150);
+  stretch->setPriority(kLayoutPriorityHugging - 1);
+  stretch->setActive(true);
+  EXPECT_EQ(laidOut(*free).width, 34);
 }
 
 TEST_F(Layout, ShortOfRoomTheLastTextGivesWayButKeepsItsFirstLine) {

@@ -355,6 +355,7 @@ TEST(Wire, ReadingFollowsItsRulesAtTheEdges) {
       {"a length beyond the record around it", "\x3a\x02\x12\x05long!", false, false, 0,
        "directionsPlan.originString: the length exceeds the bytes that follow, at byte 3"},
   };
+  EXPECT_FALSE(ProtobufReader({}).skipValueWithTag(30, 6));
   for (const auto& test : cases) {
     NimboActivity activity;
     ProtobufReader reader(asBytes(test.bytes));
