@@ -6,6 +6,7 @@
 #include <set>
 
 #include "desktop/gtfs/feeds/FeedConfiguration.h"
+#include "desktop/gtfs/text/Utf8.h"
 #include "platform/foundation/Hash.h"
 
 namespace nimbo {
@@ -20,7 +21,7 @@ using protocol::Severity;
 
 /// One that begins again within this time goes on, as far as its riders care.
 constexpr std::chrono::hours kRest{24};
-constexpr std::size_t kLongestKeptTitle = 500;  // bytes
+constexpr std::size_t kLongestKeptTitle = 200;  // characters, more than a notice shows
 
 std::uint64_t digestOf(std::initializer_list<std::string> parts) {
   std::uint64_t digest = hashOfBytes("told");
@@ -197,7 +198,7 @@ class Decision {
     if (told.shown != shown && !told.key.empty()) _changedKeys.insert(told.key);
     told.texts = digestOfTexts(incident);
     told.shown = shown;
-    told.title = incident.title.substr(0, kLongestKeptTitle);
+    told.title = firstCharacters(incident.title, kLongestKeptTitle);
     told.severity = std::max(told.severity, static_cast<int>(incident.severity));
     told.concern = std::max(told.concern, static_cast<int>(incident.concern));
   }
