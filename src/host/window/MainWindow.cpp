@@ -185,16 +185,16 @@ void MainWindow::addActions() {
 }
 
 void MainWindow::addNotifyAction() {
-  const bool isOn = TellingSettings::read(*Platform::current().sharedSettings().groupStore()).isOn;
-  const auto action = add_action_bool("notify", isOn);
-  action->signal_activate().connect([this, action](const Glib::VariantBase&) {
-    bool wasOn = false;
-    action->get_state(wasOn);
-    if (const ErrorRef failure = setNotify(*_context.platform.operator->(), wasOn ? "off" : "on"))
+  const auto isOn = [] { return TellingSettings::read(*Platform::current().sharedSettings().groupStore()).isOn; };
+  const auto action = add_action_bool("notify", isOn());
+  action->signal_activate().connect([this, action, isOn](const Glib::VariantBase&) {
+    if (const ErrorRef failure = setNotify(*_context.platform.operator->(), isOn() ? "off" : "on"))
       return tell(textOfError(*failure));
-    action->set_state(Glib::Variant<bool>::create(!wasOn));
+    action->set_state(Glib::Variant<bool>::create(isOn()));
     _widgetPage->showNotifyQuestion();
   });
+  // Other programs turn it on and off too.
+  _menu.connect_property_changed("active", [action, isOn] { action->set_state(Glib::Variant<bool>::create(isOn())); });
 }
 
 void MainWindow::markSeen(const std::vector<std::string>& ids, bool isAsked) {
