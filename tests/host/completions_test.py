@@ -9,6 +9,8 @@ import subprocess
 import sys
 import tempfile
 
+from cities import publish
+
 shell, command_line, data = sys.argv[1:]
 data = pathlib.Path(data, "completions")
 KEY = "Nimbo.TransitWidget.analytics.disabled"
@@ -21,7 +23,7 @@ CASES = {
     "nimbo-transit feed add --from 160": ["1603", "..."],
     "nimbo-transit feed remove ": ["other", "town"],
     "nimbo-transit --config CITY feed check ": ["sole"],
-    "nimbo-transit favorite add town:": ["town:m1", "town:m2"],
+    "nimbo-transit favorite add town:": ["town:m1", "town:m2", "town:m3"],
     "nimbo-transit favorite remove ": ["town:m2"],
     "nimbo-transit settings se": ["set"],
     "nimbo-transit settings set Nimbo.TransitWidget.ana": [KEY],
@@ -117,11 +119,7 @@ if not shutil.which(shell) or shell == "bash" and not os.path.exists("/usr/share
     sys.exit(77)
 with tempfile.TemporaryDirectory() as home:
     city = pathlib.Path(home, "city")
-    city.mkdir()
-    for name, table in {"agency": "agency_name,agency_url,agency_timezone\nMetro,https://example.org,UTC\n",
-                        "routes": "route_id,route_short_name,route_type\nm1,1,1\nm2,2,1\n"}.items():
-        city.joinpath(name + ".txt").write_text(table)
-    city.joinpath("alerts.pb").write_bytes(b"\n\x05\n\x032.0")
+    publish(city, [])
     os.environ.update(HOME=home, LC_ALL="C.UTF-8", TERM="dumb", XDG_CONFIG_HOME=home + "/config",
                       XDG_STATE_HOME=home + "/state", XDG_DATA_HOME=home + "/share", XDG_CACHE_HOME=home + "/cache",
                       PATH=os.pathsep.join([os.path.dirname(command_line), os.environ["PATH"]]))

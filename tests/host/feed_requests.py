@@ -1,8 +1,6 @@
 #!/usr/bin/python3
 """What hosts ask of feeds while a server does not finish: feed_requests.py NIMBO_TRANSIT NIMBO_TRANSIT_WIDGET"""
 
-import http.server
-import io
 import json
 import os
 import pathlib
@@ -13,7 +11,9 @@ import subprocess
 import sys
 import tempfile
 import threading
-import zipfile
+
+from cities import publish
+from city import Widget
 
 command_line, widget = sys.argv[1:]
 PIECE = b"P" * (3 << 20)
@@ -34,60 +34,44 @@ def serve(server):
             pass  # nobody wants it any more
 
 
-class Widget:
-    def __init__(self, folder):
-        self.process = subprocess.Popen([widget, "--config", folder, "--state", folder], stdin=subprocess.PIPE,
-                                        stdout=subprocess.PIPE, text=True)
+def hear(widget, wanted):
+    """The next message that is wanted."""
+    return next(message for message in map(json.loads, widget.process.stdout) if wanted(message))
 
-    def ask(self, identifier, method, **params):
-        self.process.stdin.write(json.dumps({"jsonrpc": "2.0", "id": identifier, "method": method,
-                                             "params": params}) + "\n")
-        self.process.stdin.flush()
 
-    def hear(self, wanted):
-        """The next message that is wanted."""
-        for line in self.process.stdout:
-            if wanted(message := json.loads(line)):
-                return message
-        raise AssertionError("the widget ended")
-
-    def answer(self, identifier):
-        return self.hear(lambda message: message.get("id") == identifier)
+def answer(widget, identifier):
+    return hear(widget, lambda message: message.get("id") == identifier)
 
 
 def check_requests(folder, address):
-    asked = Widget(folder)
-    definition = {"name": "slow", "static": address, "alerts": address}
-    asked.ask("a", "checkFeed", definition=definition)
-    asked.ask(2, "findLines", query="", limit=1)
-    assert asked.answer(2)["result"]["total"] == 12, "answered before the one that waits"
-    progress = asked.hear(lambda message: message.get("method") == "progress"
-                          and message["params"]["received"] == len(PIECE))["params"]
-    assert progress == {"request": "a", "feed": "slow", "part": "static", "received": len(PIECE), "length": 99999999,
+    asked = Widget([widget, "--config", folder, "--state", folder])
+    check = ("checkFeed", {"definition": {"name": "slow", "static": address, "alerts": address}})
+    asked.send(check, ("findLines", {"query": "", "limit": 1}))
+    assert answer(asked, 2)["result"]["total"] == 12, "answered before the one that waits"
+    privileges = open(f"/proc/{asked.process.pid}/status").read()
+    assert "NoNewPrivs:\t1" in privileges and "Seccomp:\t2" in privileges, "given up before it speaks"
+    progress = hear(asked, lambda message: message.get("method") == "progress"
+                    and message["params"]["received"] == len(PIECE))["params"]
+    assert progress == {"request": 1, "feed": "slow", "part": "static", "received": len(PIECE), "length": 99999999,
                         "done": 0, "total": 1}, progress
-    asked.ask(3, "cancel", request="a")
-    assert asked.answer("a")["error"]["code"] == -32004
-    assert asked.answer(3)["result"] == {}
-    asked.process.stdin.close()
-    assert asked.process.wait(20) == 0
+    asked.send(("cancel", {"request": 1}))
+    assert answer(asked, 1)["error"]["code"] == -32004
+    assert answer(asked, 3)["result"] == {}
+    assert asked.close() == 0
 
-    asked = Widget(folder)
-    for number in range(10, 26):
-        asked.ask(number, "checkFeed", definition=definition)
-    asked.ask(26, "checkFeed", definition=definition)
-    assert asked.answer(26)["error"]["code"] == -32001
-    asked.ask(27, "initialize")
-    assert sorted(asked.answer(number)["error"]["code"] for number in range(10, 26)) == [-32004] * 16
-    assert "result" in asked.answer(27)
-    asked.ask(28, "checkFeed", definition=definition)
-    asked.process.stdin.close()
-    assert asked.process.wait(20) == 0
+    asked = Widget([widget, "--config", folder, "--state", folder])
+    asked.send(*[check] * 17)
+    assert answer(asked, 17)["error"]["code"] == -32001
+    asked.send("initialize")
+    assert sorted(answer(asked, number)["error"]["code"] for number in range(1, 17)) == [-32004] * 16
+    assert "result" in answer(asked, 18)
+    asked.send(check)
+    assert asked.close() == 0
 
 
 def check_terminal(folder, address):
     feed = folder / "feed"
-    feed.mkdir()
-    (feed / "routes.txt").write_text("route_id,route_short_name,route_type\nR,1,3\n")
+    publish(feed, [])
     (folder / "feeds.json").write_text(json.dumps({"feeds": [
         {"name": "near", "static": str(feed), "alerts": "/none"}, {"name": "far", "static": address, "alerts": "/none"}]}))
     controller, terminal = pty.openpty()
@@ -101,7 +85,7 @@ def check_terminal(folder, address):
     for connection in connections:
         connection.close()
     assert run.wait(60) == 1
-    assert "near:R" in run.stdout.read()
+    assert "near:m1" in run.stdout.read()
     try:
         while piece := os.read(controller, 4096):
             shown += piece.decode()
@@ -110,44 +94,11 @@ def check_terminal(folder, address):
     assert "\r\x1b[Knimbo-transit: " in shown, shown
 
 
-def check_cache(folder, _):
-    """A server that is down costs nothing of what was here."""
-    archive = io.BytesIO()
-    with zipfile.ZipFile(archive, "w") as files:
-        files.writestr("routes.txt", "route_id,route_short_name,route_type\nR,1,3\n")
-
-    class Zip(http.server.BaseHTTPRequestHandler):
-        def do_GET(self):
-            self.send_response(200)
-            self.end_headers()
-            self.wfile.write(archive.getvalue())
-
-        def log_message(self, *_):
-            pass
-
-    def run(*arguments, **environment):
-        return subprocess.run([command_line, "--config", folder, "--state", folder, *arguments], capture_output=True,
-                              text=True, env=os.environ | environment)
-
-    with http.server.HTTPServer(("127.0.0.1", 0), Zip) as server:
-        threading.Thread(target=server.serve_forever, daemon=True).start()
-        added = run("feed", "add", "city", "--static", f"http://127.0.0.1:{server.server_port}/", "--alerts", "/none",
-                    "--force")
-        assert added.returncode == 0 and "/none" in added.stderr, added
-        server.shutdown()
-    for arguments in ["lines", "1"], ["favorite", "add", "city:R"], ["favorite", "list"]:
-        done = run(*arguments)
-        assert done.returncode == 0 and not done.stderr, done
-        assert arguments[1] == "add" or "city:R" in done.stdout, done
-    assert "city:R" in run("favorite", "list", NIMBO_TRANSIT_WIDGET="/none").stdout, "asks no feed"
-    assert run("feed", "check").returncode == 1
-
-
 with tempfile.TemporaryDirectory() as name, socket.create_server(("127.0.0.1", 0)) as listening:
     connections = []
     threading.Thread(target=serve, args=[listening], daemon=True).start()
     url = f"http://127.0.0.1:{listening.getsockname()[1]}/feed.zip"
-    for check in check_requests, check_terminal, check_cache:
+    for check in check_requests, check_terminal:
         place = pathlib.Path(name) / check.__name__
         place.mkdir()
         check(place, url)

@@ -7,6 +7,8 @@ import subprocess
 import sys
 import tempfile
 
+from cities import publish
+
 LIBRARIES = re.compile(r"calling init: \S*(libnimbo-|libcurl|libzip|libicu|libpango|libcairo)")
 
 
@@ -49,14 +51,12 @@ def main(cmake, build):
     without("libnimbo-strings.so", "status")
 
     feed = folder / "feed"
-    feed.mkdir()
-    (feed / "agency.txt").write_text("agency_id,agency_name\n1,City\n")
-    (feed / "routes.txt").write_text("route_id,agency_id,route_short_name,route_type\nR,1,Red,1\n")
+    publish(feed, [])
     run("feed", "add", "city", "--static", feed, "--alerts", "http://127.0.0.1:1/alerts.pb", "--force")
-    run("favorite", "add", "city:R")
-    for arguments in ["feed", "check"], ["lines", "red"], ["favorite", "remove", "city:R"], ["favorite", "add", "city:R"]:
+    run("favorite", "add", "city:m1")
+    for arguments in ["feed", "check"], ["lines", "harbour"], ["favorite", "remove", "city:m1"], ["favorite", "add", "city:m1"]:
         assert not loaded(*arguments), f"{arguments} loads {loaded(*arguments)}"
-    assert "city:R" in run("favorite", "list").stdout
+    assert "city:m1" in run("favorite", "list", NIMBO_TRANSIT_WIDGET="/none").stdout, "asks no feed"
     without("libnimbo-feeds.so", "status", "--json")
 
 

@@ -16,12 +16,12 @@ ANSWERS = {
 }
 
 
-def play_widget(failure):
-    asked = {"viewWillDisappear": 0}
+def play_widget():
+    asked = {}
     for line in sys.stdin:
         request = json.loads(line)
         method = request["method"]
-        answers = [{"failure": failure}] if failure and method == "viewWillDisappear" else ANSWERS.get(method, [{}])
+        answers = ANSWERS.get(method, [{}])
         result = answers[min(asked.get(method, 0), len(answers) - 1)]
         asked[method] = asked.get(method, 0) + 1
         if method == "shutdown":
@@ -30,24 +30,19 @@ def play_widget(failure):
 
 
 if sys.argv[1] == "--widget":
-    play_widget(sys.argv[2])
+    play_widget()
     sys.exit()
 
 with tempfile.TemporaryDirectory() as folder:
-    def update(failure=""):
-        widget = os.path.join(folder, "widget")
-        with open(widget, "w") as file:
-            file.write(f"#!/bin/sh\nexec /usr/bin/python3 '{__file__}' --widget '{failure}'\n")
-        os.chmod(widget, 0o700)
-        return subprocess.run([sys.argv[1], "--config", folder, "--state", folder, "update"], capture_output=True,
-                              text=True, env=dict(os.environ, NIMBO_TRANSIT_WIDGET=widget))
-
-    waited = update()
+    widget = os.path.join(folder, "widget")
+    with open(widget, "w") as file:
+        file.write(f"#!/bin/sh\nexec /usr/bin/python3 '{__file__}' --widget\n")
+    os.chmod(widget, 0o700)
+    waited = subprocess.run([sys.argv[1], "--config", folder, "--state", folder, "update"], capture_output=True,
+                            text=True, env=dict(os.environ, NIMBO_TRANSIT_WIDGET=widget))
     assert waited.returncode == 0, waited
     *messages, asked = waited.stderr.splitlines()
     assert messages == ["nimbo-transit: 12 MiB have come.",
                         'nimbo-transit: waiting for the static feed of "metro"'], messages
     asked = json.loads(asked)
     assert asked["performUpdate"] == 2 and asked["downloads"] == 2, asked
-    unkept = update("The disk is full.")
-    assert unkept.returncode == 1 and unkept.stderr.endswith("\nnimbo-transit: the rows cannot be kept: The disk is full.\n")

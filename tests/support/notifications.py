@@ -12,20 +12,28 @@ NOTIFICATIONS = "org.freedesktop.Notifications"
 NOTIFICATIONS_PATH = "/org/freedesktop/Notifications"
 
 
-def wait(what, condition):
+def wait_for(condition, seconds=PATIENCE):
     """The condition's first answer that is true; asked again whenever something happens, and every 20 ms."""
-    deadline, context = time.monotonic() + PATIENCE, GLib.MainContext.default()
+    deadline, context = time.monotonic() + seconds, GLib.MainContext.default()
     while time.monotonic() < deadline:
-        if answer := condition():
-            return answer
+        try:
+            if answer := condition():
+                return answer
+        except GLib.Error:
+            pass  # what was looked at is gone
         GLib.timeout_add(20, lambda: False)
         context.iteration(True)
+
+
+def wait(what, condition):
+    if answer := wait_for(condition):
+        return answer
     raise AssertionError(f"waited in vain: {what}")
 
 
-def start_bus(folder, services={}):
-    """Starts a bus that can start the programs of `services` (the text of each service file by its name, with the
-    program that it is to start). Gives the process and the address. Ends with the process."""
+def start_bus(stack, folder, services={}):
+    """Starts a bus, until the stack ends, that can start the programs of `services` (the text of each service file by its
+    name, with the program that it is to start). Gives the address."""
     os.makedirs(f"{folder}/services", exist_ok=True)
     for name, (text, program) in services.items():
         with open(f"{folder}/services/{name}", "w") as file:
@@ -36,7 +44,9 @@ def start_bus(folder, services={}):
             <allow receive_sender="*"/><allow own="*"/></policy></busconfig>""")
     bus = subprocess.Popen(["dbus-daemon", f"--config-file={folder}/bus.conf", "--nofork", "--print-address=1"],
                            stdout=subprocess.PIPE, text=True)
-    return bus, bus.stdout.readline().strip()
+    stack.callback(bus.wait)
+    stack.callback(bus.kill)
+    return bus.stdout.readline().strip()
 
 
 def connect(address):

@@ -2,39 +2,33 @@
 """Notifications as a desktop gets them. usage: notices_test.py shown|faults NIMBO_TRANSIT_NOTICES DRIVER SERVICE_FILE"""
 import json
 import os
-import queue
 import socket
-import subprocess
 import sys
-import tempfile
-import threading
-from contextlib import ExitStack
 
 from gi.repository import GLib
 from notifications import NOTIFICATIONS, Application, NotificationService, connect, start_bus, wait
+from sway_session import Home, Program
 
 program, driver, service_file = sys.argv[2:]
 NAME = "org.nimbo.Transit.Notices"
 NO_BUS, NO_SERVICE, NO_ANSWER, REFUSED, UNFIT = range(1, 6)
 
 
-class Driver:
+class Driver(Program):
     """A program that hands notices over, or with "serve" one that takes them, in time that the test moves."""
 
     def __init__(self, session, address, mode="send"):
-        self.process = session.process([driver, mode], address, stdin=subprocess.PIPE, stdout=subprocess.PIPE, text=True)
-        self.lines, self.count = queue.Queue(), 0
-        threading.Thread(target=lambda: [self.lines.put(json.loads(line)) for line in self.process.stdout],
-                         daemon=True).start()
+        super().__init__(session, driver, mode, env={"DBUS_SESSION_BUS_ADDRESS": address})
+        self.count = 0
 
     def say(self, **line):
         self.count += 1
-        print(json.dumps(dict(line, number=self.count)), file=self.process.stdin, flush=True)
+        super().say(json.dumps(dict(line, number=self.count)))
         return self.count
 
     def hear(self):
         wait("a line", lambda: not self.lines.empty())
-        return self.lines.get()
+        return json.loads(self.lines.get())
 
     def post(self, *notices, error=0):
         self.say(post=notices)
@@ -49,28 +43,15 @@ class Driver:
         assert answer.get("error") == error and bool(answer["reason"]) == bool(error), (answer, error)
 
 
-class Session(ExitStack):
+class Session(Home):
     """A bus that starts the program under test where that is installed."""
 
     def __init__(self, installed=True):
         super().__init__()
-        self.folder = self.enter_context(tempfile.TemporaryDirectory())
-        os.environ["NIMBO_TRANSIT_DESKTOP"] = f"{self.folder}/window"
-        with open(f"{self.folder}/window", "w") as file:
-            file.write(f'#!/bin/sh\necho "$@" $XDG_ACTIVATION_TOKEN >"{self.folder}/new" && mv "{self.folder}/new" '
-                       f'"{self.folder}/opened"\n')
-        os.chmod(file.name, 0o755)
+        os.environ["NIMBO_TRANSIT_DESKTOP"] = self.environment["NIMBO_TRANSIT_DESKTOP"]
         services = {NAME + ".service": (open(service_file).read(), program)} if installed else {}
-        bus, self.address = start_bus(self.folder, services)
-        self.callback(bus.wait)
-        self.callback(bus.kill)
+        self.address = start_bus(self, self.folder, services)
         self.bus = connect(self.address)
-
-    def process(self, command, address, **options):
-        process = subprocess.Popen(command, env=dict(os.environ, DBUS_SESSION_BUS_ADDRESS=address), **options)
-        self.callback(process.wait)
-        self.callback(process.kill)
-        return process
 
     def driver(self, mode="send"):
         return Driver(self, self.address, mode)
@@ -169,8 +150,7 @@ def try_shown():
         window.leave()
         first.post(notice("Ferry", opens="nimbo://incident?id=8"))
         desktop.click(desktop.see("Ferry"), "another")
-        wait("opened", lambda: os.path.exists(f"{session.folder}/opened"))
-        assert open(f"{session.folder}/opened").read() == "-- nimbo://incident?id=8 another\n"
+        session.opened(r"^-- nimbo://incident\?id=8 another\n$")
 
         # A number that is given again is another notification's.
         first.post(notice("Cable car", key="5"))

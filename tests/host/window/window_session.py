@@ -3,10 +3,9 @@ them."""
 import os
 import re
 import subprocess
-import time
 from contextlib import ExitStack
 
-PATIENCE = 60  # seconds for anything to come true
+from notifications import PATIENCE, wait, wait_for
 
 
 class Session(ExitStack):
@@ -22,10 +21,10 @@ class Session(ExitStack):
         self.environment["DBUS_SESSION_BUS_ADDRESS"] = self.serve(
             lambda fd: ["dbus-daemon", "--session", "--nofork", f"--print-address={fd}"])
         os.environ.update(self.environment)
-        global Atspi, GLib
+        global Atspi
         import gi
         gi.require_version("Atspi", "2.0")
-        from gi.repository import Atspi, GLib
+        from gi.repository import Atspi
 
     def serve(self, command):
         """Starts a server that tells its address on a file descriptor, and gives the address."""
@@ -40,25 +39,6 @@ class Session(ExitStack):
         self.callback(process.wait)
         self.callback(process.kill)
         return process
-
-
-def wait_for(condition, seconds):
-    """The condition's first answer that is true; asked again whenever something happens, and every 20 ms."""
-    deadline, context = time.monotonic() + seconds, GLib.MainContext.default()
-    while time.monotonic() < deadline:
-        try:
-            if answer := condition():
-                return answer
-        except GLib.Error:
-            pass  # what was looked at is gone
-        GLib.timeout_add(20, lambda: False)
-        context.iteration(True)
-
-
-def wait(what, condition):
-    if answer := wait_for(condition, PATIENCE):
-        return answer
-    raise AssertionError(f"waited in vain: {what}")
 
 
 class Window:
@@ -123,6 +103,13 @@ class Window:
         # Until it stands still.
         wait(f"rest of {name}", lambda: places.append(wait(name, place)) or places[-3:].count(places[-1]) == 3)
         press("mousemove", *map(str, places[-1]), "click", "1")
+
+    def fill(self, *entries):
+        """Types the texts into the entries of a form, in place of what they hold, and sends it."""
+        for entry, text in entries:
+            self.click(entry, "text")
+            press("key", "ctrl+a", "type", text)
+        press("key", "Return")
 
     def surfaces(self):
         """The visible windows of the program: a row that is dragged is one of its own."""

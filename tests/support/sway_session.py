@@ -7,21 +7,12 @@ import struct
 import subprocess
 import tempfile
 import threading
-import time
 from contextlib import ExitStack
 
-PATIENCE = 60  # seconds for anything to come true
+from notifications import PATIENCE, wait
+
 LEFT, RIGHT, MIDDLE = 0x110, 0x111, 0x112
 NOBODY = 65534
-
-
-def wait(what, condition):
-    deadline = time.monotonic() + PATIENCE
-    while not (answer := condition()):
-        if time.monotonic() > deadline:
-            raise AssertionError(f"waited in vain: {what}")
-        threading.Event().wait(0.02)
-    return answer
 
 
 class Program:
@@ -29,10 +20,7 @@ class Program:
 
     def __init__(self, session, *command, errors=False, **options):
         streams = {"stderr" if errors else "stdout": subprocess.PIPE}
-        self.process = subprocess.Popen(command, stdin=subprocess.PIPE, text=True, bufsize=1, env=session.environment,
-                                        **streams, **options)
-        session.callback(self.process.wait)
-        session.callback(self.process.kill)
+        self.process = session.start(command, stdin=subprocess.PIPE, text=True, bufsize=1, **streams, **options)
         self.lines = queue.Queue()
         stream = self.process.stderr if errors else self.process.stdout
         threading.Thread(target=lambda: [self.lines.put(line.strip()) for line in stream], daemon=True).start()
@@ -54,18 +42,24 @@ class Program:
 class Home(ExitStack):
     """A home, a log of what the widget is asked, and a program in the window's place that keeps what it is to open."""
 
-    def __init__(self, widget):
+    def __init__(self, widget=""):
         super().__init__()
         self.folder = self.enter_context(tempfile.TemporaryDirectory())
         os.chown(self.folder, os.getuid() or NOBODY, -1)
         for name, script in (("widget", f'tee -a "{self.folder}/requests" | "{widget}" "$@"'),
-                             ("window", f'echo "$@" >>"{self.folder}/opened"')):
+                             ("window", f'echo "$@" $XDG_ACTIVATION_TOKEN >>"{self.folder}/opened"')):
             with open(f"{self.folder}/{name}", "w") as file:
                 file.write("#!/bin/sh\n" + script + "\n")
             os.chmod(file.name, 0o755)
         self.environment = {
             "PATH": os.environ["PATH"], "HOME": self.folder, "XDG_RUNTIME_DIR": self.folder, "LANG": "C.UTF-8",
             "NIMBO_TRANSIT_WIDGET": f"{self.folder}/widget", "NIMBO_TRANSIT_DESKTOP": f"{self.folder}/window"}
+
+    def start(self, command, **options):
+        process = subprocess.Popen(command, env=self.environment | options.pop("env", {}), **options)
+        self.callback(process.wait)
+        self.callback(process.kill)
+        return process
 
     def kept(self, name):
         path = f"{self.folder}/{name}"
@@ -83,15 +77,11 @@ class Home(ExitStack):
                              "WAYLAND_DISPLAY": "wayland-1"}
         with open(f"{self.folder}/sway", "w") as config:
             config.write("\n".join(["xwayland disable", *configuration]) + "\n")
-        signs = [f"{self.folder}/wayland-1", f"{self.folder}/sway.sock"]
-        for path in filter(os.path.exists, signs):
-            os.remove(path)
         # It refuses to be root.
         somebody = {"user": NOBODY, "group": NOBODY, "extra_groups": []} if os.getuid() == 0 else {}
-        started = Program(self, "sway", "-c", config.name, stderr=subprocess.DEVNULL, **somebody)
-        for path in signs:
+        Program(self, "sway", "-c", config.name, stderr=subprocess.DEVNULL, **somebody)
+        for path in f"{self.folder}/wayland-1", f"{self.folder}/sway.sock":
             wait(path, lambda: os.path.exists(path))
-        return started
 
     def picture(self, output):
         """Width, height and pixels of an output of sway's."""
