@@ -37,18 +37,15 @@ void Programs::setUpCity(const std::vector<std::string>& favorites,
   if (!favorites.empty()) run(add);
 }
 
-ProgramRun Programs::run(std::vector<std::string> arguments, const std::string& input,
+ProgramRun Programs::run(const std::vector<std::string>& arguments, const std::string& input,
                          const std::string& output) const {
   folder.write("stdin", input);
   folder.write("stdout", "");
-  arguments.insert(arguments.begin(), {"--config", folder.path() / "config", "--state", folder.path() / "state", "<",
-                                       folder.path() / "stdin", "2>", folder.path() / "stderr", ">",
-                                       output.empty() ? (folder.path() / "stdout").string() : output});
-  std::string command = "exec '" NIMBO_TRANSIT "'";
-  for (const std::string& argument : arguments) {
-    const bool isRedirection = argument == "<" || argument == ">" || argument == "2>";
-    command += isRedirection ? " " + argument : " '" + std::regex_replace(argument, std::regex("'"), "'\\''") + "'";
-  }
+  const std::string top = folder.path().string() + "/";
+  std::string command = "exec '" NIMBO_TRANSIT "' --config " + top + "config --state " + top + "state";
+  for (const std::string& argument : arguments)
+    command += " '" + std::regex_replace(argument, std::regex("'"), "'\\''") + "'";
+  command += " <" + top + "stdin 2>" + top + "stderr >" + (output.empty() ? top + "stdout" : output);
   const int status = std::system(command.c_str());
   return {WIFEXITED(status) ? WEXITSTATUS(status) : 128 + WTERMSIG(status), folder.read("stdout"),
           folder.read("stderr")};

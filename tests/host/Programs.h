@@ -28,7 +28,7 @@ class Programs {
   static std::int64_t unixNow() { return now().time_since_epoch().count() / 1000000; }
 
   /// Runs nimbo-transit with these arguments, folders given. Where `output` names a device, the output goes there.
-  ProgramRun run(std::vector<std::string> arguments, const std::string& input = {},
+  ProgramRun run(const std::vector<std::string>& arguments, const std::string& input = {},
                  const std::string& output = {}) const;
   /// Plays host events with time standing still at `now`, and gives every line that came back.
   std::vector<nlohmann::json> play(const std::vector<nlohmann::json>& events) const;

@@ -8,7 +8,6 @@
 #include "desktop/gtfs/LoopbackServer.h"
 #include "desktop/gtfs/feeds/FeedMuid.h"
 #include "desktop/gtfs/feeds/GTFSTransitLineService.h"
-#include "desktop/system/SystemClock.h"
 #include "host/Programs.h"
 #include "host/RefreshRule.h"
 #include "support/TestPlatform.h"
@@ -161,24 +160,6 @@ TEST_F(RefreshTest, AsksAgainForWhatChangesWhileAnAnswerIsOnItsWay) {
   rule.answered(good);
   rule.networkReturned();
   EXPECT_EQ(asked, 13) << "nothing was wanting";
-}
-
-TEST(Refresh, SharesWhatOtherProcessesGotUnlessTheUserAsks) {
-  const LoopbackServer server([](const std::string&) {
-    return LoopbackServer::Answer{
-        LoopbackServer::answer("200 OK", AlertsBuilder::feed(SystemClock().now(), {{"a", {"m1"}, "Ice"}}))};
-  });
-  const Programs programs;
-  programs.run({"feed", "add", "city", "--static", programs.folder.path() / "feed", "--alerts", server.address()});
-  programs.run({"favorite", "add", "city:m1"});
-  for (const auto& [arguments, requests] : std::initializer_list<std::pair<std::vector<std::string>, std::size_t>>{
-           {{"update"}, 0}, {{"status", "--waybar"}, 0}, {{"status"}, 1}, {{"update"}, 0}}) {
-    const std::size_t before = server.requests().size();
-    const ProgramRun run = programs.run(arguments);
-    EXPECT_EQ(run.status, 0) << run.errors;
-    EXPECT_EQ(run.output.find("Ice") != std::string::npos, arguments.front() == "status");
-    EXPECT_EQ(server.requests().size() - before, requests) << arguments.front();
-  }
 }
 
 }  // namespace
