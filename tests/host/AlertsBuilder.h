@@ -25,7 +25,6 @@ class AlertsBuilder {
     std::int32_t cause = 1;   ///< UNKNOWN_CAUSE
     std::int32_t severity = 1;
     std::string image = {};  ///< address of a PNG file
-    std::string imageText = {};
   };
 
   static std::string feed(Date timestamp, const std::vector<Alert>& alerts) {
@@ -40,34 +39,28 @@ class AlertsBuilder {
       protozero::pbf_writer entity(feed, 2);
       entity.add_string(1, alert.id);
       protozero::pbf_writer body(entity, 5);
-      write(body, alert);
+      {
+        protozero::pbf_writer period(body, 1);
+        if (alert.start != 0) period.add_uint64(1, static_cast<std::uint64_t>(alert.start));
+        if (alert.end != 0) period.add_uint64(2, static_cast<std::uint64_t>(alert.end));
+      }
+      for (const std::string& route : alert.routes) protozero::pbf_writer(body, 5).add_string(2, route);
+      body.add_enum(6, alert.cause);
+      body.add_enum(7, alert.effect);
+      body.add_enum(14, alert.severity);
+      if (!alert.image.empty()) {
+        protozero::pbf_writer translated(body, 15);
+        protozero::pbf_writer image(translated, 1);
+        image.add_string(1, alert.image);
+        image.add_string(2, "image/png");
+      }
+      for (const auto& [field, text] : {std::pair{10u, &alert.header}, {11u, &alert.description}}) {
+        if (text->empty()) continue;
+        protozero::pbf_writer translated(body, field);
+        protozero::pbf_writer(translated, 1).add_string(1, *text);
+      }
     }
     return bytes;
-  }
-
- private:
-  static void write(protozero::pbf_writer& body, const Alert& alert) {
-    if (alert.start != 0 || alert.end != 0) {
-      protozero::pbf_writer period(body, 1);
-      if (alert.start != 0) period.add_uint64(1, static_cast<std::uint64_t>(alert.start));
-      if (alert.end != 0) period.add_uint64(2, static_cast<std::uint64_t>(alert.end));
-    }
-    for (const std::string& route : alert.routes) protozero::pbf_writer(body, 5).add_string(2, route);
-    body.add_enum(6, alert.cause);
-    body.add_enum(7, alert.effect);
-    body.add_enum(14, alert.severity);
-    if (!alert.image.empty()) {
-      protozero::pbf_writer translated(body, 15);
-      protozero::pbf_writer image(translated, 1);
-      image.add_string(1, alert.image);
-      image.add_string(2, "image/png");
-    }
-    for (const auto& [field, text] :
-         {std::pair{10u, &alert.header}, {11u, &alert.description}, {16u, &alert.imageText}}) {
-      if (text->empty()) continue;
-      protozero::pbf_writer translated(body, field);
-      protozero::pbf_writer(translated, 1).add_string(1, *text);
-    }
   }
 };
 

@@ -98,43 +98,22 @@ TEST(AlertImage, ComesAsPixelsOrWithWhatIsWrong) {
   }
 }
 
-TEST(AlertImage, IsGivenUpWhenNobodyWaitsAnyMore) {
-  std::stop_source stop;
-  const LoopbackServer server([&](const std::string&) {
-    stop.request_stop();
-    return LoopbackServer::Answer{LoopbackServer::answer("200 OK", std::string(1 << 20, 'x')), false, true};
-  });
-  EXPECT_FALSE(fetchImage(*FeedAddress::parse(server.address()), 100, stop.get_token()));
-}
-
-TEST(AlertImage, IsAskedForByItsIncident) {
+TEST(AlertImage, TakesNoMoreRoomThanItsHostGives) {
   const LoopbackServer server(
       [](const std::string&) { return LoopbackServer::Answer{LoopbackServer::answer("200 OK", png(64, 32))}; });
   const Programs programs;
-  AlertsBuilder::Alert shown{"a", {"m1"}, "Works", "Slow."}, plain{"b", {"m1"}, "Storm", "Wind."};
-  shown.image = server.address("/map.png");
-  shown.imageText = "A map";
-  programs.setUpCity({"m1"}, {shown, plain});
+  AlertsBuilder::Alert alert{"a", {"m1"}, "Works", "Slow."};
+  alert.image = server.address("/map.png");
+  programs.setUpCity({"m1"}, {alert});
   std::vector<json> events = {appearing()[0], request("performUpdate"), request("lines")};
-  const json incidents = programs.play(events).back()["result"]["lines"][0]["incidents"];
-  EXPECT_EQ(incidents[0]["image"], true);
-  EXPECT_EQ(incidents[0]["imageText"], "A map");
-  EXPECT_EQ(incidents[1]["image"], false);
-  events.pop_back();
-  const json room = {{"incident", incidents[0]["id"]}, {"width", 32}, {"offset", 4096}, {"capacity", 2048}};
-  json narrow = room, none = room;
-  narrow["capacity"] = 2047;
-  none["incident"] = incidents[1]["id"];
-  for (const json& params : {room, narrow, none}) events.push_back(request("image", params));
-  const auto lines = programs.play(events);
-  std::vector<std::string> answers;
-  for (const json& line : lines)
-    if (line.contains("error"))
-      answers.push_back(line["error"]["code"].dump());
-    else if (line.contains("result") && line["result"].contains("width"))
-      answers.push_back(line["result"].dump());
-  EXPECT_THAT(answers, testing::UnorderedElementsAre(R"({"height":16,"scale":1.0,"stride":128,"width":32})", "-32002",
-                                                     "-32002"));
+  const json incident = programs.play(events).back()["result"]["lines"][0]["incidents"][0];
+  const auto answer = [&](int capacity) {
+    events.back() =
+        request("image", {{"incident", incident["id"]}, {"width", 32}, {"offset", 4096}, {"capacity", capacity}});
+    return programs.play(events).back();
+  };
+  EXPECT_EQ(answer(2048)["result"], (json{{"height", 16}, {"scale", 1.0}, {"stride", 128}, {"width", 32}}));
+  EXPECT_EQ(answer(2047)["error"]["code"], -32002);
 }
 
 }  // namespace

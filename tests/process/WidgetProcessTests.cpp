@@ -2,6 +2,7 @@
 
 #include <gmock/gmock.h>
 
+#include "desktop/gtfs/feeds/FeedMuid.h"
 #include "host/Programs.h"
 
 namespace nimbo {
@@ -19,40 +20,6 @@ std::vector<json> operator+(std::vector<json> a, const std::vector<json>& b) {
 
 const std::vector<json> kUpdateAndLook = {request("performUpdate"), request("snapshot")};
 const json kExpand = request("setActiveDisplayMode", {{"mode", "expanded"}});
-
-TEST(WidgetProcess, ShowsTheRowsThatTheFeedCallsFor) {
-  const AlertsBuilder::Alert one{"a1", {"m1"}, "Signal failure", "Delays of ten minutes."};
-  const AlertsBuilder::Alert two{"a2", {"b10"}, "Road works", "Stops moved."}, three{"a3", {"b11"}, "Strike", "None."};
-  const struct {
-    std::string name;
-    std::vector<std::string> favorites;
-    std::vector<AlertsBuilder::Alert> alerts;
-    std::vector<std::string> compact, expanded;
-  } cases[] = {
-      {"no favourites", {}, {}, {"No Favorite Lines"}, {}},
-      {"all clear", {"m1", "b10"}, {}, {"Good Service"}, {}},
-      {"one clear line", {"m1", "m2"}, {one}, {"Signal failure"}, {"Signal failure", "Good Service"}},
-      {"room for three",
-       {"m1", "b10", "b11", "b12"},
-       {one, two, three},
-       {"3 Advisories"},
-       {"Signal failure", "2 More Advisories", "Good Service"}},
-  };
-  for (const auto& c : cases) {
-    SCOPED_TRACE(c.name);
-    Programs programs;
-    programs.setUpCity(c.favorites, c.alerts);
-    const auto lines =
-        programs.play(appearing(110, 330) + kUpdateAndLook + std::vector<json>{kExpand, request("snapshot")});
-    const auto seen = snapshots(lines);
-    ASSERT_THAT(seen, SizeIs(2));
-    EXPECT_EQ(titles(seen[0]), c.compact);
-    EXPECT_EQ(seen[0]["result"], "success");
-    EXPECT_EQ(seen[0]["largestAvailableDisplayMode"], c.expanded.empty() ? "compact" : "expanded");
-    EXPECT_EQ(titles(seen[1]), c.expanded.empty() ? c.compact : c.expanded);
-    EXPECT_EQ(seen[1]["preferredContentSize"], (json{359, 110.0 * static_cast<double>(seen[1]["rows"].size())}));
-  }
-}
 
 TEST(WidgetProcess, TellsTheStateOfLinesByItsLastFetch) {
   Programs programs;
@@ -182,7 +149,9 @@ TEST(WidgetProcess, HearsOfAModeOnlyWhereItIsNotInForce) {
                                                               kExpand, compact, compact}));
   EXPECT_EQ(seen.at(0)["expanded"], false) << "without rows for it";
   EXPECT_EQ(seen.at(0)["displayMode"], "expanded");
+  EXPECT_EQ(seen.at(0)["largestAvailableDisplayMode"], "compact");
   EXPECT_EQ(seen.at(1)["expanded"], true) << "the same mode again";
+  EXPECT_EQ(seen.at(1)["largestAvailableDisplayMode"], "expanded");
   std::istringstream recorded(programs.run({"analytics", "--json"}).output);
   std::vector<int> actions;
   for (std::string line; std::getline(recorded, line);)
@@ -276,7 +245,9 @@ TEST(WidgetProcess, TellsOfLinesBeforeAnythingElse) {
                                  {{{"id", "city:old"}, {"agencyID", "M"}, {"shortName", "2"}, {"mode", 2}},
                                   {{"id", "city:gone"}},
                                   {{"id", "bad:1"}},
-                                  {{"id", "nowhere:1"}}}}}),
+                                  {{"id", "nowhere:1"}},
+                                  {{"muid", lineMuid("city", "m2")}},
+                                  {{"muid", 7}}}}}),
   };
   const auto lines = results(programs.play(asked), asked);
   ASSERT_THAT(lines, SizeIs(4));
@@ -296,32 +267,9 @@ TEST(WidgetProcess, TellsOfLinesBeforeAnythingElse) {
   EXPECT_EQ(described.at(1), (json{{"line", nullptr}, {"gone", true}}));
   EXPECT_EQ(described.at(2), (json{{"line", nullptr}, {"gone", false}})) << "nobody knows";
   EXPECT_EQ(described.at(3), (json{{"line", nullptr}, {"gone", false}}));
+  EXPECT_EQ(described.at(4)["line"], castle);
+  EXPECT_EQ(described.at(5), (json{{"line", nullptr}, {"gone", false}}));
   EXPECT_THAT(lines[3]["failures"], SizeIs(2));
-  const std::vector<json> byNumber = {
-      request("describeLines", {{"lines", {{{"muid", castle["muid"]}}, {{"muid", 7}}}}})};
-  const json numbered = results(programs.play(byNumber), byNumber).at(0)["lines"];
-  EXPECT_EQ(numbered.at(0)["line"], castle);
-  EXPECT_EQ(numbered.at(1), (json{{"line", nullptr}, {"gone", false}}));
-}
-
-TEST(WidgetProcess, ChecksFeedsThatAreSetUpOrToBe) {
-  Programs programs;
-  programs.setUpCity({}, {{"a", {"m2"}, "Works", "Slow."}, {"x", {"gone"}, "Old", "Line."}});
-  const std::string feed = programs.folder.path() / "feed";
-  const auto definition = [&](const std::string& name, const std::string& alerts) {
-    return request("checkFeed", {{"definition", {{"name", name}, {"static", feed}, {"alerts", alerts}}}});
-  };
-  const std::vector<json> asked = {request("checkFeed", {{"feed", "city"}}), definition("new", "/none"),
-                                   definition("a:b", "/none"), request("checkFeed", {{"feed", "nowhere"}}),
-                                   request("checkFeed")};
-  const auto reports = results(programs.play(asked), asked);
-  ASSERT_THAT(reports, SizeIs(5));
-  EXPECT_EQ(reports[0]["static"]["lines"], 5);
-  EXPECT_EQ(reports[0]["alerts"]["affectedLines"], 1);
-  EXPECT_EQ(reports[0]["alerts"]["unfit"].at(0)["example"], "route gone");
-  EXPECT_FALSE(reports[0].contains("alertsError"));
-  EXPECT_EQ(reports[1]["alertsError"]["subject"], "/none");
-  for (std::size_t i = 2; i < 5; ++i) EXPECT_EQ(reports[i], nullptr) << asked[i];
 }
 
 TEST(WidgetProcess, OutlivesEveryMessage) {
@@ -348,7 +296,11 @@ TEST(WidgetProcess, OutlivesEveryMessage) {
       {request("advanceTime", {{"seconds", -1}}), -32602},
       {request("render", {{"path", "/nonexistent/folder/x.png"}}), -32602},
       {request("describeLines", {{"lines", {{{"id", "no colon"}}}}}), -32602},
+      {request("checkFeed"), -32602},
+      {request("checkFeed", {{"feed", "nowhere"}}), -32602},
+      {request("checkFeed", {{"definition", {{"name", "a:b"}, {"static", "/none"}, {"alerts", "/none"}}}}), -32602},
       {request("cancel", {{"request", 1.5}}), -32602},
+      {request("image", {{"incident", "1"}, {"width", 32}}), -32002},
       {request("render", {{"surface", "/proc/self/fd/0"}}), -32602},
       {request("render", {{"offset", -1}}), -32602},
       {request("render", {{"offset", 255'900'000}}), -32002},
