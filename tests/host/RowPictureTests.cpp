@@ -80,58 +80,6 @@ class Picture {
   Ink _ink;
 };
 
-class RowPictures : public testing::Test {
- protected:
-  /// A metro and many buses, the first `affected` of them with an incident of their own.
-  void setUpCity(int affected, const Alerts& others = {}, const std::array<std::string, 2>& metro = {"1", "2"}) {
-    std::string routes =
-        "route_id,agency_id,route_short_name,route_long_name,route_type,route_color,route_text_color\n"
-        "m1,M," +
-        metro[0] + ",Harbour Line,1,005599,FFFFFF\nm2,M," + metro[1] + ",Castle Line,1,CC0000,FFFFFF\n";
-    std::vector<std::string> favorites = {"m1", "m2", "b0", "b39"};
-    Alerts alerts = others;
-    for (int i = 0; i < 40; ++i) {
-      const std::string route = "b" + std::to_string(i);
-      routes += route + ",B,B" + std::to_string(i) + ",Bus,3,,\n";
-      if (i >= affected) continue;
-      alerts.push_back({"a" + route, {route}, "Works " + std::to_string(i), ""});
-      if (i > 0) favorites.push_back(route);
-    }
-    programs.folder.write("feed/routes.txt", routes);
-    programs.setUpCity(favorites, alerts);
-  }
-
-  /// The rows as drawn with these parameters of `initialize` over the ordinary ones.
-  std::pair<json, Picture> draw(const json& parameters, bool isExpanded) {
-    std::vector<json> events = appearing();
-    json& all = events[0]["params"];
-    all["scale"] = kScale;
-    all.update(parameters);
-    events.push_back(request("performUpdate"));
-    if (isExpanded) events.push_back(request("setActiveDisplayMode", {{"mode", "expanded"}}));
-    events.push_back(request("snapshot"));
-    events.push_back(request("render"));
-    std::stringstream script, output;
-    for (const json& event : events) script << event << "\n";
-    GLibRunLoop runLoop;
-    const PictureMemory memory;
-    ::setenv("NIMBO_TRANSIT_WIDGET", NIMBO_TRANSIT_WIDGET, 1);
-    WidgetClient client(runLoop,
-                        {"--config", programs.folder.path() / "config", "--state", programs.folder.path() / "state",
-                         "--virtual-time", isoTextOfDate(Programs::now())},
-                        &memory);
-    ScriptPlayer(client, output).play(script);
-    std::vector<json> lines;
-    for (std::string line; std::getline(output, line);) lines.push_back(json::parse(line));
-    const auto drawn = protocol::read<protocol::Rendered>(lines.back()["result"]);
-    return {snapshots(lines).at(0), Picture(memory.take(drawn).value())};
-  }
-
-  void expectRows(const json& parameters, bool isExpanded);
-
-  Programs programs;
-};
-
 bool isLatin(const std::string& text) { return std::isalpha(static_cast<unsigned char>(text.at(0))); }
 
 void expectOrder(const json& row, const Picture& picture, bool isMirrored) {
@@ -179,12 +127,62 @@ void expectOrder(const json& row, const Picture& picture, bool isMirrored) {
   }
 }
 
-void RowPictures::expectRows(const json& parameters, bool isExpanded) {
-  SCOPED_TRACE(parameters.dump() + (isExpanded ? " expanded" : " compact"));
-  const auto [snapshot, picture] = draw(parameters, isExpanded);
-  ASSERT_EQ(snapshot["rows"].size(), isExpanded ? 4u : 1u);
-  for (const json& row : snapshot["rows"]) expectOrder(row, picture, parameters.value("locale", "") == "ar");
-}
+class RowPictures : public testing::Test {
+ protected:
+  /// A metro and many buses, the first `affected` of them with an incident of their own.
+  void setUpCity(int affected, const Alerts& others = {}, const std::array<std::string, 2>& metro = {"1", "2"}) {
+    std::string routes =
+        "route_id,agency_id,route_short_name,route_long_name,route_type,route_color,route_text_color\n"
+        "m1,M," +
+        metro[0] + ",Harbour Line,1,005599,FFFFFF\nm2,M," + metro[1] + ",Castle Line,1,CC0000,FFFFFF\n";
+    std::vector<std::string> favorites = {"m1", "m2", "b0", "b39"};
+    Alerts alerts = others;
+    for (int i = 0; i < 40; ++i) {
+      const std::string route = "b" + std::to_string(i);
+      routes += route + ",B,B" + std::to_string(i) + ",Bus,3,,\n";
+      if (i >= affected) continue;
+      alerts.push_back({"a" + route, {route}, "Works " + std::to_string(i), ""});
+      if (i > 0) favorites.push_back(route);
+    }
+    programs.folder.write("feed/routes.txt", routes);
+    programs.setUpCity(favorites, alerts);
+  }
+
+  /// The rows as drawn with these parameters of `initialize` over the ordinary ones.
+  std::pair<json, Picture> draw(const json& parameters, bool isExpanded) {
+    std::vector<json> events = appearing();
+    json& all = events[0]["params"];
+    all["scale"] = kScale;
+    all.update(parameters);
+    events.push_back(request("performUpdate"));
+    if (isExpanded) events.push_back(request("setActiveDisplayMode", {{"mode", "expanded"}}));
+    events.push_back(request("snapshot"));
+    events.push_back(request("render"));
+    std::stringstream script, output;
+    for (const json& event : events) script << event << "\n";
+    GLibRunLoop runLoop;
+    const PictureMemory memory;
+    ::setenv("NIMBO_TRANSIT_WIDGET", NIMBO_TRANSIT_WIDGET, 1);
+    WidgetClient client(runLoop,
+                        {"--config", programs.folder.path() / "config", "--state", programs.folder.path() / "state",
+                         "--virtual-time", isoTextOfDate(Programs::now())},
+                        &memory);
+    ScriptPlayer(client, output).play(script);
+    std::vector<json> lines;
+    for (std::string line; std::getline(output, line);) lines.push_back(json::parse(line));
+    const auto drawn = protocol::read<protocol::Rendered>(lines.back()["result"]);
+    return {snapshots(lines).at(0), Picture(memory.take(drawn).value())};
+  }
+
+  void expectRows(const json& parameters, bool isExpanded) {
+    SCOPED_TRACE(parameters.dump() + (isExpanded ? " expanded" : " compact"));
+    const auto [snapshot, picture] = draw(parameters, isExpanded);
+    ASSERT_EQ(snapshot["rows"].size(), isExpanded ? 4u : 1u);
+    for (const json& row : snapshot["rows"]) expectOrder(row, picture, parameters.value("locale", "") == "ar");
+  }
+
+  Programs programs;
+};
 
 TEST_F(RowPictures, AreInOrderInEverySizeLanguageAndAppearance) {
   setUpCity(1, {{"x", {"m1", "m2"}, "Signal failure at the castle", "Trains run every ten minutes."},
