@@ -24,7 +24,6 @@ std::vector<std::size_t> wordLengths(const std::string& text) {
 
 ImageRef ShieldRendererDouble::render(const TransitArtwork& artwork, std::int64_t shieldSize, double screenScale,
                                       bool nightMode) {
-  ++rendered;
   const std::int64_t size = std::max<std::int64_t>(shieldSize, 0);
   const double height = 14 + 2 * static_cast<double>(size);
   if (artwork.shieldDataSource()) {

@@ -23,15 +23,12 @@ class ImageDouble final : public Image {
   double _scale;
 };
 
-/// Images of the sizes that a test sets, in points, 24 by 24 until set.
+/// Images of 24 by 24 points.
 class ImageResourcesDouble final : public ImageResources {
  public:
-  ImageRef image(std::string_view name, double screenScale, bool nightMode) override {
-    const auto found = sizes.find(name);
-    return std::make_shared<const ImageDouble>(found == sizes.end() ? Size{24, 24} : found->second, screenScale,
-                                               nightMode);
+  ImageRef image(std::string_view, double screenScale, bool nightMode) override {
+    return std::make_shared<const ImageDouble>(Size{24, 24}, screenScale, nightMode);
   }
-  std::map<std::string, Size, std::less<>> sizes;
 };
 
 /// Shields of 14 points' height at size 0 and 28 at size 7, each step 2 points; as wide as `width` says. Icons are as
@@ -43,7 +40,6 @@ class ShieldRendererDouble final : public ShieldIconRenderer {
 
   /// Points for a shield size and a text. Until set: half the height for each byte of the text, at least the height.
   std::function<double(std::int64_t shieldSize, const std::string& text)> width;
-  std::size_t rendered = 0;
   bool cachesIconAtlases = true;
 };
 

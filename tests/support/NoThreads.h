@@ -10,26 +10,17 @@ namespace nimbo {
 class NoThreads {
  public:
   NoThreads() {
-    pthread_attr_t attributes;
-    pthread_getattr_default_np(&attributes);
-    pthread_attr_getstacksize(&attributes, &_size);
-    pthread_attr_destroy(&attributes);
-    setStackSize(std::size_t(1) << 48);
+    pthread_getattr_default_np(&_before);
+    pthread_attr_t without = _before;
+    pthread_attr_setstacksize(&without, std::size_t(1) << 48);
+    pthread_setattr_default_np(&without);
   }
-  ~NoThreads() { setStackSize(_size); }
+  ~NoThreads() { pthread_setattr_default_np(&_before); }
   NoThreads(const NoThreads&) = delete;
   NoThreads& operator=(const NoThreads&) = delete;
 
  private:
-  static void setStackSize(std::size_t size) {
-    pthread_attr_t attributes;
-    pthread_getattr_default_np(&attributes);
-    pthread_attr_setstacksize(&attributes, size);
-    pthread_setattr_default_np(&attributes);
-    pthread_attr_destroy(&attributes);
-  }
-
-  std::size_t _size = 0;
+  pthread_attr_t _before;
 };
 
 }  // namespace nimbo

@@ -51,6 +51,12 @@ wl_resource* make(wl_client* client, const wl_interface& interface, std::uint32_
   return made;
 }
 
+/// Makes what is asked for, of whatever else is told.
+template <const wl_interface& interface, const auto& requests, auto kept, class... Arguments>
+void give(wl_client* client, wl_resource*, std::uint32_t id, Arguments...) {
+  make(client, interface, static_cast<std::uint32_t>(std::min(interface.version, 5)), id, &requests, kept);
+}
+
 void configure() {
   isConfigured = true;
   zwlr_layer_surface_v1_send_configure(layer, ++serial, given[0] ? given[0] : asked[0], given[1] ? given[1] : asked[1]);
@@ -145,17 +151,11 @@ const struct wp_viewport_interface kViewport {
     destination[1] = static_cast<std::uint32_t>(height);
   }
 };
-const struct wp_viewporter_interface kViewporter {
-  destroy, [](wl_client* client, wl_resource*, std::uint32_t id, wl_resource*) {
-    make(client, wp_viewport_interface, 1, id, &kViewport);
-  }
-};
+const struct wp_viewporter_interface kViewporter { destroy, give<wp_viewport_interface, kViewport, nullptr> };
 
 const struct wp_fractional_scale_v1_interface kFraction { destroy };
 const struct wp_fractional_scale_manager_v1_interface kFractions {
-  destroy, [](wl_client* client, wl_resource*, std::uint32_t id, wl_resource*) {
-    make(client, wp_fractional_scale_v1_interface, 1, id, &kFraction, &fraction);
-  }
+  destroy, give<wp_fractional_scale_v1_interface, kFraction, &fraction>
 };
 
 const struct wl_output_interface kOutput { destroy };
@@ -163,16 +163,8 @@ const struct wl_pointer_interface kPointer { pass, destroy };
 const struct wl_keyboard_interface kKeyboard { destroy };
 const struct wl_touch_interface kTouch { destroy };
 const struct wl_seat_interface kSeat {
-  [](wl_client* client, wl_resource*, std::uint32_t id) {
-    make(client, wl_pointer_interface, 5, id, &kPointer, &pointer);
-  },
-      [](wl_client* client, wl_resource*, std::uint32_t id) {
-        make(client, wl_keyboard_interface, 5, id, &kKeyboard, &keyboard);
-      },
-      [](wl_client* client, wl_resource*, std::uint32_t id) {
-        make(client, wl_touch_interface, 5, id, &kTouch, &finger);
-      },
-      destroy
+  give<wl_pointer_interface, kPointer, &pointer>, give<wl_keyboard_interface, kKeyboard, &keyboard>,
+      give<wl_touch_interface, kTouch, &finger>, destroy
 };
 
 template <const wl_interface& interface, const auto& requests>

@@ -44,13 +44,9 @@ int drive(bool serves) {
   std::unique_ptr<NoticeService> service;
   if (serves) {
     bus = std::move(*Bus::open());
-    service = std::make_unique<NoticeService>(runLoop, *bus,
-                                              NoticeService::Events{[](const std::string& problem) {
-                                                                      say({{"problem", problem}});
-                                                                    },
-                                                                    [] {
-                                                                      say({{"ended", true}});
-                                                                    }});
+    const auto tellProblem = [](const std::string& problem) { say({{"problem", problem}}); };
+    const auto tellEnd = [] { say({{"ended", true}}); };
+    service = std::make_unique<NoticeService>(runLoop, *bus, NoticeService::Events{tellProblem, tellEnd});
   }
   std::string input;
   const auto watching = runLoop.watchReadable(STDIN_FILENO, [&] {
