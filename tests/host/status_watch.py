@@ -43,70 +43,72 @@ def play_widget(arguments):
 if len(sys.argv) > 3:
     play_widget(sys.argv[4:])
 
+
+def watch(folder, by=widget, output=subprocess.PIPE):
+    return subprocess.Popen([program, "--config", folder, "--state", folder, "status", "--waybar", "--watch"], stdout=output,
+                            env=dict(os.environ, NIMBO_TRANSIT_WIDGET=by, TEST_ADVANCES=f"{folder}/advances", LC_ALL="C.UTF-8"))
+
+
+def see(bar, **wanted):
+    """The next line that holds what is wanted; those before are passed over."""
+    signal.alarm(60)  # rather than to wait for ever
+    line = {}
+    while any(line.get(key) != value for key, value in wanted.items()):
+        line = json.loads(bar.stdout.readline())
+    return line
+
+
+def end(bar):
+    bar.send_signal(signal.SIGTERM)
+    rest = bar.stdout.read()
+    assert bar.wait() == 0 and b"error" not in rest, rest
+
+
 with tempfile.TemporaryDirectory() as folder:
-    fifo, script = os.path.join(folder, "advances"), os.path.join(folder, "widget")
-    os.mkfifo(fifo)
+    script = os.path.join(folder, "widget")
+    os.mkfifo(f"{folder}/advances")
     with open(script, "w") as file:
         file.write(f'#!/bin/sh\nexec /usr/bin/python3 {__file__} {program} {widget} -- "$@"\n')
     os.chmod(script, 0o700)
-    command = [program, "--config", folder, "--state", folder]
 
-    def watch(output=subprocess.PIPE):
-        return subprocess.Popen(command + ["status", "--waybar", "--watch"], stdout=output,
-                                env=dict(os.environ, NIMBO_TRANSIT_WIDGET=script, TEST_ADVANCES=fifo, LC_ALL="C.UTF-8"))
-
-    bar = watch()
-    first = json.loads(bar.stdout.readline())
+    bar = watch(folder, script)
     # The machine's clock is far ahead of the widget's.
-    assert first["class"] == ["advisories", "new", "stale"] and first["alt"] == "advisories" and "Weavers&apos; Row" in first["tooltip"], first
-    with open(fifo, "wb", buffering=0) as advances:
+    first = see(bar, **{"class": ["advisories", "new", "stale"]})
+    assert first["alt"] == "advisories" and "Weavers&apos; Row" in first["tooltip"], first
+    with open(f"{folder}/advances", "wb", buffering=0) as advances:
         for seconds in (b"5400\n", b"1800\n"):  # an incident ends, and another one starts or ends
             before = first
             advances.write(seconds)
             first = json.loads(bar.stdout.readline())
             assert first != before and set(first) == {"text", "alt", "tooltip", "class", "percentage"}, first
-        bar.send_signal(signal.SIGTERM)
-        rest = bar.stdout.read()
-        assert bar.wait() == 0 and b"error" not in rest, rest
+        end(bar)
 
-    bar = watch()
-    with open(fifo, "wb"):
-        first = json.loads(bar.stdout.readline())
-        assert first["class"][::len(first["class"]) - 1] == ["old", "stale"] and first["alt"] == "old" and first["text"].endswith("(old)"), first
-        bar.stdout.close()
-        assert bar.wait() == 0, "a bar without a reader ends by itself"
+    bar = watch(folder)
+    first = json.loads(bar.stdout.readline())
+    assert first["class"][::len(first["class"]) - 1] == ["old", "stale"] and first["alt"] == "old" and first["text"].endswith("(old)"), first
+    bar.stdout.close()
+    assert bar.wait() == 0, "a bar without a reader ends by itself"
     ours, theirs = socket.socketpair()
-    bar = watch(theirs)
+    bar = watch(folder, output=theirs)
     theirs.close()
-    with open(fifo, "wb"):
-        assert ours.recv(1)
-        ours.close()
-        assert bar.wait() == 0, "so does one whose reader held a socket"
+    assert ours.recv(1)
+    ours.close()
+    assert bar.wait() == 0, "so does one whose reader held a socket"
 
 # A widget program that is not there is tried again, and what other processes change shows at once: nothing else would
 # make a bar look again before a minute has passed.
 with tempfile.TemporaryDirectory() as folder:
-    command = [program, "--config", folder, "--state", folder]
-    feed, late = os.path.join(folder, "feed"), os.path.join(folder, "widget")
-    bar = subprocess.Popen(command + ["status", "--waybar", "--watch"], stdout=subprocess.PIPE,
-                           env=dict(os.environ, NIMBO_TRANSIT_WIDGET=late))
-
-    def see(state):
-        signal.alarm(60)  # rather than to wait for ever
-        while json.loads(bar.stdout.readline())["alt"] != state:
-            pass
-
-    see("error")
+    feed, alerts, late = f"{folder}/feed", f"{folder}/feed/late.pb", f"{folder}/widget"
+    bar = watch(folder, late)
+    see(bar, alt="error")
     os.symlink(widget, late)
-    see("advisories")
+    see(bar, alt="advisories")
     publish(feed, [])
-    alerts = feed + "/late.pb"
     for arguments, state in ((["feed", "add", "city", "--static", feed, "--alerts", alerts, "--force"], "none"),
                              (["favorite", "add", "city:m1"], "error")):
-        subprocess.run(command + arguments, check=True, capture_output=True)
-        see(state)
+        subprocess.run([program, "--config", folder, "--state", folder, *arguments], check=True, capture_output=True)
+        see(bar, alt=state)
     os.rename(feed + "/alerts.pb", alerts)
-    see("good")
-    bar.send_signal(signal.SIGTERM)
-    assert bar.wait() == 0
+    see(bar, alt="good")
+    end(bar)
 print("watched")
