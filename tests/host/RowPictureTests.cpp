@@ -129,23 +129,15 @@ void expectOrder(const json& row, const Picture& picture, bool isMirrored) {
 
 class RowPictures : public testing::Test {
  protected:
-  /// A metro and many buses, the first `affected` of them with an incident of their own.
-  void setUpCity(int affected, const Alerts& others = {}, const std::array<std::string, 2>& metro = {"1", "2"}) {
-    std::string routes =
+  /// A metro and buses.
+  void setUpCity(const Alerts& alerts, const std::string& firstLine = "1", const std::string& secondLine = "2") {
+    programs.folder.write(
+        "feed/routes.txt",
         "route_id,agency_id,route_short_name,route_long_name,route_type,route_color,route_text_color\n"
         "m1,M," +
-        metro[0] + ",Harbour Line,1,005599,FFFFFF\nm2,M," + metro[1] + ",Castle Line,1,CC0000,FFFFFF\n";
-    std::vector<std::string> favorites = {"m1", "m2", "b0", "b39"};
-    Alerts alerts = others;
-    for (int i = 0; i < 40; ++i) {
-      const std::string route = "b" + std::to_string(i);
-      routes += route + ",B,B" + std::to_string(i) + ",Bus,3,,\n";
-      if (i >= affected) continue;
-      alerts.push_back({"a" + route, {route}, "Works " + std::to_string(i), ""});
-      if (i > 0) favorites.push_back(route);
-    }
-    programs.folder.write("feed/routes.txt", routes);
-    programs.setUpCity(favorites, alerts);
+            firstLine + ",Harbour Line,1,005599,FFFFFF\nm2,M," + secondLine +
+            ",Castle Line,1,CC0000,FFFFFF\nb0,B,B0,Bus,3,,\nb39,B,B39,Bus,3,,\n");
+    programs.setUpCity({"m1", "m2", "b0", "b39"}, alerts);
   }
 
   /// The rows as drawn with these parameters of `initialize` over the ordinary ones.
@@ -185,8 +177,9 @@ class RowPictures : public testing::Test {
 };
 
 TEST_F(RowPictures, AreInOrderInEverySizeLanguageAndAppearance) {
-  setUpCity(1, {{"x", {"m1", "m2"}, "Signal failure at the castle", "Trains run every ten minutes."},
-                {"y", {"m1", "b0"}, "Marathon", "Streets are closed and stops have moved until the evening."}});
+  setUpCity({{"x", {"m1", "m2"}, "Signal failure at the castle", "Trains run every ten minutes."},
+             {"y", {"m1", "b0"}, "Marathon", "Streets are closed and stops have moved until the evening."},
+             {"z", {"b0"}, "Works", ""}});
   const json tall = {{"compact", {359, 343}}, {"expanded", {359, 1372}}};
   const json cases[] = {{{"locale", "en"}},
                         {{"appearance", "dark"}},
@@ -204,11 +197,10 @@ TEST_F(RowPictures, AreInOrderInEverySizeLanguageAndAppearance) {
 
 TEST_F(RowPictures, KeepShieldsOffTheTextsHoweverNarrowTheyAre) {
   // Of equal shields only one would be made smaller: all of them have to be narrow enough.
-  setUpCity(0,
-            {{"x", {"m1"}, "Signal failure at the castle", "Trains run every ten minutes until the evening."},
+  setUpCity({{"x", {"m1"}, "Signal failure at the castle", "Trains run every ten minutes until the evening."},
              {"y", {"m1"}, "Elevatoroutofservicebeyondthecastle", ""},
              {"z", {"m2"}, "Marathon", "Streets are closed."}},
-            {"Hudson-Bergen Light Rail", "WWWWWWWWWW"});
+            "Hudson-Bergen Light Rail", "WWWWWWWWWW");
   for (const int width : {240, 300, 348, 359})
     for (const auto& [textSize, height] : {std::pair("large", 110), {"accessibilityExtraExtraExtraLarge", 343}})
       for (const char* locale : {"en", "ar"})

@@ -246,7 +246,6 @@ TEST(Trust, ProgramsEndWithAMessageWhereTheyCannotReadOrWrite) {
       {widget + folders + " --pictures 7 7</dev/null", "--pictures: descriptor 7"},
       {host + folders + " script - <&-", "cannot read -: Bad file descriptor"},
       {host + folders + " script /", "cannot read /: Is a directory"},
-      {host + folders + " decode - <&-", "cannot read -: Bad file descriptor"},
       {host + folders + " status >&-", "cannot write to the standard output: Bad file descriptor"},
       {"ulimit -f 1; " + host + folders + " render x.png", "no memory for the widget's pictures: File too large"},
       {"ulimit -f 1; " + host + folders + " update", "the rows cannot be kept: "},

@@ -141,12 +141,10 @@ def try_faults():
         host.see("the widget process on TEST-1 is ended: it ended")
         screen.see("shown 359x110 .* drawn")
 
-        first = session.environment["WAYLAND_DISPLAY"]
         screen.process.kill()
         host.see("the compositor is gone; looking")
         screen.process.wait()
         screen = session.compositor()
-        assert session.environment["WAYLAND_DISPLAY"] == first
         screen.see("shown 539x165 .* drawn")
         other = session.layer()
         screen.see("shown 539x165 .* drawn")
