@@ -54,20 +54,17 @@ TEST(CommandLine, AsksWhetherAFeedOfOtherThingsHoldsAlertsToo) {
     more.insert(more.begin(), {"feed", "add", name, "--static", feed, "--alerts", programs.alertsFile()});
     return programs.run(more);
   };
-  const auto isCombined = [&] {
-    return programs.folder.read("config/feeds.json").find("combined") != std::string::npos;
-  };
   programs.publishBytes(AlertsBuilder::feed(Programs::now(), {}) + vehicle);
   const ProgramRun refused = add("a", {});
   EXPECT_EQ(refused.status, 1);
   EXPECT_THAT(refused.errors, AllOf(HasSubstr("positions of vehicles"), HasSubstr("--combined")));
   EXPECT_EQ(programs.folder.read("config/feeds.json"), "");
   EXPECT_EQ(add("b", {"--combined", "--force"}).status, 0);
-  EXPECT_TRUE(isCombined());
+  EXPECT_THAT(programs.folder.read("config/feeds.json"), HasSubstr("combined"));
   programs.run({"feed", "remove", "b"});
   programs.publishBytes(AlertsBuilder::feed(Programs::now(), {{"a", {"m2"}, "Works", "Slow."}}) + vehicle);
   EXPECT_EQ(add("c", {"--force"}).status, 0);
-  EXPECT_TRUE(isCombined());
+  EXPECT_THAT(programs.folder.read("config/feeds.json"), HasSubstr("combined"));
 }
 
 TEST(CommandLine, LeadsFromNothingToTheStateOfALine) {
@@ -436,7 +433,6 @@ TEST(CommandLine, UpdatesTheRowsForTheNextStart) {
   EXPECT_EQ(programs.run({"analytics"}).output, "") << "nobody has looked at the widget";
   programs.publishBytes("no feed");
   EXPECT_EQ(programs.run({"update"}).status, 1);
-  EXPECT_EQ(saved().status, 0);
   EXPECT_THAT(saved().output, AllOf(HasSubstr("Works"), HasSubstr("\nUpdated "))) << "better than none";
 }
 

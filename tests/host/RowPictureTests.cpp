@@ -80,8 +80,6 @@ class Picture {
   Ink _ink;
 };
 
-bool isLatin(const std::string& text) { return std::isalpha(static_cast<unsigned char>(text.at(0))); }
-
 void expectOrder(const json& row, const Picture& picture, bool isMirrored) {
   const auto frame = row["frame"].get<std::vector<double>>();
   Parts parts;
@@ -94,7 +92,8 @@ void expectOrder(const json& row, const Picture& picture, bool isMirrored) {
     const Ink::Found ink = picture.drawnIn(text);
     EXPECT_GE(picture.contrastIn(text), kReadable);
     const bool isPrimary = text.top == parts.texts[0].top;
-    if (isMirrored && isLatin(row[isPrimary ? "primaryText" : "secondaryText"]))
+    const std::string words = row[isPrimary ? "primaryText" : "secondaryText"];
+    if (isMirrored && std::isalpha(static_cast<unsigned char>(words.at(0))))
       EXPECT_NEAR(ink.left, text.left, 12) << "a text begins on its own side";
     else
       EXPECT_NEAR(begin(ink.right, ink.left), edge, 12) << "texts begin on the leading side";

@@ -100,4 +100,3 @@ with tempfile.TemporaryDirectory() as name, socket.create_server(("127.0.0.1", 0
         place = pathlib.Path(name) / check.__name__
         place.mkdir()
         check(place, url)
-    listening.close()

@@ -15,8 +15,7 @@ ANSWERS = {
     "initialize": [{"name": "widget", "version": "1", "protocol": 1}],
 }
 
-
-def play_widget():
+if sys.argv[1] == "--widget":
     asked = {}
     for line in sys.stdin:
         request = json.loads(line)
@@ -27,10 +26,6 @@ def play_widget():
         if method == "shutdown":
             print(json.dumps(asked), file=sys.stderr)
         print(json.dumps({"jsonrpc": "2.0", "id": request["id"], "result": result}), flush=True)
-
-
-if sys.argv[1] == "--widget":
-    play_widget()
     sys.exit()
 
 with tempfile.TemporaryDirectory() as folder:

@@ -7,7 +7,6 @@
 #include <memory>
 #include <mutex>
 #include <optional>
-#include <sstream>
 #include <string>
 #include <utility>
 #include <vector>
@@ -44,9 +43,8 @@ class ScriptedRandomSource final : public RandomSource {
 class RecordingSignposts final : public Signposts {
  public:
   void event(const LogFacility& facility, std::string_view name, std::string_view message) override {
-    std::ostringstream event;
-    event << facility.subsystem << " " << facility.category << " " << name << message;
-    events.push_back(event.str());
+    const auto log = std::string(facility.subsystem) + " " + std::string(facility.category) + " ";
+    events.push_back(log + std::string(name) + std::string(message));
   }
   std::vector<std::string> events;
 };

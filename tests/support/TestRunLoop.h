@@ -5,6 +5,7 @@
 #include <functional>
 #include <mutex>
 #include <thread>
+#include <utility>
 #include <vector>
 
 #include "platform/RunLoop.h"
@@ -58,8 +59,7 @@ class TestRunLoop final : public RunLoop {
   /// Drops the queued work.
   void clear() {
     std::unique_lock guard(_lock);
-    const auto dropped = std::move(_queue);
-    _queue.clear();
+    const auto dropped = std::exchange(_queue, {});
     guard.unlock();  // what the work holds may queue more as it goes
   }
 

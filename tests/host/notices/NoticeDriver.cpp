@@ -3,7 +3,6 @@
 
 #include <unistd.h>
 
-#include <cstring>
 #include <iostream>
 #include <nlohmann/json.hpp>
 
@@ -69,4 +68,4 @@ int drive(bool serves) {
 
 }  // namespace nimbo
 
-int main(int, char** argv) { return nimbo::drive(std::strcmp(argv[1], "serve") == 0); }
+int main(int, char** argv) { return nimbo::drive(argv[1] == std::string_view("serve")); }
