@@ -15,7 +15,7 @@ case $purpose in
   run) ;;
   test | lint) packages+=(libgtest-dev libgmock-dev protobuf-compiler libprotobuf-dev python3 python3-kiwisolver zlib1g-dev libssl-dev
     desktop-file-utils appstream mandoc systemd bash-completion zsh fish libxml2-utils
-    xvfb xdotool dbus at-spi2-core python3-gi gir1.2-atspi-2.0 procps sway grim) ;;
+    xvfb xdotool dbus at-spi2-core python3-gi gir1.2-atspi-2.0 procps sway grim waybar polybar) ;;
   bench) packages+=(libbenchmark-dev protobuf-compiler libprotobuf-dev python3 python3-dev python3-kiwisolver
     libxdamage-dev xvfb dbus procps sway mako-notifier dunst) ;;
   fuzz) packages+=(clang libclang-rt-dev llvm) ;;  # the compiler with libFuzzer, the sanitizers, names in their reports
