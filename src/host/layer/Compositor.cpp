@@ -10,6 +10,7 @@
 #include <cerrno>
 #include <cstdlib>
 #include <cstring>
+#include <utility>
 
 #include "host/layer/Seat.h"
 
@@ -28,6 +29,7 @@ struct Compositor::EventSource {
   Compositor* compositor;
   gpointer watch;
   bool isReading;
+  bool waitsToWrite;
 
   static EventSource& of(GSource* source) { return *reinterpret_cast<EventSource*>(source); }
 
@@ -40,7 +42,9 @@ struct Compositor::EventSource {
     self.isReading = true;
     // A compositor that does not read now is written to when it does; one that is gone is noticed in reading.
     const bool isFull = wl_display_flush(display) < 0 && errno == EAGAIN;
-    g_source_modify_unix_fd(source, self.watch, static_cast<GIOCondition>(isFull ? G_IO_IN | G_IO_OUT : G_IO_IN));
+    // Each call wakes the run loop that is about to sleep.
+    if (std::exchange(self.waitsToWrite, isFull) != isFull)
+      g_source_modify_unix_fd(source, self.watch, static_cast<GIOCondition>(isFull ? G_IO_IN | G_IO_OUT : G_IO_IN));
     return FALSE;
   }
 
@@ -124,6 +128,8 @@ Compositor::Compositor(GLibRunLoop& runLoop, Delegate& delegate)
   _registry.reset(wl_display_get_registry(_display.get()));
   wl_registry_add_listener(_registry.get(), &Events::kRegistry, this);
   askForAnswer();
+  // It answers while the program goes on to start.
+  wl_display_flush(_display.get());
   _patience = _runLoop.scheduleTimer(kPatience, false, [this](Timer&) { fail("the compositor does not answer"); });
 }
 

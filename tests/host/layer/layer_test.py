@@ -161,7 +161,8 @@ def try_faults():
         screen.see("shown 539x165 .* row #f6f6f8")
 
         waiting.see("the compositor does not answer")
-        assert waiting.process.wait() == 1
+        _, status, usage = os.wait4(waiting.process.pid, 0)
+        assert os.waitstatus_to_exitcode(status) == 1 and usage.ru_utime + usage.ru_stime < 2, "it sleeps while it waits"
 
 
 def try_sway():
