@@ -158,7 +158,10 @@ double DesktopPreferences::textScale() const { return textScaleForCategory(textS
 std::string DesktopPreferences::locale() const { return _languageChoice == kSystem ? "" : _languageChoice; }
 
 void DesktopPreferences::apply() {
-  Gtk::Settings::get_default()->property_gtk_application_prefer_dark_theme() = appearance() == Appearance::dark;
+  auto isDark = Gtk::Settings::get_default()->property_gtk_application_prefer_dark_theme();
+  const bool wantsDark = appearance() == Appearance::dark;
+  // The toolkit reads its theme anew with each call.
+  if (isDark != wantsDark) isDark = wantsDark;
   _style->load_from_data(windowStyle(appearance(), textScale() / desktopTextScale()));
   _lookChanged.emit();
 }

@@ -107,7 +107,10 @@ void MainWindow::buildHeader() {
   _update.set_action_name("win.update");
   _menu.set_icon_name("open-menu-symbolic");
   _menu.set_tooltip_text(LocalizedString("Window_Menu"));
-  _menu.set_menu_model(makeMainMenu());
+  // A window is seldom open for its menu.
+  _menu.set_create_popup_func([this] {
+    if (!_menu.get_menu_model()) _menu.set_menu_model(makeMainMenu());
+  });
   _menu.set_primary();
   _menu.set_has_frame(false);
   // The focus stays on the page, where it comes back to when the page does.
