@@ -28,6 +28,10 @@ WidgetHostProcess::~WidgetHostProcess() {
   stop();
 }
 
+void WidgetHostProcess::prepare() {
+  if (!_widget && !_gaveUp) start();
+}
+
 void WidgetHostProcess::setVisible(bool visible) {
   if (visible == _visible) return;
   _visible = visible;
@@ -145,10 +149,11 @@ void WidgetHostProcess::setUpConnection() {
 
 void WidgetHostProcess::appear() {
   _appeared = true;
+  // Its rows of the last time are drawn before the fetch takes its time.
+  askForContent();
   _widget->ask(protocol::kViewWillAppear);
   _widget->ask(protocol::kViewDidAppear);
   _refresh.setOnScreen(true);
-  askForContent();
 }
 
 void WidgetHostProcess::disappear() {
@@ -288,7 +293,7 @@ ErrorRef WidgetHostProcess::failure(std::string reason) {
 }
 
 bool WidgetHostProcess::prepareFor(const std::shared_ptr<Question>& question) {
-  if (!_widget && !_gaveUp) start();
+  prepare();
   std::erase_if(_questions, [](const auto& asked) { return asked.expired(); });
   _questions.push_back(question);
   if (_widget && !_visible) stopLater();

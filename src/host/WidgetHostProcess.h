@@ -60,6 +60,8 @@ class WidgetHostProcess {
 
   /// How the widget is shown: told to the process that runs, which is started anew only for another locale.
   void setPresentation(const WidgetPresentation& presentation);
+  /// Starts a process that does not run yet, ahead of `setVisible`; it ends as when the widget is hidden.
+  void prepare();
   /// Whether the user can see the widget.
   void setVisible(bool visible);
   /// Whether the user wants a row for each incident; it is so while the widget offers it.

@@ -7,7 +7,8 @@
 namespace nimbo {
 
 void* functionOfLatePart(const char* file, const char* function) {
-  void* const library = ::dlopen(file, RTLD_NOW | RTLD_LOCAL);
+  // Libraries of others are bound as they are called: a start calls a part of them.
+  void* const library = ::dlopen(file, RTLD_LAZY | RTLD_LOCAL);
   void* const address = library ? ::dlsym(library, function) : nullptr;
   if (!address)
     throw LatePartMissing(std::string("a part of the program is missing: ") + ::dlerror() +

@@ -42,6 +42,7 @@ int LayerHost::run() {
   for (const std::string& output : _arguments.outputs)
     if (std::ranges::count(_widgets, output, &OutputWidget::outputName) == 0)
       _widgets.emplace_back(_widgetContext, output);
+  _colorScheme.emplace([this] { takeAppearance(); });
   _context.runLoop.run();
   return _status;
 }
@@ -117,7 +118,7 @@ void LayerHost::lookForCompositor(const std::string& reason) {
 }
 
 void LayerHost::takeAppearance() {
-  const auto appearance = _colorScheme.prefersDark().value_or(false) ? Appearance::dark : Appearance::light;
+  const auto appearance = _colorScheme->prefersDark().value_or(false) ? Appearance::dark : Appearance::light;
   for (OutputWidget& widget : _widgets) widget.setAppearance(appearance);
 }
 

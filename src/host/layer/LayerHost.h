@@ -46,7 +46,7 @@ class LayerHost final : private Compositor::Delegate {
   SystemClock _clock;
   WindowLauncher _launcher;
   OutputWidget::Context _widgetContext;
-  ColorSchemePortal _colorScheme{[this] { takeAppearance(); }};
+  std::optional<ColorSchemePortal> _colorScheme;  // once the widgets' processes are started
   std::unique_ptr<Compositor> _compositor;
   std::list<OutputWidget> _widgets;
   std::optional<Date> _readySince;  // of the last compositor; absent before the first

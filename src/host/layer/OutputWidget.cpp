@@ -28,8 +28,8 @@ OutputWidget::OutputWidget(const Context& context, std::string outputName)
   _presentation.width = context.arguments.width;
   _process.setPresentation(_presentation);
   _process.setExpanded(context.arguments.expanded);
-  // It draws its first rows while the compositor makes room for them.
-  _process.setVisible(true);
+  // It lays its first rows out while the compositor makes room for them.
+  _process.prepare();
 }
 
 OutputWidget::~OutputWidget() {
@@ -44,7 +44,6 @@ void OutputWidget::appear(Compositor& compositor, const Compositor::Output* outp
   _surface = std::make_unique<LayerSurface>(compositor, output, _context.arguments.placement, _context.arguments.width,
                                             static_cast<std::int32_t>(std::lround(height)), delegate);
   surfaceScaleChanged();
-  _process.setVisible(true);
 }
 
 void OutputWidget::leave() {
@@ -119,7 +118,8 @@ void OutputWidget::widgetDidFail(WidgetHostProcess::Failure, const std::string& 
 
 void OutputWidget::surfaceMayBeDrawn() {
   _mayDraw = true;
-  _process.askForContent();
+  _process.setVisible(true);
+  if (_mayDraw) _process.askForContent();
 }
 
 void OutputWidget::surfaceIsSeen(bool isSeen) {
