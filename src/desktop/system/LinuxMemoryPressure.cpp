@@ -23,6 +23,10 @@ constexpr std::string_view kWarningTrigger = "some 150000 2000000";
 /// All tasks that had work waited at once for as long: the machine does little else.
 constexpr std::string_view kCriticalTrigger = "full 150000 2000000";
 
+/// Seconds after which a source listens. The kernel takes 15 ms to take a trigger back, which a process that ends
+/// sooner would have to wait for.
+constexpr TimeInterval kBegins = 1;
+
 /// A source whose events come from a descriptor that a derived class opens.
 class DescriptorSource : public MemoryPressureSource {
  public:
@@ -33,11 +37,15 @@ class DescriptorSource : public MemoryPressureSource {
   ~DescriptorSource() override { DescriptorSource::cancel(); }
 
   void activate() override {
-    if (!_descriptor && !_state->cancelled) _descriptor = open();
-    if (_descriptor && !_watch) _watch = watch(_loop, _descriptor.get());
+    if (_state->cancelled || _beginning) return;
+    _beginning = _loop.scheduleTimer(kBegins, false, [this](Timer&) {
+      _descriptor = open();
+      if (_descriptor) _watch = watch(_loop, _descriptor.get());
+    });
   }
 
   void cancel() override {
+    if (_beginning) _beginning->invalidate();
     stopWatching();
     const std::lock_guard guard(_state->lock);
     _state->cancelled = true;
@@ -71,6 +79,7 @@ class DescriptorSource : public MemoryPressureSource {
   GLibRunLoop& _loop;
   std::shared_ptr<SerialQueue> _queue;
   std::shared_ptr<State> _state;
+  std::shared_ptr<Timer> _beginning;  // kept when it has fired
   FileDescriptor _descriptor;
   GSourceHandle _watch;
 };

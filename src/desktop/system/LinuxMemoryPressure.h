@@ -9,8 +9,8 @@ namespace nimbo {
 
 /// Memory pressure as the kernel reports it: the machine's from pressure stall triggers, the process's from the events
 /// of its cgroup. Events are waited for on the main run loop; no thread of its own, no wake-up without an event.
-/// Sources are activated and cancelled on the main thread, and stay quiet where a file is missing or not permitted.
-/// Sources: Documentation/accounting/psi.rst, Documentation/admin-guide/cgroup-v2.rst.
+/// Sources are activated and cancelled on the main thread, listen from a second after that, and stay quiet where a file
+/// is missing or not permitted. Sources: Documentation/accounting/psi.rst, Documentation/admin-guide/cgroup-v2.rst.
 class LinuxMemoryPressure final : public MemoryPressure {
  public:
   struct Files {

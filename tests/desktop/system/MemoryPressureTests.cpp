@@ -13,20 +13,23 @@ namespace {
 struct LinuxMemoryPressureTest : testing::Test {
   TestPlatform platform;
   TemporaryFolder root;
-  GLibRunLoop loop;
+  VirtualTime time{Date()};
+  GLibRunLoop loop{&time};
   std::shared_ptr<SerialQueue> queue = std::make_shared<SerialQueue>("pressure");
   std::string heard;  // written on the queue, read after `settle`
 
   std::unique_ptr<MemoryPressureSource> listen(LinuxMemoryPressure& pressure, MemoryPressureKind kind, char name) {
     auto source = pressure.makeSource(kind, queue, [this, name] { heard += name; });
     source->activate();
+    time.advance(2);
     return source;
   }
 
   /// Lets events that have happened reach their handlers: once round the loop, once through the queue.
   void settle() {
-    loop.scheduleTimer(
-        0, false, [this](Timer&) { queue->dispatchAsync([this] { loop.dispatchAsync([this] { loop.quit(); }); }); });
+    loop.dispatchAsync([this] {
+      loop.dispatchAsync([this] { queue->dispatchAsync([this] { loop.dispatchAsync([this] { loop.quit(); }); }); });
+    });
     loop.run();
   }
 };
