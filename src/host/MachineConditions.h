@@ -1,9 +1,9 @@
 #pragma once
 
 #include <functional>
+#include <memory>
 
-typedef struct _GNetworkMonitor GNetworkMonitor;
-typedef struct _GPowerProfileMonitor GPowerProfileMonitor;
+#include "host/ConditionsPart.h"
 
 namespace nimbo {
 
@@ -13,18 +13,13 @@ class MachineConditions {
  public:
   /// `networkReturned` is called when the network changes to one that is there, from the first question on.
   explicit MachineConditions(std::function<void()> networkReturned) : _networkReturned(std::move(networkReturned)) {}
-  ~MachineConditions();
-  MachineConditions(const MachineConditions&) = delete;
-  MachineConditions& operator=(const MachineConditions&) = delete;
 
   /// Whether the network is metered or power is saved.
   bool areScarce();
 
  private:
   std::function<void()> _networkReturned;
-  GNetworkMonitor* _network = nullptr;     // GLib's own
-  GPowerProfileMonitor* _power = nullptr;  // a reference
-  unsigned long _handler = 0;
+  std::unique_ptr<ReportedConditions> _reported;
 };
 
 }  // namespace nimbo

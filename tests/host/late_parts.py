@@ -9,7 +9,7 @@ import tempfile
 
 from cities import publish
 
-LIBRARIES = re.compile(r"calling init: \S*(libnimbo-|libcurl|libzip|libicu|libpango|libcairo)")
+LIBRARIES = re.compile(r"calling init: \S*(libnimbo-|libcurl|libzip|libicu|libpango|libcairo|libgio)")
 
 
 def main(cmake, build):
@@ -44,11 +44,11 @@ def main(cmake, build):
     for arguments in ["--waybar"], [], ["--saved"]:
         status = run("status", *arguments, LD_DEBUG="files")  # of both processes
         assert "4 Advisories" in status.stdout
-        drawing = [name for name in LIBRARIES.findall(status.stderr) if name in ("libpango", "libcairo")]
-        assert not drawing, f"status {arguments} loads {drawing}"
+        needless = {"libpango", "libcairo", "libicu", "libgio"}.intersection(LIBRARIES.findall(status.stderr))
+        assert not needless, f"status {arguments} loads {needless}"
         assert "libnimbo-images" not in status.stderr
     assert without("libnimbo-drawing.so", "status", "--json").returncode != 0
-    without("libnimbo-strings.so", "status")
+    without("libnimbo-strings.so", "feed", "find", "metro")
 
     feed = folder / "feed"
     publish(feed, [])

@@ -6,6 +6,7 @@
 
 #include "desktop/resources/Resources.h"
 #include "desktop/strings/Isolation.h"
+#include "desktop/strings/PlainPattern.h"
 #include "desktop/strings/SpanishAnd.h"
 #include "platform/foundation/Log.h"
 
@@ -80,9 +81,11 @@ std::string ICUStringTables::format(const std::string& pattern, std::span<const 
       if (needsIsolation(argument)) argument = isolated(std::get<std::string>(argument));
     arguments = keptApart;
   }
+  const std::string spoken = _isSpanish ? withSpanishAnd(pattern, arguments) : pattern;
+  if (auto text = filledWithoutICU(spoken, arguments, _languageTag)) return *std::move(text);
   try {
     if (!_format) _format = stringsPart().makePatternFormat(_languageTag);
-    return _format->fill(_isSpanish ? withSpanishAnd(pattern, arguments) : pattern, arguments);
+    return _format->fill(spoken, arguments);
   } catch (const std::runtime_error& failure) {
     writeLog({kDefaultLogSubsystem, "StringTables"}, LogLevel::error, "Unable to fill the pattern %@: %@",
              {pattern, failure.what()});

@@ -7,7 +7,8 @@
 
 namespace nimbo {
 
-/// The string tables inside the program ("strings/<language>.json"), whose patterns are ICU's.
+/// The string tables inside the program ("strings/<language>.json"), whose patterns are ICU's. Most are filled without
+/// it, since it takes more memory than all the rest of a status bar's texts (docs/decisions/0006-parts-opened-late.md).
 class ICUStringTables final : public StringTables {
  public:
   /// `locale` is a BCP 47 tag ("de-AT") or a POSIX name ("de_AT.UTF-8"). The table of the tag is used, else that of the
@@ -35,7 +36,7 @@ class ICUStringTables final : public StringTables {
   bool _isSpanish;
   bool _isRightToLeft;
   std::string _languageTag;                        ///< by whose rules patterns are filled
-  mutable std::unique_ptr<PatternFormat> _format;  ///< null before the first pattern
+  mutable std::unique_ptr<PatternFormat> _format;  ///< null before the first pattern that takes ICU
 };
 
 }  // namespace nimbo

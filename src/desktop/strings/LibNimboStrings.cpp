@@ -36,24 +36,6 @@ class ICUPatternFormat final : public PatternFormat {
   }
 
   std::string fill(const std::string& pattern, std::span<const FormatArgument> arguments) override {
-    const auto isCount = [](const FormatArgument& argument) { return std::holds_alternative<std::uint64_t>(argument); };
-    const bool hasCounts = std::any_of(arguments.begin(), arguments.end(), isCount);
-    if (hasCounts || arguments.size() > kMarks.size()) return fillByICU(pattern, arguments);
-    std::string text;
-    std::string_view rest = textWithMarks(pattern);
-    for (std::size_t at; (at = rest.find_first_of(kMarks)) != std::string_view::npos; rest.remove_prefix(at + 1)) {
-      const std::size_t index = kMarks.find(rest[at]);
-      text += rest.substr(0, at);
-      text += index < arguments.size() ? std::get<std::string>(arguments[index]) : "{" + std::to_string(index) + "}";
-    }
-    return text += rest;
-  }
-
- private:
-  /// Characters that no table has.
-  static constexpr std::string_view kMarks = "\1\2\3\4\5\6";
-
-  std::string fillByICU(const std::string& pattern, std::span<const FormatArgument> arguments) {
     UErrorCode status = U_ZERO_ERROR;
     const icu::MessageFormat format(icu::UnicodeString::fromUTF8(pattern), _locale, status);
     std::vector<icu::Formattable> values;
@@ -70,20 +52,8 @@ class ICUPatternFormat final : public PatternFormat {
     return utf8(text);
   }
 
-  /// The pattern filled with a mark for each text. ICU puts texts into a pattern as they are: it is asked once where,
-  /// since rows are made by the thousand (docs/decisions/0006-parts-opened-late.md).
-  const std::string& textWithMarks(const std::string& pattern) {
-    std::string& kept = _textsWithMarks[pattern];
-    if (kept.empty()) {
-      std::vector<FormatArgument> marks;
-      for (const char mark : kMarks) marks.emplace_back(std::string(1, mark));
-      kept = fillByICU(pattern, marks);
-    }
-    return kept;
-  }
-
+ private:
   icu::Locale _locale;
-  std::map<std::string, std::string> _textsWithMarks;
 };
 
 class ICUDateFormat final : public DateFormat {

@@ -16,7 +16,7 @@ class PatternFormat {
  public:
   virtual ~PatternFormat() = default;
   /// Throws std::runtime_error with ICU's name of what is wrong with the pattern or an argument's type. An argument
-  /// that is not given stays as the pattern has it. Patterns are kept: they are those of a table.
+  /// that is not given stays as the pattern has it.
   virtual std::string fill(const std::string& pattern, std::span<const FormatArgument> arguments) = 0;
 };
 

@@ -137,6 +137,21 @@ TEST(StringTables, CountByTheRulesOfTheLanguage) {
             "+18.446.744.073.709.551.615 weitere");
 }
 
+TEST(StringTables, CountAsICUDoes) {
+  for (const std::string locale :
+       {"en", "en-IN", "de", "de-CH", "de-u-nu-arab", "fr", "fr-CA", "es", "es-MX", "ja", "ar", "ar-AE"}) {
+    const ICUStringTables tables(locale);
+    const auto icu = stringsPart().makePatternFormat(locale);
+    auto patterns = tableOf(locale.substr(0, 2));
+    patterns["own"] = "{0} # {1, plural, one{=1 #} =2 {two {0}} other  {# {0, plural, =7 {#} other {{1} #}}}}";
+    for (const auto& [key, pattern] : patterns)
+      for (const std::uint64_t count : {0, 1, 2, 3, 7, 11, 21, 100, 999, 1000, 1000000}) {
+        const FormatArgument counts[] = {count, count, count};
+        EXPECT_EQ(tables.format(pattern, counts), icu->fill(pattern, counts)) << locale << " " << key;
+      }
+  }
+}
+
 TEST(StringTables, AnswerPatternsThatCannotBeFilled) {
   const ICUStringTables english("en");
   const std::vector<FormatArgument> arguments{std::string("A"), std::uint64_t{2}};
