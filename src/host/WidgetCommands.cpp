@@ -76,7 +76,10 @@ WidgetPresentation presentationForStatus(const StatusOptions& options) {
 /// The rows of the last time.
 int runSavedStatus(const CommandContext& context, const StatusOptions& options) {
   const auto mode = options.expanded ? WidgetDisplayMode::Expanded : WidgetDisplayMode::Compact;
-  printRows(savedSnapshot(context, presentationForStatus(options), mode, {.rows = options.json}), options, {});
+  WidgetPresentation presentation = presentationForStatus(options);
+  // Of rows that are not shown come as few as may be.
+  if (!options.expanded && !options.json) presentation.expandedHeight = presentation.compactHeight;
+  printRows(savedSnapshot(context, presentation, mode, {.rows = options.json}), options, {});
   return kExitSuccess;
 }
 
