@@ -93,6 +93,7 @@ class Peer:
 
 class Day:
     UPDATES = 10  # in one figure
+    SETTLED = 2  # seconds after which a bar has given back what its rows took
 
     def __init__(self, build, folder):
         self.build, self.folder = build, folder
@@ -212,7 +213,7 @@ class Day:
                                stdout=subprocess.PIPE, text=True)
         while "Advisories" not in bar.stdout.readline():
             pass
-        time.sleep(0.5)
+        time.sleep(self.SETTLED)
         with open(f"/proc/{bar.pid}/task/{bar.pid}/children") as file:
             processes = [bar.pid, *map(int, file.read().split())]
         total = sum(map(proportional_mib, processes))

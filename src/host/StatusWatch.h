@@ -55,7 +55,8 @@ class StatusWatch {
   protocol::Lines _lines;                                      // as the widget told last
   Backoff _restarts{kFirstRestart, kLongestRestart};
   std::shared_ptr<Timer> _restart;
-  std::shared_ptr<Timer> _stale;  // when the rows become old
+  std::shared_ptr<Timer> _stale;      // when the rows become old
+  std::shared_ptr<Timer> _givesBack;  // null before the first rows
   SystemRandom _random;
   MachineConditions _conditions{[this] { _refresh.networkReturned(); }};
   RefreshRule _refresh;

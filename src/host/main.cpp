@@ -11,6 +11,7 @@
 #include <set>
 
 #include "desktop/gtfs/feeds/Feed.h"
+#include "desktop/system/SmallMemory.h"
 #include "desktop/system/StandardDescriptors.h"
 #include "host/Arguments.h"
 #include "host/Commands.h"
@@ -303,6 +304,7 @@ int CommandLine::outputStatus() {
 }  // namespace nimbo
 
 int main(int argc, char** argv) {
+  nimbo::keepHeapSmall();
   nimbo::prepareStandardDescriptors();
   return nimbo::CommandLine().run(argc, argv);
 }

@@ -9,6 +9,7 @@
 #include "desktop/gtfs/static/LineItems.h"
 #include "desktop/rpc/Base64.h"
 #include "desktop/store/RefreshSetting.h"
+#include "desktop/system/SmallMemory.h"
 #include "platform/foundation/Log.h"
 #include "platform/foundation/Version.h"
 #include "platform/ui/Color.h"
@@ -468,6 +469,7 @@ void WidgetProcess::tellNotice(const ErrorRef& notice) {
 void WidgetProcess::announceFrame() {
   if (std::exchange(_frameAnnounced, true)) return;
   notify(_connection, protocol::kFrame, {});
+  if (!_givesBack || !_givesBack->isValid()) _givesBack = giveBackHeapSoon(_runLoop);
 }
 
 protocol::Advanced WidgetProcess::advanceTime(const protocol::AdvanceParams& params) {

@@ -110,6 +110,7 @@ class WidgetProcess {
   std::set<std::string> _seenEarly;  // before a fetch told what they are
   bool _hostChoseMode = false;
   bool _frameAnnounced = false;
+  std::shared_ptr<Timer> _givesBack;           // null before the first change
   std::vector<TransitLineItemRef> _keptLines;  // of the answer that was kept last
   Date _keptLinesAt;
 };

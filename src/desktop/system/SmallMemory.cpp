@@ -16,6 +16,10 @@ void keepHeapSmall() {
   mallopt(M_MMAP_THRESHOLD, kMapped);
 }
 
+std::shared_ptr<Timer> giveBackHeapSoon(RunLoop& runLoop) {
+  return runLoop.scheduleTimer(1, false, [](Timer&) { malloc_trim(0); });
+}
+
 void giveBackStack() {
   pthread_attr_t attributes;
   if (pthread_getattr_np(pthread_self(), &attributes) != 0) return;

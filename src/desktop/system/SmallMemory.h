@@ -1,5 +1,9 @@
 #pragma once
 
+#include <memory>
+
+#include "platform/RunLoop.h"
+
 namespace nimbo {
 
 /// Keeps the resident memory of a program that runs all day small; for the beginning of `main`.
@@ -8,6 +12,10 @@ namespace nimbo {
 /// when it is freed: by default glibc moves later ones of that size into the heap (docs/performance.md). Source:
 /// https://man7.org/linux/man-pages/man3/mallopt.3.html
 void keepHeapSmall();
+
+/// Gives back to the system the heap's pages that hold nothing, a second from now, when what a change of the rows took
+/// is freed. Answers the timer, which is valid until then.
+std::shared_ptr<Timer> giveBackHeapSoon(RunLoop& runLoop);
 
 /// Gives back to the system what deeper calls on this thread took of its stack and have left, such as
 /// GTK, which reads its theme recursively.
