@@ -103,7 +103,7 @@ class LinePayload final : public NBUserActivityPayload {
   std::optional<Bytes> bytes() const override { return bzip2CompressedData(recordOf(_line)); }
   bool isEqual(const Object* other) const override {
     const auto* payload = instanceOf<LinePayload>(other);
-    return payload && (payload->_line == _line || recordOf(payload->_line) == recordOf(_line));
+    return payload && StoredTransitLineItem::areAlike(*payload->_line, *_line);
   }
   std::uint64_t hash() const override { return _line->muid(); }
 
@@ -125,8 +125,7 @@ class IncidentsPayload final : public NBUserActivityPayload {
   bool isEqual(const Object* other) const override {
     const auto* payload = instanceOf<IncidentsPayload>(other);
     return payload && std::ranges::equal(payload->_incidents, _incidents, [](const auto& a, const auto& b) {
-             return a == b || StoredTransitIncident::initWithIncident(a)->data() ==
-                                  StoredTransitIncident::initWithIncident(b)->data();
+             return StoredTransitIncident::areAlike(*a, *b);
            });
   }
   std::uint64_t hash() const override { return _incidents.size(); }

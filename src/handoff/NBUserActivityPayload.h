@@ -7,7 +7,7 @@
 namespace nimbo {
 
 /// What stands for bytes in the user info of a hand-off until that is opened: rows are made again and again, and hardly
-/// one is tapped. Payloads are equal where the records are that they are made of, and so are their bytes. Main thread
+/// one is tapped. Payloads are equal where the records that they would be made of are, and so are their bytes. Main thread
 /// only.
 class NBUserActivityPayload : public Object {
  public:

@@ -1,7 +1,11 @@
+#include <functional>
+
 #include "handoff/ApplicationRecord+NimboExtras.h"
 #include "handoff/NBOpenable.h"
 #include "handoff/NBUserActivityData.h"
 #include "platform/UserSession.h"
+#include "platform/wire/StoredTransitIncident.h"
+#include "platform/wire/StoredTransitLineItem.h"
 #include "support/TestPlatform.h"
 #include "support/WidgetHostDouble.h"
 
@@ -42,20 +46,65 @@ TEST_F(Openable, ActivityDataIsTaggedWhenMadeAndComparedByWhatItStores) {
   }
 }
 
+using LineFields = StoredTransitLineItemFields;
+using IncidentFields = TransitIncidentFields;
+
+/// One for each field.
+const std::function<void(LineFields&)> kLineChanges[] = {
+    [](auto& f) { f.identifier = std::make_shared<const MapItemIdentifier>(1, TransitLineLocator{"feed"}); },
+    [](auto& f) { f.name = "B"; },
+    [](auto& f) { f.system = std::make_shared<const TransitSystem>(1, "System", nullptr); },
+    [](auto& f) { f.artwork = shieldArtwork("B"); },
+    [](auto& f) { f.modeArtwork = shieldArtwork("B"); },
+    [](auto& f) { f.alternateArtwork = shieldArtwork("B"); },
+    [](auto& f) { f.lineColorString = "#c8102e"; },
+    [](auto& f) { f.isBus = true; },
+    [](auto& f) { f.departureTimeDisplayStyle = 1; },
+    [](auto& f) { f.departuresAreVehicleSpecific = true; },
+    [](auto& f) { f.showVehicleNumber = true; },
+    [](auto& f) { f.hasEncyclopedicInfo = true; },
+    [](auto& f) { f.isIncidentsTTLExpired = true; },
+    [](auto& f) { f.hasIncidentComponent.set(false); },
+    [](auto& f) { f.incidents = {StoredTransitIncident::initWithIncident(incident(1))}; }};
+const std::function<void(IncidentFields&)> kIncidentChanges[] = {
+    [](auto& f) { f.muid = 2; },
+    [](auto& f) { f.title = ""; },
+    [](auto& f) { f.summary = "other"; },
+    [](auto& f) { f.fullDescription = "other"; },
+    [](auto& f) { f.messageForRoutePlanning = "other"; },
+    [](auto& f) { f.messageForRouteStepping = "other"; },
+    [](auto& f) { f.messageForNonRoutable = "other"; },
+    [](auto& f) { f.startDate = Date(); },
+    [](auto& f) { f.endDate = Date(); },
+    [](auto& f) { f.creationDate = Date(); },
+    [](auto& f) { f.lastUpdated = Date(); },
+    [](auto& f) { f.iconType = 1; },
+    [](auto& f) { f.isBlockingIncident = true; },
+    [](auto& f) { f.affectedEntities = {std::make_shared<const BasicAffectedEntity>(1)}; },
+    [](auto& f) { f.linkURL = "https://example.org"; }};
+
 TEST_F(Openable, PayloadsAreEqualWhereTheirRecordsAre) {
-  const auto a = incident(1), b = incident(2);
-  const auto list = activityDataForIncidents({a, b}), line = activityDataForLineItem(lineItem(1, "A", {a}));
-  const std::pair<NBUserActivityDataRef, const Object*> equal[] = {
-      {activityDataForIncidents({incident(1), b}), list.get()},
-      {activityDataForLineItem(lineItem(1, "A", {incident(1)})), line.get()}};
-  for (const auto& [made, other] : equal) {
-    EXPECT_TRUE(made->isEqual(other));
-    EXPECT_EQ(made->hash(), other->hash());
-  }
-  for (const TransitIncidents& other : {TransitIncidents{a}, {b, a}, {a, incident(3)}, {}})
-    EXPECT_FALSE(activityDataForIncidents(other)->isEqual(list.get()));
-  for (const TransitLineItemRef& other : {lineItem(1, "B", {a}), lineItem(1, "A", {b}), lineItem(1, "A")})
-    EXPECT_FALSE(activityDataForLineItem(other)->isEqual(line.get()));
+  const auto line = [](const std::function<void(LineFields&)>& change) {
+    LineFields fields{.identifier = std::make_shared<const MapItemIdentifier>(1), .artwork = shieldArtwork("A")};
+    if (change) change(fields);
+    return activityDataForLineItem(std::make_shared<const StoredTransitLineItem>(std::move(fields)));
+  };
+  const auto list = [](const std::function<void(IncidentFields&)>& change) {
+    IncidentFields fields{.muid = 1};
+    if (change) change(fields);
+    return activityDataForIncidents({std::make_shared<const BasicTransitIncident>(std::move(fields)), incident(3)});
+  };
+  const auto expectEqual = [](const NBUserActivityDataRef& a, const NBUserActivityDataRef& b) {
+    EXPECT_TRUE(a->isEqual(b.get()));
+    EXPECT_EQ(a->hash(), b->hash());
+  };
+  expectEqual(line(nullptr), line(nullptr));
+  expectEqual(list(nullptr), list(nullptr));
+  expectEqual(line(kLineChanges[14]), line(kLineChanges[14]));
+  for (const auto& change : kLineChanges) EXPECT_FALSE(line(change)->isEqual(line(nullptr).get()));
+  for (const auto& change : kIncidentChanges) EXPECT_FALSE(list(change)->isEqual(list(nullptr).get()));
+  for (const TransitIncidents& other : {TransitIncidents{incident(3)}, {}})
+    EXPECT_FALSE(activityDataForIncidents(other)->isEqual(list(nullptr).get()));
 }
 
 TEST_F(Openable, PayloadsAreMadeWhenTheyAreOpened) {

@@ -14,6 +14,17 @@ std::shared_ptr<const StoredTransitIncident> StoredTransitIncident::initWithInci
   return std::make_shared<const StoredTransitIncident>(fieldsOf(*incident));
 }
 
+bool StoredTransitIncident::areAlike(const TransitIncident& a, const TransitIncident& b) {
+  return &a == &b ||
+         (a.muid() == b.muid() && a.title() == b.title() && a.summary() == b.summary() &&
+          a.fullDescription() == b.fullDescription() && a.messageForRoutePlanning() == b.messageForRoutePlanning() &&
+          a.messageForRouteStepping() == b.messageForRouteStepping() &&
+          a.messageForNonRoutable() == b.messageForNonRoutable() && a.startDate() == b.startDate() &&
+          a.endDate() == b.endDate() && a.creationDate() == b.creationDate() && a.lastUpdated() == b.lastUpdated() &&
+          a.iconType() == b.iconType() && a.isBlockingIncident() == b.isBlockingIncident() &&
+          membersAreEqual(a.affectedEntities(), b.affectedEntities()) && a.linkURL() == b.linkURL());
+}
+
 const ArchivableClass& StoredTransitIncident::archivedClass() {
   static constexpr ArchivableClass archived{"StoredTransitIncident", decodeRecord<StoredTransitIncident>};
   return archived;

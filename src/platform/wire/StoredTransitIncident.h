@@ -19,6 +19,8 @@ class StoredTransitIncident final : public Record<StoredTransitIncident, Transit
 
   /// The incident's snapshot; itself when it is one already, null for null.
   static std::shared_ptr<const StoredTransitIncident> initWithIncident(const TransitIncidentRef& incident);
+  /// Whether the snapshots of both are equal. Makes none.
+  static bool areAlike(const TransitIncident& a, const TransitIncident& b);
 
   static const ArchivableClass& archivedClass();
   const ArchivableClass& archivableClass() const override { return archivedClass(); }

@@ -1,5 +1,7 @@
 #include "platform/wire/StoredTransitLineItem.h"
 
+#include <algorithm>
+
 #include "platform/wire/RecordImplementation.h"
 #include "platform/wire/TransitFieldTables.h"
 
@@ -48,6 +50,22 @@ std::shared_ptr<StoredTransitLineItem> StoredTransitLineItem::initWithLineItem(c
   for (const TransitIncidentRef& incident : lineItem->incidents())
     if (incident) fields.incidents.push_back(StoredTransitIncident::initWithIncident(incident));
   return std::make_shared<StoredTransitLineItem>(std::move(fields));
+}
+
+bool StoredTransitLineItem::areAlike(const TransitLineItem& a, const TransitLineItem& b) {
+  return &a == &b ||
+         (a.muid() == b.muid() && a.identifier()->locator() == b.identifier()->locator() && a.name() == b.name() &&
+          membersAreEqual(a.system(), b.system()) && membersAreEqual(a.artwork(), b.artwork()) &&
+          membersAreEqual(a.modeArtwork(), b.modeArtwork()) &&
+          membersAreEqual(a.alternateArtwork(), b.alternateArtwork()) && a.lineColorString() == b.lineColorString() &&
+          a.isBus() == b.isBus() && a.departureTimeDisplayStyle() == b.departureTimeDisplayStyle() &&
+          a.departuresAreVehicleSpecific() == b.departuresAreVehicleSpecific() &&
+          a.showVehicleNumber() == b.showVehicleNumber() && a.hasEncyclopedicInfo() == b.hasEncyclopedicInfo() &&
+          a.isIncidentsTTLExpired() == b.isIncidentsTTLExpired() &&
+          a.hasIncidentComponent() == b.hasIncidentComponent() &&
+          std::ranges::equal(a.incidents(), b.incidents(), [](const auto& one, const auto& other) {
+            return one && other ? StoredTransitIncident::areAlike(*one, *other) : one == other;
+          }));
 }
 
 const MapItemIdentifierRef& StoredTransitLineItem::identifier() const {

@@ -39,6 +39,8 @@ class StoredTransitLineItem final : public Record<StoredTransitLineItem, StoredT
 
   /// The item's snapshot, or null for null.
   static std::shared_ptr<StoredTransitLineItem> initWithLineItem(const TransitLineItemRef& lineItem);
+  /// Whether the snapshots of both are equal. Makes none.
+  static bool areAlike(const TransitLineItem& a, const TransitLineItem& b);
 
   std::uint64_t muid() const override { return identifier()->muid(); }
   /// The number 0 while the record has none.

@@ -50,9 +50,9 @@ class HeldObjects {
 
   TransitIncidents orHeld(TransitIncidents incidents) const {
     for (TransitIncidentRef& incident : incidents)
-      if (const auto held = _incidents.find(keyOf(*incident)); held != _incidents.end() &&
-                                                               kindOf(held->second) == kindOf(incident) &&
-                                                               recordOf(held->second) == recordOf(incident))
+      if (const auto held = _incidents.find(keyOf(*incident));
+          held != _incidents.end() && isSameKind(*held->second, *incident) &&
+          StoredTransitIncident::areAlike(*held->second, *incident))
         incident = held->second;
     return incidents;
   }
@@ -63,13 +63,12 @@ class HeldObjects {
     return {incident.muid(), incident.startDate(), incident.isBlockingIncident()};
   }
   /// What records leave out.
-  static std::tuple<AlertEffect, std::int32_t, std::int32_t, AlertConcern, AlertImage> kindOf(
-      const TransitIncidentRef& incident) {
-    const AlertIncident::Fields& fields = static_cast<const AlertIncident&>(*incident).fields();
-    return {fields.effect, fields.cause, fields.severity, fields.concern, fields.image};
-  }
-  static Bytes recordOf(const TransitIncidentRef& incident) {
-    return StoredTransitIncident::initWithIncident(incident)->data();
+  static bool isSameKind(const TransitIncident& a, const TransitIncident& b) {
+    const auto kindOf = [](const TransitIncident& incident) {
+      const AlertIncident::Fields& fields = static_cast<const AlertIncident&>(incident).fields();
+      return std::tie(fields.effect, fields.cause, fields.severity, fields.concern, fields.image);
+    };
+    return kindOf(a) == kindOf(b);
   }
   std::map<Key, TransitIncidentRef> _incidents;
 };
