@@ -36,15 +36,18 @@ std::string wordOf(const char* const (&words)[Count], std::int32_t number) {
   return words[number > 0 && number < static_cast<std::int32_t>(Count) ? number : 0];
 }
 
-protocol::LineIncident lineIncidentOf(const TransitIncident& incident) {
+/// Without its texts unless these are wanted.
+protocol::LineIncident lineIncidentOf(const TransitIncident& incident, bool texts) {
   protocol::LineIncident result{.id = std::to_string(incident.muid()),
-                                .title = incident.title().value_or(""),
-                                .text = incident.fullDescription() ? incident.fullDescription() : incident.summary(),
                                 .from = incident.startDate(),
                                 .until = incident.endDate(),
-                                .url = incident.linkURL(),
                                 .effect = wordOf(kEffects, 0),
                                 .cause = wordOf(kCauses, 0)};
+  if (texts) {
+    result.title = incident.title().value_or("");
+    result.text = incident.fullDescription() ? incident.fullDescription() : incident.summary();
+    result.url = incident.linkURL();
+  }
   if (const auto* alert = dynamic_cast<const AlertIncident*>(&incident)) {
     const AlertIncident::Fields& fields = alert->fields();
     result.severity = static_cast<protocol::Severity>(fields.severity - kUnknownSeverity);
@@ -52,7 +55,7 @@ protocol::LineIncident lineIncidentOf(const TransitIncident& incident) {
     result.cause = wordOf(kCauses, fields.cause);
     result.concern = static_cast<protocol::Concern>(fields.concern);
     result.hasImage = fields.image.address.has_value();
-    result.imageText = fields.image.text;
+    if (texts) result.imageText = fields.image.text;
   } else if (incident.isBlockingIncident()) {
     result.concern = protocol::Concern::noService;
   }
@@ -99,11 +102,7 @@ class Reports {
 
  private:
   void add(std::vector<protocol::LineIncident>& list, const TransitIncident& incident) {
-    protocol::LineIncident written = lineIncidentOf(incident);
-    if (!_texts) {
-      written.title.clear();
-      for (auto* text : {&written.text, &written.url, &written.imageText}) text->reset();
-    }
+    protocol::LineIncident written = lineIncidentOf(incident, _texts);
     constexpr std::size_t kFrame = 300;  // keys and dates
     const std::size_t size = kFrame + written.title.size() + written.text.value_or("").size() +
                              written.url.value_or("").size() + written.imageText.value_or("").size();
@@ -142,7 +141,7 @@ std::map<std::uint64_t, IncidentForm> incidentForms(const GTFSTransitLineService
       IncidentForm& form = forms[incident->muid()];
       if (form.lines.empty()) {
         form.muid = incident->muid();
-        form.digest = digestOf(lineIncidentOf(*incident));
+        form.digest = digestOf(lineIncidentOf(*incident, true));
       }
       const std::uint64_t line = verdict.identifier->muid();
       if (form.lines.empty() || form.lines.back() != line) form.lines.push_back(line);

@@ -398,7 +398,9 @@ void WidgetProcess::keepLines() {
   for (const auto& verdict : _platform->transitLines().verdicts()) items.push_back(verdict.item);
   const Date now = currentDate();
   const TimeInterval age = intervalBetween(_keptLinesAt, now);
-  if (items == _keptLines && age >= 0 && age < kKeepLinesAgain) return;
+  const bool isDue = age < 0 || age >= kKeepLinesAgain;
+  if (items == _keptLines && !isDue) return;
+  _keptLines = std::move(items);
   protocol::Lines lines = lineReports(_platform->favoritesEditor(), _platform->transitLines(), SeenForms(), false);
   for (protocol::LineReport& line : lines.lines) {
     line.shield.reset();
@@ -407,9 +409,14 @@ void WidgetProcess::keepLines() {
         for (std::string* word : {&incident.id, &incident.effect, &incident.cause}) word->clear();
   }
   // Answers that were there are as old as the oldest of them.
-  if (!_platform->transitLines().tookShared()) lines.updated = now;
+  const auto updated = _platform->transitLines().tookShared() ? lines.updated : now;
+  lines.updated = lines.asked = std::nullopt;
+  // The same where an incident has other words, which are not kept.
+  const std::size_t states = std::hash<json>()(protocol::write(lines));
+  if (states == _keptStates && !isDue) return;
+  lines.updated = updated;
   const std::string text = protocol::write(lines).dump(-1, ' ', false, json::error_handler_t::replace);
-  _keptLines = std::move(items);
+  _keptStates = states;
   _keptLinesAt = now;
   if (const ErrorRef error = _platform->sharedSettings().groupStore()->setValue_forKey(text, protocol::kSavedLinesKey))
     writeLog({kDefaultLogSubsystem, "WidgetProcess"}, LogLevel::error, "The states of the lines are not kept: %@",

@@ -112,6 +112,7 @@ class WidgetProcess {
   bool _frameAnnounced = false;
   std::shared_ptr<Timer> _givesBack;           // null before the first change
   std::vector<TransitLineItemRef> _keptLines;  // of the answer that was kept last
+  std::size_t _keptStates = 0;                 // hash of what was written then
   Date _keptLinesAt;
 };
 
