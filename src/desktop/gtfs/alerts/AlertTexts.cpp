@@ -196,7 +196,7 @@ std::optional<AlertTexts> alertTextsIn(std::string_view alert, AlertEffect effec
                                        const LanguagePreference& preference) {
   AlertTexts texts;
   const auto titleIn = [&](AlertField field) { return textIn(alert, field, preference, kLongestTitle); };
-  const std::string description = textIn(alert, AlertField::descriptionText, preference, kLongestDescription);
+  std::string description = textIn(alert, AlertField::descriptionText, preference, kLongestDescription);
   texts.title = onOneLine(titleIn(AlertField::headerText));
   if (texts.title.empty()) texts.title = firstLine(titleIn(AlertField::descriptionText));
   if (texts.title.empty()) texts.title = onOneLine(titleIn(AlertField::effectDetail));
@@ -204,7 +204,7 @@ std::optional<AlertTexts> alertTextsIn(std::string_view alert, AlertEffect effec
   if (texts.title.empty()) return std::nullopt;
   if (const std::string_view rest = afterTitle(description, texts.title); !rest.empty()) {
     texts.summary = summaryOfText(rest);
-    texts.description = description;
+    texts.description = std::move(description);
   }
   if (std::string url = textIn(alert, AlertField::url, preference, kLongestAddress); isWebAddress(url))
     texts.linkURL = std::move(url);

@@ -24,8 +24,7 @@ struct HtmlTag {
 class HtmlTagFinder {
  public:
   /// The text outlives the finder.
-  explicit HtmlTagFinder(std::string_view text)
-      : _text(text), _lastEnd(text.rfind('>')), _lastEquals(text.rfind('=')) {}
+  explicit HtmlTagFinder(std::string_view text) : _text(text), _lastEnd(lastOf('>')), _lastEquals(lastOf('=')) {}
 
   /// The markup at `position`, where a "<" stands: a tag of an HTML element, also one that the text's end cuts off, a
   /// comment, a document type; a script or style sheet as a whole. Absent when it is none: the "<" of "<5 min" or of a
@@ -33,6 +32,11 @@ class HtmlTagFinder {
   std::optional<HtmlTag> tagAt(std::size_t position) const;
 
  private:
+  /// Not looked for in a text without markup, as most are.
+  std::size_t lastOf(char c) const {
+    return _text.find('<') == std::string_view::npos ? std::string_view::npos : _text.rfind(c);
+  }
+
   std::string_view _text;
   std::size_t _lastEnd;
   std::size_t _lastEquals;

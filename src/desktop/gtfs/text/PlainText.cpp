@@ -1,6 +1,7 @@
 #include "desktop/gtfs/text/PlainText.h"
 
 #include <algorithm>
+#include <array>
 #include <optional>
 
 #include "desktop/gtfs/text/Html.h"
@@ -26,12 +27,32 @@ bool isUnwanted(char32_t c) {
 }
 
 /// Whether an ASCII character means nothing but itself: no space, control or markup.
-bool isPlain(char c) { return c > 0x20 && c < 0x7F && c != '<' && c != '&'; }
+constexpr bool isPlain(char c) { return c > 0x20 && c < 0x7F && c != '<' && c != '&'; }
+
+constexpr auto kPlain = [] {
+  std::array<bool, 256> plain{};
+  for (int c = 0; c < 0x7F; ++c) plain[static_cast<std::size_t>(c)] = isPlain(static_cast<char>(c));
+  return plain;
+}();
+
+/// The bytes at the beginning of a text that begins with a plain character that are plain, or a space between two such.
+std::size_t lengthOfPlain(std::string_view text) {
+  const auto isPlainAt = [text](std::size_t i) {
+    return i < text.size() && kPlain[static_cast<unsigned char>(text[i])];
+  };
+  std::size_t length = 1;
+  for (;;) {
+    while (isPlainAt(length)) ++length;
+    if (length == text.size() || text[length] != ' ' || !isPlainAt(length + 1)) return length;
+    length += 2;
+  }
+}
 
 /// Takes characters and line ends; writes the folded text.
 class FoldingWriter {
  public:
-  explicit FoldingWriter(std::size_t limit) : _limit(limit) {}
+  /// For a text of so many bytes.
+  FoldingWriter(std::size_t limit, std::size_t size) : _limit(limit) { _text.reserve(std::min(limit, size)); }
 
   void write(char32_t c) {
     if (isLineEnd(c)) {
@@ -45,7 +66,7 @@ class FoldingWriter {
       append(c);
     }
   }
-  /// Characters that are plain; at least one.
+  /// Characters that are plain, and single spaces between them; at least one.
   void write(std::string_view plain) {
     append(static_cast<unsigned char>(plain.front()));
     _count += plain.size() - 1;
@@ -63,7 +84,10 @@ class FoldingWriter {
       _text.resize(clusterBoundary(_text, firstCharacters(_text, _limit - 1).size()));
       _text += "…";
     }
-    if (!_hasDirectionMark || hasRightToLeftLetters(_text)) return std::move(_text);
+    if (!_hasDirectionMark || hasRightToLeftLetters(_text)) {
+      _text.shrink_to_fit();
+      return std::move(_text);
+    }
     std::string result;
     for (std::size_t position = 0; position < _text.size();)
       if (const char32_t c = takeCharacter(_text, position); !isDirectionMark(c)) appendCharacter(result, c);
@@ -122,13 +146,11 @@ bool hasLinesOfMarkup(std::string_view text, const HtmlTagFinder& tags) {
 std::string plainText(std::string_view text, std::size_t limit) {
   const HtmlTagFinder tags(text);
   std::optional<bool> lineEndsAreSpaces;  // found out for texts that have any
-  FoldingWriter writer(limit);
+  FoldingWriter writer(limit, text.size());
   for (std::size_t position = 0; position < text.size() && !writer.isFull();) {
     const std::string_view rest = text.substr(position);
     if (isPlain(rest.front())) {  // most of any text
-      const std::string_view most = rest.substr(0, limit);
-      const auto end = std::find_if_not(most.begin(), most.end(), isPlain);
-      const std::string_view run = most.substr(0, static_cast<std::size_t>(end - most.begin()));
+      const std::string_view run = rest.substr(0, lengthOfPlain(rest.substr(0, limit)));
       writer.write(run);
       position += run.size();
       continue;
