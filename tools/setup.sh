@@ -7,7 +7,7 @@ purpose=${1:-run}
 # Compiler and build tools; then a library each, with its reason in README.md.
 packages=(
   g++ cmake ninja-build pkg-config ccache
-  libglib2.0-dev libsqlite3-dev libcurl4-openssl-dev libprotozero-dev libzip-dev libcsv-dev zlib1g-dev libicu-dev
+  libglib2.0-dev libsqlite3-dev libcurl4-openssl-dev libprotozero-dev libzip-dev libcsv-dev zlib1g-dev libicu-dev libxxhash-dev
   nlohmann-json3-dev libcli11-dev libpango1.0-dev libcairo2-dev libturbojpeg0-dev libfontconfig-dev libbz2-dev libsystemd-dev
   libseccomp-dev libgtkmm-4.0-dev libwayland-dev wayland-protocols fonts-dejavu-core ca-certificates
 )

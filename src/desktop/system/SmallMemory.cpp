@@ -5,7 +5,6 @@
 #include <sys/mman.h>
 #include <unistd.h>
 
-#include <cstddef>
 #include <cstdint>
 
 namespace nimbo {
@@ -33,6 +32,16 @@ void giveBackStack() {
   const auto begin = reinterpret_cast<std::uintptr_t>(lowest);
   // Of the main thread's stack the lower part is not mapped yet: that is answered as an error and does no harm.
   if (begin < used) (void)madvise(lowest, used - begin, MADV_DONTNEED);
+}
+
+void populate(void* memory, std::size_t size) {
+  constexpr std::size_t kWorthACall = 1 << 20;
+  if (size < kWorthACall) return;
+  const auto page = static_cast<std::uintptr_t>(sysconf(_SC_PAGESIZE));
+  const auto begin = (reinterpret_cast<std::uintptr_t>(memory) + page - 1) / page * page;
+  const auto end = (reinterpret_cast<std::uintptr_t>(memory) + size) / page * page;
+  // Since Linux 5.14; before, the pages come one by one.
+  (void)madvise(reinterpret_cast<void*>(begin), end - begin, MADV_POPULATE_WRITE);
 }
 
 }  // namespace nimbo

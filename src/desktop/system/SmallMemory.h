@@ -1,5 +1,6 @@
 #pragma once
 
+#include <cstddef>
 #include <memory>
 
 #include "platform/RunLoop.h"
@@ -20,5 +21,9 @@ std::shared_ptr<Timer> giveBackHeapSoon(RunLoop& runLoop);
 /// Gives back to the system what deeper calls on this thread took of its stack and have left, such as
 /// GTK, which reads its theme recursively.
 void giveBackStack();
+
+/// Has the system give the pages of large memory that is about to be written at once: half of what a fault for each
+/// takes (docs/performance.md).
+void populate(void* memory, std::size_t size);
 
 }  // namespace nimbo

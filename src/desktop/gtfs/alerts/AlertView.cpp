@@ -1,5 +1,8 @@
 #include "desktop/gtfs/alerts/AlertView.h"
 
+#include <algorithm>
+
+#include "desktop/gtfs/ContentHash.h"
 #include "desktop/gtfs/alerts/RealtimeFields.h"
 
 namespace nimbo {
@@ -71,7 +74,24 @@ bool readField(protozero::pbf_message<AlertField>& message, std::string_view ale
   return true;
 }
 
+template <class Hash>
+std::size_t hashBy(const AlertContent& content, const Hash& ofText) {
+  std::size_t hash = static_cast<std::size_t>(content.cause) * 16 + static_cast<std::size_t>(content.effect);
+  for (const std::string_view text : {content.header, content.description, content.url, content.effectDetail})
+    hash = hash * 131 + ofText(text);
+  return hash;
+}
+
 }  // namespace
+
+std::size_t AlertContent::quickHash() const {
+  return hashBy(*this, [](std::string_view text) {
+    constexpr std::size_t kTelling = 16;  // a number, and the language behind it
+    return text.size() + contentHash(text.substr(text.size() - std::min(text.size(), kTelling)));
+  });
+}
+
+std::size_t AlertContent::hash() const { return hashBy(*this, contentHash); }
 
 AlertView readAlertView(std::string_view alert, const std::function<void(const EntitySelector&)>& onSelector) {
   AlertView view;

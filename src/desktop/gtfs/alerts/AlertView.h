@@ -19,19 +19,10 @@ struct AlertContent {
 
   bool operator==(const AlertContent&) const = default;
 
-  /// Equal for equal contents, made without reading the texts: most alerts that are no repetition differ in it.
-  std::size_t sizeHash() const {
-    return hashBy([](std::string_view text) { return text.size(); });
-  }
-  std::size_t hash() const { return hashBy(std::hash<std::string_view>()); }
-
- private:
-  template <class Hash>
-  std::size_t hashBy(const Hash& ofText) const {
-    std::size_t hash = static_cast<std::size_t>(cause) * 16 + static_cast<std::size_t>(effect);
-    for (const std::string_view text : {header, description, url, effectDetail}) hash = hash * 131 + ofText(text);
-    return hash;
-  }
+  /// Equal for equal contents, made of the sizes and the ends of the texts: most alerts that are no repetition differ
+  /// in it.
+  std::size_t quickHash() const;
+  std::size_t hash() const;
 };
 
 /// What one pass over an Alert message tells about it.

@@ -7,12 +7,13 @@
 #include <charconv>
 #include <cmath>
 
+#include "desktop/gtfs/ContentHash.h"
 #include "desktop/gtfs/feeds/OtherContent.h"
 #include "desktop/gtfs/feeds/TransitLineServiceError.h"
 #include "desktop/gtfs/net/FileReading.h"
 #include "desktop/gtfs/net/ServerWishes.h"
-#include "desktop/gtfs/static/StaticFeed.h"
 #include "desktop/system/AtomicFile.h"
+#include "desktop/system/SmallMemory.h"
 #include "platform/SystemServices.h"
 
 namespace nimbo {
@@ -22,7 +23,7 @@ namespace {
 // Lines, then an empty one, then the body: what the file is, the address, ETag, Last-Modified, microseconds since 1970
 // of the first answer with this body and of the publisher's timestamp, which may be empty, the body's checksum. When
 // the last answer with it came is the file's own time.
-constexpr std::string_view kFirstLine = "nimbo-alerts 3";
+constexpr std::string_view kFirstLine = "nimbo-alerts 4";
 constexpr std::size_t kLines = 7;
 constexpr std::uint64_t kLargestFile = 65 << 20;
 
@@ -78,8 +79,6 @@ bool isOlder(const std::optional<Date>& timestamp, const std::optional<Date>& he
   return timestamp && held && *timestamp < *held && *held <= currentDate();
 }
 
-std::size_t hashOf(const std::string& body) { return std::hash<std::string>()(body); }
-
 std::optional<Date> dateIn(std::string_view text) {
   const auto number = numberIn<std::int64_t>(text);
   return number ? std::optional(Date(std::chrono::microseconds(*number))) : std::nullopt;
@@ -113,16 +112,16 @@ std::optional<KeptAlerts> readKept(const std::filesystem::path& path, const Feed
       !rest.starts_with('\n'))
     return std::nullopt;
   rest.remove_prefix(1);
-  if (flatChecksum(rest) != *checksum) return std::nullopt;
+  if (contentHash(rest) != *checksum) return std::nullopt;
   KeptAlerts kept{{.feed = feed,
+                   .hash = *checksum,
+                   .size = rest.size(),
                    .validators = {std::string(lines[2]), std::string(lines[3])},
                    .timestamp = timestamp,
                    .fetchedAt = *fetchedAt,
                    .changedAt = *changedAt,
                    .file = std::move(file)},
                   std::string(rest)};
-  kept.state.hash = hashOf(kept.body);
-  kept.state.size = kept.body.size();
   return kept;
 }
 
@@ -166,7 +165,7 @@ void AlertsStore::write(const std::filesystem::path& path, AlertsState& state, c
   std::string bytes(kFirstLine);
   for (const std::string& line :
        {state.feed->alerts.identity(), state.validators.etag, state.validators.lastModified, textOf(state.changedAt),
-        state.timestamp ? textOf(*state.timestamp) : std::string(), std::to_string(flatChecksum(body))})
+        state.timestamp ? textOf(*state.timestamp) : std::string(), std::to_string(state.hash)})
     bytes.append(1, '\n').append(line);
   state.writtenAt = state.fetchedAt;
   if (const ErrorRef error = writeFileAtomically(path, bytes.append("\n\n").append(body)))
@@ -194,7 +193,7 @@ Outcome<std::optional<AlertsFeed>> AlertsStore::fetchLocal(const Feed& feed, Ale
   const auto changedAt = fileChangeDate(feed.alerts.path());
   auto bytes = readFile(feed.alerts.path(), kLargestAlerts);
   if (!bytes) return bytes.error();
-  const std::size_t hash = std::hash<std::string>()(*bytes);
+  const std::uint64_t hash = contentHash(*bytes);
   std::optional<AlertsFeed> alerts;
   if (needsFeed || hash != state.hash) {
     auto read = readBody(feed, std::move(*bytes));
@@ -220,10 +219,15 @@ Outcome<std::optional<AlertsFeed>> AlertsStore::fetchRemote(const Feed& feed, Al
     return waitsForServer(feed, *retryAt);
   std::string body;
   HTTPWishes wishes;
-  const auto answer = HTTPFetcher::fetch({feed.alerts, known, kLargestAlerts, kFetchTimeLimit, &wishes}, stop,
+  const auto reserve = [&](std::uint64_t size) { body.reserve(std::min(size, kLargestAlerts)); };
+  const auto answer = HTTPFetcher::fetch({feed.alerts, known, kLargestAlerts, kFetchTimeLimit, &wishes, reserve}, stop,
                                          [&](std::string_view piece) {
-                                           // The next answer is mostly as large, and growing copies all of it.
-                                           if (body.empty()) body.reserve(state.size + state.size / 16);
+                                           if (body.empty()) {
+                                             // The next answer is mostly as large, and growing copies all of it.
+                                             if (body.capacity() < state.size)
+                                               body.reserve(state.size + state.size / 16);
+                                             populate(body.data(), std::min(state.size, body.capacity()));
+                                           }
                                            body += piece;
                                            return true;
                                          });
@@ -233,7 +237,9 @@ Outcome<std::optional<AlertsFeed>> AlertsStore::fetchRemote(const Feed& feed, Al
   }
   const bool isKept = kept && (answer->isUnchanged || body == kept->body);
   if (isKept) body = std::move(kept->body);
-  const std::size_t hash = answer->isUnchanged && !needsFeed ? state.hash : hashOf(body);
+  const std::uint64_t hash = isKept                              ? kept->state.hash
+                             : answer->isUnchanged && !needsFeed ? state.hash
+                                                                 : contentHash(body);
   const bool isSame = state.feed && hash == state.hash;
   std::optional<AlertsFeed> alerts;
   if (needsFeed || !isSame) {

@@ -18,7 +18,7 @@ namespace nimbo {
 /// What is known of a feed's last answer, for who asks again: a feed that does not change costs next to nothing.
 struct AlertsState {
   std::optional<Feed> feed = {};       ///< whose answer it was; absent before the first
-  std::size_t hash = 0;                ///< of the answer's bytes
+  std::uint64_t hash = 0;              ///< of the answer's bytes
   std::size_t size = 0;                ///< how many they were
   HTTPValidators validators = {};      ///< of a server's answer
   std::optional<Date> timestamp = {};  ///< when the publisher made it; absent when he does not say

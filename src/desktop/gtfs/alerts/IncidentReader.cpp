@@ -7,6 +7,7 @@
 #include <unordered_map>
 #include <unordered_set>
 
+#include "desktop/gtfs/ContentHash.h"
 #include "desktop/gtfs/alerts/AlertPeriods.h"
 #include "desktop/gtfs/alerts/AlertView.h"
 #include "desktop/gtfs/feeds/FeedMuid.h"
@@ -35,9 +36,6 @@ struct Incident {
   };
   std::map<std::size_t, OnLine> lines;  // by place in the query
 };
-
-/// Title, description, address, cause and effect.
-using TextsKey = std::tuple<std::string, std::string, std::string, std::int32_t, AlertEffect>;
 
 struct ContentHash {
   std::size_t operator()(const AlertContent& content) const { return content.hash(); }
@@ -91,7 +89,7 @@ class IncidentBuilder {
         _incidentsOfLines(query.lines.size()) {
     for (std::size_t i = 0; i < query.lines.size(); ++i)
       for (const std::string& former : query.lines[i].formerRouteIDs) _matcher.addRoute(former, i);
-    _sizes.reserve(alerts.alerts().size());
+    _quickHashes.reserve(alerts.alerts().size());
   }
 
   IncidentReading build() {
@@ -105,7 +103,7 @@ class IncidentBuilder {
               *_foreignRoutes.begin() + ", and none that it has. Check that the two belong together.",
           _alerts.place()));
     if (!_incidents.empty()) takeLeastKeys();
-    for (const Incident& incident : _incidents) emit(incident);
+    for (Incident& incident : _incidents) emit(incident);
     for (TransitIncidents& incidents : _incidentsOfLines)
       _reading.verdicts.push_back(Verdict::of(std::move(incidents), _gap));
     return std::move(_reading);
@@ -135,7 +133,7 @@ class IncidentBuilder {
       _reading.skipped.add("alert that is damaged", alert.id);
       return lacks(alertBreaksOff(_alerts.place()));
     }
-    _sizes.emplace_back(&alert, view.content.sizeHash());
+    _quickHashes.emplace_back(&alert, view.content.quickHash());
     if (_lines.empty() && !_hasTrips && (_belongs || !_hasRoutes)) return;
     AlertPeriods periods = alertPeriodsIn(view.body);
     const std::size_t published = periods.published;
@@ -170,6 +168,8 @@ class IncidentBuilder {
       return;
     }
     Incident& incident = _incidents[*index];
+    incident.key = std::min(incident.key, keyOf(alert));
+    _quickHashes.pop_back();
     incident.severity = std::max(incident.severity, view.severity);
     for (const auto& [place, isWholeLine] : _lines) {
       Incident::OnLine& onLine = incident.lines[place];
@@ -274,33 +274,39 @@ class IncidentBuilder {
     const AlertContent& content = view.content;
     const auto [known, isNewContent] = _incidentOfContent.try_emplace(content);
     if (!isNewContent) return known->second;
-    const auto texts = textsOf(view);
+    auto texts = textsOf(view);
     if (!texts) {
       _incidentOfContent.erase(known);
       return std::nullopt;
     }
     // Texts of one language may agree where those of others differ.
-    const auto [place, isNew] = _incidentOfTexts.try_emplace(
-        {texts->title, texts->description.value_or(""), texts->linkURL.value_or(""), content.cause, content.effect},
-        _incidents.size());
-    if (isNew)
+    const auto isSame = [&](const auto& other) {
+      const Incident& incident = _incidents[other.second];
+      return incident.texts == *texts && incident.cause == content.cause && incident.effect == content.effect;
+    };
+    const std::size_t hash = contentHash(texts->title) ^ contentHash(texts->description.value_or(""));
+    const auto [begin, end] = _incidentsOfTexts.equal_range(hash);
+    const auto place = std::find_if(begin, end, isSame);
+    known->second = place == end ? _incidents.size() : place->second;
+    if (place == end) {
+      _incidentsOfTexts.emplace(hash, _incidents.size());
       _incidents.push_back(
-          {keyOf(alert), *texts, {}, content.effect, content.cause, view.severity, AlertConcern::none, {}});
-    Incident& incident = _incidents[place->second];
+          {keyOf(alert), std::move(*texts), {}, content.effect, content.cause, view.severity, AlertConcern::none, {}});
+    }
+    Incident& incident = _incidents[known->second];
     const std::string detail = content.effectDetail.empty() ? std::string() : effectDetailIn(view.body);
     incident.concern = std::max(incident.concern, concernOf(content.effect, detail));
     // Of alerts that say the same the first one that has an image shows it.
     if (view.hasImage && incident.image == AlertImage()) incident.image = alertImageIn(view.body, _query.language);
-    known->second = place->second;
-    _sizesOfContents.insert(content.sizeHash());
-    return place->second;
+    _quickHashesOfContents.insert(content.quickHash());
+    return known->second;
   }
 
   /// Alerts of the same content that concern other lines, or are over, are the same incident: their identifiers count
   /// for its number too.
   void takeLeastKeys() {
-    for (const auto& [alert, size] : _sizes) {
-      if (!_sizesOfContents.contains(size)) continue;
+    for (const auto& [alert, quickHash] : _quickHashes) {
+      if (!_quickHashesOfContents.contains(quickHash)) continue;
       const auto found = _incidentOfContent.find(readAlertView(alert->body, [](const EntitySelector&) {}).content);
       if (found == _incidentOfContent.end()) continue;
       std::string& key = _incidents[found->second].key;
@@ -308,15 +314,16 @@ class IncidentBuilder {
     }
   }
 
-  void emit(const Incident& incident) {
+  /// Takes the texts out of the incident.
+  void emit(Incident& incident) {
     AlertIncident::Fields fields;
     fields.muid = incidentMuid(_query.feed, incident.key);
-    fields.title = incident.texts.title;
-    fields.summary = incident.texts.summary;
-    fields.fullDescription = incident.texts.description;
+    fields.title = std::move(incident.texts.title);
+    fields.summary = std::move(incident.texts.summary);
+    fields.fullDescription = std::move(incident.texts.description);
     fields.messageForRoutePlanning = fields.messageForRouteStepping = fields.messageForNonRoutable = fields.title;
     fields.iconType = static_cast<std::int32_t>(incident.effect);
-    fields.linkURL = incident.texts.linkURL;
+    fields.linkURL = std::move(incident.texts.linkURL);
     fields.effect = incident.effect;
     fields.cause = incident.cause;
     fields.severity = incident.severity;
@@ -353,11 +360,11 @@ class IncidentBuilder {
   std::unordered_set<std::string_view> _knownRoutes;
   std::optional<bool> _isOnlyAgencyMeant;  // absent until asked
   std::map<std::size_t, bool> _lines;  // of the alert at hand: place in the query, whether it is about the whole line
-  std::vector<std::pair<const AlertEntity*, std::size_t>> _sizes;  // `sizeHash` of all alerts
+  std::vector<std::pair<const AlertEntity*, std::size_t>> _quickHashes;  // of those that are no incident
   std::vector<Incident> _incidents;
-  std::map<TextsKey, std::size_t> _incidentOfTexts;
+  std::unordered_multimap<std::size_t, std::size_t> _incidentsOfTexts;  // by the hash of title and description
   std::unordered_map<AlertContent, std::size_t, ContentHash> _incidentOfContent;
-  std::unordered_set<std::size_t> _sizesOfContents;  // by `sizeHash`
+  std::unordered_set<std::size_t> _quickHashesOfContents;
 };
 
 }  // namespace

@@ -10,6 +10,7 @@
 #include "desktop/gtfs/feeds/TransitLineServiceError.h"
 #include "desktop/raii/FileDescriptor.h"
 #include "desktop/system/AtomicFile.h"
+#include "desktop/system/SmallMemory.h"
 
 namespace nimbo {
 
@@ -43,7 +44,10 @@ Outcome<std::string> read(const std::filesystem::path& path, std::uint64_t limit
   if ((flags & O_NOFOLLOW) && status.st_uid != ::geteuid()) return unreadable(path, "it is another user's.");
   if (static_cast<std::uint64_t>(status.st_size) > limit) return tooLarge();
   std::string bytes;
-  bytes.resize(static_cast<std::size_t>(status.st_size) + 1);  // room to see the end without moving everything
+  const auto size = static_cast<std::size_t>(status.st_size) + 1;  // room to see the end without moving everything
+  bytes.reserve(size);
+  populate(bytes.data(), size);
+  bytes.resize(size);
   std::size_t count = 0;
   for (;;) {
     if (count == bytes.size()) {  // also when the file has grown since
