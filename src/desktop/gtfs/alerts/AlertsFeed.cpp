@@ -1,9 +1,11 @@
 #include "desktop/gtfs/alerts/AlertsFeed.h"
 
+#include <algorithm>
 #include <array>
 #include <set>
 #include <unordered_map>
 
+#include "desktop/gtfs/ContentHash.h"
 #include "desktop/gtfs/alerts/AlertPeriods.h"
 #include "desktop/gtfs/alerts/RealtimeFields.h"
 #include "desktop/gtfs/feeds/TransitLineServiceError.h"
@@ -144,6 +146,15 @@ std::string AlertsFeed::otherContent() const {
          " and holds no alert. Give the address of the alerts; where it is this one, set \"combined\" for it.";
 }
 
+bool AlertsFeed::hasRepeated() const {
+  std::vector<std::uint64_t> hashes;
+  hashes.reserve(_alerts.size());
+  for (const AlertEntity& alert : _alerts)
+    if (!alert.id.empty()) hashes.push_back(contentHash(alert.id));
+  std::sort(hashes.begin(), hashes.end());
+  return std::adjacent_find(hashes.begin(), hashes.end()) != hashes.end();
+}
+
 void AlertsFeed::joinLanguages() {
   /// The first alert of an identifier that has come again.
   struct Repeated {
@@ -216,7 +227,7 @@ Outcome<AlertsFeed> AlertsFeed::read(std::string bytes, const std::string& place
   if (feed.hasOthers() && feed._alertEntities == 0 && !isCombined)
     return transitLineServiceError(TransitLineServiceError::otherFeed,
                                    "The alerts feed " + place + " is another one: " + feed.otherContent(), place);
-  feed.joinLanguages();
+  if (feed.hasRepeated()) feed.joinLanguages();
   return feed;
 }
 

@@ -49,6 +49,8 @@ class AlertsFeed {
  private:
   void readHeader(std::string_view body);
   void readEntity(std::string_view body);
+  /// Whether an identifier comes again, which few feeds have.
+  bool hasRepeated() const;
   void joinLanguages();
   std::string otherContent() const;
 
