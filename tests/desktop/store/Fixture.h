@@ -39,10 +39,13 @@ class StoreTest : public testing::Test {
     std::ifstream stream(path, std::ios::binary);
     return {std::istreambuf_iterator<char>(stream), {}};
   }
-  static void overwrite(const std::filesystem::path& path, std::streamoff offset, const std::string& bytes) {
-    std::fstream stream(path, std::ios::binary | std::ios::in | std::ios::out);
-    stream.seekp(offset);
-    stream << bytes;
+  /// Makes the table's page one of no known kind.
+  void ruinTable(const std::string& name) {
+    SQLiteConnection connection = connect();
+    connection.prepare("PRAGMA wal_checkpoint(TRUNCATE)").step();
+    const auto page = connection.integer("SELECT rootpage FROM sqlite_schema WHERE name = '" + name + "'");
+    std::fstream stream(file(), std::ios::binary | std::ios::in | std::ios::out);
+    stream.seekp((page - 1) * 4096) << std::string(4096, '\xee');
   }
 
   TestPlatform platform;

@@ -1,8 +1,4 @@
-#include <sys/resource.h>
-#include <sys/stat.h>
 #include <unistd.h>
-
-#include <csignal>
 
 #include "desktop/raii/SQLite.h"
 #include "desktop/store/FavoritesEditor.h"
@@ -11,6 +7,7 @@
 #include "desktop/store/SQLiteSharedSettings.h"
 #include "desktop/store/SeenIncidents.h"
 #include "desktop/store/StateDatabaseFile.h"
+#include "support/FullDisk.h"
 
 namespace nimbo {
 
@@ -27,42 +24,19 @@ class StateDatabaseTest : public StoreTest {
 
 TEST_F(StateDatabaseTest, SharesValuesOfEveryKindBetweenProcesses) {
   const auto host = makeSettings(), widget = makeSettings();
+  EXPECT_EQ(widget->valueForKey("key"), std::nullopt);
+  EXPECT_FALSE(fs::exists(folder())) << "before the first write";
   for (const Value& value :
        {Value(true), Value(false), Value(""), Value("Zür\0ich"), Value(Bytes()), Value(Bytes{0, 255, 0})}) {
     EXPECT_EQ(host->setValue_forKey(value, "key"), nullptr);
     EXPECT_EQ(widget->valueForKey("key"), value);
   }
+  EXPECT_EQ(fs::status(folder()).permissions(), fs::perms::owner_all);
+  for (const char* log : {"", "-wal", "-shm"})
+    EXPECT_EQ(fs::status(file().concat(log)).permissions(), fs::perms::owner_read | fs::perms::owner_write) << log;
   EXPECT_EQ(widget->removeValueForKey("key"), nullptr);
   EXPECT_EQ(host->valueForKey("key"), std::nullopt);
   EXPECT_EQ(host->removeValueForKey("key"), nullptr);
-}
-
-TEST_F(StateDatabaseTest, MakesFilesForItsOwnerOnlyAndNotBeforeTheFirstWrite) {
-  const auto settings = makeSettings();
-  EXPECT_EQ(settings->valueForKey("key"), std::nullopt);
-  EXPECT_FALSE(fs::exists(folder()));
-  EXPECT_EQ(settings->setValue_forKey(true, "key"), nullptr);
-  EXPECT_EQ(fs::status(folder()).permissions(), fs::perms::owner_all);
-  int files = 0;
-  for (const auto& entry : fs::directory_iterator(folder())) {
-    EXPECT_EQ(entry.status().permissions(), fs::perms::owner_read | fs::perms::owner_write) << entry.path();
-    ++files;
-  }
-  EXPECT_EQ(files, 3) << "the database, its write-ahead log and the log's index";
-}
-
-TEST_F(StateDatabaseTest, SetsADamagedFileAsideAndSaysSo) {
-  ASSERT_EQ(makeSettings()->setValue_forKey(std::string(20000, 'x'), "key"), nullptr);
-  const std::string whole = contentOf(file());
-  for (const std::string& damaged : {std::string("hello"), std::string(5000, 'x'), whole.substr(0, 5000)}) {
-    std::ofstream(file(), std::ios::binary | std::ios::trunc) << damaged;
-    EXPECT_EQ(makeSettings()->setValue_forKey(true, "new"), nullptr);
-    EXPECT_EQ(contentOf(setAside()), damaged);
-    EXPECT_THAT(notices, ElementsAre(HasSubstr(setAside().native())));
-    EXPECT_EQ(makeSettings()->valueForKey("new"), Value(true));
-    notices.clear();
-    fs::remove(setAside());
-  }
 }
 
 TEST_F(StateDatabaseTest, KeepsWhatCanBeReadOfADamagedFileInEveryProcess) {
@@ -70,19 +44,15 @@ TEST_F(StateDatabaseTest, KeepsWhatCanBeReadOfADamagedFileInEveryProcess) {
   ASSERT_EQ(host->setValue_forKey("kept", "first"), nullptr);
   ASSERT_EQ(host->setValue_forKey(Bytes(20000, 'x'), "large"), nullptr);
   ASSERT_EQ(widget->stringForKey("first"), "kept");
-  {
-    SQLiteConnection connection = connect();
-    connection.prepare("PRAGMA wal_checkpoint(TRUNCATE)").step();
-    // The analytics table's page becomes one of no known kind.
-    const auto page = connection.integer("SELECT rootpage FROM sqlite_schema WHERE name = 'analytics'");
-    overwrite(file(), (page - 1) * 4096, std::string(4096, '\xee'));
-  }
+  ruinTable("analytics");
+  const std::string damaged = contentOf(file());
   SQLiteAnalyticsPipeline analytics(makeDatabase());
   const ErrorRef error = analytics.list().error();
   ASSERT_NE(error, nullptr);
   EXPECT_THAT(notices, ElementsAre(error->reason()));
   EXPECT_THAT(error->reason(), testing::AllOf(HasSubstr(setAside().native()), HasSubstr("0 favorites and 2 settings")));
   EXPECT_EQ(error->subject(), setAside().native());
+  EXPECT_TRUE(contentOf(setAside()) == damaged);
   EXPECT_TRUE(analytics.list());
   // Those that had the damaged file open go over to the new one.
   EXPECT_EQ(host->setValue_forKey("since", "second"), nullptr);
@@ -121,26 +91,6 @@ TEST_F(StateDatabaseTest, LeavesDatabasesOfOthersAsTheyAre) {
   }
 }
 
-/// A disk on which no file grows beyond so many bytes, for a scope.
-class FullDisk {
- public:
-  explicit FullDisk(rlim_t bytes) : _handler(std::signal(SIGXFSZ, SIG_IGN)) {
-    ::getrlimit(RLIMIT_FSIZE, &_before);
-    const rlimit small{bytes, _before.rlim_max};
-    ::setrlimit(RLIMIT_FSIZE, &small);
-  }
-  ~FullDisk() {
-    ::setrlimit(RLIMIT_FSIZE, &_before);
-    std::signal(SIGXFSZ, _handler);
-  }
-  FullDisk(const FullDisk&) = delete;
-  FullDisk& operator=(const FullDisk&) = delete;
-
- private:
-  rlimit _before{};
-  void (*_handler)(int);
-};
-
 TEST_F(StateDatabaseTest, ShowsWhatIsStoredOnAFullDiskInEitherForm) {
   ASSERT_EQ(FavoritesEditor(makeDatabase(), nullptr).add({lineItem(1, "A")}), nullptr);
   const auto count = [&] {
@@ -178,11 +128,7 @@ TEST_F(StateDatabaseTest, KnowsWhatWasSeenUntilItChanges) {
   for (int day = 1; day <= 16; ++day) nightly.periods.emplace_back(at(24 * day), at(24 * day + 5));
   const SeenIncidents incidents(makeDatabase());
   ASSERT_EQ(incidents.keep({seen, nightly}, platform.time.now()), nullptr);
-  const struct {
-    IncidentForm form;
-    bool isSeen;
-    const char* what;
-  } cases[] = {
+  const std::tuple<IncidentForm, bool, const char*> cases[] = {
       {seen, true, "the same"},
       {{1, 8, {10}, seen.periods}, false, "other texts"},
       {{1, 7, {10}, {{at(-1), at(3)}}}, false, "a later end"},
@@ -196,7 +142,7 @@ TEST_F(StateDatabaseTest, KnowsWhatWasSeenUntilItChanges) {
   };
   const auto kept = SeenIncidents(makeDatabase()).list();
   ASSERT_TRUE(kept);
-  for (const auto& test : cases) EXPECT_EQ(kept->have(test.form, platform.time.now()), test.isSeen) << test.what;
+  for (const auto& [form, isSeen, what] : cases) EXPECT_EQ(kept->have(form, platform.time.now()), isSeen) << what;
   ASSERT_EQ(incidents.keep({{3, 3, {}, {}}}, platform.time.now() + std::chrono::days(91)), nullptr);
   EXPECT_FALSE(incidents.list()->have(seen, platform.time.now())) << "old rows go";
 }
@@ -228,11 +174,10 @@ TEST_F(StateDatabaseTest, IsReachedThroughLinkedFoldersOnly) {
 TEST_F(StateDatabaseTest, KeepsTheOldValueWhenAWriteFails) {
   const auto settings = makeSettings();
   ASSERT_EQ(settings->setValue_forKey("old", "key"), nullptr);
-  ErrorRef full;
-  {
+  const ErrorRef full = [&] {
     const FullDisk disk(64 * 1024);
-    full = settings->setValue_forKey(Bytes(1 << 20), "key");
-  }
+    return settings->setValue_forKey(Bytes(1 << 20), "key");
+  }();
   ASSERT_NE(full, nullptr);
   EXPECT_THAT(full->reason(), HasSubstr("Cannot write " + file().native()));
   EXPECT_EQ(settings->valueForKey("key"), Value("old"));
