@@ -36,11 +36,7 @@ TEST(LinuxNetworkFailureDiagnosis, ReadsRadiosAndRoutes) {
   };
   Files blockedWithRoute = radios("1\n", "bluetooth\n", "1\n");
   blockedWithRoute["proc/net/route"] = kDefault4;
-  const struct {
-    const char* name;
-    Files files;
-    NetworkFailure expected;
-  } kCases[] = {
+  const std::tuple<const char*, Files, NetworkFailure> kCases[] = {
       {"nothing to read", {}, unknown},
       {"a route", {{"proc/net/route", kDefault4}}, unknown},
       {"a route of version 6 only",
@@ -57,10 +53,10 @@ TEST(LinuxNetworkFailureDiagnosis, ReadsRadiosAndRoutes) {
       {"modem without an interface", noRouteAnd({{"sys/class/wwan/wwan0/uevent", ""}}), cellularDataDisabled},
       {"mobile radio blocked", noRouteAnd(radios("0\n", "wwan\n", "1\n")), cellularDataDisabled},
   };
-  for (const auto& test : kCases) {
+  for (const auto& [name, files, expected] : kCases) {
     const TemporaryFolder root;
-    for (const auto& [path, text] : test.files) root.write(path, text);
-    EXPECT_EQ(LinuxNetworkFailureDiagnosis(root.path()).diagnose(), test.expected) << test.name;
+    for (const auto& [path, text] : files) root.write(path, text);
+    EXPECT_EQ(LinuxNetworkFailureDiagnosis(root.path()).diagnose(), expected) << name;
   }
 }
 
