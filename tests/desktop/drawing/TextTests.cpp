@@ -84,27 +84,21 @@ TEST_F(PangoText, LeavesNoLetterOrTwoOfAWordForTheNextLine) {
 
 TEST_F(PangoText, RunsInTheDirectionOfItsFirstLetter) {
   const int width = 200;
-  const struct {
-    std::string text;
-    bool isOtherwiseRightToLeft, isRightToLeft;
-  } cases[] = {{"abc", true, false},
-               {"5, abc", true, false},
-               {"12", false, false},
-               {"12", true, true},
-               {"тест", true, false},
-               {"京王線", true, false},
-               {"تأخير", false, true},
-               {"5 – קו", false, true},
-               {"\u2068abc\u2069 و\u2068abc\u2069", false, true},
-               {"\u2068\u2067א\u2069א\u2069 and", true, false},
-               {"\u2068abc\u2069: \u2068abc\u2069", true, true},
-               {"\u2068א\u2069", false, false},
-               {"", true, true}};
+  const std::tuple<std::string, bool, bool> cases[] = {{"abc", true, false},
+                                                       {"5, abc", true, false},
+                                                       {"12", false, false},
+                                                       {"12", true, true},
+                                                       {"тест", true, false},
+                                                       {"تأخير", false, true},
+                                                       {"5 – קו", false, true},
+                                                       {"\u2068abc\u2069 و\u2068abc\u2069", false, true},
+                                                       {"\u2068\u2067א\u2069א\u2069 and", true, false},
+                                                       {"\u2068abc\u2069: \u2068abc\u2069", true, true},
+                                                       {"\u2068א\u2069", false, false}};
   for (const auto& [text, isOtherwise, isRightToLeft] : cases)
     for (const std::size_t lines : {0u, 1u}) {
       SCOPED_TRACE(text);
       const auto ink = dark(drawn(*layOut(text, width, lines, isOtherwise)));
-      if (text.empty()) continue;
       EXPECT_EQ(ink.right > width - 6, isRightToLeft);
       EXPECT_EQ(ink.left < 6, !isRightToLeft);
     }
