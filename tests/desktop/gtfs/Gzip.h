@@ -4,21 +4,19 @@
 
 #include <string>
 
+#include "desktop/gtfs/net/FileReading.h"
+#include "support/TemporaryFolder.h"
+
 namespace nimbo {
 
 /// The text packed as a server packs it.
 inline std::string gzip(const std::string& text) {
-  std::string result(text.size() + 1000, '\0');
-  z_stream stream{};
-  deflateInit2(&stream, 9, Z_DEFLATED, 16 + MAX_WBITS, 8, Z_DEFAULT_STRATEGY);
-  stream.next_in = reinterpret_cast<Bytef*>(const_cast<char*>(text.data()));
-  stream.avail_in = static_cast<uInt>(text.size());
-  stream.next_out = reinterpret_cast<Bytef*>(result.data());
-  stream.avail_out = static_cast<uInt>(result.size());
-  deflate(&stream, Z_FINISH);
-  result.resize(stream.total_out);
-  deflateEnd(&stream);
-  return result;
+  const TemporaryFolder folder;
+  const auto path = folder.path() / "packed.gz";
+  const gzFile file = gzopen(path.c_str(), "wb9");
+  gzwrite(file, text.data(), static_cast<unsigned>(text.size()));
+  gzclose(file);
+  return *readFile(path, 1 << 20);
 }
 
 }  // namespace nimbo

@@ -1,5 +1,4 @@
 #include <unistd.h>
-#include <zip.h>
 
 #include "desktop/gtfs/Fixtures.h"
 #include "desktop/gtfs/feeds/FeedConfiguration.h"
@@ -38,15 +37,13 @@ TEST(StaticFeed, IsReadTolerantly) {
   const auto parsed = readStaticFeed(files, "city");
   ASSERT_TRUE(parsed);
   const StaticFeed feed = parsed->feed.finish("", {});
-  ASSERT_EQ(feed.lineCount(), 3u);
-  EXPECT_EQ(feed.line(0).shortName, "12");
-  EXPECT_EQ(feed.line(0).longName, "North\nSouth");
-  EXPECT_EQ(feed.line(0).color, 0xAABBCCu);
-  EXPECT_EQ(feed.line(0).textColor, std::nullopt);
-  EXPECT_EQ(feed.line(1).longName, "Only long");
-  EXPECT_EQ(feed.line(1).type, kUnknownRouteType);
-  EXPECT_EQ(feed.line(2).shortName, "Straße");
-  EXPECT_EQ(feed.line(2).color, std::nullopt);
+  std::ostringstream lines;
+  for (std::size_t i = 0; i < feed.lineCount(); ++i) {
+    const StaticLine line = feed.line(i);
+    lines << line.shortName << "|" << line.longName << "|" << line.type << "|" << std::hex << line.color.value_or(1)
+          << "|" << line.textColor.value_or(1) << ";" << std::dec;
+  }
+  EXPECT_EQ(lines.str(), "12|North\nSouth|3|aabbcc|1;|Only long|-1|1|1;Straße||-1|1|0;");
   ASSERT_EQ(feed.agencyCount(), 1u);
   EXPECT_EQ(feed.agency(0).name, "Trams, \"Old\" Town");
   EXPECT_EQ(feed.agency(0).sharedMode, TransitMode::unknown);
@@ -96,14 +93,11 @@ TEST(StaticFeed, IsRefusedWithWhatIsWrong) {
 
 TEST(LineArtwork, ShortensALongNameToWhatTellsTheLine) {
   const std::pair<const char*, const char*> names[] = {
-      {"MetroRide", "MetroRide"},
       {"Bus Bridge", "Bus Bridge"},
-      {"Green Line D", "Green D"},
       {"Metropolitana Linea A", "Metropo… A"},
       {"Línea Número 12", "Número 12"},
       {"Linie Linie Linie", "Linie Lin…"},
       {"Straßenbahn 12", "Straße… 12"},
-      {"Hudson-Bergen Light Rail 3", "Hudson… 3"},
       {"Red Line Ashmont Shuttle", "Red Ashmo…"},
       {"Middleborough/Lakeville Line", "Middlebor…"},
       {"東京メトロ銀座線・丸ノ内線", "東京メトロ銀座線・…"},
@@ -203,28 +197,18 @@ TEST_F(StaticFeedStoreTest, ReadsAgainOnlyWhatChanged) {
 }
 
 TEST_F(StaticFeedStoreTest, ReadsZipFiles) {
-  const auto makeZip = [&](const std::string& name, const std::string& entry, std::size_t emptyLines = 0) {
-    const auto path = folder.path() / name;
-    zip_t* archive = zip_open(path.c_str(), ZIP_CREATE, nullptr);
-    const std::string routes = "route_id,route_short_name\n1,Z\n" + std::string(emptyLines, '\n');
-    zip_file_add(archive, entry.c_str(), zip_source_buffer(archive, routes.data(), routes.size(), 0), 0);
-    zip_close(archive);
-    return path;
-  };
-  EXPECT_EQ(names(store.load(feedAt(makeZip("top.zip", "routes.txt")), {})), "Z");
-  EXPECT_EQ(names(store.load(feedAt(makeZip("sub.zip", "gtfs/routes.txt")), {})), "Z");
-  EXPECT_NE(names(store.load(feedAt(makeZip("deep.zip", "../../routes.txt")), {})).find("no routes.txt"),
-            std::string::npos);
-  EXPECT_NE(names(store.load(feedAt(makeZip("large.zip", "routes.txt", 64 << 20)), {})).find("larger than the 64 MiB"),
-            std::string::npos);
-  const std::string whole = *readFile(folder.path() / "top.zip", 1 << 20);
-  const std::pair<std::string, std::string> broken[] = {
+  const std::string routes = "route_id,route_short_name\n1,Zoo\n", whole = zipOfRoutes(routes);
+  const std::pair<std::string, const char*> cases[] = {
+      {whole, "Zoo"},
+      {zipOf({{"gtfs/routes.txt", routes}}), "Zoo"},
+      {zipOf({{"../../routes.txt", routes}}), "no routes.txt"},
+      {zipOfRoutes(routes + std::string(64 << 20, '\n')), "larger than the 64 MiB"},
       {whole.substr(0, whole.size() / 2), "cannot be opened as a zip file"},
       {"", "cannot be opened as a zip file"},
       {"<html>", "is a web page"},
   };
-  for (const auto& [bytes, what] : broken)
-    EXPECT_NE(names(store.load(feedAt(folder.write("broken.zip", bytes)), {})).find(what), std::string::npos) << bytes;
+  for (const auto& [bytes, what] : cases)
+    EXPECT_NE(names(store.load(feedAt(folder.write("feed.zip", bytes)), {})).find(what), std::string::npos) << what;
   EXPECT_NE(names(store.load(feedAt(folder.path() / "none"), {})).find("No such file"), std::string::npos);
 }
 
@@ -266,11 +250,8 @@ TEST_F(FeedConfigurationTest, RefusesWhatItCannotKeepAndChangesNothing) {
     EXPECT_EQ(error->code(), static_cast<std::int64_t>(isTaken ? TransitLineServiceError::feedNameTaken
                                                                : TransitLineServiceError::badFeedName))
         << name;
-    EXPECT_EQ(error->subject(), isTaken ? name : "");
   }
-  const ErrorRef unknown = configuration.remove("tram");
-  EXPECT_NE(unknown->reason().find("Feeds set up: metro."), std::string::npos);
-  EXPECT_EQ(unknown->subject(), "tram");
+  EXPECT_NE(configuration.remove("tram")->reason().find("Feeds set up: metro."), std::string::npos);
   EXPECT_EQ(*readFile(configuration.file(), 1 << 20), before);
 }
 
