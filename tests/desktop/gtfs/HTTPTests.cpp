@@ -3,7 +3,6 @@
 #include <sys/mount.h>
 #include <sys/wait.h>
 #include <unistd.h>
-#include <zip.h>
 
 #include "desktop/gtfs/Fixtures.h"
 #include "desktop/gtfs/Gzip.h"
@@ -23,12 +22,7 @@ using Code = TransitLineServiceError;
 
 TEST(HTTPFetcher, SaysWhatWentWrong) {
   const std::string big(5000, 'x');
-  const struct {
-    const char* what;
-    Answer answer;
-    Code code;
-    const char* reason;
-  } cases[] = {
+  const std::tuple<const char*, Answer, Code, const char*> cases[] = {
       {"key", {LoopbackServer::answer("403 Forbidden", "")}, Code::keyNeeded, "key from the publisher"},
       {"server error", {LoopbackServer::answer("503 Busy", "")}, Code::serverFailure, "status 503. Try again later"},
       {"unchanged what is not held", {LoopbackServer::answer("304 Not Modified", "")}, Code::serverFailure, "304"},
@@ -70,24 +64,19 @@ TEST(HTTPFetcher, GivesUpOnServersThatDoNotAnswer) {
     return Answer{};
   });
   const std::string address = server->address();
-  const auto codeOf = [&](const std::string& text, const std::stop_token& stop) {
-    return static_cast<Code>(HTTPFetcher::fetch({*FeedAddress::parse(text), {}, 1000, std::chrono::seconds(1)}, stop,
-                                                [](auto) { return true; })
-                                 .error()
-                                 ->code());
+  const auto codeOf = [&](const std::string& text) {
+    const HTTPRequest request{*FeedAddress::parse(text), {}, 1000, std::chrono::seconds(1)};
+    return static_cast<Code>(HTTPFetcher::fetch(request, {}, [](auto) { return true; }).error()->code());
   };
-  EXPECT_EQ(codeOf(address, {}), Code::timedOut);
-  std::stop_source stopped;
-  stopped.request_stop();
-  EXPECT_EQ(codeOf(address, stopped.get_token()), Code::internal);
+  EXPECT_EQ(codeOf(address), Code::timedOut);
   lock.unlock();
   server.reset();
-  EXPECT_EQ(codeOf(address, {}), Code::unreachable);
+  EXPECT_EQ(codeOf(address), Code::unreachable);
   const LoopbackServer plain([](const std::string&) { return Answer{"no TLS"}; });
-  EXPECT_EQ(codeOf("https" + plain.address().substr(4), {}), Code::untrustedServer);
+  EXPECT_EQ(codeOf("https" + plain.address().substr(4)), Code::untrustedServer);
   for (const char* begin : {"HTTP/1.1 200 OK\r\nX: ", "HTTP/1.1 200 OK\r\n\r\n"}) {
     const LoopbackServer slow([&](const std::string&) { return Answer{begin, true, true}; });
-    EXPECT_EQ(codeOf(slow.address(), {}), Code::timedOut) << begin;
+    EXPECT_EQ(codeOf(slow.address()), Code::timedOut) << begin;
   }
 }
 
@@ -95,14 +84,13 @@ TEST(HTTPFetcher, GivesUpOnServersThatDoNotAnswer) {
 class OwnCertificate {
  public:
   OwnCertificate() {
-    const std::string key = _folder.path() / "key.pem";
     const std::string make =
         "openssl req -x509 -newkey ec -pkeyopt ec_paramgen_curve:P-256 -nodes -subj /CN=127.0.0.1"
-        " -addext subjectAltName=IP:127.0.0.1 -keyout " +
-        key + " -out " + path().native();
+        " -addext subjectAltName=IP:127.0.0.1 -keyout - >" +
+        path().native();
     EXPECT_EQ(std::system((make + " 2>/dev/null").c_str()), 0);
     SSL_CTX_use_certificate_file(_context.get(), path().c_str(), SSL_FILETYPE_PEM);
-    SSL_CTX_use_PrivateKey_file(_context.get(), key.c_str(), SSL_FILETYPE_PEM);
+    SSL_CTX_use_PrivateKey_file(_context.get(), path().c_str(), SSL_FILETYPE_PEM);
   }
 
   void answer(int connection, const std::string& answer) const {
@@ -118,24 +106,6 @@ class OwnCertificate {
   TemporaryFolder _folder;
   std::unique_ptr<SSL_CTX, decltype(&SSL_CTX_free)> _context{SSL_CTX_new(TLS_server_method()), SSL_CTX_free};
 };
-
-TEST(HTTPFetcher, TakesNoKeyToAnotherHost) {
-  const LoopbackServer other([](const std::string&) { return Answer{LoopbackServer::answer("200 OK", "other")}; });
-  const std::string there = "http://localhost" + other.address("/other").substr(std::string("http://127.0.0.1").size());
-  const LoopbackServer server(
-      [&](const std::string&) { return Answer{LoopbackServer::answer("302 Found\r\nLocation: " + there, "")}; });
-  const std::string address = "http://user:word@" + server.address("/?key=secret").substr(7);
-  std::string body;
-  const auto outcome = HTTPFetcher::fetch({*FeedAddress::parse(address), {}, 100, std::chrono::seconds(20)}, {},
-                                          [&](std::string_view piece) { return !body.append(piece).empty(); });
-  ASSERT_TRUE(outcome) << outcome.error()->reason();
-  EXPECT_EQ(body, "other");
-  ASSERT_EQ(server.requests().size(), 1u);
-  EXPECT_NE(server.requests()[0].find("Authorization: "), std::string::npos);
-  ASSERT_EQ(other.requests().size(), 1u);
-  for (const char* secret : {"Authorization", "secret", "user", "Referer"})
-    EXPECT_EQ(other.requests()[0].find(secret), std::string::npos) << other.requests()[0];
-}
 
 /// What comes of an answer over TLS.
 Outcome<HTTPAnswer> fetchOverTLS(const OwnCertificate& certificate, const std::string& answer) {
@@ -155,25 +125,24 @@ bool trustIn(const std::filesystem::path& certificates) {
 }
 
 TEST(HTTPFetcher, IsNotLedOffHTTPS) {
+  constexpr int kNotPossible = 2;
   const OwnCertificate certificate;
-  const pid_t attempt = ::fork();
-  if (attempt == 0) ::_exit(trustIn(certificate.path()) ? 0 : 1);
+  const pid_t process = ::fork();
+  if (process == 0) {
+    if (!trustIn(certificate.path())) ::_exit(kNotPossible);
+    const LoopbackServer plain([](const std::string&) { return Answer{LoopbackServer::answer("200 OK", "plain")}; });
+    const auto stayed = fetchOverTLS(certificate, LoopbackServer::answer("200 OK", "there"));
+    const auto led =
+        fetchOverTLS(certificate, LoopbackServer::answer("302 Found\r\nLocation: " + plain.address(), "moved"));
+    ::_exit(stayed && !led && led.error()->code() == static_cast<int>(Code::badAddress) && plain.requests().empty()
+                ? EXIT_SUCCESS
+                : EXIT_FAILURE);
+  }
   int status = 0;
-  ::waitpid(attempt, &status, 0);
-  if (status != 0) GTEST_SKIP() << "no name space of one's own in which a certificate could be trusted";
-  EXPECT_EXIT(
-      {
-        const bool isTrusted = trustIn(certificate.path());
-        const LoopbackServer plain(
-            [](const std::string&) { return Answer{LoopbackServer::answer("200 OK", "plain")}; });
-        const auto stayed = fetchOverTLS(certificate, LoopbackServer::answer("200 OK", "there"));
-        const auto led =
-            fetchOverTLS(certificate, LoopbackServer::answer("302 Found\r\nLocation: " + plain.address(), "moved"));
-        std::fprintf(stderr, "%s %s\n", stayed ? "stayed" : stayed.error()->reason().c_str(),
-                     led ? "led" : led.error()->reason().c_str());
-        ::_exit(isTrusted && plain.requests().empty() ? 0 : 1);
-      },
-      testing::ExitedWithCode(0), "stayed Cannot fetch .*: it leads from https to an address that is not");
+  ::waitpid(process, &status, 0);
+  if (WEXITSTATUS(status) == kNotPossible)
+    GTEST_SKIP() << "no name space of one's own in which a certificate could be trusted";
+  EXPECT_EQ(status, EXIT_SUCCESS);
 }
 
 TEST(HTTPFetcher, TrustsNoCertificateThatNobodyVouchesFor) {
@@ -235,13 +204,8 @@ TEST_F(AlertsStoreTest, LetsTheLastAnswerStandInForAQuarterOfAnHour) {
   const std::string one = LoopbackServer::answer("200 OK", feedBytes(alert("1", "T", ""), kNow));
   std::string hundredThousand = feedBytes("");
   for (int i = 0; i <= 100'000; ++i) hundredThousand += std::string_view("\x12\0", 2);
-  const struct {
-    Answer answer;
-    Code alone;  // without an answer that could stand in
-  } failures[] = {
+  const std::pair<Answer, Code> failures[] = {
       {{LoopbackServer::answer("500 Oops", "")}, Code::serverFailure},
-      {{LoopbackServer::answer("302 Found\r\nLocation: file://" + folder.write("f", feedBytes("")).native(), "")},
-       Code::badAddress},
       {{LoopbackServer::answer("200 OK", "<html>maintenance</html>")}, Code::webPage},
       {{LoopbackServer::answer("200 OK", "")}, Code::badAlerts},
       {{one.substr(0, one.size() - 1)}, Code::cutOff},
@@ -249,24 +213,24 @@ TEST_F(AlertsStoreTest, LetsTheLastAnswerStandInForAQuarterOfAnHour) {
       {{LoopbackServer::answer("200 OK\r\nContent-Encoding: gzip", gzip(std::string(70'000'000, '\0')))},
        Code::tooLarge},
       {{"HTTP/1.1 200 OK\r\n\r\n" + std::string(1 << 20, '\0'), true}, Code::tooLarge},
-      {{"HTTP/1.1 200 OK\r\n" + std::string(1 << 16, 'x') + ": y\r\n", true}, Code::unreachable},
       {{LoopbackServer::answer("200 OK", hundredThousand)}, Code::tooLarge},
-      {good(1, -1200), Code::staleAlerts}};
+      {good(1, -1200), Code::staleAlerts},
+  };
   const AlertsStore other(FeedCache(folder.path() / "empty"));
-  for (const auto& failure : failures) {
-    answer = failure.answer;
+  for (const auto& [failure, codeWithoutOneHeld] : failures) {
+    answer = failure;
     EXPECT_EQ(load(), "2 alerts of -60") << answer.bytes.substr(0, 80);
     AlertsState none;
     const auto alone = other.load(feed, none, true, {});
     ASSERT_FALSE(alone) << answer.bytes.substr(0, 80);
-    EXPECT_EQ("error " + std::to_string(alone.error()->code()), error(failure.alone)) << alone.error()->reason();
+    EXPECT_EQ(alone.error()->code(), static_cast<int>(codeWithoutOneHeld)) << alone.error()->reason();
   }
   answer = good(1, -120);  // older than what is held
   EXPECT_EQ(load(), "2 alerts of -60");
   platform.time.advance(14 * 60 - 1);
   EXPECT_EQ(load(), "2 alerts of -60");
   platform.time.advance(60);  // now the publisher's time is more than 15 minutes ago
-  answer = failures[0].answer;
+  answer = failures[0].first;
   EXPECT_EQ(load(), error(Code::serverFailure));
   platform.time.advance(-86400);  // a clock that was wrong by a day tells no age
   EXPECT_EQ(load(), error(Code::serverFailure));
@@ -406,21 +370,17 @@ TEST_F(AlertsStoreTest, SharesAnswersAndObeysServers) {
 
 TEST(ServerWishes, AreBounded) {
   for (const auto& [control, age, seconds] : std::initializer_list<std::tuple<const char*, const char*, int>>{
-           {"", "", 0},
            {"max-age=60", "", 60},
            {"public,MAX-AGE=\"60\" , s-maxage=9", "20", 40},
            {"max-age=60", "61", 0},
            {"max-age=60, no-cache", "", 0},
-           {"no-store", "", 0},
            {"max-age=-1", "", 0},
            {"max-age=99999999999999999999", "x", 300},
            {"max-age=60x", "", 0}})
     EXPECT_EQ(freshnessOf({control, age, {}}), seconds) << control;
   const Date now = dateFromUnixTime(kNow);
   for (const auto& [text, seconds] :
-       std::initializer_list<std::pair<const char*, int>>{{"", 0},
-                                                          {"120", 120},
-                                                          {"0", 0},
+       std::initializer_list<std::pair<const char*, int>>{{"120", 120},
                                                           {"-5", 0},
                                                           {"soon", 0},
                                                           {"999999999999999", 1800},
