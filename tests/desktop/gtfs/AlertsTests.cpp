@@ -1,6 +1,7 @@
+#include <gmock/gmock.h>
+
 #include "desktop/gtfs/Fixtures.h"
 #include "desktop/gtfs/alerts/AlertTexts.h"
-#include "desktop/gtfs/feeds/TransitLineServiceError.h"
 
 namespace nimbo {
 namespace {
@@ -162,14 +163,27 @@ TEST(Alert, IsSkippedAloneAndCountedUnlessSevereOrAskedFor) {
   }
 }
 
+TEST(AlertsFeed, IsRefusedWithWhatItIsInstead) {
+  const std::string address = "https://example.org/alerts";
+  const std::pair<std::string, std::string> cases[] = {
+      {"", "it is empty"},
+      {"<!doctype html><title>Sorry</title>", "web page"},
+      {"\n{\"entity\": []}", "JSON"},
+      {feedBytes(alert("a", "T", "")).erase(20), "cut off"},
+      {std::string("\x0A\x07\x0A\x03") + "2.0\x10\x01", "DIFFERENTIAL"},
+  };
+  for (const auto& [bytes, what] : cases) {
+    const auto feed = AlertsFeed::read(bytes, address);
+    ASSERT_FALSE(feed) << what;
+    EXPECT_THAT(feed.error()->reason(), testing::AllOf(testing::HasSubstr(what), testing::HasSubstr(address)));
+  }
+}
+
 TEST(Alert, TextsComeFromWhatThereIs) {
   const std::string description = "description_text { translation { text: 'Stop <b>closed</b>.\\n\\nUse stop B.' } } ";
   const std::string detail = "effect_detail { translation { text: 'Stop shift' } } ";
-  const struct {
-    const char* what;
-    std::string alert;
-    std::optional<std::string> title, summary, description;
-  } cases[] = {
+  using Text = std::optional<std::string>;
+  const std::tuple<const char*, std::string, Text, Text, Text> cases[] = {
       {"header", "header_text { translation { text: 'Works\\non line 1 ' } } " + description, "Works on line 1",
        "Stop closed.", "Stop closed.\n\nUse stop B."},
       {"first line of the description", description + detail, "Stop closed.", "Use stop B.",

@@ -9,7 +9,6 @@
 #include "desktop/gtfs/LoopbackServer.h"
 #include "desktop/gtfs/alerts/AlertsStore.h"
 #include "desktop/gtfs/feeds/TransitLineServiceError.h"
-#include "desktop/gtfs/net/FileReading.h"
 #include "desktop/gtfs/net/HTTPFetcher.h"
 #include "desktop/gtfs/net/ServerWishes.h"
 #include "support/TestPlatform.h"
@@ -64,11 +63,14 @@ TEST(HTTPFetcher, GivesUpOnServersThatDoNotAnswer) {
     return Answer{};
   });
   const std::string address = server->address();
-  const auto codeOf = [&](const std::string& text) {
+  const auto codeOf = [&](const std::string& text, const std::stop_token& stop = {}) {
     const HTTPRequest request{*FeedAddress::parse(text), {}, 1000, std::chrono::seconds(1)};
-    return static_cast<Code>(HTTPFetcher::fetch(request, {}, [](auto) { return true; }).error()->code());
+    return static_cast<Code>(HTTPFetcher::fetch(request, stop, [](auto) { return true; }).error()->code());
   };
   EXPECT_EQ(codeOf(address), Code::timedOut);
+  std::stop_source stopped;
+  stopped.request_stop();
+  EXPECT_EQ(codeOf(address, stopped.get_token()), Code::internal);
   lock.unlock();
   server.reset();
   EXPECT_EQ(codeOf(address), Code::unreachable);
@@ -174,7 +176,6 @@ class AlertsStoreTest : public testing::Test {
 
   TestPlatform platform;
   TemporaryFolder folder;
-  std::mutex lock;
   Answer answer;
   LoopbackServer server{[this](const std::string&) { return answer; }};
   Feed feed{"city", *FeedAddress::parse("/none"), *FeedAddress::parse(server.address())};
@@ -374,6 +375,7 @@ TEST(ServerWishes, AreBounded) {
            {"public,MAX-AGE=\"60\" , s-maxage=9", "20", 40},
            {"max-age=60", "61", 0},
            {"max-age=60, no-cache", "", 0},
+           {"no-store", "", 0},
            {"max-age=-1", "", 0},
            {"max-age=99999999999999999999", "x", 300},
            {"max-age=60x", "", 0}})

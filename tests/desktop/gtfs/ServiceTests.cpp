@@ -134,7 +134,10 @@ TEST_F(LineServiceTest, FailsWhenAFeedDoes) {
   addFeed("south", {"1"}, folder.path() / "missing.pb");
   EXPECT_EQ(lookup({line("north", "r1")}), "1 (In north); ");
   EXPECT_EQ(lookup({line("north", "r1"), line("south", "r1")}), error(Code::unreadableFile));
+  ASSERT_EQ(service->knownIncidents().size(), 1u) << "what the other feed says stays known";
+  EXPECT_EQ(service->knownIncidents()[0].title, "In north");
   EXPECT_EQ(lookup({line("north", "r1"), line("east", "r1")}), error(Code::unknownFeed));
+  EXPECT_EQ(service->knownIncidents().size(), 1u) << "a feed that is not set up hides nothing either";
   std::string many;
   for (int i = 0; i <= 5000; ++i) many += alert(std::to_string(i), "T" + std::to_string(i), route("r1"));
   addFeed("west", {"1"}, folder.write("many.pb", feedBytes(many)));

@@ -3,7 +3,6 @@
 #include "desktop/gtfs/Fixtures.h"
 #include "desktop/gtfs/feeds/FeedConfiguration.h"
 #include "desktop/gtfs/feeds/TransitLineServiceError.h"
-#include "desktop/gtfs/net/FileReading.h"
 #include "desktop/gtfs/static/LineArtwork.h"
 #include "desktop/gtfs/static/LineItems.h"
 #include "desktop/gtfs/static/StaticFeedStore.h"
@@ -98,6 +97,7 @@ TEST(LineArtwork, ShortensALongNameToWhatTellsTheLine) {
       {"Línea Número 12", "Número 12"},
       {"Linie Linie Linie", "Linie Lin…"},
       {"Straßenbahn 12", "Straße… 12"},
+      {"Hudson-Bergen Light Rail 3", "Hudson… 3"},
       {"Red Line Ashmont Shuttle", "Red Ashmo…"},
       {"Middleborough/Lakeville Line", "Middlebor…"},
       {"東京メトロ銀座線・丸ノ内線", "東京メトロ銀座線・…"},
