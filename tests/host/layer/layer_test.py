@@ -1,5 +1,6 @@
 #!/usr/bin/python3
-"""The widget on the desktop as its user has it. usage: layer_test.py faults|sway NIMBO_TRANSIT_LAYER WIDGET COMPOSITOR"""
+"""The widget on the desktop as its user has it. usage: layer_test.py faults|sway NIMBO_TRANSIT NIMBO_TRANSIT_LAYER
+WIDGET COMPOSITOR"""
 import os
 import signal
 import socket
@@ -13,12 +14,16 @@ from sway_session import LEFT, MIDDLE, RIGHT, Home, Pointer, Program, wait
 
 
 TAB, ENTER, ESCAPE = 15, 28, 1
-layer, widget, compositor = sys.argv[2:]
+program, layer, widget, compositor = sys.argv[2:]
 
 
 class Session(Home):
+    """The rows of the last time are there, so that a click finds what can be expanded."""
+
     def __init__(self):
         super().__init__(widget)
+        self.folders = ["--config", self.folder, "--state", self.folder]
+        assert self.start([program, *self.folders, "update"], stdout=subprocess.DEVNULL).wait() == 0
 
     def compositor(self, *without):
         program = Program(self, compositor, *without)
@@ -26,8 +31,7 @@ class Session(Home):
         return program
 
     def layer(self, *arguments):
-        folders = ["--config", self.folder, "--state", self.folder]
-        return Program(self, layer, *folders, *arguments, errors=True)
+        return Program(self, layer, *self.folders, *arguments, errors=True)
 
 
 class Portal(Service):
