@@ -35,6 +35,8 @@ constexpr std::pair<const char*, const char*> kRefreshChoices[] = {{"30", "Windo
                                                                    {"300", "Window_Refresh_300"},
                                                                    {"1800", "Window_Refresh_1800"}};
 
+bool isNotifyOn() { return TellingSettings::read(*Platform::current().sharedSettings().groupStore()).isOn; }
+
 }  // namespace
 
 Glib::RefPtr<Gio::MenuModel> makeMainMenu() {
@@ -110,6 +112,8 @@ void MainWindow::buildHeader() {
   // A window is seldom open for its menu.
   _menu.set_create_popup_func([this] {
     if (!_menu.get_menu_model()) _menu.set_menu_model(makeMainMenu());
+    // Other programs turn it on and off too.
+    change_action_state("notify", Glib::Variant<bool>::create(isNotifyOn()));
   });
   _menu.set_primary();
   _menu.set_has_frame(false);
@@ -188,16 +192,13 @@ void MainWindow::addActions() {
 }
 
 void MainWindow::addNotifyAction() {
-  const auto isOn = [] { return TellingSettings::read(*Platform::current().sharedSettings().groupStore()).isOn; };
-  const auto action = add_action_bool("notify", isOn());
-  action->signal_activate().connect([this, action, isOn](const Glib::VariantBase&) {
-    if (const ErrorRef failure = setNotify(*_context.platform.operator->(), isOn() ? "off" : "on"))
+  const auto action = add_action_bool("notify", isNotifyOn());
+  action->signal_activate().connect([this, action](const Glib::VariantBase&) {
+    if (const ErrorRef failure = setNotify(*_context.platform.operator->(), isNotifyOn() ? "off" : "on"))
       return tell(textOfError(*failure));
-    action->set_state(Glib::Variant<bool>::create(isOn()));
+    action->set_state(Glib::Variant<bool>::create(isNotifyOn()));
     _widgetPage->showNotifyQuestion();
   });
-  // Other programs turn it on and off too.
-  _menu.connect_property_changed("active", [action, isOn] { action->set_state(Glib::Variant<bool>::create(isOn())); });
 }
 
 void MainWindow::markSeen(const std::vector<std::string>& ids, bool isAsked) {

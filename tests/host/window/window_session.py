@@ -86,6 +86,9 @@ class Window:
     def box(self, name, role):
         return self.see(name, role).get_extents(Atspi.CoordType.WINDOW)
 
+    def is_checked(self, name, role):
+        return self.see(name, role).get_state_set().contains(Atspi.StateType.CHECKED)
+
     def click(self, name, role="push button"):
         def place():
             box = self.box(name, role)

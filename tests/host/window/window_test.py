@@ -94,6 +94,11 @@ def tour(session, folder):
     window.click("Not Now")
     wait("no question any more", lambda: not window.find("Do you want to be told"))
     assert subprocess.run([command_line, "settings", "get", "notify"], capture_output=True).stdout == b"off\n"
+    for value, isMarked in ("severe", True), ("off", False):  # by another program
+        subprocess.run([command_line, "settings", "set", "notify", value], check=True)
+        window.click("Menu")
+        wait(f"the mark of {value}", lambda: window.is_checked("Notifications", "menu item") == isMarked)
+        press("key", "Escape")
     wait("what is new", lambda: window.frame().get_name() == "4 new – Nimbo Transit")
     window.click("4 Advisories")
     for text in "Incidents", "Signals fail", "Music plays", "^As of ":
