@@ -212,7 +212,7 @@ class Bench:
                 self.process("peakKiB", *loaded, *self.large, scale=mib), unit="MiB"),
             Row("redraw of six rows, nothing changed", 1.5, *self.pair("redraw"), peer="bare Pango and Cairo"),
             Row("layout of six rows after a changed constant", 16.7, self.timed("layOut", 1e3), unit="ms"),
-            Row("decode of the hand-off record", 0.4, *self.pair("decode"), peer="libprotobuf, fresh message"),
+            Row("decode of the hand-off record", 0.7, *self.pair("decode"), peer="libprotobuf, fresh message"),
             Row("encode of the hand-off record", 1.0, *self.pair("encode"), peer="libprotobuf, built message"),
             Row("alerts feed of 5 MB and 5000 alerts to the incidents of 20 favorites", 0.25,
                 self.function("alerts/manual_time"), self.function("alertsPeer"),
