@@ -8,12 +8,10 @@
 #include <csignal>
 #include <cstdio>
 #include <filesystem>
-#include <thread>
 #include <vector>
 
 #include "desktop/drawing/DrawingPart.h"
 #include "desktop/system/AtomicFile.h"
-#include "desktop/system/LatePart.h"
 #include "desktop/system/LinuxMemoryPressure.h"
 #include "desktop/system/SmallMemory.h"
 #include "platform/foundation/Version.h"
@@ -54,17 +52,6 @@ std::vector<std::filesystem::path> writablePlaces(const nimbo::Paths& paths) {
   places.emplace_back(NIMBO_COVERAGE_FOLDER);
 #endif
   return places;
-}
-
-/// Opens the part that draws and begins to look for fonts, while the rows are read. Who draws hears where it is
-/// missing.
-std::jthread prepareDrawing() {
-  return std::jthread([] {
-    try {
-      nimbo::drawingPart().lookForFonts();
-    } catch (const nimbo::LatePartMissing&) {
-    }
-  });
 }
 
 /// Keeps the protocol's output to the protocol: whatever else prints to standard output goes to standard error.
@@ -118,7 +105,7 @@ int main(int argc, char** argv) {
     return 1;
   }
   try {
-    const std::jthread drawing = pictures != -1 ? prepareDrawing() : std::jthread();
+    if (pictures != -1) nimbo::drawingPart().lookForFonts();
     return nimbo::WidgetProcess(std::move(options), STDIN_FILENO, output).run();
   } catch (const std::exception& exception) {
     std::fprintf(stderr, "nimbo-transit-widget: %s\n", exception.what());

@@ -42,14 +42,13 @@ using PictureRef = std::shared_ptr<const Picture>;
 /// What draws a picture: called once, at once, with the origin at the top left.
 using DrawOperation = std::function<void(Painter&)>;
 
-/// What libnimbo-drawing does, the part with Pango and Cairo (system/LatePart.h). Main thread only, where nothing else
-/// is said.
+/// What libnimbo-drawing does, the part with Pango and Cairo (system/LatePart.h). Main thread only.
 class DrawingPart {
  public:
   virtual ~DrawingPart() = default;
 
   /// Begins to look for fonts, on a thread of Pango's: for a program that will show text soon, and has other things to
-  /// do until then. Any thread.
+  /// do until then.
   virtual void lookForFonts() = 0;
   /// `language` is the user's, as a BCP 47 tag.
   virtual std::unique_ptr<TextSystem> makeTextSystem(const std::string& language) = 0;
@@ -65,7 +64,7 @@ class DrawingPart {
                             const std::filesystem::path& path) = 0;
 };
 
-/// Opens the part with the first call. Any thread. Throws LatePartMissing.
+/// Opens the part with the first call. Throws LatePartMissing.
 DrawingPart& drawingPart();
 
 }  // namespace nimbo
