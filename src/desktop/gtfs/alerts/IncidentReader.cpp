@@ -37,7 +37,7 @@ struct Incident {
   std::map<std::size_t, OnLine> lines;  // by place in the query
 };
 
-struct ContentHash {
+struct AlertContentHash {
   std::size_t operator()(const AlertContent& content) const { return content.hash(); }
 };
 
@@ -363,7 +363,7 @@ class IncidentBuilder {
   std::vector<std::pair<const AlertEntity*, std::size_t>> _quickHashes;  // of those that are no incident
   std::vector<Incident> _incidents;
   std::unordered_multimap<std::size_t, std::size_t> _incidentsOfTexts;  // by the hash of title and description
-  std::unordered_map<AlertContent, std::size_t, ContentHash> _incidentOfContent;
+  std::unordered_map<AlertContent, std::size_t, AlertContentHash> _incidentOfContent;
   std::unordered_set<std::size_t> _quickHashesOfContents;
 };
 

@@ -8,7 +8,6 @@
 #include <unordered_map>
 #include <vector>
 
-#include "desktop/gtfs/ContentHash.h"
 #include "desktop/gtfs/static/StaticFeed.h"
 #include "platform/foundation/Outcome.h"
 
@@ -76,7 +75,7 @@ class SelectorMatcher {
 
   std::vector<StaticLine> _lines;
   std::vector<std::string_view> _agencyOfLine;
-  std::unordered_map<std::string_view, std::size_t, TextHash> _placeOfRoute;
+  std::unordered_map<std::string_view, std::size_t> _placeOfRoute;
   std::unordered_map<std::uint32_t, std::size_t> _placeOfLine;
   std::unordered_map<std::string_view, std::size_t> _agencies;
   TripLookup _trips;
