@@ -82,7 +82,7 @@ void StatusWatch::showSnapshot(const protocol::Snapshot& snapshot) {
   const Date now = _clock.now();
   const auto content = barContentOf(snapshot, _lines, now);
   if (content) _show(*content);
-  if (!_givesBack || !_givesBack->isValid()) _givesBack = giveBackHeapSoon(_context.runLoop);
+  giveBackHeapSoon(_context.runLoop, _givesBack);
   cancel(_stale);
   if (content && !content->isStale && snapshot.result == protocol::FetchResult::success && snapshot.updated)
     _stale = _context.runLoop.scheduleTimer(kBarStaleAfter - intervalBetween(*snapshot.updated, now) + 1, false,

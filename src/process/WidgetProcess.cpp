@@ -476,7 +476,7 @@ void WidgetProcess::tellNotice(const ErrorRef& notice) {
 void WidgetProcess::announceFrame() {
   if (std::exchange(_frameAnnounced, true)) return;
   notify(_connection, protocol::kFrame, {});
-  if (!_givesBack || !_givesBack->isValid()) _givesBack = giveBackHeapSoon(_runLoop);
+  giveBackHeapSoon(_runLoop, _givesBack);
 }
 
 protocol::Advanced WidgetProcess::advanceTime(const protocol::AdvanceParams& params) {

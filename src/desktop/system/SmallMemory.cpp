@@ -15,8 +15,8 @@ void keepHeapSmall() {
   mallopt(M_MMAP_THRESHOLD, kMapped);
 }
 
-std::shared_ptr<Timer> giveBackHeapSoon(RunLoop& runLoop) {
-  return runLoop.scheduleTimer(1, false, [](Timer&) { malloc_trim(0); });
+void giveBackHeapSoon(RunLoop& runLoop, std::shared_ptr<Timer>& timer) {
+  if (!timer || !timer->isValid()) timer = runLoop.scheduleTimer(1, false, [](Timer&) { malloc_trim(0); });
 }
 
 void giveBackStack() {

@@ -15,8 +15,8 @@ namespace nimbo {
 void keepHeapSmall();
 
 /// Gives back to the system the heap's pages that hold nothing, a second from now, when what a change of the rows took
-/// is freed. Answers the timer, which is valid until then.
-std::shared_ptr<Timer> giveBackHeapSoon(RunLoop& runLoop);
+/// is freed. Sets the caller's `timer`, which may be null; nothing while it is still to fire.
+void giveBackHeapSoon(RunLoop& runLoop, std::shared_ptr<Timer>& timer);
 
 /// Gives back to the system what deeper calls on this thread took of its stack and have left, such as
 /// GTK, which reads its theme recursively.
